@@ -1,0 +1,26 @@
+# Compiler settings that every target of this tree shares, and the tools around them.
+
+set(CMAKE_CXX_STANDARD 20)
+set(CMAKE_CXX_STANDARD_REQUIRED ON)
+set(CMAKE_CXX_EXTENSIONS OFF)
+set(CMAKE_CXX_VISIBILITY_PRESET hidden)
+set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
+set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+# -O3 alone: results are to the bit, so nothing that lets the compiler reorder or contract floating-point work.
+set(CMAKE_CXX_FLAGS_RELEASE "-O3 -DNDEBUG")
+
+find_program(KPLIB_CCACHE ccache)
+if(KPLIB_CCACHE)
+    set(CMAKE_CXX_COMPILER_LAUNCHER ${KPLIB_CCACHE})
+endif()
+
+add_compile_options(-fno-math-errno -ffp-contract=off -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor
+                    -Woverloaded-virtual -Wcast-align -Wundef -Werror)
+
+if(KPLIB_SANITIZE)
+    add_compile_options(-fsanitize=${KPLIB_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer -g1)
+    if(KPLIB_FUZZ)
+        add_compile_options(-fsanitize=fuzzer-no-link)
+    endif()
+    add_link_options(-fsanitize=${KPLIB_SANITIZE})
+endif()

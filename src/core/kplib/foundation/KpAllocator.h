@@ -1,0 +1,39 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+#include <functional>
+
+/// A value that names a pair of functions to allocate and free with, so that a buffer can be given back the way it was
+/// obtained. Copied by value, never throws: failure is a null result.
+class KPLIB_API KpAllocator {
+public:
+    enum AllocatorType : int {
+        AllocatorNone = 0,     ///< allocates and frees nothing: the memory belongs to somebody else
+        AllocatorMalloc = 1,   ///< malloc and free
+        AllocatorMalloc2 = 2,  ///< the same pair as AllocatorMalloc, and that is meant
+        AllocatorNew = 3,      ///< array new and delete of bytes
+    };
+
+    /// The pair of that type; any other value gives that of AllocatorNone.
+    KpAllocator(AllocatorType type);
+
+    /// The given pair; either may be null.
+    KpAllocator(void* (*allocateWith)(unsigned long), void (*deallocateWith)(void*));
+
+    /// `size` bytes or null. On a first failure the callback below runs, if one is set, and one more attempt is made.
+    void* allocate(unsigned long size) const;
+
+    /// Gives memory of allocate() back; null is ignored.
+    void deallocate(void* ptr) const;
+
+    bool operator==(const KpAllocator& other) const = default;
+
+    /// Sets what to run when an allocation fails, for the owner of a cache that can be dropped: process-wide, unlocked,
+    /// so to be set before other threads start. An empty function takes it away.
+    static void setFreeUnusedUncompressedDataCB(std::function<void()> callback);
+
+private:
+    void* (*allocate_)(unsigned long);
+    void (*deallocate_)(void*);
+};

@@ -1,0 +1,323 @@
+#pragma once
+
+#include <kplib/foundation/KpMemory.h>
+
+#include <climits>
+#include <cstddef>
+#include <cstring>
+#include <initializer_list>
+#include <new>
+#include <type_traits>
+#include <utility>
+
+/// How a KpDArray makes, copies and drops its elements; it never changes how the array grows.
+enum class KpElementKind : int {
+    Bytes,    ///< scalars and pointers: left uninitialised, copied as one block
+    Plain,    ///< values without a destructor: left uninitialised (no constructor runs), copied one by one
+    Managed,  ///< all others: constructed, copied and destroyed one by one
+};
+
+/// What the array has to know of an element type. The default is sound for all types that may be moved as bytes;
+/// specialise it for a type of your own that points into itself, with `movesAsBytes` false.
+template <typename T>
+struct KpElementTraits {
+    static constexpr KpElementKind kind = std::is_scalar_v<T>               ? KpElementKind::Bytes
+                                          : std::is_trivially_copyable_v<T> ? KpElementKind::Plain
+                                                                            : KpElementKind::Managed;
+    /// Standard containers and strings may point into themselves: they are moved by move construction.
+    static constexpr bool movesAsBytes = !requires { typename T::allocator_type; };
+};
+
+/// The growable array of the library: three words, no allocator, no virtual operations.
+///
+/// Elements are moved as bytes when the array grows or opens a gap (KpElementTraits tells the exceptions), so nothing
+/// may hold the address of an element across a growth. The array grows by half its size, and only resize(), remax() and
+/// the insertions change it; positions are not checked. Exhausted memory is a KpMemoryException. If copying or making a
+/// managed element throws, the array is as before, without the new elements; if the storage itself can't grow in
+/// insertMemory() and what stands on it, the capacity is already changed and the array is good for destruction only.
+/// One thread at a time.
+template <typename T>
+class KpDArray {
+    static_assert(alignof(T) <= alignof(std::max_align_t), "the heap gives no larger alignment");
+
+public:
+    using value_type = T;
+    using iterator = T*;
+    using const_iterator = const T*;
+
+    KpDArray() noexcept = default;
+    KpDArray(const KpDArray& other) : KpDArray() { insert(0, other.size_, other.data_); }
+    KpDArray(KpDArray&& other) noexcept { swap(other); }
+    KpDArray(std::initializer_list<T> items) : KpDArray() { insert(0, static_cast<long>(items.size()), items.begin()); }
+    ~KpDArray()
+    {
+        clear();
+        kpfree(data_);
+    }
+
+    KpDArray& operator=(const KpDArray& other);
+    KpDArray& operator=(KpDArray&& other) noexcept
+    {
+        KpDArray(std::move(other)).swap(*this);
+        return *this;
+    }
+
+    /// Sets the capacity to the larger of `newMax` and `newSize`, and the size to `newSize`; -1 stands for the size as
+    /// it is. The only operation that gives storage back. Returns the old capacity less the new one.
+    long remax(long newMax = -1, long newSize = -1);
+
+    /// Sets the size (negative counts as 0) and returns it. Storage is never given back.
+    long resize(long newSize);
+
+    /// Opens a gap of `count` raw elements at `pos`, which the caller has to fill (to construct, if managed).
+    void insertMemory(long pos, long count);
+
+    /// Copies `count` elements to `pos`. `src` may point into this array, if the range doesn't run across `pos`.
+    void insert(long pos, long count, const T* src);
+
+    /// Adds a copy at the end, in constant time on average; `item` may be an element of this array.
+    void append(const T& item)
+    {
+        if (size_ >= capacity_) [[unlikely]] {
+            insert(size_, 1, &item);
+            return;
+        }
+        ::new (static_cast<void*>(data_ + size_)) T(item);
+        ++size_;
+    }
+
+    /// Inserts a copy behind all elements that `compare` tells to be less or equal, by binary search in ]lo, hi[; -1
+    /// and -1 search the whole array. Returns its index. O(log n) comparisons, and the move of what follows.
+    long insertSorted(const T& item, int (*compare)(const T&, const T&), long lo = -1, long hi = -1);
+
+    /// Takes the element at `pos` out; what follows moves down.
+    void remove(long pos);
+
+    /// Size 0; the storage stays.
+    void clear() noexcept { destroyFrom(0); }
+
+    void swap(KpDArray& other) noexcept
+    {
+        std::swap(size_, other.size_);
+        std::swap(capacity_, other.capacity_);
+        std::swap(data_, other.data_);
+    }
+
+    long size() const noexcept { return size_; }
+    long capacity() const noexcept { return capacity_; }
+    T* data() noexcept { return data_; }
+    const T* data() const noexcept { return data_; }
+    T& operator[](long i) noexcept { return data_[i]; }
+    const T& operator[](long i) const noexcept { return data_[i]; }
+    T* begin() noexcept { return data_; }
+    T* end() noexcept { return data_ + size_; }
+    const T* begin() const noexcept { return data_; }
+    const T* end() const noexcept { return data_ + size_; }
+
+private:
+    using Traits = KpElementTraits<T>;
+    static constexpr bool isManaged = Traits::kind == KpElementKind::Managed;
+
+    static unsigned long bytes(long count)
+    {
+        unsigned long size = 0;  // an impossible count asks for all there is, and so fails
+        return __builtin_mul_overflow(static_cast<unsigned long>(count), sizeof(T), &size) ? ULONG_MAX : size;
+    }
+    static long sum(long a, long b)
+    {
+        long result = 0;
+        return __builtin_add_overflow(a, b, &result) ? LONG_MAX : result;
+    }
+    static long larger(long a, long b) { return a > b ? a : b; }
+    long grown() const { return static_cast<long>(static_cast<double>(size_) * 1.5); }
+
+    static void moveBytes(T* to, const T* from, long count)
+    {
+        if (count > 0)
+            std::memmove(static_cast<void*>(to), static_cast<const void*>(from), bytes(count));
+    }
+    void relocate(long count);
+    void moveElements(long to, long from, long count);
+    void constructTo(long newSize);
+    void destroyFrom(long newSize) noexcept;
+    void copyIntoGap(long pos, long count, const T* src);
+
+    long size_ = 0;
+    long capacity_ = 0;
+    T* data_ = nullptr;
+};
+
+template <typename T>
+KpDArray<T>& KpDArray<T>::operator=(const KpDArray& other)
+{
+    if (this == &other)
+        return *this;
+    resize(other.size_);
+    for (long i = 0; i < size_; ++i)
+        data_[i] = other.data_[i];
+    return *this;
+}
+
+template <typename T>
+long KpDArray<T>::remax(long newMax, long newSize)
+{
+    const long oldCapacity = capacity_;
+    const long size = newSize < 0 ? size_ : newSize;
+    const long target = larger(newMax < 0 ? size_ : newMax, size);
+    destroyFrom(size);
+    if (target != capacity_) {
+        if (target == 0) {
+            kpfree(data_);
+            data_ = nullptr;
+        } else {
+            relocate(target);
+        }
+        capacity_ = target;
+    }
+    constructTo(size);
+    return oldCapacity - capacity_;
+}
+
+template <typename T>
+long KpDArray<T>::resize(long newSize)
+{
+    newSize = larger(newSize, 0);
+    destroyFrom(newSize);
+    if (newSize > capacity_)
+        remax(larger(grown(), newSize), newSize);
+    constructTo(newSize);
+    return size_;
+}
+
+template <typename T>
+void KpDArray<T>::insertMemory(long pos, long count)
+{
+    const long needed = sum(size_, count);
+    if (needed > capacity_) {
+        capacity_ = larger(grown(), needed);
+        relocate(capacity_);
+    }
+    if (pos < size_)
+        moveElements(pos + count, pos, size_ - pos);
+    size_ = needed;
+}
+
+template <typename T>
+void KpDArray<T>::insert(long pos, long count, const T* src)
+{
+    if (count < 1)
+        return;
+    const bool isOwn = src >= data_ && src < data_ + size_;
+    const long index = isOwn ? src - data_ : 0;
+    insertMemory(pos, count);
+    copyIntoGap(pos, count, !isOwn ? src : data_ + (index < pos ? index : index + count));
+}
+
+template <typename T>
+long KpDArray<T>::insertSorted(const T& item, int (*compare)(const T&, const T&), long lo, long hi)
+{
+    for (;;) {
+        if (hi == -1)
+            hi = size_;
+        if (hi - lo < 2)
+            break;
+        const long mid = (lo + hi) / 2;
+        (compare(item, data_[mid]) < 0 ? hi : lo) = mid;
+    }
+    insert(lo + 1, 1, &item);
+    return lo + 1;
+}
+
+template <typename T>
+void KpDArray<T>::remove(long pos)
+{
+    if constexpr (isManaged)
+        data_[pos].~T();
+    moveElements(pos, pos + 1, size_ - pos - 1);
+    --size_;
+}
+
+/// Moves all live elements into storage for `count`.
+template <typename T>
+void KpDArray<T>::relocate(long count)
+{
+    if constexpr (Traits::movesAsBytes) {
+        data_ = static_cast<T*>(kprealloc(data_, bytes(count)));
+    } else {
+        T* const old = data_;
+        data_ = static_cast<T*>(kpmalloc(bytes(count)));
+        for (long i = 0; i < size_; ++i) {
+            ::new (static_cast<void*>(data_ + i)) T(std::move(old[i]));
+            old[i].~T();
+        }
+        kpfree(old);
+    }
+}
+
+/// Moves `count` live elements from one index to another that holds none; the ranges may overlap.
+template <typename T>
+void KpDArray<T>::moveElements(long to, long from, long count)
+{
+    if constexpr (Traits::movesAsBytes) {
+        moveBytes(data_ + to, data_ + from, count);
+    } else {
+        for (long k = 0; k < count; ++k) {
+            const long i = to < from ? k : count - 1 - k;
+            ::new (static_cast<void*>(data_ + to + i)) T(std::move(data_[from + i]));
+            data_[from + i].~T();
+        }
+    }
+}
+
+template <typename T>
+void KpDArray<T>::constructTo(long newSize)
+{
+    if constexpr (isManaged) {
+        for (; size_ < newSize; ++size_)  // the size follows each element, so that one that throws leaves no raw ones
+            ::new (static_cast<void*>(data_ + size_)) T();
+    } else {
+        size_ = newSize;
+    }
+}
+
+template <typename T>
+void KpDArray<T>::destroyFrom(long newSize) noexcept
+{
+    if (size_ <= newSize)
+        return;
+    const long oldSize = size_;
+    size_ = newSize;
+    if constexpr (isManaged) {
+        for (long i = newSize; i < oldSize; ++i)
+            data_[i].~T();
+    }
+}
+
+template <typename T>
+void KpDArray<T>::copyIntoGap(long pos, long count, const T* src)
+{
+    if constexpr (Traits::kind == KpElementKind::Bytes) {
+        moveBytes(data_ + pos, src, count);
+    } else {
+        long i = count;
+        try {
+            while (i > 0) {
+                ::new (static_cast<void*>(data_ + pos + i - 1)) T(src[i - 1]);
+                --i;
+            }
+        } catch (...) {
+            for (; i < count; ++i)
+                data_[pos + i].~T();
+            moveElements(pos, pos + count, size_ - pos - count);
+            size_ -= count;
+            throw;
+        }
+    }
+}
+
+/// -1, 1 or 0 by operator<, for insertSorted; the order of KpString is that of strcmp.
+template <typename T>
+int kpStandardCompare(const T& a, const T& b)
+{
+    return a < b ? -1 : b < a ? 1 : 0;
+}

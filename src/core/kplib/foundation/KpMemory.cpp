@@ -1,0 +1,67 @@
+#include <kplib/foundation/KpMemory.h>
+
+#include <kplib/foundation/KpMemoryException.h>
+#include <kplib/foundation/KpString.h>
+
+#include <cstdint>
+#include <cstdlib>
+
+namespace {
+
+// The text is made and dropped: whoever catches reads the wording of KpMemoryException, and that is meant. It is short
+// enough for one block, so that a failure here ends in kpmalloc and cannot come back to kprealloc.
+void dropReallocationText(unsigned long size)
+{
+    try {
+        KpString text{KpString::NoMemory()};
+        text.printf("could not reallocate %Id bytes", size);
+    } catch (const KpMemoryException&) {
+        return;  // there isn't even memory for the text
+    }
+}
+
+}  // namespace
+
+void* kpmalloc(unsigned long size)
+{
+    void* const block = std::malloc(size);
+    if (!block)
+        throw KpMemoryException(size);
+    return block;
+}
+
+void* kprealloc(void* ptr, unsigned long size)
+{
+    if (!ptr)
+        return kpmalloc(size);
+    if (size == 0) {
+        std::free(ptr);
+        return nullptr;
+    }
+    void* const block = std::realloc(ptr, size);
+    if (!block) {
+        dropReallocationText(size);
+        throw KpMemoryException(size);
+    }
+    return block;
+}
+
+void kpfree(void* ptr)
+{
+    std::free(ptr);
+}
+
+void* KpAlignedMalloc(unsigned long size, unsigned long /*alignment*/)
+{
+    return std::malloc(size);
+}
+
+void KpAlignedFree(void* ptr)
+{
+    std::free(ptr);
+}
+
+bool KpIsAligned(const void* ptr, unsigned long alignment)
+{
+    return (reinterpret_cast<std::uintptr_t>(ptr) & (alignment - 1)) == 0;
+}

@@ -1,0 +1,24 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+// The library's allocation functions, over the C heap. All are safe from any thread.
+
+/// `size` bytes, never null. Throws KpMemoryException(size) when there are none.
+KPLIB_API void* kpmalloc(unsigned long size);
+
+/// Resizes a block of kpmalloc; a null `ptr` allocates. Size 0 with `ptr` set frees it and gives null. Throws
+/// KpMemoryException(size) when there is no memory; `ptr` then stays as it was.
+KPLIB_API void* kprealloc(void* ptr, unsigned long size);
+
+/// Gives a block back; null is ignored.
+KPLIB_API void kpfree(void* ptr);
+
+/// `size` bytes with the heap's own alignment (16 here) or null; `alignment` is ignored, and that is meant.
+KPLIB_API void* KpAlignedMalloc(unsigned long size, unsigned long alignment);
+
+/// Gives a block of KpAlignedMalloc back.
+KPLIB_API void KpAlignedFree(void* ptr);
+
+/// Whether `ptr` is a multiple of `alignment`, a power of two.
+KPLIB_API bool KpIsAligned(const void* ptr, unsigned long alignment);

@@ -1,0 +1,23 @@
+#pragma once
+
+#include <kplib/foundation/KpException.h>
+
+/// Exhausted memory. It can be made, thrown and asked when there is no memory left at all.
+class KPLIB_API KpMemoryException : public KpException {
+public:
+    /// `size`: the bytes that were asked for, 0 when unknown.
+    explicit KpMemoryException(unsigned long size = 0);
+    KpMemoryException(const KpMemoryException&) = default;
+    KpMemoryException& operator=(const KpMemoryException&) = default;
+    ~KpMemoryException() override;
+
+    using KpException::what;
+    /// "could not allocate N bytes", or "could not allocate enough memory" when the size is unknown or there is no
+    /// memory for the text. Writes into this object: one thread at a time.
+    const char* what() override;
+
+    unsigned long size() const { return size_; }
+
+private:
+    unsigned long size_;
+};

@@ -1,0 +1,47 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+#include <cstdint>
+
+/// Type of the elements of typed memory. The numbers stand on the wire and in files and never change.
+class KPLIB_API KpPrimType {
+public:
+    enum Type : std::int32_t {
+        Byte = 0,     ///< unsigned 8 bit
+        Short = 1,    ///< signed 16 bit
+        Int = 2,      ///< signed 32 bit
+        Float = 3,    ///< IEEE 754 single
+        Double = 4,   ///< IEEE 754 double
+        Complex = 5,  ///< two singles, real and imaginary
+        String = 6,   ///< a reference to text
+        UShort = 7,   ///< unsigned 16 bit; behind String, and that is meant
+        UInt = 8,     ///< unsigned 32 bit: named, sized and sent only, no typed operation serves it
+        SByte = 9,    ///< signed 8 bit: likewise
+    };
+    static constexpr int NumTypes = 10;
+
+    /// Names ("byte", "short" ...) and sizes in bytes, indexed by the value; valid for 0 to 9 only.
+    static const char* const primTypeName[NumTypes];
+    static const std::int32_t primTypeSize[NumTypes];
+
+    constexpr KpPrimType(Type type = Byte) : type_(type) {}
+
+    /// From a number, as read from a message; any number is held as it is.
+    constexpr explicit KpPrimType(std::int32_t number) : type_(static_cast<Type>(number)) {}
+
+    /// The type of that exact name into `type`; false for an unknown name, and `type` stays.
+    static bool nameToType(const char* name, Type& type);
+
+    constexpr operator Type() const { return type_; }
+
+    /// Whether this is one of the ten types.
+    constexpr bool isValid() const { return static_cast<std::uint32_t>(type_) < NumTypes; }
+
+    /// Name and size that may be asked of any value: "unknown" and 0 outside the ten types.
+    const char* name() const { return isValid() ? primTypeName[type_] : "unknown"; }
+    int size() const { return isValid() ? primTypeSize[type_] : 0; }
+
+private:
+    Type type_;
+};

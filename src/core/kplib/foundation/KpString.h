@@ -1,0 +1,114 @@
+#pragma once
+
+#include <kplib/foundation/KpDArray.h>
+#include <kplib/foundation/KpExport.h>
+
+#include <cstdarg>
+#include <iosfwd>
+#include <string_view>
+
+/// The library's string: an array of char whose last element is the NUL, so size() is length() + 1.
+///
+/// Text is bytes, of whatever encoding. Only raw array operations and a move away from it leave a string without its
+/// NUL (an array of size 0); it then reads as "". No positions are checked. One thread at a time.
+class KPLIB_API KpString : public KpDArray<char> {
+public:
+    /// Selects the constructor that takes no memory.
+    struct NoMemory {};
+
+    /// Empty, with room for 16 characters.
+    KpString();
+    /// A copy of the text; null gives an empty string.
+    KpString(const char* s);
+    /// The `count` bytes from `s + start`, without a look at the length of `s`.
+    KpString(const char* s, int start, int count);
+    /// Formatted as by printf(); the leading int only selects this constructor.
+    KpString(int ignored, const char* format, ...);
+    explicit KpString(std::string_view text);
+    /// An array of size 0: for what must not allocate.
+    explicit KpString(NoMemory) noexcept {}
+
+    KpString(const KpString&) = default;
+    KpString(KpString&&) noexcept = default;
+    KpString& operator=(const KpString&) = default;
+    KpString& operator=(KpString&&) noexcept = default;
+    /// A copy of the text, which may lie in this string; null makes the string empty.
+    KpString& operator=(const char* s);
+
+    /// Number of characters.
+    int length() const noexcept { return size() > 0 ? static_cast<int>(size() - 1) : 0; }
+    bool isEmpty() const noexcept { return size() < 2; }
+    const char* c_str() const noexcept { return size() > 0 ? data() : ""; }
+    operator const char*() const noexcept { return c_str(); }
+    operator std::string_view() const noexcept { return {c_str(), size() > 0 ? static_cast<size_t>(size() - 1) : 0}; }
+
+    /// Appends; null is ignored. `s` may lie in this string.
+    KpString& operator+=(const char* s);
+    KpString& operator+=(char c)
+    {
+        append(c);
+        return *this;
+    }
+    /// Appends one character, in constant time on average.
+    void append(char c)
+    {
+        if (size() == 0 || size() >= capacity()) [[unlikely]]
+            growForOne();
+        data()[size() - 1] = c;
+        KpDArray<char>::append('\0');
+    }
+
+    /// Equality of length and of the text up to the first NUL.
+    bool operator==(const KpString& other) const;
+    /// As !=, turned round.
+    bool operator==(const char* s) const { return !(*this != s); }
+    /// True when the texts differ. A null `s` differs only from a string without a NUL, not from any proper one, empty
+    /// or not: odd, and meant.
+    bool operator!=(const char* s) const;
+    bool operator!=(char* s) const { return *this != static_cast<const char*>(s); }
+    bool operator!=(std::nullptr_t) const { return *this != static_cast<const char*>(nullptr); }
+
+    /// Replaces the content by the formatted text and returns it. The string itself must not be among the arguments.
+    char* printf(const char* format, ...);
+    char* vprintf(const char* format, va_list args);
+
+    void setInt64(long long v);
+    static KpString fromInt64(long long v);
+    /// The decimal number at the start of the text; without one, 0.
+    static long long toInt64(const char* s);
+    long long toInt64() const;
+    /// The number at the start of the text, by sscanf with "%f" or "%d"; 0 and `ok` false without one.
+    float toFloat(bool& ok) const;
+    int toInt(bool& ok) const;
+
+    /// Whether all characters are ASCII letters or digits; true for an empty string.
+    bool isAlnum() const;
+    bool isAlpha() const;
+    bool isDigit() const;
+
+    /// The characters `from` to `to`, both inclusive; `to` = `from` - 1 gives an empty string.
+    KpString substr(unsigned from, unsigned to) const;
+
+    /// Replaces each occurrence of `from`, left to right; what was put in is not searched again. An empty or null
+    /// `from` changes nothing.
+    void replaceSubStr(const char* from, const char* to);
+
+    /// Splits at each separator, empty pieces included: always one piece more than there are separators.
+    void explode(char separator, KpDArray<KpString>& out) const;
+
+    /// The text as a token: a backslash before each " and \, and quotes around all when it is empty, holds white space,
+    /// or `force` asks for them.
+    KpString protect(bool force = false) const;
+
+private:
+    void growForOne();
+    void append(const char* s, long count);
+};
+
+/// `a` followed by `b`; a null `b` adds nothing.
+KPLIB_API KpString operator+(const KpString& a, const char* b);
+
+/// The order of strcmp.
+KPLIB_API bool operator<(const KpString& a, const KpString& b);
+
+KPLIB_API std::ostream& operator<<(std::ostream& out, const KpString& text);
