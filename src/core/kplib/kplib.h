@@ -28,8 +28,11 @@
 #include <kplib/foundation/StringUtils.h>
 #include <kplib/log/KpLastError.h>
 #include <kplib/log/KpLogFile.h>
+#include <kplib/log/KpLogFileDefaultModuleModifier.h>
+#include <kplib/log/KpLogFileWriteCallbackDisabler.h>
 #include <kplib/log/KpLogLevel.h>
 #include <kplib/log/KpResult.h>
+#include <kplib/system/KpWatch.h>
 #include <kplib/threads/KpProgressGuiInterface.h>
 #include <kplib/threads/KpProgressInterface.h>
 #include <kplib/threads/ProgressScope.h>
