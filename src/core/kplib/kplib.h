@@ -32,6 +32,9 @@
 #include <kplib/log/KpLogFileWriteCallbackDisabler.h>
 #include <kplib/log/KpLogLevel.h>
 #include <kplib/log/KpResult.h>
+#include <kplib/rawdata/KpRawData.h>
+#include <kplib/rawdata/KpTypedElement.h>
+#include <kplib/rawdata/KpTypedPointer.h>
 #include <kplib/system/KpWatch.h>
 #include <kplib/threads/KpProgressGuiInterface.h>
 #include <kplib/threads/KpProgressInterface.h>

@@ -165,9 +165,8 @@ template <typename Path>
 ConvertLoop* convertLoop(KpPrimType to, KpPrimType from)
 {
     ConvertLoop* loop = nullptr;
-    visitPair(to, from, [&]<typename To, typename From>(ElementTag<To>, ElementTag<From>) {
-        loop = convert<Path, To, From>;
-    });
+    visitPair(to, from,
+              [&]<typename To, typename From>(ElementTag<To>, ElementTag<From>) { loop = convert<Path, To, From>; });
     return loop;
 }
 
@@ -175,9 +174,8 @@ template <typename Path>
 MapLoop* mapLoop(KpPrimType to, KpPrimType from)
 {
     MapLoop* loop = nullptr;
-    visitPair(to, from, [&]<typename To, typename From>(ElementTag<To>, ElementTag<From>) {
-        loop = mapLinear<Path, To, From>;
-    });
+    visitPair(to, from,
+              [&]<typename To, typename From>(ElementTag<To>, ElementTag<From>) { loop = mapLinear<Path, To, From>; });
     return loop;
 }
 

@@ -47,13 +47,14 @@ private:
     {
         const Real reciprocal = std::nextafter(Real(1) / static_cast<Real>(count), Real(2));
         for (long i = 0; i < n; ++i)
-            dst[i].value = static_cast<T>(static_cast<std::int32_t>(static_cast<Real>(signedSum(sums[i])) * reciprocal));
+            dst[i].value =
+                static_cast<T>(static_cast<std::int32_t>(static_cast<Real>(signedSum(sums[i])) * reciprocal));
     }
 };
 
 /// Sums of real numbers are kept in their own precision and depend on their order.
 template <typename T>
-    requires std::is_floating_point_v<T>
+requires std::is_floating_point_v<T>
 struct Mean<T, T> {
     using Element = T;
     using State = T;
@@ -178,8 +179,8 @@ struct Finish {
 template <typename Path, typename Rule, typename Item>
 void joinColumns(typename Rule::State* states, const Item* items, long blocks, const BlockRow& row, bool isFirst)
 {
-    auto* join = Path::template run<JoinColumns<Rule, Item, 0, 0>, typename Rule::State*, const void*, long, long, long,
-                                    bool>;
+    auto* join =
+        Path::template run<JoinColumns<Rule, Item, 0, 0>, typename Rule::State*, const void*, long, long, long, bool>;
     if (row.components == 3 && row.fx == 2)
         join = Path::template run<JoinColumns<Rule, Item, 2, 3>>;
     if (row.components == 1 && row.fx == 2)
@@ -255,8 +256,8 @@ struct Plain {
 template <typename Path>
 struct ByLines {
     template <typename Rule>
-    static constexpr BlockLoop* loop = std::is_same_v<Rule, MeanOf<std::uint8_t>> ? meanOfBytes<Path>
-                                                                                 : rowByLines<Path, Rule>;
+    static constexpr BlockLoop* loop =
+        std::is_same_v<Rule, MeanOf<std::uint8_t>> ? meanOfBytes<Path> : rowByLines<Path, Rule>;
 };
 
 template <typename Rows>
@@ -275,8 +276,7 @@ std::span<const KernelPath<BlockLoops>> blockPaths()
 {
     static const KernelPath<BlockLoops> paths[] = {{"plain", true, blockLoop<Plain>},
                                                    {"lines", true, blockLoop<ByLines<ForAny>>},
-                                                   {"lines/avx2", hasAvx2(), blockLoop<ByLines<ForAvx2>>},
-                                                   {"lines/avx512", hasAvx512(), blockLoop<ByLines<ForAvx512>>}};
+                                                   {"lines/avx2", hasAvx2(), blockLoop<ByLines<ForAvx2>>}};
     return paths;
 }
 

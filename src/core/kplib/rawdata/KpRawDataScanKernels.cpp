@@ -50,8 +50,8 @@ struct Lanes {
     typedef T Vector __attribute__((vector_size(Bytes)));
     static constexpr int count = Bytes / sizeof(T);
     static constexpr int unroll = 4;
-    static constexpr long step = unroll * count;       // elements a round
-    static constexpr long block = 64 * step;           // elements between two looks at the outcome
+    static constexpr long step = unroll * count;  // elements a round
+    static constexpr long block = 64 * step;      // elements between two looks at the outcome
 
     KPLIB_KERNEL_BODY static void load(Vector& to, const void* from) { std::memcpy(&to, from, Bytes); }
 };
@@ -179,9 +179,10 @@ std::span<const KernelPath<RangeLoops>> rangePaths()
 
 std::span<const KernelPath<DiffersLoops>> differsPaths()
 {
-    static const KernelPath<DiffersLoops> paths[] = {{"plain", true, Each<ForAny, DiffersPlain>::of<DiffersLoop>},
-                                                     {"avx2", hasAvx2(), Each<ForAvx2, Differs32>::of<DiffersLoop>},
-                                                     {"avx512", hasAvx512(), Each<ForAvx512, Differs64>::of<DiffersLoop>}};
+    static const KernelPath<DiffersLoops> paths[] = {
+        {"plain", true, Each<ForAny, DiffersPlain>::of<DiffersLoop>},
+        {"avx2", hasAvx2(), Each<ForAvx2, Differs32>::of<DiffersLoop>},
+        {"avx512", hasAvx512(), Each<ForAvx512, Differs64>::of<DiffersLoop>}};
     return paths;
 }
 

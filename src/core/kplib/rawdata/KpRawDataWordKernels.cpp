@@ -44,10 +44,14 @@ template <typename Path>
 SwapLoop* swapLoop(int width)
 {
     switch (width) {
-    case 2: return Path::template run<SwapEach<std::uint16_t>>;
-    case 4: return Path::template run<SwapEach<std::uint32_t>>;
-    case 8: return Path::template run<SwapEach<std::uint64_t>>;
-    default: return nullptr;
+    case 2:
+        return Path::template run<SwapEach<std::uint16_t>>;
+    case 4:
+        return Path::template run<SwapEach<std::uint32_t>>;
+    case 8:
+        return Path::template run<SwapEach<std::uint64_t>>;
+    default:
+        return nullptr;
     }
 }
 
@@ -55,11 +59,16 @@ template <typename Path>
 ReverseLoop* reverseLoop(int width)
 {
     switch (width) {
-    case 1: return Path::template run<CopyReversed<std::uint8_t>>;
-    case 2: return Path::template run<CopyReversed<std::uint16_t>>;
-    case 4: return Path::template run<CopyReversed<std::uint32_t>>;
-    case 8: return Path::template run<CopyReversed<std::uint64_t>>;
-    default: return nullptr;
+    case 1:
+        return Path::template run<CopyReversed<std::uint8_t>>;
+    case 2:
+        return Path::template run<CopyReversed<std::uint16_t>>;
+    case 4:
+        return Path::template run<CopyReversed<std::uint32_t>>;
+    case 8:
+        return Path::template run<CopyReversed<std::uint64_t>>;
+    default:
+        return nullptr;
     }
 }
 

@@ -16,9 +16,9 @@ KPLIB_KERNEL_BODY T clamped(T value, T low, T high)
     return value > high ? high : value;
 }
 
-/// The fraction cut off, for values not below the smallest int; NaN and what lies above the largest become the smallest,
-/// as the processor answers them. The choice is made before the cast: a cast out of range is undefined, and compilers
-/// make use of that.
+/// The fraction cut off, for values not below the smallest int; NaN and what lies above the largest become the
+/// smallest, as the processor answers them. The choice is made before the cast: a cast out of range is undefined, and
+/// compilers make use of that.
 template <typename Real>
 KPLIB_KERNEL_BODY std::int32_t truncatedToInt(Real value)
 {
@@ -60,8 +60,8 @@ KPLIB_KERNEL_BODY To converted(From value)
 
 /// The precision in which a linear map from one type to another is computed.
 template <typename To, typename From>
-using MapReal = std::conditional_t<std::is_same_v<To, double> ||
-                                       (std::is_same_v<From, double> && sizeof(To) == sizeof(float)),
-                                   double, float>;
+using MapReal =
+    std::conditional_t<std::is_same_v<To, double> || (std::is_same_v<From, double> && sizeof(To) == sizeof(float)),
+                       double, float>;
 
 }  // namespace kplib::detail

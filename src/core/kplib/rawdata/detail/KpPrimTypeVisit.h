@@ -45,7 +45,8 @@ bool visitNumberType(KpPrimType type, Work&& work)
 template <typename Work>
 bool visitNumbers(KpTypedPointer memory, Work&& work)
 {
-    return visitNumberType(memory.type, [&](auto tag) { work(static_cast<typename decltype(tag)::Type*>(memory.data)); });
+    return visitNumberType(memory.type,
+                           [&](auto tag) { work(static_cast<typename decltype(tag)::Type*>(memory.data)); });
 }
 
 /// Whether the library computes with elements of this type.
