@@ -49,7 +49,7 @@ void addReversals(int width)
         for (int axis = 0; axis < 3; ++axis)
             add("flip/" + std::to_string(voxel) + " bytes/" + "xyz"[axis], flip, voxel, axis);
     }
-    for (int width : {1, 2, 4, 8})
+    for (int width : {1, 2, 3, 4, 8})
         addReversals(width);
     return true;
 }();

@@ -60,10 +60,9 @@ void addConversion(const std::string& pair)
         if (!path.usable)
             continue;
         add("memcpy/" + pair + "/64Ki/" + path.name, [=](benchmark::State& state) {
-            convertWith<To, From>(state, fewVoxels, plain, path.run == best(convertPaths()) ? 1.0 / 3 : 0,
-                                  [&](auto dst, auto src) {
-                                      path.run(dst.type, src.type)(dst.data, src.data, fewVoxels);
-                                  });
+            convertWith<To, From>(
+                state, fewVoxels, plain, path.run == best(convertPaths()) ? 1.0 / 3 : 0,
+                [&](auto dst, auto src) { path.run(dst.type, src.type)(dst.data, src.data, fewVoxels); });
         });
     }
 }
@@ -92,9 +91,8 @@ void addMap(const std::string& pair)
            [](auto dst, auto src) { KpRawData::mapLinear(dst, src, manyVoxels, 20, 0.75); });
     for (const auto& path : mapPaths()) {
         if (path.usable)
-            addRun("mapLinear/" + pair + "/64Ki/" + path.name, fewVoxels, 0, [=](auto dst, auto src) {
-                path.run(dst.type, src.type)(dst.data, src.data, fewVoxels, 20, 0.75);
-            });
+            addRun("mapLinear/" + pair + "/64Ki/" + path.name, fewVoxels, 0,
+                   [=](auto dst, auto src) { path.run(dst.type, src.type)(dst.data, src.data, fewVoxels, 20, 0.75); });
     }
 }
 

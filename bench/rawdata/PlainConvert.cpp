@@ -14,8 +14,8 @@ void plainConvert(To* dst, const From* src, long n)
         if constexpr (std::is_floating_point_v<To>)
             dst[i] = src[i];
         else
-            dst[i] = static_cast<To>(
-                std::clamp<From>(src[i], std::numeric_limits<To>::min(), static_cast<From>(std::numeric_limits<To>::max())));
+            dst[i] = static_cast<To>(std::clamp<From>(src[i], std::numeric_limits<To>::min(),
+                                                      static_cast<From>(std::numeric_limits<To>::max())));
     }
 }
 

@@ -5,8 +5,8 @@
 
 #include <algorithm>
 
-// What reads a buffer once, or changes it in place or by filling: against a sum of its bytes, a copy of as many bytes, and
-// the system's fill.
+// What reads a buffer once, or changes it in place or by filling: against a sum of its bytes, a copy of as many bytes,
+// and the system's fill.
 
 using namespace kplib::bench;
 using namespace kplib::detail;

@@ -39,8 +39,9 @@ Bytes cropped(const Bytes& block, const Sizes& dims, const Sizes& min, const Siz
             for (int x = min[0]; x <= max[0]; ++x) {
                 const Sizes at = {std::clamp(x, 0, dims[0] - 1), std::clamp(y, 0, dims[1] - 1),
                                   std::clamp(z, 0, dims[2] - 1)};
-                const auto* from = at == Sizes{x, y, z} || !fill ? block.data() + offset(dims, at[0], at[1], at[2], voxel)
-                                                                 : static_cast<const std::uint8_t*>(fill);
+                const auto* from = at == Sizes{x, y, z} || !fill
+                                       ? block.data() + offset(dims, at[0], at[1], at[2], voxel)
+                                       : static_cast<const std::uint8_t*>(fill);
                 result.insert(result.end(), from, from + voxel);
             }
     return result;
@@ -48,7 +49,10 @@ Bytes cropped(const Bytes& block, const Sizes& dims, const Sizes& min, const Siz
 
 /// A block of malloc, as crop() takes it.
 struct Block {
-    explicit Block(const Bytes& bytes) : data(std::malloc(bytes.size())) { std::memcpy(data, bytes.data(), bytes.size()); }
+    explicit Block(const Bytes& bytes) : data(std::malloc(bytes.size()))
+    {
+        std::memcpy(data, bytes.data(), bytes.size());
+    }
     ~Block() { std::free(data); }
     Bytes bytes(long n) const
     {
@@ -85,7 +89,7 @@ TEST(Flip, mirrorsVoxelsOfAnySize)
 
 TEST(Flip, everyPathReverses)
 {
-    for (int width : {1, 2, 4, 8})
+    for (int width : {1, 2, 3, 4, 8})
         for (long n : {0, 1, 63, 64, 65, 1001}) {
             const Bytes bytes = someValues<std::uint8_t>(n * width, 10);
             Bytes expected(bytes.size());
@@ -149,12 +153,12 @@ TEST(Crop, refusalsLeaveAllAsItWas)
         Sizes dims, min, max;
         bool done, failing;
     } cases[] = {
-        {{3, 2, 1}, {1, 0, 0}, {0, 1, 0}, false, false},             // empty
-        {{3, 2, 1}, {2, 0, 0}, {0, 1, 0}, false, false},             // less than that
-        {{3, 0, 1}, {0, 0, 0}, {2, 1, 0}, false, false},             // nothing to take from
-        {{3, 2, 1}, {INT_MIN, 0, 0}, {INT_MAX, 1, 0}, false, false}, // more than an int holds
-        {{3, 2, 1}, {0, 0, 0}, {3, 1, 0}, false, true},              // no memory
-        {{3, 2, 1}, {0, 0, 0}, {2, 1, 0}, true, true},               // the block itself
+        {{3, 2, 1}, {1, 0, 0}, {0, 1, 0}, false, false},              // empty
+        {{3, 2, 1}, {2, 0, 0}, {0, 1, 0}, false, false},              // less than that
+        {{3, 0, 1}, {0, 0, 0}, {2, 1, 0}, false, false},              // nothing to take from
+        {{3, 2, 1}, {INT_MIN, 0, 0}, {INT_MAX, 1, 0}, false, false},  // more than an int holds
+        {{3, 2, 1}, {0, 0, 0}, {3, 1, 0}, false, true},               // no memory
+        {{3, 2, 1}, {0, 0, 0}, {2, 1, 0}, true, true},                // the block itself
     };
     for (const auto& c : cases) {
         Block block(before);

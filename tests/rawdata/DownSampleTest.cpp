@@ -21,11 +21,11 @@ struct Case {
     long elements() const { return dx * dy * dz * n; }
 };
 
-const Case cases[] = {{5, 5, 5, 2, 2, 2, 1},    {131, 7, 5, 2, 2, 2, 1},  {133, 9, 5, 4, 4, 2, 1},
-                      {70, 6, 4, 3, 1, 2, 1},   {37, 6, 4, 1, 2, 3, 2},   {41, 4, 4, 2, 2, 2, 3},
-                      {29, 7, 3, 5, 3, 1, 4},   {64, 2, 2, 1, 1, 1, 1},   {4300, 2, 2, 2, 1, 2, 1},
+const Case cases[] = {{5, 5, 5, 2, 2, 2, 1},       {131, 7, 5, 2, 2, 2, 1},  {133, 9, 5, 4, 4, 2, 1},
+                      {70, 6, 4, 3, 1, 2, 1},      {37, 6, 4, 1, 2, 3, 2},   {41, 4, 4, 2, 2, 2, 3},
+                      {29, 7, 3, 5, 3, 1, 4},      {64, 2, 2, 1, 1, 1, 1},   {4300, 2, 2, 2, 1, 2, 1},
                       {2500, 2, 1, 2100, 2, 1, 1}, {3, 2, 2, 2, 1, 2, 1500}, {40, 35, 33, 17, 16, 16, 1},
-                      {6, 5, 4, 7, 1, 1, 1},    {6, 5, 4, 6, 5, 4, 1},    {6, 5, 4, 1, 6, 1, 2}};
+                      {6, 5, 4, 7, 1, 1, 1},       {6, 5, 4, 6, 5, 4, 1},    {6, 5, 4, 1, 6, 1, 2}};
 
 /// The definition, voxel by voxel.
 template <typename T>
@@ -61,8 +61,8 @@ void runPath(BlockLoop* loop, const Case& c, void* dst, const void* src, int siz
     auto* to = static_cast<char*>(dst);
     for (long z = 0; z + c.fz <= c.dz; z += c.fz)
         for (long y = 0; y + c.fy <= c.dy; y += c.fy, to += blocks * c.n * size)
-            loop({static_cast<const char*>(src) + (z * sliceStride + y * rowStride) * size, to, blocks, c.fx, c.fy, c.fz,
-                  c.n, rowStride, sliceStride});
+            loop({static_cast<const char*>(src) + (z * sliceStride + y * rowStride) * size, to, blocks, c.fx, c.fy,
+                  c.fz, c.n, rowStride, sliceStride});
 }
 
 template <typename T>
@@ -130,7 +130,8 @@ TEST(DownSample, everyPathEqualsTheDefinition)
                             continue;
                         Elements<T> dst(long(expected.size()), seed % 2);
                         runPath(path.run(src.typed().type, rule), c, dst.data(), src.data(), sizeof(T));
-                        EXPECT_EQ(dst, expected) << path.name << ' ' << src.typed().type.name() << ' ' << c.dx << ' ' << c.fx;
+                        EXPECT_EQ(dst, expected)
+                            << path.name << ' ' << src.typed().type.name() << ' ' << c.dx << ' ' << c.fx;
                     }
                     Elements<T> dst(long(expected.size()));
                     (rule == BlockRule::Mean ? KpRawData::downSample3DN : KpRawData::downSampleMaxFilterComponents3DN)(
@@ -170,8 +171,8 @@ TEST(DownSample, labelsKeepTheCornerAndTheirDirection)
                         expected.push_back(values[(z * c.fz * c.dy + y * c.fy) * c.dx + x * c.fx]);
             Elements<T> src(values, 0), dst(long(expected.size()));
             const bool toFirst = std::is_same_v<T, std::uint16_t>;
-            KpRawData::downSampleLabels3D(toFirst ? dst.data() : src.data(), toFirst ? src.typed() : dst.typed(), c.dx, c.dy,
-                                          c.dz, c.fx, c.fy, c.fz, nullptr);
+            KpRawData::downSampleLabels3D(toFirst ? dst.data() : src.data(), toFirst ? src.typed() : dst.typed(), c.dx,
+                                          c.dy, c.dz, c.fx, c.fy, c.fz, nullptr);
             EXPECT_EQ(dst, expected) << src.typed().type.name() << ' ' << c.dx;
         }
     });

@@ -38,7 +38,8 @@ public:
     long size() const { return n_; }
     bool operator==(const std::vector<T>& values) const
     {
-        return n_ == long(values.size()) && (n_ == 0 || !std::memcmp(bytes_.data() + start_, values.data(), n_ * sizeof(T)));
+        return n_ == long(values.size()) &&
+               (n_ == 0 || !std::memcmp(bytes_.data() + start_, values.data(), n_ * sizeof(T)));
     }
 
 private:
@@ -50,13 +51,43 @@ private:
 template <typename T>
 std::vector<T> someValues(long n, unsigned seed)
 {
-    const double edges[] = {0.0,          -0.0,         0.5,          -0.5,          1.0,           -1.9,
-                            254.9,        255.0,        255.5,        256.0,         300.7,         32767.0,
-                            32767.5,      32768.0,      -32768.0,     -32769.0,      65535.0,       65535.9,
-                            65536.0,      2147483520.0, 2147483646.5, 2147483647.0,  2147483648.0,  3e9,
-                            -2147483645.5, -2147483646.0, -2147483647.0, -2147483648.0, -2147483904.0, -3e9,
-                            1e30,         -1e30,        1e-40,        -1e-40,        16777217.0,
-                            std::numeric_limits<double>::infinity(), -std::numeric_limits<double>::infinity(),
+    const double edges[] = {0.0,
+                            -0.0,
+                            0.5,
+                            -0.5,
+                            1.0,
+                            -1.9,
+                            254.9,
+                            255.0,
+                            255.5,
+                            256.0,
+                            300.7,
+                            32767.0,
+                            32767.5,
+                            32768.0,
+                            -32768.0,
+                            -32769.0,
+                            65535.0,
+                            65535.9,
+                            65536.0,
+                            2147483520.0,
+                            2147483646.5,
+                            2147483647.0,
+                            2147483648.0,
+                            3e9,
+                            -2147483645.5,
+                            -2147483646.0,
+                            -2147483647.0,
+                            -2147483648.0,
+                            -2147483904.0,
+                            -3e9,
+                            1e30,
+                            -1e30,
+                            1e-40,
+                            -1e-40,
+                            16777217.0,
+                            std::numeric_limits<double>::infinity(),
+                            -std::numeric_limits<double>::infinity(),
                             std::numeric_limits<double>::quiet_NaN()};
     std::mt19937 random(seed);
     std::vector<T> values(n);
@@ -66,7 +97,8 @@ std::vector<T> someValues(long n, unsigned seed)
         else if (random() % 3 == 0)
             v = static_cast<T>(edges[random() % std::size(edges)]);
         else
-            v = static_cast<T>(std::ldexp(static_cast<double>(random()) - 2147483648.0, -static_cast<int>(random() % 40)));
+            v = static_cast<T>(
+                std::ldexp(static_cast<double>(random()) - 2147483648.0, -static_cast<int>(random() % 40)));
     }
     return values;
 }

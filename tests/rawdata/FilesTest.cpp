@@ -127,7 +127,8 @@ TEST(Files, failedReadsAreLoggedWithTheSizeOfTheCall)
 
 TEST(Files, interruptedReadIsAFailure)
 {
-    struct sigaction ring {}, before;
+    struct sigaction ring {
+    }, before;
     ring.sa_handler = [](int) {};
     sigaction(SIGALRM, &ring, &before);
     int ends[2];

@@ -125,8 +125,9 @@ TEST(Memset, cutsIntegersAndRoundsReals)
     const struct {
         double value;
         std::int64_t stored;  // before it is cut to the width
-    } cases[] = {{2.5, 3},    {-2.5, -2},         {-2.51, -3},       {300.0, 300},      {70000.4, 70000},
-                 {huge, INT32_MIN}, {-huge, INT32_MIN}, {nan, INT32_MIN}, {2147483647.4, INT32_MAX}};
+    } cases[] = {{2.5, 3},           {-2.5, -2},       {-2.51, -3},
+                 {300.0, 300},       {70000.4, 70000}, {huge, INT32_MIN},
+                 {-huge, INT32_MIN}, {nan, INT32_MIN}, {2147483647.4, INT32_MAX}};
     eachType([&]<typename T>(ElementTag<T>) {
         for (const auto& c : cases) {
             const T expected = std::is_integral_v<T> ? static_cast<T>(c.stored) : static_cast<T>(c.value);
@@ -176,7 +177,8 @@ TEST(SwapBytes, reversesTheBytesOfEachWord)
         for (long i = 0; i < 16; i += widths[type])
             std::reverse(expected.begin() + i, expected.begin() + i + widths[type]);
         Elements<std::uint8_t> words(bytes, 0);
-        KpRawData::swapBytes({words.data(), KpPrimType(type)}, static_cast<unsigned long>(16 / KpPrimType(type).size()));
+        KpRawData::swapBytes({words.data(), KpPrimType(type)},
+                             static_cast<unsigned long>(16 / KpPrimType(type).size()));
         EXPECT_EQ(words, expected) << type;
     }
     const LogCapture log;

@@ -83,6 +83,14 @@ void downSample(BlockRule rule, void* dst, KpTypedPointer src, const Grid& grid,
     eachLayer(grid, progress, makeLayer, [&](long k) { return k * row.fz + 1; });
 }
 
+/// FX is the factor, 0 if known at run time only.
+template <int FX, typename Word>
+void takeEvery(Loose<Word>* __restrict to, const Loose<Word>* __restrict from, long n, long factor)
+{
+    for (long i = 0; i < n; ++i)
+        to[i].value = from[i * (FX ? FX : factor)].value;
+}
+
 template <typename Word>
 void takeCorners(void* dst, const void* src, const Grid& grid, KpProgressInterface* progress)
 {
@@ -92,8 +100,7 @@ void takeCorners(void* dst, const void* src, const Grid& grid, KpProgressInterfa
     const auto makeLayer = [&](long k) {
         for (long j = 0; j < ny; ++j, to += nx) {
             const auto* row = from + (k * grid.factor[2] * grid.voxels(1) + j * grid.factor[1]) * grid.voxels(0);
-            for (long i = 0; i < nx; ++i)
-                to[i].value = row[i * fx].value;
+            fx == 2 ? takeEvery<2>(to, row, nx, fx) : takeEvery<0>(to, row, nx, fx);
         }
     };
     // Layers of the target against slices of the source: the last is about dz / fz of dz, and that is meant.

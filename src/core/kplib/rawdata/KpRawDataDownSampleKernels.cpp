@@ -3,8 +3,11 @@
 #include <kplib/rawdata/detail/KpPrimTypeVisit.h>
 
 #include <algorithm>
+#include <bit>
 #include <cmath>
+#include <cstddef>
 #include <cstdint>
+#include <cstring>
 #include <limits>
 #include <type_traits>
 
@@ -168,6 +171,32 @@ struct JoinColumns {
     }
 };
 
+/// Joins a line of integers likewise, for voxels of N components, of which gcc makes no vectors. All shifts of the line
+/// are joined as they lie, and of the results those at the heads of the blocks are moved together.
+template <typename Rule, int N>
+struct JoinGroups {
+    using State = typename Rule::State;
+    static constexpr long slack = 4;  // a move may carry that many states, of which the next move covers the surplus
+    static constexpr std::size_t moved = std::bit_ceil(N * sizeof(State));
+
+    KPLIB_KERNEL_BODY static void run(State* joined, const State* line, long blocks, long fx)
+    {
+        auto* __restrict to = joined;
+        auto* __restrict from = line;
+        const long width = ((blocks - 1) * fx + 1) * N;
+        for (long k = 0; k < width; ++k)
+            to[k] = Rule::next(from[k], from[k + N]);
+        for (long x = 2; x < fx; ++x)
+            for (long k = 0; k < width; ++k)
+                to[k] = Rule::next(to[k], from[k + x * N]);
+        for (long i = 1; i < blocks; ++i) {
+            unsigned char group[moved];
+            std::memcpy(group, joined + i * fx * N, moved);
+            std::memcpy(joined + i * N, group, moved);
+        }
+    }
+};
+
 template <typename Rule>
 struct Finish {
     KPLIB_KERNEL_BODY static void run(void* dst, const typename Rule::State* states, long n, long voxels)
@@ -192,6 +221,20 @@ void joinColumns(typename Rule::State* states, const Item* items, long blocks, c
     join(states, items, blocks, row.fx, row.components, isFirst);
 }
 
+template <typename Path, typename Rule>
+void joinLine(typename Rule::State* joined, const typename Rule::State* line, long blocks, const BlockRow& row)
+{
+    if constexpr (std::is_integral_v<typename Rule::Element>) {
+        if (row.components == 2)
+            return Path::template run<JoinGroups<Rule, 2>>(joined, line, blocks, long{row.fx});
+        if (row.components == 3)
+            return Path::template run<JoinGroups<Rule, 3>>(joined, line, blocks, long{row.fx});
+        if (row.components == 4)
+            return Path::template run<JoinGroups<Rule, 4>>(joined, line, blocks, long{row.fx});
+    }
+    joinColumns<Path, Rule>(joined, line, blocks, row, true);
+}
+
 constexpr long lineLength = 2048;  // states of a stretch of a row; they stay in the first cache
 
 /// A stretch of blocks whose states fit into a line. Integers are joined along y and z as they lie, then along x. The
@@ -201,7 +244,7 @@ void joinStretch(const BlockRow& row, const void* src, void* dst, long blocks)
 {
     using T = typename Rule::Element;
     using State = typename Rule::State;
-    State line[lineLength], joined[lineLength];
+    State line[lineLength], joined[lineLength + JoinGroups<Rule, 3>::slack];
     const bool isAnyOrder = std::is_integral_v<T> || row.fx == 1;
     const long width = blocks * row.fx * row.components;
     for (long z = 0; z < row.fz; ++z) {
@@ -215,7 +258,7 @@ void joinStretch(const BlockRow& row, const void* src, void* dst, long blocks)
     }
     const bool isJoined = !isAnyOrder || row.fx == 1;
     if (!isJoined)
-        joinColumns<Path, Rule>(joined, line, blocks, row, true);
+        joinLine<Path, Rule>(joined, line, blocks, row);
     Path::template run<Finish<Rule>>(dst, static_cast<const State*>(isJoined ? line : joined), blocks * row.components,
                                      row.voxels());
 }

@@ -51,7 +51,7 @@ struct Lanes {
     static constexpr int count = Bytes / sizeof(T);
     static constexpr int unroll = 4;
     static constexpr long step = unroll * count;  // elements a round
-    static constexpr long block = 64 * step;      // elements between two looks at the outcome
+    static constexpr long block = 256 * step;     // elements between two looks at the outcome
 
     KPLIB_KERNEL_BODY static void load(Vector& to, const void* from) { std::memcpy(&to, from, Bytes); }
 };
@@ -126,24 +126,16 @@ struct DiffersWide {
     KPLIB_KERNEL_BODY static bool run(const void* elements, long n, const void* head)
     {
         using L = Lanes<T, Bytes>;
-        using Vector = typename L::Vector;
         auto* values = static_cast<const Loose<T>*>(elements);
-        const Vector first = *static_cast<const T*>(head) - Vector{};
-        long i = 0;
-        for (; i + L::step <= n; i += L::step) {
-            Vector v[L::unroll];
-            for (int u = 0; u < L::unroll; ++u)
-                L::load(v[u], values + i + u * L::count);
-            const auto differs = (v[0] < first) | (v[0] > first) | (v[1] < first) | (v[1] > first) | (v[2] < first) |
-                                 (v[2] > first) | (v[3] < first) | (v[3] > first);
-            unsigned long words[Bytes / sizeof(long)], any = 0;
-            std::memcpy(words, &differs, Bytes);
-            for (unsigned long word : words)
-                any |= word;
-            if (any)
+        const T first = *static_cast<const T*>(head);
+        for (long count = 0; n >= L::step; values += count, n -= count) {
+            count = std::min(n - n % L::step, L::block);
+            T min = first, max = first;
+            blockRange<T, Bytes>(values, count, min, max);
+            if (min < first || max > first)
                 return true;
         }
-        return DiffersPlain<T>::run(values + i, n - i, head);
+        return DiffersPlain<T>::run(values, n, head);
     }
 };
 

@@ -36,7 +36,7 @@ using SwapLoop = void(void* words, long n);
 using SwapLoops = SwapLoop*(int width);
 std::span<const KernelPath<SwapLoops>> swapPaths();
 
-/// Copies `n` elements of 1, 2, 4 or 8 bytes in reverse order.
+/// Copies `n` elements of 1, 2, 3, 4 or 8 bytes in reverse order.
 using ReverseLoop = void(void* dst, const void* src, long n);
 using ReverseLoops = ReverseLoop*(int width);
 std::span<const KernelPath<ReverseLoops>> reversePaths();
