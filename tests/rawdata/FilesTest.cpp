@@ -6,11 +6,8 @@
 
 #include <gtest/gtest.h>
 
-#include <cerrno>
-#include <csignal>
 #include <thread>
 
-#include <sys/time.h>
 #include <unistd.h>
 
 using namespace kplib::test;
@@ -123,26 +120,4 @@ TEST(Files, failedReadsAreLoggedWithTheSizeOfTheCall)
             EXPECT_TRUE(log.lines()[0].ends_with(std::string("KpRawData::read() failed, ") + c.line)) << log.lines()[0];
         }
     }
-}
-
-TEST(Files, interruptedReadIsAFailure)
-{
-    struct sigaction ring {
-    }, before;
-    ring.sa_handler = [](int) {};
-    sigaction(SIGALRM, &ring, &before);
-    int ends[2];
-    ASSERT_EQ(pipe(ends), 0);
-    ASSERT_EQ(::write(ends[1], "abc", 3), 3);
-    const itimerval soon{{0, 20000}, {0, 20000}}, never{};
-    setitimer(ITIMER_REAL, &soon, nullptr);
-    char bytes[10];
-    const LogCapture log;
-    EXPECT_EQ(KpRawData::read(ends[0], bytes, 10, false), 3);
-    setitimer(ITIMER_REAL, &never, nullptr);
-    sigaction(SIGALRM, &before, nullptr);
-    ASSERT_EQ(log.lines().size(), 1u);
-    EXPECT_NE(log.lines()[0].find("ret=-1, size=7, errno=4 ("), std::string::npos) << log.lines()[0];
-    close(ends[0]);
-    close(ends[1]);
 }

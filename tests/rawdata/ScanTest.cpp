@@ -51,15 +51,13 @@ TEST(GetRange, everyPathFollowsTheSequentialSteps)
                     else if (v > expected[1])
                         expected[1] = v;
                 }
-                for (const auto& path : rangePaths()) {
-                    if (!path.usable)
-                        continue;
+                eachUsable(rangePaths(), [&](const auto& path) {
                     Elements<T> elements(values, seed % 2);
                     T actual[] = {values[0], values[0]};
                     path.run(elements.typed().type)(elements.data(), n, &actual[0], &actual[1]);
                     EXPECT_EQ(std::memcmp(actual, expected, sizeof actual), 0)
                         << path.name << ' ' << elements.typed().type.name() << ' ' << n << ' ' << seed;
-                }
+                });
             }
         }
     });
@@ -161,13 +159,11 @@ TEST(SwapBytes, reversesTheBytesOfEachWord)
             auto expected = bytes;
             for (long i = 0; i < n; ++i)
                 std::reverse(expected.begin() + i * width, expected.begin() + (i + 1) * width);
-            for (const auto& path : swapPaths()) {
-                if (!path.usable)
-                    continue;
+            eachUsable(swapPaths(), [&](const auto& path) {
                 Elements<std::uint8_t> words(bytes, 1);
                 path.run(width)(words.data(), n);
                 EXPECT_EQ(words, expected) << path.name << ' ' << width << ' ' << n;
-            }
+            });
         }
     }
     const int widths[KpPrimType::NumTypes] = {1, 2, 4, 4, 8, 4, 4, 2, 4, 1};  // of what is reversed in each type
