@@ -81,7 +81,8 @@ TEST(MapLinear, everyPathComputesInThePrecisionOfThePair)
     const double maps[][2] = {{0, 1}, {100, 1}, {-1024.3, 0.7}, {1e-10, 3e4}, {1e300, -1}};
     eachPair([&]<typename To, typename From>(ElementTag<To>, ElementTag<From>) {
         const std::vector<From> values = someValues<From>(1003, 2);
-        for (const auto& [offset, scale] : maps) {
+        for (const auto& map : maps) {
+            const double offset = map[0], scale = map[1];
             std::vector<To> expected;
             for (From v : values)
                 expected.push_back(referenceMap<To>(v, offset, scale));
