@@ -9,8 +9,13 @@
 #include <kplib/foundation/KpForward.h>
 #include <kplib/foundation/KpMemory.h>
 #include <kplib/foundation/KpMemoryException.h>
+#include <kplib/foundation/KpMutex.h>
 #include <kplib/foundation/KpPrimType.h>
 #include <kplib/foundation/KpStdStringTokenizer.h>
 #include <kplib/foundation/KpString.h>
 #include <kplib/foundation/KpStringTokenizer.h>
+#include <kplib/foundation/KpThreadLocalStorage.h>
+#include <kplib/foundation/KpWaitCondition.h>
 #include <kplib/foundation/StringUtils.h>
+#include <kplib/log/KpLogFile.h>
+#include <kplib/log/KpLogLevel.h>
