@@ -1,8 +1,8 @@
 #pragma once
 
 #include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpForward.h>
 
-class KpMutex;
 struct KpWaitConditionPrivate;
 
 /// Where threads wait for a change that a mutex guards. Threads may wake up without a cause, so the caller asks for the

@@ -1,9 +1,9 @@
 #pragma once
 
 #include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpForward.h>
 #include <kplib/log/KpLogLevel.h>
 
-class KpString;
 struct KpLogFilePrivate;
 
 /// The log: every message of the library is a line here, on its way to disk when the call returns. Reached through
