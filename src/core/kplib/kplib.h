@@ -14,3 +14,8 @@
 #include <kplib/foundation/KpString.h>
 #include <kplib/foundation/KpStringTokenizer.h>
 #include <kplib/foundation/StringUtils.h>
+#include <kplib/imaging/KpColor.h>
+#include <kplib/param/HxParamBase.h>
+#include <kplib/param/HxParamBundle.h>
+#include <kplib/param/HxParamEditCheck.h>
+#include <kplib/param/HxParameter.h>
