@@ -142,8 +142,8 @@ KpResult checkPixels(const SliceFile& slice)
         return badInput("'%s' has an unsupported pixel type: %d bits allocated", path, slice.bitsAllocated);
     if (slice.bitsStored < 1 || slice.bitsStored > slice.bitsAllocated || slice.highBit + 1 < slice.bitsStored ||
         slice.highBit >= slice.bitsAllocated)
-        return badInput("'%s' contradicts itself: %d bits stored up to bit %d of %d", path, slice.bitsStored, slice.highBit,
-                        slice.bitsAllocated);
+        return badInput("'%s' contradicts itself: %d bits stored up to bit %d of %d", path, slice.bitsStored,
+                        slice.highBit, slice.bitsAllocated);
     if (slice.rows < 1 || slice.columns < 1)
         return badInput("'%s' has no pixels", path);
     return KpResult();
@@ -182,7 +182,8 @@ KpResult measureSpacing(Series& series, double& spacing)
     for (size_t i = 0; i < gaps.size(); ++i) {
         const long missing = std::lround(gaps[i] / median) - 1;
         if (missing > 0)
-            series.warnings.emplace_back(KpString(0, "%ld slice(s) missing behind '%s'", missing, slices[i].path.c_str()));
+            series.warnings.emplace_back(
+                KpString(0, "%ld slice(s) missing behind '%s'", missing, slices[i].path.c_str()));
         else if (std::abs(gaps[i] - median) > 0.02 * median)
             series.warnings.emplace_back(KpString(0, "uneven spacing: %.4g mm behind '%s', %.4g mm elsewhere", gaps[i],
                                                   slices[i].path.c_str(), median));
@@ -203,7 +204,8 @@ void cutOut(const Word* from, long n, const SliceFile& slice, Word* to)
     for (long i = 0; i < n; ++i) {
         const Word bits = static_cast<Word>(static_cast<Word>(from[i] >> below) << unused);
         using Signed = std::make_signed_t<Word>;
-        to[i] = slice.isSigned ? static_cast<Word>(static_cast<Signed>(bits) >> unused) : static_cast<Word>(bits >> unused);
+        to[i] =
+            slice.isSigned ? static_cast<Word>(static_cast<Signed>(bits) >> unused) : static_cast<Word>(bits >> unused);
     }
 }
 
@@ -262,7 +264,8 @@ void place(const SliceFile& slice, unsigned char* stored, Volume& volume, long z
         source = {widened.data(), KpPrimType::Short};
     }
     if (volume.type == KpPrimType::Float && slice.slope != 0)
-        KpRawData::mapLinear(volume.slice(z), source, static_cast<unsigned long>(n), slice.intercept / slice.slope, slice.slope);
+        KpRawData::mapLinear(volume.slice(z), source, static_cast<unsigned long>(n), slice.intercept / slice.slope,
+                             slice.slope);
     else
         KpRawData::memcpy(volume.slice(z), source, n);
 }
@@ -291,8 +294,8 @@ void addImageLevel(const Series& series, HxParamBundle& root)
     for (size_t i = 0; i < series.slices.size(); ++i) {
         const SliceFile& s = series.slices[i];
         const KpString name(0, "ImageNr%05zu", i + 1);
-        const KpString text(0, "%d,%s,%.10g\\%.10g\\%.10g", s.number, s.instanceUid.c_str(), s.position[0], s.position[1],
-                            s.position[2]);
+        const KpString text(0, "%d,%s,%.10g\\%.10g\\%.10g", s.number, s.instanceUid.c_str(), s.position[0],
+                            s.position[1], s.position[2]);
         list.insert(HxParameter::create(name, text), 0);
     }
 }

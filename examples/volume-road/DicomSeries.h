@@ -33,6 +33,6 @@ struct Series {
 /// size, type and orientation; gaps are warnings.
 KpResult scanSeries(const char* folder, const std::string& uid, KpProgressInterface& progress, Series& series);
 
-/// Reads the voxels into one block, and the header of the first image into `root`, with what differs from image to image
-/// beside it. On cancellation the volume is incomplete and `progress` says so.
+/// Reads the voxels into one block, and the header of the first image into `root`, with what differs from image to
+/// image beside it. On cancellation the volume is incomplete and `progress` says so.
 KpResult readSeries(const Series& series, KpProgressInterface& progress, Volume& volume, HxParamBundle& root);

@@ -101,7 +101,8 @@ bool hasDicomMark(const char* path)
     FILE* const f = std::fopen(path, "rb");
     if (!f)
         return false;
-    const bool isMarked = std::fread(start, 1, sizeof start, f) == sizeof start && std::memcmp(start + 128, "DICM", 4) == 0;
+    const bool isMarked =
+        std::fread(start, 1, sizeof start, f) == sizeof start && std::memcmp(start + 128, "DICM", 4) == 0;
     std::fclose(f);
     return isMarked;
 }

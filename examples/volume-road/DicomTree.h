@@ -6,8 +6,8 @@
 class DcmFileFormat;
 class DcmItem;
 
-/// Adds every element of `dataSet` to `all`: a leaf is "Description: value" under its tag's name, a sequence is a bundle of
-/// items, and where private blocks are reserved there is an index of their creators.
+/// Adds every element of `dataSet` to `all`: a leaf is "Description: value" under its tag's name, a sequence is a
+/// bundle of items, and where private blocks are reserved there is an index of their creators.
 void fillTree(HxParamBundle& all, DcmItem& dataSet);
 
 /// The header of a file, its meta information included, into `DICOM`/`All` of `root`; text becomes UTF-8 where it can.

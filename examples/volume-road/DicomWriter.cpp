@@ -87,7 +87,8 @@ void putImage(DcmItem& data, Volume& volume, const SeriesText& text, long z)
     const double shift = static_cast<double>(z) * volume.spacing[2];
     put(data, DCM_InstanceNumber, KpString(0, "%ld", z + 1));
     putReals(data, DCM_ImagePositionPatient,
-             {volume.origin[0] + shift * normal[0], volume.origin[1] + shift * normal[1], volume.origin[2] + shift * normal[2]});
+             {volume.origin[0] + shift * normal[0], volume.origin[1] + shift * normal[1],
+              volume.origin[2] + shift * normal[2]});
     putReals(data, DCM_ImageOrientationPatient, {x[0], x[1], x[2], y[0], y[1], y[2]});
     putReals(data, DCM_PixelSpacing, {volume.spacing[1], volume.spacing[0]});
     putReals(data, DCM_SliceThickness, {volume.spacing[2]});

@@ -12,6 +12,6 @@ struct SeriesText {
     double windowCenter, windowWidth;  ///< in displayed values
 };
 
-/// Writes a volume of 16-bit voxels as a series of MR images into `folder`, one file a slice, each a complete object with
-/// UIDs, place and orientation, window, a private block and a sequence.
+/// Writes a volume of 16-bit voxels as a series of MR images into `folder`, one file a slice, each a complete object
+/// with UIDs, place and orientation, window, a private block and a sequence.
 KpResult writeSeries(Volume& volume, const SeriesText& text, const char* folder, KpProgressInterface& progress);

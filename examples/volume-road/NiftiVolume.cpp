@@ -14,13 +14,26 @@ using Image = std::unique_ptr<nifti_image, decltype(&nifti_image_free)>;
 bool primTypeOf(const nifti_image& image, KpPrimType& type)
 {
     switch (image.datatype) {
-    case DT_UINT8: type = KpPrimType::Byte; return true;
-    case DT_INT16: type = KpPrimType::Short; return true;
-    case DT_UINT16: type = KpPrimType::UShort; return true;
-    case DT_INT32: type = KpPrimType::Int; return true;
-    case DT_FLOAT32: type = KpPrimType::Float; return true;
-    case DT_FLOAT64: type = KpPrimType::Double; return true;
-    default: return false;
+    case DT_UINT8:
+        type = KpPrimType::Byte;
+        return true;
+    case DT_INT16:
+        type = KpPrimType::Short;
+        return true;
+    case DT_UINT16:
+        type = KpPrimType::UShort;
+        return true;
+    case DT_INT32:
+        type = KpPrimType::Int;
+        return true;
+    case DT_FLOAT32:
+        type = KpPrimType::Float;
+        return true;
+    case DT_FLOAT64:
+        type = KpPrimType::Double;
+        return true;
+    default:
+        return false;
     }
 }
 
@@ -46,7 +59,8 @@ void makeRightHanded(Volume& volume)
     const Vector normal = cross(volume.axes[0], volume.axes[1]);
     if (dot(normal, volume.axes[2]) >= 0)
         return;
-    const int dims[3] = {static_cast<int>(volume.dims[0]), static_cast<int>(volume.dims[1]), static_cast<int>(volume.dims[2])};
+    const int dims[3] = {static_cast<int>(volume.dims[0]), static_cast<int>(volume.dims[1]),
+                         static_cast<int>(volume.dims[2])};
     KpRawData::flip(volume.bytes.data(), volume.type.size(), dims, 2);
     const double extent = static_cast<double>(volume.dims[2] - 1) * volume.spacing[2];
     for (size_t i = 0; i < 3; ++i)

@@ -81,7 +81,9 @@ Between position(const Along& along, long i, double pixel)
 Picture cut(Volume& shown, const Along& across, const Along& down, const Along& normal)
 {
     const double pixel = std::min(across.spacing, down.spacing);
-    const auto extent = [&](const Along& a) { return std::lround(static_cast<double>(a.size - 1) * a.spacing / pixel) + 1; };
+    const auto extent = [&](const Along& a) {
+        return std::lround(static_cast<double>(a.size - 1) * a.spacing / pixel) + 1;
+    };
     Picture picture(extent(across), extent(down));
     const unsigned char* const plane = shown.bytes.data() + normal.size / 2 * normal.stride;
     for (long row = 0; row < picture.height; ++row) {
@@ -91,7 +93,8 @@ Picture cut(Volume& shown, const Along& across, const Along& down, const Along& 
             const unsigned char* const at = plane + y.offset + x.offset;
             const double top = at[0] + x.share * (at[x.step] - at[0]);
             const double bottom = at[y.step] + x.share * (at[y.step + x.step] - at[y.step]);
-            picture.pixels[row * picture.width + column] = static_cast<unsigned char>(top + y.share * (bottom - top) + 0.5);
+            picture.pixels[row * picture.width + column] =
+                static_cast<unsigned char>(top + y.share * (bottom - top) + 0.5);
         }
     }
     return picture;

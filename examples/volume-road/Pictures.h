@@ -13,8 +13,8 @@ struct Window {
 /// The volume through the window, as bytes. The linear function of DICOM PS3.3, C.11.2.1.2.1.
 Volume display(Volume& volume, const Window& window);
 
-/// Writes axial.png, coronal.png and sagittal.png through the middle of a volume of bytes, the patient upright and seen as
-/// usual (left on the right side of the picture), with square pixels.
+/// Writes axial.png, coronal.png and sagittal.png through the middle of a volume of bytes, the patient upright and seen
+/// as usual (left on the right side of the picture), with square pixels.
 KpResult writePlanes(Volume& shown, const OutputFolder& out);
 
 /// Writes all slices of a volume of bytes side by side.

@@ -45,8 +45,10 @@ void addVolume(Volume& volume, KpString& text)
     const auto displayed = [&](float v) { return static_cast<double>(v) * volume.slope + volume.intercept; };
     text += KpString(0, "%-20s %ld x %ld x %ld voxels of %s\n", "size", volume.dims[0], volume.dims[1], volume.dims[2],
                      volume.type.name());
-    text += KpString(0, "%-20s %.6g x %.6g x %.6g mm\n", "spacing", volume.spacing[0], volume.spacing[1], volume.spacing[2]);
-    text += KpString(0, "%-20s (%.4f, %.4f, %.4f) mm\n", "first voxel at", volume.origin[0], volume.origin[1], volume.origin[2]);
+    text += KpString(0, "%-20s %.6g x %.6g x %.6g mm\n", "spacing", volume.spacing[0], volume.spacing[1],
+                     volume.spacing[2]);
+    text += KpString(0, "%-20s (%.4f, %.4f, %.4f) mm\n", "first voxel at", volume.origin[0], volume.origin[1],
+                     volume.origin[2]);
     for (const auto& axis : volume.axes)
         text += KpString(0, "%-20s (%.6f, %.6f, %.6f)\n", "axis", axis[0], axis[1], axis[2]);
     text += KpString(0, "%-20s %.8g to %.8g\n", "values", displayed(low), displayed(high));

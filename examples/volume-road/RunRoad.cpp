@@ -36,8 +36,8 @@ Volume reducedByMean(Volume& volume, std::array<int, 3> f, KpProgressInterface& 
 {
     Volume small = shrunk(volume, f);
     const auto [x, y, z] = volume.dims;
-    KpRawData::downSample3D(small.bytes.data(), volume.voxels(), static_cast<unsigned long>(x), static_cast<unsigned long>(y),
-                            static_cast<unsigned long>(z), f[0], f[1], f[2], &progress);
+    KpRawData::downSample3D(small.bytes.data(), volume.voxels(), static_cast<unsigned long>(x),
+                            static_cast<unsigned long>(y), static_cast<unsigned long>(z), f[0], f[1], f[2], &progress);
     return small;
 }
 
@@ -46,8 +46,8 @@ Volume reducedByMaximum(Volume& volume, std::array<int, 3> f, KpProgressInterfac
     Volume small = shrunk(volume, f);
     const auto [x, y, z] = volume.dims;
     KpRawData::downSampleMaxFilterComponents3DN(small.bytes.data(), volume.voxels(), static_cast<unsigned long>(x),
-                                                static_cast<unsigned long>(y), static_cast<unsigned long>(z), f[0], f[1], f[2],
-                                                1, &progress);
+                                                static_cast<unsigned long>(y), static_cast<unsigned long>(z), f[0],
+                                                f[1], f[2], 1, &progress);
     return small;
 }
 

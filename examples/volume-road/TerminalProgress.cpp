@@ -62,6 +62,6 @@ void TerminalProgress::draw()
         return;
     drawn_ = permille;
     const int filled = permille * width / 1000;
-    std::fprintf(stderr, "\r[%.*s%*s] %3d%% %s\033[K", filled, "########################################", width - filled, "",
-                 permille / 10, text_.c_str());
+    std::fprintf(stderr, "\r[%.*s%*s] %3d%% %s\033[K", filled, "########################################",
+                 width - filled, "", permille / 10, text_.c_str());
 }

@@ -3,7 +3,8 @@
 #include <kplib/foundation/KpString.h>
 #include <kplib/threads/KpProgressGuiInterface.h>
 
-/// Shows progress on standard error: a bar on a terminal, a line a stage elsewhere. Ctrl-C cancels the job at its next step.
+/// Shows progress on standard error: a bar on a terminal, a line a stage elsewhere. Ctrl-C cancels the job at its next
+/// step.
 class TerminalProgress : public KpProgressGuiInterface {
 public:
     TerminalProgress();

@@ -10,8 +10,8 @@
 
 using Vector = std::array<double, 3>;
 
-/// Voxels of one type in one block, x fastest, and where they lie in the patient: mm, x to the left, y to the back, z to the
-/// head. Displayed value = stored value * slope + intercept.
+/// Voxels of one type in one block, x fastest, and where they lie in the patient: mm, x to the left, y to the back, z
+/// to the head. Displayed value = stored value * slope + intercept.
 struct Volume {
     std::array<long, 3> dims{};
     Vector spacing{1, 1, 1};

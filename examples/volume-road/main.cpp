@@ -68,13 +68,15 @@ int report(const KpResult& result)
 int run(int argc, char** argv)
 {
     std::string nifti, series, target, uid, file;
-    CLI::App app("Takes a volume down the road: DICOM files, header tree, voxels, reduced volumes, pictures.", "volume-road");
+    bool isPhantom = false;
+    CLI::App app("Takes a volume down the road: DICOM files, header tree, voxels, reduced volumes, pictures.",
+                 "volume-road");
     app.require_subcommand(1);
 
     CLI::App& make = *app.add_subcommand("make-series", "write a volume as a DICOM series");
     CLI::Option_group& source = *make.add_option_group("source");
     source.add_option("--nifti", nifti, "a NIfTI volume");
-    source.add_flag("--phantom", "the built-in head phantom");
+    source.add_flag("--phantom", isPhantom, "the built-in head phantom");
     source.require_option(1);
     make.add_option("OUT", target, "folder to write the images into")->required();
 
