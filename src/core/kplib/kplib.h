@@ -29,12 +29,15 @@
 #include <kplib/imaging/KpColor.h>
 #include <kplib/log/KpLastError.h>
 #include <kplib/log/KpLogFile.h>
+#include <kplib/log/KpLogFileDefaultModuleModifier.h>
+#include <kplib/log/KpLogFileWriteCallbackDisabler.h>
 #include <kplib/log/KpLogLevel.h>
 #include <kplib/log/KpResult.h>
 #include <kplib/param/HxParamBase.h>
 #include <kplib/param/HxParamBundle.h>
 #include <kplib/param/HxParamEditCheck.h>
 #include <kplib/param/HxParameter.h>
+#include <kplib/system/KpWatch.h>
 #include <kplib/threads/KpProgressGuiInterface.h>
 #include <kplib/threads/KpProgressInterface.h>
 #include <kplib/threads/ProgressScope.h>

@@ -26,14 +26,14 @@ public:
     /// Deletes the object when the count is no longer positive.
     void unref()
     {
-        if (!destructionInProgress_ && --refCount_ <= 0) [[unlikely]]
-            destroy();
+        if (--refCount_ <= 0) [[unlikely]]
+            unrefLast();
     }
 
     int refCount() const { return refCount_; }
 
 private:
-    void destroy();
+    void unrefLast();
 
     int refCount_ = 0;
     bool destructionInProgress_ = false;  // from then on the count stands still

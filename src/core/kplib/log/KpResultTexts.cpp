@@ -11,7 +11,6 @@ struct Row {
 
 constexpr Row rows[] = {
     {KpResult::Ok, {"operation successful", "operation successful"}},
-    {KpResult::Failed, {nullptr, nullptr}},
     {KpResult::InternalError, {"internal error", "internal error"}},
     {KpResult::DataExpected, {"data expected", "data expected"}},
     {KpResult::NotSupported, {"not supported", "not supported"}},
