@@ -26,7 +26,7 @@ public:
     }
 
     std::string take() { return std::exchange(told, {}); }
-    const std::function<void()>& cancelCallback() const { return cancelCallback_; }
+    const std::function<void()>& cancelCallback() const { return cancelCallback; }
 
     std::string told;
 };
