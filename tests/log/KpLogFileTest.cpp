@@ -31,7 +31,7 @@ public:
         std::free(text_);
     }
     KpLogFile* operator->() { return log_.get(); }
-    KpLogFilePrivate& record() { return logRecord(*log_); }
+    KpLogFilePrivate& record() { return kplib::detail::logRecord(*log_); }
 
     /// What was flushed since the last take().
     std::string take()

@@ -19,12 +19,12 @@ struct OffsetDropper {
 void KpProgressInterface::setProgressGui(KpProgressGuiInterface* gui)
 {
     if (gui_) {
-        gui_->cancelCallback_ = nullptr;
+        gui_->cancelCallback = nullptr;
         gui_->progress_ = nullptr;
     }
     gui_ = gui;
     if (gui_) {
-        gui_->cancelCallback_ = [this] { cancel(); };
+        gui_->cancelCallback = [this] { cancel(); };
         gui_->progress_ = this;
     }
 }
