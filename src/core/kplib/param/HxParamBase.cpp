@@ -22,12 +22,14 @@ struct Free {
 };
 using OwnedText = std::unique_ptr<char, Free>;
 
+/// In a block of its own, filled up with zeros for NameKey.
 OwnedText nameCopy(const char* text)
 {
+    constexpr size_t block = kplib::detail::nameBlock;
     const size_t prefix = kplib::detail::isDigit(*text) ? 1 : 0, length = prefix + std::strlen(text);
-    const size_t size = (length / kplib::detail::nameBlock + 1) * kplib::detail::nameBlock;
+    const size_t size = (length / block + 1) * block;
     OwnedText name(static_cast<char*>(kpmalloc(size)));
-    name.get()[0] = '_';
+    *name = '_';
     std::memcpy(name.get() + prefix, text, length - prefix);
     std::memset(name.get() + length, 0, size - length);
     return name;
@@ -45,7 +47,7 @@ OwnedText generatedName(HxParamBase::Type type)
 }
 
 /// Ends `name` at its first blank; gives what follows, null without one.
-const char* cutAtBlank(char* name)
+char* cutAtBlank(char* name)
 {
     char* const blank = std::strchr(name, ' ');
     if (!blank)
@@ -149,17 +151,20 @@ void HxParamBase::setName(const char* name)
     if (name == name_)
         return;
     OwnedText fresh = nameCopy(name);
-    const char* const rest = isBundle() ? cutAtBlank(fresh.get()) : nullptr;
+    char* const rest = isBundle() ? cutAtBlank(fresh.get()) : nullptr;
     for (char* c = fresh.get(); *c; ++c)
         *c = cleaned(*c);
     if (isBundle())
         retitle(fresh.get(), rest);
+    if (rest)
+        std::memset(rest, 0, std::strlen(rest));
     adoptName(fresh.release());
 }
 
 void HxParamBase::adoptName(char* fresh)
 {
     const OwnedText old(std::exchange(name_, fresh));
+    tag_ = kplib::detail::tagNumber(name_);
     if (old && std::strcmp(old.get(), name_) != 0)
         touch(TouchName);
 }

@@ -6,6 +6,10 @@
 #include <cstddef>
 #include <cstdint>
 
+namespace kplib::detail {
+class NameKey;
+}
+
 /// A named node of the parameter tree: an HxParameter with a value, or an HxParamBundle with children.
 ///
 /// A node is made outside a tree, without a parent; the bundle that takes it owns it from then on. Names follow the
@@ -85,6 +89,7 @@ protected:
 
 private:
     friend class HxParamBundle;
+    friend class kplib::detail::NameKey;
 
     void adoptName(char* fresh);
     void retitle(const char* name, const char* rest);
@@ -93,6 +98,7 @@ private:
     Type type_ = TypeParameter;
     std::uint8_t touched_ = 0;
     std::uint16_t flags_ = 0;
-    char* name_ = nullptr;  // in a block filled up with zeros, see detail/ParamName.h
+    std::uint32_t tag_ = 0;  // the name's tagNumber(), for quick comparison, in what is padding otherwise
+    char* name_ = nullptr;
     HxParamEditCheck* editCheck_ = nullptr;
 };

@@ -154,7 +154,7 @@ void HxParamBundle::insert(HxParamBase* node, int replace)
     if (replace) {
         const kplib::detail::NameKey key(node->name(), kplib::detail::NameKey::Literal);
         for (long i = first; i < last; ++i) {
-            if (key.matches(children_[i]->name())) {
+            if (key.matches(*children_[i])) {
                 replaceAt(i, owned.release());
                 return;
             }

@@ -8,10 +8,6 @@
 #include <cstdio>
 #include <utility>
 
-namespace kplib::detail {
-class NameKey;
-}
-
 /// The inner node of the parameter tree: a container of sub-bundles, which stand first and in the order of insertion,
 /// and of parameters. It owns its children.
 ///
@@ -76,7 +72,7 @@ public:
     /// The sub-bundle at an index, null outside.
     HxParamBundle* bundle(int i) { return const_cast<HxParamBundle*>(std::as_const(*this).bundle(i)); }
     const HxParamBundle* bundle(int i) const;
-    int nBundles() const { return static_cast<int>(counts() & ~sortedBit); }
+    int nBundles() const { return static_cast<int>(counts_.load(std::memory_order_relaxed) & ~sortedBit); }
 
     /// Sets the parameter of that name that find() gives, of whatever type, or adds one. Null text is empty text.
     void set(const char* name, const char* text);
@@ -215,6 +211,7 @@ private:
 
     static constexpr std::uint32_t sortedBit = 0x80000000u;
     std::uint32_t counts() const { return counts_.load(std::memory_order_acquire); }
+    bool hasParameters() const { return size() > nBundles(); }
     void setCounts(std::uint32_t counts) { counts_.store(counts, std::memory_order_release); }
 
     void swapChildren(HxParamBundle& other) noexcept;

@@ -1,7 +1,6 @@
 #include <kplib/foundation/KpString.h>
 #include <kplib/param/HxParamBundle.h>
-#include <kplib/param/HxParameter.h>
-#include <kplib/param/detail/ParamName.h>
+#include <kplib/param/detail/ParamLookup.h>
 
 #include <cmath>
 #include <cstdio>
@@ -120,7 +119,7 @@ const char* HxParamBundle::findTagInAll(const char* tag, const char* defaultValu
 {
     const HxParameter* leaf = findInGroups(tag);
     if (!leaf)
-        leaf = findSorted(tag);
+        leaf = findSorted(NameKey(tag, NameKey::Literal));
     return tagValue(leaf, defaultValue);
 }
 

@@ -1,26 +1,18 @@
 #include <kplib/imaging/KpColor.h>
 #include <kplib/param/HxParamBundle.h>
 #include <kplib/param/HxParameter.h>
-#include <kplib/param/detail/ParamName.h>
+#include <kplib/param/detail/ParamLookup.h>
 
 #include <cstdlib>
 #include <thread>
 
+using kplib::detail::asBundle;
+using kplib::detail::asParameter;
 using kplib::detail::isDigit;
 using kplib::detail::mystrcasecmp;
 using kplib::detail::NameKey;
 
 namespace {
-
-const HxParamBundle* asBundle(const HxParamBase* node)
-{
-    return static_cast<const HxParamBundle*>(node);
-}
-
-const HxParameter* asParameter(const HxParamBase* node)
-{
-    return static_cast<const HxParameter*>(node);
-}
 
 /// The order of qsort over children.
 int compareParamNames(const void* a, const void* b)
@@ -92,31 +84,13 @@ const HxParameter* HxParamBundle::findSorted(const char* name) const
     return findSorted(NameKey(name, NameKey::Literal));
 }
 
-const HxParameter* HxParamBundle::findSorted(const NameKey& key) const
-{
-    if (!isSorted())
-        sortParameters();
-    long lo = nBundles(), hi = size() - 1;
-    while (lo <= hi) {
-        const long mid = (lo + hi) / 2;
-        const int order = key.order(children_[mid]->name());
-        if (order == 0)
-            return asParameter(children_[mid]);
-        if (order < 0)
-            hi = mid - 1;
-        else
-            lo = mid + 1;
-    }
-    return nullptr;
-}
-
 /// The parameter of that name, of any type.
 const HxParameter* HxParamBundle::parameter(const NameKey& key) const
 {
     if (isSorted())
         return findSorted(key);
     for (long i = nBundles(); i < size(); ++i) {
-        if (key.matches(children_[i]->name()))
+        if (key.matches(*children_[i]))
             return asParameter(children_[i]);
     }
     return nullptr;
@@ -151,7 +125,7 @@ bool HxParamBundle::isShadowed(const char* name) const
 bool HxParamBundle::isTitled(const NameKey& key) const
 {
     static constexpr NameKey nameKey("Name");
-    const HxParameter* const title = size() > nBundles() ? find(nameKey, 1, 64) : nullptr;
+    const HxParameter* const title = hasParameters() ? find(nameKey, 1, 64) : nullptr;
     const char* text = title ? title->getString() : nullptr;
     for (int tokens = 0; text && tokens < 16; ++tokens) {
         while (isWhite(*text))
@@ -173,15 +147,6 @@ const HxParamBundle* HxParamBundle::titled(const NameKey& key) const
             return asBundle(children_[i]);
     }
     return nullptr;
-}
-
-const HxParamBundle* HxParamBundle::bundle(const NameKey& key) const
-{
-    for (int i = 0; i < nBundles(); ++i) {
-        if (key.matches(children_[i]->name()))
-            return asBundle(children_[i]);
-    }
-    return titled(key);
 }
 
 const HxParamBundle* HxParamBundle::bundle(const char* name) const
@@ -209,7 +174,7 @@ const HxParamBase* HxParamBundle::findBase(const char* name) const
 {
     const NameKey key(name);
     for (const HxParamBase* child : *this) {
-        if (key.matches(child->name()))
+        if (key.matches(*child))
             return child;
     }
     return titled(key);

@@ -193,12 +193,10 @@ void HxParameter::assign(int n, KpPrimType type, const void* data)
     primType_ = type;
 }
 
-const char* HxParameter::getString() const
+const char* HxParameter::numbersAsString() const
 {
     static KpString* buffers[4];
     static int currentBuffer = 0;
-    if (primType_ == KpPrimType::String)
-        return static_cast<const char*>(value_);
     KpString*& buffer = buffers[currentBuffer];
     if (!buffer)
         buffer = new (kpmalloc(sizeof(KpString))) KpString(KpString::NoMemory());
@@ -287,7 +285,8 @@ bool HxParameter::operator==(const HxParameter& other) const
 bool HxParameter::getBundleTagValue(const char*& out) const
 {
     const char* const whole = getString();
-    const char* const colon = whole ? std::strchr(whole, ':') : nullptr;
+    const char* const colon =
+        !whole || *whole == ':' ? whole : std::strchr(whole, ':');  // setTag() gives no description
     if (!colon || !colon[1])
         return false;
     out = colon + 2;

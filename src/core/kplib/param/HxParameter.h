@@ -43,7 +43,10 @@ public:
 
     /// The stored text; numbers are written into one of four process-wide, unlocked strings that take turns, so that
     /// the last four results are valid. Null only for a text built from null.
-    const char* getString() const;
+    const char* getString() const
+    {
+        return primType_ == KpPrimType::String ? static_cast<const char*>(value_) : numbersAsString();
+    }
 
     /// Adds the values to `out`, which is cleared first unless `append`: numbers with a blank between them, integers in
     /// decimal, floats by "%.8g", doubles by "%.12g", nothing for other types; a text without its double quotes. If
@@ -73,6 +76,7 @@ public:
 private:
     void assign(int n, KpPrimType type, const void* data);
     const char* text() const { return value_ ? static_cast<const char*>(value_) : ""; }
+    const char* numbersAsString() const;
     unsigned long storedBytes() const;
 
     int dimension_;

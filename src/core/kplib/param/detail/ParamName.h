@@ -1,15 +1,15 @@
 #pragma once
 
+#include <kplib/param/HxParamBase.h>
+
+#include <array>
 #include <bit>
 #include <cstdint>
 #include <cstring>
 
-// Node names: how they are stored and compared.
+// How the names of nodes are compared.
 
 namespace kplib::detail {
-
-/// Bytes that the block of a name is a multiple of, filled up with zeros, so that NameKey can read it by words.
-constexpr unsigned long nameBlock = 16;
 
 constexpr bool isDigit(char c)
 {
@@ -25,21 +25,37 @@ constexpr unsigned char upperCase(char c)
 
 /// The order of node names, -1, 0 or 1. A blank in `b`, and only there, ends `b`, so that a token inside a text can be
 /// compared where it stands. A null `a` comes first, then a null `b`.
-constexpr int mystrcasecmp(const char* a, const char* b)
+int mystrcasecmp(const char* a, const char* b);
+
+/// The value of a hexadecimal digit in either case, 16 for any other character.
+constexpr unsigned hexDigit(char c)
 {
-    if (!a || !b)
-        return a ? 1 : -1;
-    for (;; ++a, ++b) {
-        const unsigned char left = upperCase(*a), right = *b == ' ' ? 0 : upperCase(*b);
-        if (left != right)
-            return left < right ? -1 : 1;
-        if (left == 0)
-            return 0;
-    }
+    const unsigned digit = static_cast<unsigned char>(c) - unsigned{'0'};
+    const unsigned letter = (static_cast<unsigned char>(c) | 0x20u) - unsigned{'a'};
+    return digit < 10 ? digit : letter < 6 ? letter + 10 : 16;
 }
 
-/// A name to look for, made ready for many comparisons: upper-cased once, and compared eight bytes at a time with the
-/// names of nodes, about three times as fast as mystrcasecmp() in a binary search. Refers to the text.
+/// The number 0xggggeeee of a name "Ggggg-eeee" in either case, else 0. The order of names is that of their numbers.
+constexpr std::uint32_t tagNumber(const char* name)
+{
+    if (*name != 'G' && *name != 'g')
+        return 0;
+    std::uint32_t number = 0;
+    for (int i = 1; i < 10; ++i) {
+        const unsigned digit = hexDigit(name[i]);
+        if (i == 5 ? name[i] != '-' : digit > 15)
+            return 0;
+        if (i != 5)
+            number = number << 4 | digit;
+    }
+    return name[10] ? 0 : number;
+}
+
+/// Bytes that the blocks of nodes' names are a multiple of, so that NameKey can read the first ones in one go.
+constexpr unsigned long nameBlock = 8;
+
+/// A name to look for among nodes. The names of tags are compared by their numbers, which nodes keep for it, so that a
+/// lookup in a header reads no texts; others by their first eight characters at once. Refers to the text.
 class NameKey {
 public:
     enum Form {
@@ -48,74 +64,61 @@ public:
     };
 
     constexpr explicit NameKey(const char* name, Form form = Canonical) :
-        name_(name), isPrefixed_(name && form == Canonical && isDigit(*name))
+        name_(name), tag_(name ? tagNumber(name) : 0), isPrefixed_(name && form == Canonical && isDigit(*name))
     {
-        long i = 0;
-        if (isPrefixed_)
-            put(i++, '_');
-        for (; name && *name && *name != ' ' && i < 16; ++name)
-            put(i++, upperCase(*name));
-        hasBlank_ = name && *name == ' ' && i < 16;
-        rest_ = i == 16 ? name : nullptr;
+        if (tag_ == 0 && name)
+            takeHead();
     }
 
-    /// mystrcasecmp(nodeName, key) == 0: a blank ends the key.
-    bool matches(const char* nodeName) const
+    /// mystrcasecmp(name of the node, key) == 0: a blank ends the key.
+    bool matches(const HxParamBase& node) const
     {
-        return name_ && word(nodeName) == words_[0] && word(nodeName + 8) == words_[1] &&
-               (!rest_ || mystrcasecmp(nodeName + 16, rest_) == 0);
+        if (tag_ != 0)
+            return tag_ == node.tag_;
+        return head_ == head(node.name_) && (!rest_ || mystrcasecmp(node.name_ + nameBlock, rest_) == 0) && name_;
     }
 
-    /// mystrcasecmp(key, nodeName).
-    int order(const char* nodeName) const
+    /// mystrcasecmp(key, name of the node).
+    int order(const HxParamBase& node) const
     {
-        if (!name_ || hasBlank_) [[unlikely]]
-            return orderOfText(nodeName);
-        const std::uint64_t first = word(nodeName);
-        if (first != words_[0])
-            return words_[0] < first ? -1 : 1;
-        const std::uint64_t second = word(nodeName + 8);
-        if (second != words_[1])
-            return words_[1] < second ? -1 : 1;
-        return rest_ ? mystrcasecmp(rest_, nodeName + 16) : 0;
+        if (tag_ != 0 && node.tag_ != 0)
+            return tag_ < node.tag_ ? -1 : tag_ > node.tag_;
+        return orderOfText(node.name_);
     }
 
     /// mystrcasecmp(key, token) == 0, for a token in any text.
-    bool matchesToken(const char* token) const
-    {
-        if (isPrefixed_ && *token++ != '_')
-            return false;
-        return mystrcasecmp(name_, token) == 0;
-    }
+    bool matchesToken(const char* token) const { return orderOfText(token) == 0; }
 
 private:
-    constexpr void put(long i, unsigned char c) { words_[i / 8] |= static_cast<std::uint64_t>(c) << (56 - i % 8 * 8); }
+    constexpr void takeHead()
+    {
+        std::array<unsigned char, nameBlock> chars{};
+        const char* next = name_;
+        unsigned long i = 0;
+        if (isPrefixed_)
+            chars[i++] = '_';
+        while (i < nameBlock && *next && *next != ' ')
+            chars[i++] = upperCase(*next++);
+        head_ = std::bit_cast<std::uint64_t>(chars);
+        rest_ = i == nameBlock ? next : nullptr;
+    }
 
-    /// Eight characters of a node's name in upper case, the first one in the highest bits. Names hold letters, digits,
-    /// `-` and `_` only, and of these just the small letters have both 0x20 and 0x40 set.
-    static std::uint64_t word(const char* nodeName)
+    /// The first characters of a node's name in upper case. Names hold letters, digits, `-` and `_` only, and of these
+    /// just the small letters have both 0x20 and 0x40 set.
+    static std::uint64_t head(const char* nodeName)
     {
         std::uint64_t chars = 0;
         std::memcpy(&chars, nodeName, sizeof(chars));
-        chars ^= chars & (chars >> 1) & 0x2020202020202020u;
-        return std::endian::native == std::endian::little ? __builtin_bswap64(chars) : chars;
+        return chars ^ (chars & (chars >> 1) & 0x2020202020202020u);
     }
 
-    int orderOfText(const char* nodeName) const
-    {
-        if (isPrefixed_) {
-            if (*nodeName != '_')
-                return '_' < upperCase(*nodeName) ? -1 : 1;
-            ++nodeName;
-        }
-        return mystrcasecmp(name_, nodeName);
-    }
+    int orderOfText(const char* text) const;
 
-    std::uint64_t words_[2] = {};
     const char* name_;
-    const char* rest_ = nullptr;  // what follows the first 16 characters, null if nothing can
+    const char* rest_ = nullptr;  // what follows the head, null if nothing can
+    std::uint64_t head_ = 0;
+    std::uint32_t tag_;
     bool isPrefixed_;
-    bool hasBlank_ = false;  // among the first 16 characters
 };
 
 }  // namespace kplib::detail
