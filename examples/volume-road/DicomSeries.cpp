@@ -309,7 +309,7 @@ KpResult scanSeries(const char* folder, const std::string& uid, KpProgressInterf
         return listed;
     std::vector<SliceFile> found;
     const ProgressScope scope(&progress);
-    progress.startWorking(static_cast<int>(paths.size()), "Looking for images");
+    progress.startWorking(static_cast<int>(paths.size()), "");
     for (const std::string& path : paths) {
         if (progress.isCanceled())
             return KpResult();
@@ -342,7 +342,7 @@ KpResult readSeries(const Series& series, KpProgressInterface& progress, Volume&
     KpDArray<unsigned char> stored;
     stored.resize(volume.sliceCount() * 2);
     const ProgressScope scope(&progress);
-    progress.startWorking(static_cast<int>(series.slices.size()), "Reading images");
+    progress.startWorking(static_cast<int>(series.slices.size()), "");
     for (size_t i = 0; i < series.slices.size(); ++i) {
         if (progress.isCanceled())
             return KpResult();

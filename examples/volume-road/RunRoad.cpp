@@ -139,7 +139,7 @@ KpResult runRoad(const char* folder, const std::string& uid, const std::string& 
     if (KpResult opened = out.open(target); opened.isBad())
         return opened;
     const ProgressScope scope(&progress);
-    progress.startWorking(7, "Starting");
+    progress.startWorking(7, "");
     Road road(progress);
     Series series;
     HxParamBundle root("Volume");
