@@ -177,8 +177,8 @@ KpResult measureSpacing(Series& series, double& spacing)
             return badInput("'%s' and '%s' lie at the same place", slices[i - 1].path.c_str(), slices[i].path.c_str());
     }
     std::vector<double> sorted = gaps;
-    std::nth_element(sorted.begin(), sorted.begin() + static_cast<long>(sorted.size() / 2), sorted.end());
-    const double median = sorted[sorted.size() / 2];
+    std::nth_element(sorted.begin(), sorted.begin() + static_cast<long>((sorted.size() - 1) / 2), sorted.end());
+    const double median = sorted[(sorted.size() - 1) / 2];
     for (size_t i = 0; i < gaps.size(); ++i) {
         const long missing = std::lround(gaps[i] / median) - 1;
         if (missing > 0)
