@@ -92,7 +92,8 @@ TEST(DicomTags, areMappedForEnhancedObjects)
     std::string all;
     for (const std::string& tag : tags) {
         KpString mapped("-");
-        EXPECT_EQ(HxParamBundle::replaceTag(tag.c_str(), mapped), mapped != "-");
+        const bool isMapped = HxParamBundle::replaceTag(tag.c_str(), mapped);
+        EXPECT_EQ(isMapped, mapped != "-") << tag;
         all += mapped;
     }
     EXPECT_EQ(all, "G0018-9082G0008-9007G0020-9072G0018-9074G0020-9128G0020-9153---");

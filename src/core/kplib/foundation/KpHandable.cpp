@@ -1,0 +1,17 @@
+#include <kplib/foundation/KpHandable.h>
+
+KpHandable::~KpHandable() = default;
+
+void KpHandable::notifyDelete() {}
+
+void KpHandable::unrefLast()
+{
+    if (destructionInProgress_) {
+        ++refCount_;  // the count was 0 or less and stays so: what unref() took from it was taken in vain
+        return;
+    }
+    destructionInProgress_ = true;
+    notifyDelete();
+    destructionNotified_ = true;
+    delete this;
+}

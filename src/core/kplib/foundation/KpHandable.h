@@ -1,0 +1,41 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+/// Base of objects that KpHandle counts, for one thread; KpHandableThreaded is for objects that travel between threads.
+///
+/// The count is the number of handles, 0 for a new object. An object that no handle ever holds lives and dies as any
+/// other; one that a handle has held is deleted with its last handle, never by hand. A copy of an object is an object
+/// of its own, with a count of 0.
+class KPLIB_API KpHandable {
+public:
+    KpHandable() = default;
+    KpHandable(const KpHandable&) noexcept {}
+    KpHandable& operator=(const KpHandable&) noexcept { return *this; }
+    virtual ~KpHandable();
+
+    /// Runs once before the object is deleted, while it is whole. It may take and drop handles to the object.
+    virtual void notifyDelete();
+
+    void ref()
+    {
+        if (!destructionInProgress_)
+            ++refCount_;
+    }
+
+    /// Deletes the object when the count is no longer positive.
+    void unref()
+    {
+        if (--refCount_ <= 0) [[unlikely]]
+            unrefLast();
+    }
+
+    int refCount() const { return refCount_; }
+
+private:
+    void unrefLast();
+
+    int refCount_ = 0;
+    bool destructionInProgress_ = false;  // from then on the count stands still
+    bool destructionNotified_ = false;
+};

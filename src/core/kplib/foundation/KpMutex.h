@@ -1,0 +1,62 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+struct KpMutexPrivate;
+
+/// Mutual exclusion, recursive on request.
+///
+/// Failures of the platform don't throw: unlock() writes them to the log, the others keep silent. The caller sees to it
+/// that a mutex is unlocked when it is destroyed, and that a plain one is unlocked by the thread that holds it.
+class KPLIB_API KpMutex {
+public:
+    /// An unlocked mutex. With `recursive` its holder may lock it again, and unlocks it as often.
+    explicit KpMutex(bool recursive);
+    KpMutex(const KpMutex&) = delete;
+    KpMutex& operator=(const KpMutex&) = delete;
+    virtual ~KpMutex();
+
+    bool isRecursive() const;
+
+    /// Blocks until the mutex is held.
+    void lock();
+
+    /// Takes the mutex if that can be done at once, and tells whether it did.
+    bool tryLock();
+
+    /// Gives up one lock. A failure is one error line in the log.
+    void unlock();
+
+private:
+    friend class KpWaitCondition;
+
+    KpMutexPrivate* record_;  // keeps the platform's thread header out of here
+};
+
+/// Holds a lock for the length of a scope; null holds nothing. Nests on a recursive KpMutex.
+template <typename Lock>
+class KpScopedLockT {
+public:
+    explicit KpScopedLockT(Lock* lock) : lock_(lock)
+    {
+        if (lock_)
+            lock_->lock();
+    }
+    KpScopedLockT(const KpScopedLockT&) = delete;
+    KpScopedLockT& operator=(const KpScopedLockT&) = delete;
+
+    /// Ends the process if the unlocking throws.
+    ~KpScopedLockT()
+    {
+        if (lock_)
+            lock_->unlock();
+        lock_ = nullptr;
+    }
+
+private:
+    Lock* lock_;
+};
+
+/// One recursive lock for all modules of the system, to guard the making of singletons on first use. Valid from static
+/// initialisation until exit. Its name is older than the rule that reserves it.
+extern KPLIB_API KpMutex _KpSingleton_Mutex;  // NOLINT(bugprone-reserved-identifier)

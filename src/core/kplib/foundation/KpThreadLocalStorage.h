@@ -1,0 +1,37 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+struct KpThreadLocalStoragePrivate;
+
+/// A slot that holds one pointer for each thread, null at first. Platform failures are silent: a slot that could not be
+/// had stays null.
+class KPLIB_API KpThreadLocalStorageBase {
+public:
+    KpThreadLocalStorageBase();
+    /// `destructor` is called with a thread's value when the thread ends, unless the value is null. The main thread
+    /// only ends that way by leaving through the platform's thread exit.
+    explicit KpThreadLocalStorageBase(void (*destructor)(void*));
+    KpThreadLocalStorageBase(const KpThreadLocalStorageBase&) = delete;
+    KpThreadLocalStorageBase& operator=(const KpThreadLocalStorageBase&) = delete;
+    /// Gives the slot up. Values that threads still hold are not visited.
+    ~KpThreadLocalStorageBase();
+
+    void* get() const;
+
+    /// Replaces this thread's value; the old one is the caller's to destroy.
+    void set(void* value);
+
+private:
+    KpThreadLocalStoragePrivate* key_;
+};
+
+/// The same for pointers to T. It owns and destroys nothing by itself.
+template <typename T>
+class KpThreadLocalStorage : public KpThreadLocalStorageBase {
+public:
+    using KpThreadLocalStorageBase::KpThreadLocalStorageBase;
+
+    T* get() const { return static_cast<T*>(KpThreadLocalStorageBase::get()); }
+    void set(T* value) { KpThreadLocalStorageBase::set(value); }
+};

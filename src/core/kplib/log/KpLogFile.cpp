@@ -1,0 +1,269 @@
+#include <kplib/log/KpLogFile.h>
+
+#include <kplib/foundation/KpString.h>
+#include <kplib/log/detail/KpLogFilePrivate.h>
+
+#include <cstdarg>
+#include <initializer_list>
+
+namespace {
+
+using Lock = KpScopedLockT<KpMutex>;
+
+// Whoever logs first makes the log; this makes it at the latest.
+[[maybe_unused]] KpLogFile* const s_theLogInstance = &getTheLogInstance();
+
+KpString joined(std::initializer_list<std::string_view> pieces)
+{
+    long size = 1;
+    for (std::string_view piece : pieces)
+        size += static_cast<long>(piece.size());
+    KpString text{KpString::NoMemory()};
+    text.resize(size);
+    char* to = text.data();
+    for (std::string_view piece : pieces)
+        to += piece.copy(to, piece.size());
+    *to = '\0';
+    return text;
+}
+
+const char* levelField(KpLogLevel level)
+{
+    const char* const letter = KpLogLevelToString(level);
+    return level == KpLogInfo || !*letter ? " " : letter;
+}
+
+void traceFormatted(KpLogFile& log, KpLogLevel level, const char* module, const char* format, va_list args)
+{
+    KpString text{KpString::NoMemory()};
+    text.vprintf(format, args);
+    log.trace(level, module, text);
+}
+
+// As one piece, also for others who write to the same stream.
+void put(std::string_view line, bool addsNewline, FILE* file)
+{
+    flockfile(file);
+    std::fwrite(line.data(), 1, line.size(), file);
+    if (addsNewline)
+        putc_unlocked('\n', file);
+    funlockfile(file);
+}
+
+}  // namespace
+
+KpString KpLogFilePrivate::formatLine(KpLogLevel level, const char* module, const char* text)
+{
+    const Lock lock(&mutex);
+    const std::string_view time = timeText(dateTimeFormat);
+    return joined({time, time.empty() ? "" : ": ", levelField(level), " [", module ? module : defaultModule.c_str(),
+                   "] ", text ? text : ""});
+}
+
+void KpLogFilePrivate::write(std::string_view line)
+{
+    const bool addsNewline = !line.ends_with('\n');
+    const bool goesToFile = file && !consoleToLogEnabled;
+    if (goesToFile)
+        put(line, addsNewline, file);
+    if (!goesToFile || logToConsoleEnabled)
+        put(line, addsNewline, stdout);
+    bytesWritten += line.size() + addsNewline;
+    flush();
+}
+
+void KpLogFilePrivate::flush()
+{
+    if (!file || consoleToLogEnabled || logToConsoleEnabled)
+        std::fflush(stdout);
+    if (file)
+        std::fflush(file);
+}
+
+std::string_view KpLogFilePrivate::timeText(KpLogFile::DateTimeFormat format)
+{
+    if (format != KpLogFile::TimeOnly && format != KpLogFile::DateAndTime)
+        return {};
+    const kplib::platform::WallTime now = kplib::platform::wallTime();
+    if (format == KpLogFile::TimeOnly && timeStampSet)
+        return clock.elapsed(timeStamp, now);
+    std::string_view text = clock.dateAndTime(now);
+    if (format == KpLogFile::TimeOnly)
+        text.remove_prefix(text.find(' ') + 1);
+    return text;
+}
+
+KpLogFilePrivate& kplib::detail::logRecord(KpLogFile& log)
+{
+    return *log.record_;
+}
+
+KpLogFile& getTheLogInstance()
+{
+    static KpLogFile* const log = KpLogFile::createInstance();
+    return *log;
+}
+
+KpLogFile::KpLogFile() : record_(new KpLogFilePrivate) {}
+
+KpLogFile::~KpLogFile()
+{
+    if (record_->file)
+        std::fclose(record_->file);
+    delete record_;
+}
+
+KpLogFile* KpLogFile::createInstance()
+{
+    return new KpLogFile;
+}
+
+void KpLogFile::trace(KpLogLevel level, const char* module, const char* text)
+{
+    writeLine(level, record_->formatLine(level, module, text));
+}
+
+void KpLogFile::tracef(KpLogLevel level, const char* module, const char* format, ...)
+{
+    va_list args;
+    va_start(args, format);
+    traceFormatted(*this, level, module, format, args);
+    va_end(args);
+}
+
+void KpLogFile::printf(const char* format, ...)
+{
+    va_list args;
+    va_start(args, format);
+    traceFormatted(*this, KpLogInfo, nullptr, format, args);
+    va_end(args);
+}
+
+void KpLogFile::warnf(const char* format, ...)
+{
+    va_list args;
+    va_start(args, format);
+    traceFormatted(*this, KpLogWarning, nullptr, format, args);
+    va_end(args);
+}
+
+void KpLogFile::errorf(const char* format, ...)
+{
+    va_list args;
+    va_start(args, format);
+    traceFormatted(*this, KpLogError, nullptr, format, args);
+    va_end(args);
+}
+
+void KpLogFile::print(const char* module, const char* text)
+{
+    trace(KpLogInfo, module, text);
+}
+
+void KpLogFile::warn(const char* module, const char* text)
+{
+    trace(KpLogWarning, module, text);
+}
+
+void KpLogFile::error(const char* module, const char* text)
+{
+    trace(KpLogError, module, text);
+}
+
+void KpLogFile::writeLine(KpLogLevel level, const KpString& line)
+{
+    if (record_->logLevel <= level) {
+        const Lock lock(&record_->mutex);
+        record_->write(line);
+    }
+    const WriteCallback callback = record_->writeCallback;
+    if (callback && record_->writeCallbackLogLevel <= level)
+        callback(level, line);
+}
+
+void KpLogFile::writeCharBuffer(const char* text)
+{
+    const Lock lock(&record_->mutex);
+    const std::string_view bytes = text;
+    if (record_->file) {
+        put(bytes, false, record_->file);
+        record_->bytesWritten += bytes.size();
+    }
+    if (record_->logToConsoleEnabled)
+        put(bytes, false, stdout);
+    record_->flush();
+}
+
+void KpLogFile::flush()
+{
+    const Lock lock(&record_->mutex);
+    record_->flush();
+}
+
+void KpLogFile::setLogLevel(KpLogLevel level)
+{
+    record_->logLevel = level;
+}
+
+KpLogLevel KpLogFile::logLevel() const
+{
+    return record_->logLevel;
+}
+
+bool KpLogFile::debugEnabled() const
+{
+    return record_->logLevel == KpLogDebug || record_->writeCallbackLogLevel == KpLogDebug;
+}
+
+void KpLogFile::setWriteCallback(WriteCallback callback, KpLogLevel minimumLevel)
+{
+    record_->writeCallback = callback;
+    record_->writeCallbackLogLevel = minimumLevel;
+}
+
+KpLogFile::WriteCallback KpLogFile::writeCallback() const
+{
+    return record_->writeCallback;
+}
+
+KpLogLevel KpLogFile::writeCallbackLogLevel() const
+{
+    return record_->writeCallbackLogLevel;
+}
+
+void KpLogFile::setDateTimeFormat(DateTimeFormat format)
+{
+    const Lock lock(&record_->mutex);
+    record_->dateTimeFormat = format;
+}
+
+KpLogFile::DateTimeFormat KpLogFile::dateTimeFormat() const
+{
+    const Lock lock(&record_->mutex);
+    return record_->dateTimeFormat;
+}
+
+void KpLogFile::setDefaultModule(const char* module)
+{
+    const Lock lock(&record_->mutex);
+    record_->defaultModule = module;
+}
+
+const char* KpLogFile::defaultModule() const
+{
+    const Lock lock(&record_->mutex);
+    return record_->defaultModule.isEmpty() ? nullptr : record_->defaultModule.c_str();
+}
+
+void KpLogFile::timeString(KpString& out, DateTimeFormat format)
+{
+    const Lock lock(&record_->mutex);
+    out = joined({record_->timeText(format)});
+}
+
+void KpLogFile::resetTimeStamp()
+{
+    const Lock lock(&record_->mutex);
+    record_->timeStamp = kplib::platform::wallTime();
+    record_->timeStampSet = true;
+}

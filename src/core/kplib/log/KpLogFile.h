@@ -1,0 +1,98 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpForward.h>
+#include <kplib/log/KpLogLevel.h>
+
+struct KpLogFilePrivate;
+namespace kplib::detail {
+KpLogFilePrivate& logRecord(KpLogFile& log);
+}
+
+/// The log: every message of the library is a line here, on its way to disk when the call returns. Reached through
+/// getTheLogInstance(). With no file open, lines go to standard output.
+///
+/// A line is time, ": ", a letter for the level, the module in brackets, a blank and the text:
+///
+///     14:03:59.120: W [Dicom] text
+///
+/// An information line has a blank for its letter, and that is meant. Any thread may write; lines don't interleave.
+/// Nothing is reported of a failing file. Exhausted memory is an exception, with the log as good as before.
+class KPLIB_API KpLogFile {
+public:
+    enum DateTimeFormat : int {
+        NoDateTime = 0,
+        TimeOnly = 1,     ///< 14:03:59.120, or the time since resetTimeStamp()
+        DateAndTime = 2,  ///< 2017-03-01 14:03:59.120
+    };
+
+    /// Gets each line, with time and header and without an added newline. It runs on the thread that logs, without any
+    /// lock, and may log itself as long as that doesn't come back to it without end.
+    using WriteCallback = void (*)(KpLogLevel level, const KpString& line);
+
+    KpLogFile();
+    KpLogFile(const KpLogFile&) = delete;
+    KpLogFile& operator=(const KpLogFile&) = delete;
+    /// Closes the file.
+    ~KpLogFile();
+
+    /// A new log, the caller's to delete.
+    static KpLogFile* createInstance();
+
+    /// One line; a null `module` stands for the default module. A message below all thresholds is still formatted:
+    /// where that costs, ask debugEnabled() first.
+    void trace(KpLogLevel level, const char* module, const char* text);
+    void tracef(KpLogLevel level, const char* module, const char* format, ...);
+
+    /// Information.
+    void print(const char* module, const char* text);
+    void printf(const char* format, ...);
+    void warn(const char* module, const char* text);
+    void warnf(const char* format, ...);
+    void error(const char* module, const char* text);
+    void errorf(const char* format, ...);
+
+    /// A finished line: to file or console if `level` reaches logLevel(), with a newline added if it has none at its
+    /// end, and as it is to the callback if `level` reaches writeCallbackLogLevel().
+    void writeLine(KpLogLevel level, const KpString& line);
+
+    /// The text as it stands, whatever the thresholds, to the open file and to the console if lines are copied there.
+    void writeCharBuffer(const char* text);
+
+    void flush();
+
+    /// The least level that reaches file and console; KpLogInfo at first.
+    void setLogLevel(KpLogLevel level);
+    KpLogLevel logLevel() const;
+
+    /// Whether debug messages go anywhere.
+    bool debugEnabled() const;
+
+    /// What gets each line from `minimumLevel` on; null and KpLogOff at first. Belongs to start-up: no lock is taken.
+    void setWriteCallback(WriteCallback callback, KpLogLevel minimumLevel);
+    WriteCallback writeCallback() const;
+    KpLogLevel writeCallbackLogLevel() const;
+
+    void setDateTimeFormat(DateTimeFormat format);
+    DateTimeFormat dateTimeFormat() const;
+
+    /// The module of messages that name none; null or "" for none.
+    void setDefaultModule(const char* module);
+    /// Null when there is none. Valid until the next setDefaultModule().
+    const char* defaultModule() const;
+
+    /// The time now, as the head of a line in that format has it.
+    void timeString(KpString& out, DateTimeFormat format);
+
+    /// From now on TimeOnly shows the time since this call; hours wrap at 24, and that is meant.
+    void resetTimeStamp();
+
+private:
+    friend KpLogFilePrivate& kplib::detail::logRecord(KpLogFile& log);
+
+    KpLogFilePrivate* record_;
+};
+
+/// The one log of the process. It exists from static initialisation on and is never destroyed, so that static
+/// destructors may still log.
+KPLIB_API KpLogFile& getTheLogInstance();

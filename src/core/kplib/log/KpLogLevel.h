@@ -1,0 +1,20 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+/// How grave a message is, from the least up.
+enum KpLogLevel : int {
+    KpLogDebug = 0,
+    KpLogInfo = 1,
+    KpLogWarning = 2,
+    KpLogError = 3,
+    KpLogCritical = 4,
+    KpLogOff = 5,  ///< only as a threshold: no message reaches it
+};
+
+/// "D", "I", "W", "E" or "C"; "" for anything that is no level of a message.
+KPLIB_API const char* KpLogLevelToString(KpLogLevel level);
+
+/// The level whose letter, in upper case, begins the text: "D", "Debug" and "DX" are all KpLogDebug. Anything else, or
+/// a null `s`, gives KpLogCritical and a false `ok`. `ok` may be null.
+KPLIB_API KpLogLevel KpLogLevelFromString(const char* s, bool* ok);

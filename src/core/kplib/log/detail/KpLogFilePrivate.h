@@ -1,0 +1,49 @@
+#pragma once
+
+#include <kplib/foundation/KpMutex.h>
+#include <kplib/foundation/KpString.h>
+#include <kplib/log/KpLogFile.h>
+#include <kplib/log/detail/KpLogClock.h>
+
+#include <atomic>
+#include <cstdio>
+#include <string>
+
+/// What a log knows. The mutex guards all but the atomics, which are set during start-up, and the console flags.
+struct KpLogFilePrivate {
+    /// The line of a message; takes the mutex.
+    KpString formatLine(KpLogLevel level, const char* module, const char* text);
+
+    /// Puts out the text, with a newline unless it ends in one. The caller holds the mutex for these.
+    void write(std::string_view line);
+    void flush();
+    std::string_view timeText(KpLogFile::DateTimeFormat format);
+
+    KpMutex mutex{true};
+    std::string baseFolder;
+    bool dateFoldersEnabled = false;
+    FILE* file = nullptr;
+    FILE* consoleFile = nullptr;
+    KpString filePath;
+    long maxNumLogFiles = 40;
+    unsigned long long maxLogFileSizeInBytes = 50000000;
+    std::atomic<KpLogFile::WriteCallback> writeCallback = nullptr;
+    std::atomic<KpLogLevel> logLevel = KpLogInfo;
+    std::atomic<KpLogLevel> writeCallbackLogLevel = KpLogOff;
+    bool consoleToLogEnabled = false;
+    bool logToConsoleEnabled = false;
+    KpLogFile::DateTimeFormat dateTimeFormat = KpLogFile::TimeOnly;
+    KpString defaultModule;
+    unsigned long long bytesWritten = 0;
+    bool timeStampSet = false;
+    kplib::platform::WallTime timeStamp{};
+
+    kplib::detail::KpLogClock clock;
+};
+
+namespace kplib::detail {
+
+/// The record of a log, for what opens its file.
+KpLogFilePrivate& logRecord(KpLogFile& log);
+
+}  // namespace kplib::detail

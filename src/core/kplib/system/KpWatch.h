@@ -1,0 +1,67 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpForward.h>
+
+#include <cstdint>
+
+/// Stop watch on the system's monotonic counter, which adds up over several runs. One thread at a time.
+///
+/// A watch that was only ever continued with cont(), before the first start() of any watch in the process, reports 0.
+class KPLIB_API KpWatch {
+public:
+    /// Stands at 0, or runs at once.
+    explicit KpWatch(bool startNow);
+    /// The same with a label for dump(), copied; null for none.
+    KpWatch(const char* name, bool startNow);
+    KpWatch(const KpWatch&) = delete;
+    KpWatch& operator=(const KpWatch&) = delete;
+    ~KpWatch();
+
+    /// Runs from 0.
+    void start();
+    /// Stands at 0.
+    void reset();
+    /// Runs on from the time gathered so far.
+    void cont();
+
+    /// Stops and gives the time, in seconds or rounded to milliseconds (for up to 49 days). Stopping a watch that
+    /// stands adds the time since its last start once more.
+    float stop();
+    double stop2();
+    unsigned int stopMSec();
+
+    /// The time so far, without stopping.
+    float getTime() const;
+    double getTime2() const;
+    unsigned int getTimeMSec() const;
+
+    bool isRunning() const { return running_; }
+
+    /// Writes one line to the log with name, `index` if not 0, the time so far, and how much that is since the last
+    /// dump(). Nothing without a name. The name is used as a printf() format: a percent sign in it has to be doubled.
+    void dump(int index);
+
+private:
+    std::uint64_t ticks() const;
+    std::uint64_t stopTicks();
+
+    bool running_ = false;
+    KpString* name_ = nullptr;
+    float lastDump_ = -1;  // seconds; negative before the first
+    std::uint64_t accumulated_ = 0;
+    std::uint64_t startTicks_ = 0;
+};
+
+/// Runs a watch for the length of a scope; one that runs already is left running.
+class KPLIB_API KpScopedWatch {
+public:
+    KpScopedWatch(KpWatch& watch, bool reset);
+    KpScopedWatch(const KpScopedWatch&) = delete;
+    KpScopedWatch& operator=(const KpScopedWatch&) = delete;
+    ~KpScopedWatch();
+
+private:
+    KpWatch& watch_;
+    bool wasRunning_;
+};

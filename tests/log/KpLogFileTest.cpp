@@ -1,0 +1,265 @@
+#include <kplib/log/KpLogFile.h>
+
+#include <kplib/log/KpLogFileDefaultModuleModifier.h>
+#include <kplib/log/KpLogFileWriteCallbackDisabler.h>
+#include <kplib/log/detail/KpLogFilePrivate.h>
+
+#include <support/ExhaustedMemory.h>
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <memory>
+#include <regex>
+#include <string>
+#include <string_view>
+#include <thread>
+
+namespace {
+
+// A log that writes to a file in memory, without times.
+class FileLog {
+public:
+    FileLog()
+    {
+        record().file = open_memstream(&text_, &size_);
+        log_->setDateTimeFormat(KpLogFile::NoDateTime);
+    }
+    ~FileLog()
+    {
+        log_.reset();
+        std::free(text_);
+    }
+    KpLogFile* operator->() { return log_.get(); }
+    KpLogFilePrivate& record() { return kplib::detail::logRecord(*log_); }
+
+    /// What was flushed since the last take().
+    std::string take()
+    {
+        const std::string text(text_, size_);
+        std::rewind(record().file);
+        size_ = 0;
+        return text;
+    }
+
+private:
+    char* text_ = nullptr;
+    size_t size_ = 0;
+    std::unique_ptr<KpLogFile> log_{KpLogFile::createInstance()};
+};
+
+std::string received;
+
+void expectFree(KpMutex* mutex)
+{
+    ASSERT_TRUE(mutex->tryLock());
+    mutex->unlock();
+}
+
+void receive(KpLogLevel level, const KpString& line)
+{
+    received += std::to_string(level) + line.c_str();
+}
+
+}  // namespace
+
+TEST(KpLogLevel, lettersAndBack)
+{
+    const std::string letters = "DIWEC";
+    for (const char* text :
+         {"DX", "Info", "Warning", "E", "Critical", "warning", "", static_cast<const char*>(nullptr)}) {
+        const size_t level = text && *text ? letters.find(*text) : std::string::npos;
+        const bool known = level != std::string::npos;
+        bool ok = !known;
+        EXPECT_EQ(KpLogLevelFromString(text, &ok), known ? static_cast<KpLogLevel>(level) : KpLogCritical);
+        EXPECT_EQ(ok, known);
+        EXPECT_TRUE(!ok || KpLogLevelToString(KpLogLevelFromString(text, nullptr)) == std::string(1, *text));
+    }
+    for (int other : {-1, 5, 1000})
+        EXPECT_STREQ(KpLogLevelToString(static_cast<KpLogLevel>(other)), "");
+}
+
+TEST(KpLogFile, linesHaveOneShape)
+{
+    FileLog log;
+    log->setLogLevel(KpLogDebug);
+    const struct {
+        int level;
+        const char *module, *text, *line;
+    } cases[] = {{0, "Dicom", "text", "D [Dicom] text\n"},
+                 {1, "Dicom", "text", "  [Dicom] text\n"},
+                 {2, nullptr, "text", "W [] text\n"},
+                 {3, "", "text", "E [] text\n"},
+                 {4, "Dicom", "text", "C [Dicom] text\n"},
+                 {7, nullptr, "text", "  [] text\n"},
+                 {1, nullptr, "", "  [] \n"},
+                 {2, nullptr, "x\n\n", "W [] x\n\n"}};
+    for (const auto& c : cases) {
+        log->trace(static_cast<KpLogLevel>(c.level), c.module, c.text);
+        EXPECT_EQ(log.take(), c.line);
+    }
+    log->writeLine(KpLogError, "");
+    log->setDefaultModule("Def");
+    log->print("Mod", "%d");
+    log->printf("%d %s", 1, "a");
+    log->warn("Mod", "%d");
+    log->warnf("%d %s", 2, "b");
+    log->error("Mod", "%d");
+    log->errorf("%d %s", 3, std::string(5000, 'c').c_str());
+    log->tracef(KpLogCritical, "Mod", "%d %s", 4, "d");
+    EXPECT_EQ(log.take(), "\n  [Mod] %d\n  [Def] 1 a\nW [Mod] %d\nW [Def] 2 b\nE [Mod] %d\nE [Def] 3 " +
+                              std::string(5000, 'c') + "\nC [Mod] 4 d\n");
+}
+
+TEST(KpLogFile, thresholdsOfFileAndCallbackAreIndependent)
+{
+    FileLog log;
+    const struct {
+        KpLogLevel file, callback, message;
+        const char *written, *called;
+        bool debug;
+    } cases[] = {{KpLogWarning, KpLogDebug, KpLogInfo, "", "1  [] text", true},
+                 {KpLogInfo, KpLogError, KpLogWarning, "W [] text\n", "", false},
+                 {KpLogDebug, KpLogOff, KpLogCritical, "C [] text\n", "", true},
+                 {KpLogOff, KpLogCritical, KpLogCritical, "", "4C [] text", false}};
+    for (const auto& c : cases) {
+        received.clear();
+        log->setLogLevel(c.file);
+        log->setWriteCallback(receive, c.callback);
+        log->trace(c.message, nullptr, "text");
+        EXPECT_EQ(log.take(), c.written);
+        EXPECT_EQ(received, c.called) << "without the added newline";
+        EXPECT_EQ(log->debugEnabled(), c.debug);
+    }
+}
+
+TEST(KpLogFile, linesGoWhereTheFlagsLead)
+{
+    const struct {
+        bool hasFile, consoleToLog, logToConsole;
+        const char *toFile, *toConsole;
+    } cases[] = {{true, false, false, "E [] x\nraw", ""}, {true, false, true, "E [] x\nraw", "E [] x\nraw"},
+                 {true, true, false, "raw", "E [] x\n"},  {true, true, true, "raw", "E [] x\nraw"},
+                 {false, false, false, "", "E [] x\n"},   {false, false, true, "", "E [] x\nraw"}};
+    for (const auto& c : cases) {
+        FileLog log;
+        FILE* const file = log.record().file;
+        log.record().file = c.hasFile ? file : nullptr;
+        log.record().consoleToLogEnabled = c.consoleToLog;
+        log.record().logToConsoleEnabled = c.logToConsole;
+        testing::internal::CaptureStdout();
+        log->error(nullptr, "x");
+        log->writeCharBuffer("raw");
+        EXPECT_EQ(testing::internal::GetCapturedStdout(), c.toConsole);
+        EXPECT_EQ(log.record().bytesWritten, c.hasFile ? 10u : 7u);
+        log.record().file = file;
+        EXPECT_EQ(log.take(), c.toFile);
+    }
+}
+
+TEST(KpLogFile, timeIsLocal)
+{
+    FileLog log;
+    KpString text("old");
+    log->timeString(text, static_cast<KpLogFile::DateTimeFormat>(3));
+    EXPECT_TRUE(text.isEmpty());
+    const struct {
+        const char* zone;
+        long offset;
+    } cases[] = {{"UTC0", 0}, {"TST-5:30", 19800}, {"UTC0", 0}, {"TST11", -39600}};
+    for (const auto& c : cases) {  // within one second, as a rule
+        setenv("TZ", c.zone, 1);
+        char expected[32];
+        time_t now = 0;
+        do {  // again, should the second have changed
+            now = kplib::platform::wallTime().seconds;
+            const time_t shifted = now + c.offset;
+            tm fields{};
+            strftime(expected, sizeof expected, "%Y-%m-%d %H:%M:%S.", gmtime_r(&shifted, &fields));
+            log->timeString(text, KpLogFile::DateAndTime);
+        } while (now != kplib::platform::wallTime().seconds);
+        EXPECT_TRUE(std::regex_match(text.c_str(), std::regex(std::string(expected) + "\\d\\d\\d"))) << text;
+    }
+    unsetenv("TZ");
+    log->setDateTimeFormat(KpLogFile::TimeOnly);
+    log->error("M", "text");
+    EXPECT_TRUE(std::regex_match(log.take(), std::regex("\\d\\d:\\d\\d:\\d\\d\\.\\d\\d\\d: E \\[M\\] text\n")));
+}
+
+TEST(KpLogFile, relativeTimeCountsFromTheStamp)
+{
+    kplib::detail::KpLogClock clock;
+    EXPECT_EQ(clock.elapsed({1000, 900}, {1001, 100}), "00:00:00.200");
+    EXPECT_EQ(clock.elapsed({1000, 100}, {1000 + 3600 + 2 * 60 + 3, 104}), "01:02:03.004");
+    FileLog log;
+    KpString text;
+    log->resetTimeStamp();
+    log.record().timeStamp.seconds -= 25 * 3600;
+    log->timeString(text, KpLogFile::TimeOnly);
+    EXPECT_TRUE(std::string_view(text).starts_with("01:00:00.")) << text;
+    log->timeString(text, KpLogFile::DateAndTime);
+    EXPECT_EQ(text.length(), 23);
+}
+
+TEST(KpLogFileCompanions, restoreWhatTheyFound)
+{
+    KpLogFile& log = getTheLogInstance();
+    {
+        const KpLogFileDefaultModuleModifier outer("outer");
+        {
+            const KpLogFileDefaultModuleModifier inner(nullptr);
+            EXPECT_EQ(log.defaultModule(), nullptr);
+        }
+        EXPECT_STREQ(log.defaultModule(), "outer");
+        kplib::test::failAtEachAllocation(
+            [] { const KpLogFileDefaultModuleModifier longer("longer than there was room"); },
+            [&] { EXPECT_STREQ(log.defaultModule(), "outer"); });
+    }
+    EXPECT_EQ(log.defaultModule(), nullptr);
+    log.setWriteCallback(receive, KpLogWarning);
+    KpLogFileWriteCallbackDisabler disabler;
+    {
+        const KpLogFileScopedWriteCallbackDisabler scoped;
+        EXPECT_TRUE(!log.writeCallback() && log.writeCallbackLogLevel() == 5);
+    }
+    EXPECT_TRUE(log.writeCallback() == receive && log.writeCallbackLogLevel() == KpLogWarning);
+    disabler.disableWriteCallback();
+    EXPECT_EQ(log.writeCallback(), nullptr);
+    disabler.restoreWriteCallback();
+    EXPECT_EQ(log.writeCallback(), receive);
+    log.setWriteCallback(nullptr, KpLogOff);
+}
+
+TEST(KpLogFile, exhaustedMemoryLeavesTheLogAsItWas)
+{
+    FileLog log;
+    log->setDateTimeFormat(KpLogFile::DateAndTime);
+    kplib::test::failAtEachAllocation(
+        [&] {
+            log->tracef(KpLogError, nullptr, "%0100d", 1);
+            KpString time;
+            log->timeString(time, KpLogFile::TimeOnly);
+            log->setDefaultModule("a module that is too long for the memory that there is");
+        },
+        [&] { std::thread(expectFree, &log.record().mutex).join(); });
+}
+
+TEST(KpLogFileThreads, linesDontInterleave)
+{
+    FileLog log;
+    const std::string text(500, 'x');
+    const auto work = [&] {
+        for (int k = 0; k < 200; ++k) {
+            log->errorf("%s", text.c_str());
+            log->setDefaultModule(k % 2 ? "a" : "b");
+        }
+    };
+    std::thread threads[] = {std::thread(work), std::thread(work), std::thread(work), std::thread(work)};
+    for (std::thread& thread : threads)
+        thread.join();
+    const std::string all = log.take();
+    EXPECT_EQ(all.size(), log.record().bytesWritten);
+    const std::regex line("E \\[[ab]?\\] x{500}\n");
+    const auto lines = std::distance(std::sregex_iterator(all.begin(), all.end(), line), std::sregex_iterator());
+    EXPECT_EQ(lines, 800);
+}

@@ -1,0 +1,39 @@
+#pragma once
+
+#include <support/FailingMalloc.h>
+
+#include <kplib/foundation/KpMemoryException.h>
+
+#include <gtest/gtest.h>
+
+#include <new>
+
+namespace kplib::test {
+
+/// Runs `work` with its first allocation failing, then its second, and so on until it gets through; runs `check` after
+/// each. A failure has to come out as an exception.
+template <typename Work, typename Check>
+void failAtEachAllocation(Work work, Check check)
+{
+    for (long n = 0;; ++n) {
+        SCOPED_TRACE(n);
+        bool failed = false, allocated = false;
+        {
+            const FailingMalloc failing(n, 1);
+            try {
+                work();
+            } catch (const KpMemoryException&) {
+                failed = true;
+            } catch (const std::bad_alloc&) {
+                failed = true;
+            }
+            allocated = failing.count() > n;
+        }
+        check();
+        if (!allocated)
+            return;
+        EXPECT_TRUE(failed);
+    }
+}
+
+}  // namespace kplib::test
