@@ -94,7 +94,7 @@ Picture cut(Volume& shown, const Along& across, const Along& down, const Along& 
             const double top = at[0] + x.share * (at[x.step] - at[0]);
             const double bottom = at[y.step] + x.share * (at[y.step + x.step] - at[y.step]);
             picture.pixels[row * picture.width + column] =
-                static_cast<unsigned char>(top + y.share * (bottom - top) + 0.5);
+                static_cast<unsigned char>(std::lround(top + y.share * (bottom - top)));
         }
     }
     return picture;
