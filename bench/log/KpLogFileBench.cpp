@@ -44,7 +44,7 @@ template <typename Write>
 void logLine(benchmark::State& state, Write writeTo)
 {
     const std::unique_ptr<KpLogFile> log(KpLogFile::createInstance());
-    KpLogFilePrivate& record = logRecord(*log);
+    KpLogFilePrivate& record = kplib::detail::logRecord(*log);
     record.file = std::fopen(path, "w");
     long lines = 0;
     for (auto _ : state) {

@@ -9,41 +9,37 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstring>
 #include <memory>
 #include <string>
 #include <vector>
 
-using kplib::test::slotOf;
-
 TEST(KpTypeInfo, registryFindsWhatIsAlive)
 {
-    EXPECT_EQ(KpTypeInfo::fromName("KpTypedObject"), KpTypedObject::getClassTypeId());
-    EXPECT_EQ(KpTypeInfo::fromName("KpInterface"), KpInterface::getClassTypeId());
-    EXPECT_EQ(KpTypeInfo::fromName("KpInterfaceOwner"), KpInterfaceOwner::getClassTypeId());
-    const long before = KpTypeInfo::allTypes().size();
+    for (const KpTypeInfo* type :
+         {KpTypedObject::getClassTypeId(), KpInterface::getClassTypeId(), KpInterfaceOwner::getClassTypeId()})
+        EXPECT_EQ(KpTypeInfo::fromName(type->name()), type);
+    const KpDArray<KpTypeInfo*>& all = KpTypeInfo::allTypes();
+    const long before = all.size();
     {
         const KpTypeInfo key("b");
-        const std::string names[] = {"c", "a", "b", "b", "aa", "Z", "b"};
         std::vector<std::unique_ptr<KpTypeInfo>> types;
-        for (const std::string& name : names)
-            types.push_back(std::make_unique<KpTypeInfo>(name.c_str(), nullptr, nullptr, nullptr));
-        const KpDArray<KpTypeInfo*>& all = KpTypeInfo::allTypes();
-        ASSERT_EQ(all.size(), before + 7);
-        for (long i = 1; i < all.size(); ++i)
-            EXPECT_LE(std::strcmp(all[i - 1]->name(), all[i]->name()), 0);
+        for (const char* name : {"c", "a", "b", "b", "aa", "Z", "b"})
+            types.push_back(std::make_unique<KpTypeInfo>(name, nullptr, nullptr, nullptr));
+        EXPECT_EQ(all.size(), before + 7);
+        EXPECT_TRUE(std::is_sorted(all.begin(), all.end(),
+                                   [](auto* a, auto* b) { return std::strcmp(a->name(), b->name()) < 0; }));
         EXPECT_EQ(KpTypeInfo::fromName("a"), types[1].get());
         EXPECT_EQ(KpTypeInfo::fromName("b"), types[6].get()) << "the last of several";
-        for (const char* unknown : {"", "ab", "A", "zzz"})
-            EXPECT_EQ(KpTypeInfo::fromName(unknown), nullptr) << unknown;
         KpTypeInfo::removeType("b");
-        EXPECT_EQ(KpTypeInfo::fromName("b"), types[3].get());
         types[2].reset();
-        EXPECT_EQ(KpTypeInfo::fromName("b"), types[3].get()) << "the destroyed one, not one of its name";
+        EXPECT_EQ(KpTypeInfo::fromName("b"), types[3].get()) << "what is left is found by identity, not by name";
         KpTypeInfo::removeType("unknown");
     }
-    EXPECT_EQ(KpTypeInfo::allTypes().size(), before);
-    EXPECT_EQ(KpTypeInfo::fromName("b"), nullptr);
+    EXPECT_EQ(all.size(), before);
+    for (const char* unknown : {"", "ab", "A", "b", "zzz"})
+        EXPECT_EQ(KpTypeInfo::fromName(unknown), nullptr) << unknown;
 }
 
 TEST(KpTypeInfo, isOfTypeWalksBothParents)
@@ -57,18 +53,22 @@ TEST(KpTypeInfo, isOfTypeWalksBothParents)
 
 namespace {
 
+std::string ends;  // of the objects below, by their letters
+
 struct Part : KpInterface {
-    Part(KpInterfaceOwner* itsOwner, std::string* log, char letter) :
-        KpInterface(itsOwner, KpInterfaceOwner::OwnerDeletes), ends(log), name(letter)
+    Part(KpInterfaceOwner* itsOwner, char letter) : KpInterface(itsOwner, KpInterfaceOwner::OwnerDeletes), name(letter)
     {
     }
     ~Part() override
     {
-        *ends += name;
+        ends += name;
         owner()->notifyDelete();  // a way back into the owner that has to be safe
     }
-    std::string* ends;
     char name;
+};
+
+struct Kept : KpHandable {
+    ~Kept() override { ends += 'k'; }
 };
 
 KpTypedObject* newestPart(const KpHandle<KpInterfaceOwner>& owner)
@@ -97,15 +97,13 @@ TEST(KpInterfaceOwner, findsTheNewestAndThenItself)
 
 TEST(KpInterfaceOwner, attachesOnceAtTheFirstQuery)
 {
-    static int calls;
-    calls = 0;
+    static int calls = 0;
     KpInterfaceOwnerDefaultImpl owner;
-    owner.registerAttachInterfacesOnceCB(
-        [](void* data) {
-            ++calls;
-            static_cast<KpInterfaceOwner*>(data)->getInterface(KpInterface::getClassTypeId());
-        },
-        static_cast<KpInterfaceOwner*>(&owner));
+    const auto attach = [](void* data) {
+        ++calls;
+        static_cast<KpInterfaceOwner*>(data)->getInterface(nullptr);
+    };
+    owner.registerAttachInterfacesOnceCB(attach, static_cast<KpInterfaceOwner*>(&owner));
     KpDArray<KpTypedObject*> all;
     owner.getAllInterfaces(all);
     owner.getInterface(nullptr);
@@ -114,17 +112,10 @@ TEST(KpInterfaceOwner, attachesOnceAtTheFirstQuery)
 
 TEST(KpInterfaceOwner, takesWhatItOwnsWithItsLastHandle)
 {
-    struct Kept : KpHandable {
-        explicit Kept(std::string* log) : ends(log) {}
-        ~Kept() override { *ends += 'k'; }
-        std::string* ends;
-    };
-    std::string ends;
-    auto* const first = new Part(nullptr, &ends, 'a');
-    KpHandle<KpInterfaceOwner> owner(first->owner());
+    KpHandle<KpInterfaceOwner> owner((new Part(nullptr, 'a'))->owner());
     const KpInterface listed(owner.get(), KpInterfaceOwner::StaticMemory);
-    new Part(owner.get(), &ends, 'b');
-    owner->addHandle(new Kept(&ends));
+    new Part(owner.get(), 'b');
+    owner->addHandle(new Kept);
     owner = nullptr;
     EXPECT_EQ(ends, "bak");
 }
@@ -132,11 +123,10 @@ TEST(KpInterfaceOwner, takesWhatItOwnsWithItsLastHandle)
 TEST(KpInterfaceOwner, registrationWithoutMemoryChangesNothing)
 {
     KpInterfaceOwnerDefaultImpl owner;
-    std::unique_ptr<KpInterface> attached;
+    std::unique_ptr<KpInterface> attached, alone;
     kplib::test::failAtEachAllocation(
         [&] { attached = std::make_unique<KpInterface>(&owner, KpInterfaceOwner::StaticMemory); },
         [&] { EXPECT_EQ(owner.getInterface(KpInterface::getClassTypeId()), attached.get()); });
-    std::unique_ptr<KpInterface> alone;
     kplib::test::failAtEachAllocation(
         [&] { alone = std::make_unique<KpInterface>(nullptr, KpInterfaceOwner::StaticMemory); }, [] {});
     const KpHandle<KpInterfaceOwner> last(alone->owner());
@@ -147,15 +137,14 @@ TEST(KpEditable, announcesItsChanges)
     static std::string heard;
     struct Listener final : KpEditingListener {
         explicit Listener(char letter) : name(letter) {}
-        void editingStarted(KpEditable* object) override { hear('+', object); }
-        void editingFinished(KpEditable* object) override { hear('-', object); }
-        void hear(char what, KpEditable* object) const
+        void editingStarted(KpEditable* object) override { hear("+", object); }
+        void editingFinished(KpEditable* object) override { hear("-", object); }
+        void hear(const char* what, KpEditable* object)
         {
-            heard += {what, name, static_cast<char>('0' + object->getEditingFlags())};
+            heard += what + (name + std::to_string(object->getEditingFlags()));
         }
         char name;
     };
-    heard.clear();
     Listener a('a'), b('b'), unknown('u');
     KpEditable object;
     for (KpEditingListener* listener : {&a, &b, &a})
@@ -173,11 +162,8 @@ TEST(KpEditable, announcesItsChanges)
 
 TEST(KpTypedObject, tablesAreTheOnesOthersAreCompiledAgainst)
 {
-    EXPECT_EQ(slotOf(&KpTypedObject::getTypeId), 0);
-    EXPECT_EQ(slotOf(&KpInterfaceOwner::ref), 3);
-    EXPECT_EQ(slotOf(&KpInterfaceOwner::unref), 4);
-    EXPECT_EQ(slotOf(&KpInterfaceOwner::notifyDelete), 5);
-    EXPECT_EQ(slotOf(&KpEditable::startEditing), 0);
-    EXPECT_EQ(slotOf(&KpEditable::getEditingFlags), 4);
-    EXPECT_EQ(slotOf(&KpEditingListener::editingFinished), 1);
+    EXPECT_EQ(kplib::test::slotsOf(&KpTypedObject::getTypeId, &KpInterfaceOwner::ref, &KpInterfaceOwner::notifyDelete,
+                                   &KpEditable::startEditing, &KpEditable::getEditingFlags,
+                                   &KpEditingListener::editingFinished),
+              (std::vector<long>{0, 3, 5, 0, 4, 1}));
 }

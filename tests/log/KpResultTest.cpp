@@ -10,8 +10,8 @@
 
 #include <string>
 #include <thread>
-#include <vector>
 
+using kplib::test::Lines;
 using kplib::test::LogCapture;
 
 namespace {
@@ -41,6 +41,7 @@ protected:
     {
         KpResult::notificationCallbackRemoveAll();
         Tm::setError(KpResult());
+        asked.clear();
     }
     LogCapture log{KpLogError};
 };
@@ -51,14 +52,11 @@ TEST(KpResult, successHasNoRecord)
 {
     static_assert(sizeof(KpResult) == sizeof(void*));
     const LogCapture log;
-    const KpResult successes[] = {KpResult(), KpResult(0, "text", "data"), KpResult(KpResult::Ok, 7, "f", "t", "d"),
-                                  KpResult(0, 7, "f", "t", "d")};
-    for (const KpResult& result : successes) {
+    for (const KpResult& result : {KpResult(), KpResult(0, "text", "data"), KpResult(KpResult::Ok, 7, "f", "t", "d")}) {
         EXPECT_TRUE(result.isOk() && !result.isBad() && !result.hasData());
         EXPECT_EQ(result.codeValue() + result.line(), 0);
         EXPECT_EQ(std::string(result.text()) + result.file() + result.data(), "");
         result.throwOnFail();
-        result.notify();
     }
     EXPECT_TRUE(log.lines().empty());
 }
@@ -66,14 +64,11 @@ TEST(KpResult, successHasNoRecord)
 TEST(KpResult, failureKeepsWhatItWasGiven)
 {
     const LogCapture log;
-    const KpResult result(5000, 12, "file.cpp", "text", "data"), shared = result;
-    EXPECT_EQ(log.lines(), (std::vector<std::string>{
-                               "D [KpResult::Error] code: 1388 file: file.cpp line: 12 message: text data: data"}))
+    const KpResult result(5000, 12, "f.cpp", "text", "data"), shared = result;
+    EXPECT_EQ(log.lines(), Lines{"D [KpResult::Error] code: 1388 file: f.cpp line: 12 message: text data: data"})
         << "once, for all copies";
-    EXPECT_TRUE(shared.isBad());
-    EXPECT_EQ(shared.code(), 5000);
-    EXPECT_EQ(shared.line(), 12);
-    EXPECT_STREQ(shared.file(), "file.cpp");
+    EXPECT_TRUE(shared.isBad() && shared.code() == 5000 && shared.line() == 12);
+    EXPECT_STREQ(shared.file(), "f.cpp");
     EXPECT_EQ(shared.text(), result.text()) << "the same record";
     KpResult bare(5000, nullptr, nullptr);
     EXPECT_EQ(std::string(bare.text()) + bare.file() + bare.data() + std::to_string(bare.line()), "0");
@@ -87,25 +82,15 @@ TEST(KpResult, codesHaveTheirOwnTexts)
     const struct {
         int code;
         const char *given, *data, *shortText;
-    } cases[] = {
-        {1, nullptr, "", ""},
-        {2, nullptr, "internal error", "internal error"},
-        {2, "given", "given", "internal error"},
-        {9, "", "false", "false"},
-        {10, nullptr, "", ""},
-        {11, nullptr, "operation interrupted", ""},
-        {12, "", "", "failed to write file"},
-        {13, nullptr, "", "failed to read file"},
-        {17, nullptr, "one of the arguments is invalid", "one of the arguments is invalid"},
-        {120, nullptr, "Could not save snapshot image!", ""},
-        {4104, nullptr,
-         "Exec format error. An attempt was made to execute a file that is not executable or that has an "
-         "invalid executable-file format. ",
-         ""},
-        {4132, nullptr,
-         "Resource deadlock would occur. The argument to a math function is not in the domain of the function.", ""},
-        {-1, nullptr, "", ""},
-    };
+    } cases[] = {{1, nullptr, "", ""},
+                 {2, nullptr, "internal error", "internal error"},
+                 {2, "given", "given", "internal error"},
+                 {11, nullptr, "operation interrupted", ""},
+                 {12, "", "", "failed to write file"},
+                 {17, nullptr, "one of the arguments is invalid", "one of the arguments is invalid"},
+                 {120, nullptr, "Could not save snapshot image!", ""},
+                 {4112, nullptr, "Resource busy.", ""},
+                 {-1, nullptr, "", ""}};
     for (const auto& c : cases) {
         SCOPED_TRACE(c.code);
         const KpResult result(c.code, "x", c.given);
@@ -140,12 +125,9 @@ TEST_F(TmTest, failLogsRemembersAndNotifies)
     EXPECT_FALSE(Tm::fail(KpResult()));
     EXPECT_TRUE(Tm::fail(KpResult(0x1F, 7, "a.cpp", "100%s", "da%nta")));
     EXPECT_TRUE(Tm::failWin(KpResult(1, "second", nullptr)));
-    EXPECT_EQ(log.lines(), (std::vector<std::string>{
-                               "E [] \nFile: a.cpp\nLine: 7\nCode: 1F\nText: 100%s\nData: da%nta",
-                               "E [] \nFile: \nLine: 0\nCode: 1\nText: second\nData: ",
-                           }));
+    EXPECT_EQ(log.lines(), (Lines{"E [] \nFile: a.cpp\nLine: 7\nCode: 1F\nText: 100%s\nData: da%nta",
+                                  "E [] \nFile: \nLine: 0\nCode: 1\nText: second\nData: "}));
     EXPECT_EQ(asked, "a31 a1 ");
-    asked.clear();
     EXPECT_EQ(Tm::lastError(true).code(), 0x1F);
     EXPECT_EQ(Tm::lastError(false).code(), 0x1F) << "the first one stays, until it is taken";
     EXPECT_TRUE(Tm::lastError(true).isOk());
@@ -153,16 +135,14 @@ TEST_F(TmTest, failLogsRemembersAndNotifies)
 
 TEST_F(TmTest, callbacksAreAskedFromTheLastToTheFirst)
 {
-    const KpResult failure(1, "x", nullptr);
-    const auto heard = [&] {
+    const auto heard = [failure = KpResult(1, "x", nullptr)] {
         asked.clear();
         failure.notify();
         return asked;
     };
     EXPECT_EQ(heard(), "");
-    KpResult::notificationCallbackAdd(ask<'a', false>);
-    KpResult::notificationCallbackAdd(ask<'b', false>);
-    KpResult::notificationCallbackAdd(ask<'a', false>);
+    for (auto callback : {ask<'a', false>, ask<'b', false>, ask<'a', false>})
+        KpResult::notificationCallbackAdd(callback);
     EXPECT_EQ(heard(), "a1 b1 a1 ");
     KpResult::notificationCallbackRemove(ask<'a', false>);
     KpResult::notificationCallbackRemove(ask<'x', false>);
@@ -180,15 +160,13 @@ TEST_F(TmTest, tmErrorTellsThePlace)
 {
     const KpResult verbose = Tm::tmError(KpResult::ReadOnly, "f.cpp", 3, "fn", "day", "hour", nullptr, true, false);
     EXPECT_STREQ(verbose.data(), "in_function=fn\ndate=day\ntime=hour");
-    EXPECT_EQ(verbose.line(), 3);
-    EXPECT_STREQ(verbose.file(), "f.cpp");
+    EXPECT_EQ(verbose.file() + std::to_string(verbose.line()), "f.cpp3");
     EXPECT_TRUE(Tm::lastError(true).isOk());
     EXPECT_STREQ(Tm::tmError(KpResult::ReadOnly, "f", 3, "fn", "d", "t", "more", true, false).data(),
                  "more\nin_function=fn\ndate=d\ntime=t");
     const KpResult here = KP_ERROR_DATA(KpResult::OutOfRange, "index");
     EXPECT_EQ(here.line(), __LINE__ - 1);
-    EXPECT_STREQ(here.text(), "out of range");
-    EXPECT_EQ(Tm::lastError(true).code(), KpResult::OutOfRange);
+    EXPECT_EQ(Tm::lastError(true).text(), here.text());
     EXPECT_TRUE(KP_ERROR(KpResult::Ok).isOk());
     EXPECT_TRUE(Tm::lastError(true).isOk()) << "a success clears it";
 }
@@ -199,25 +177,14 @@ TEST(TmThreads, eachThreadHasItsLastError)
     Tm::setError(KpResult(1, "mine", nullptr));
     std::thread([] {
         EXPECT_TRUE(Tm::lastError(true).isOk());
-        EXPECT_TRUE(Tm::fail(KpResult(2, "other", nullptr)));
-        EXPECT_STREQ(Tm::lastError(true).text(), "other");
-    }).join();
-    EXPECT_STREQ(Tm::lastError(false).text(), "mine");
-}
-
-TEST(Tm, exhaustedMemoryIsAnExceptionAndNothingElse)
-{
-    getTheLogInstance().setLogLevel(KpLogOff);
-    std::thread([] {  // which has no last error yet
         const KpResult failure(1, "text", "data");
         kplib::test::failAtEachAllocation([&] { Tm::fail(failure); }, [] {});
-        EXPECT_STREQ(Tm::lastError(false).text(), "text");
+        EXPECT_STREQ(Tm::lastError(true).text(), "text");
         kplib::test::failAtEachAllocation(
             [] { Tm::tmError(KpResult::ReadOnly, "f", 3, "fn", "day", "hour", "data", true, true); }, [] {});
         EXPECT_EQ(Tm::lastError(true).code(), KpResult::ReadOnly);
         kplib::test::failAtEachAllocation([] { KpResult::notificationCallbackAdd(ask<'a', true>); }, [] {});
         KpResult::notificationCallbackRemoveAll();
-    })
-        .join();
-    getTheLogInstance().setLogLevel(KpLogInfo);
+    }).join();
+    EXPECT_STREQ(Tm::lastError(false).text(), "mine");
 }

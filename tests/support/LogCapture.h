@@ -8,14 +8,15 @@
 
 namespace kplib::test {
 
+using Lines = std::vector<std::string>;
+
 /// Collects the lines of the process's log, such as "E [Dicom] text", and keeps them from the console. One at a time.
 class LogCapture {
 public:
     explicit LogCapture(KpLogLevel from = KpLogDebug)
     {
         lines().clear();
-        getTheLogInstance().setLogLevel(KpLogOff);
-        getTheLogInstance().setDateTimeFormat(KpLogFile::NoDateTime);
+        set(KpLogOff, KpLogFile::NoDateTime);
         getTheLogInstance().setWriteCallback([](KpLogLevel, const KpString& line) { lines().push_back(line.c_str()); },
                                              from);
     }
@@ -24,14 +25,20 @@ public:
     ~LogCapture()
     {
         getTheLogInstance().setWriteCallback(nullptr, KpLogOff);
-        getTheLogInstance().setDateTimeFormat(KpLogFile::TimeOnly);
-        getTheLogInstance().setLogLevel(KpLogInfo);
+        set(KpLogInfo, KpLogFile::TimeOnly);
     }
 
-    static std::vector<std::string>& lines()
+    static Lines& lines()
     {
-        static std::vector<std::string> collected;
+        static Lines collected;
         return collected;
+    }
+
+private:
+    static void set(KpLogLevel level, KpLogFile::DateTimeFormat format)
+    {
+        getTheLogInstance().setLogLevel(level);
+        getTheLogInstance().setDateTimeFormat(format);
     }
 };
 

@@ -1,17 +1,21 @@
 #pragma once
 
 #include <cstring>
+#include <vector>
 
 namespace kplib::test {
 
-/// Position of a virtual operation in its class's table, which other modules are compiled against; each destructor
+/// Positions of virtual operations in their classes' tables, which other modules are compiled against; each destructor
 /// takes two. By the C++ ABI of gcc and clang.
-template <typename Function>
-int slotOf(Function member)
+template <typename... Functions>
+std::vector<long> slotsOf(Functions... members)
 {
-    long word = 0;
-    std::memcpy(&word, &member, sizeof word);
-    return static_cast<int>(word / static_cast<long>(sizeof(void*)));
+    const auto slot = [](auto member) {
+        long word = 0;
+        std::memcpy(&word, &member, sizeof word);
+        return word / static_cast<long>(sizeof(void*));
+    };
+    return {slot(members)...};
 }
 
 }  // namespace kplib::test

@@ -26,12 +26,17 @@
 #include <kplib/foundation/KpTypedObject.h>
 #include <kplib/foundation/KpWaitCondition.h>
 #include <kplib/foundation/StringUtils.h>
+#include <kplib/imaging/KpColor.h>
 #include <kplib/log/KpLastError.h>
 #include <kplib/log/KpLogFile.h>
 #include <kplib/log/KpLogFileDefaultModuleModifier.h>
 #include <kplib/log/KpLogFileWriteCallbackDisabler.h>
 #include <kplib/log/KpLogLevel.h>
 #include <kplib/log/KpResult.h>
+#include <kplib/param/HxParamBase.h>
+#include <kplib/param/HxParamBundle.h>
+#include <kplib/param/HxParamEditCheck.h>
+#include <kplib/param/HxParameter.h>
 #include <kplib/rawdata/KpRawData.h>
 #include <kplib/rawdata/KpTypedElement.h>
 #include <kplib/rawdata/KpTypedPointer.h>

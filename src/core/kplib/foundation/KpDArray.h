@@ -114,6 +114,10 @@ public:
     const T* begin() const noexcept { return data_; }
     const T* end() const noexcept { return data_ + size_; }
 
+protected:
+    /// For derived arrays that fill raw storage themselves.
+    void setSize(long size) noexcept { size_ = size; }
+
 private:
     using Traits = KpElementTraits<T>;
     static constexpr bool isManaged = Traits::kind == KpElementKind::Managed;

@@ -38,6 +38,7 @@ public:
             old->unref();
         return *this;
     }
+    // NOLINTNEXTLINE(bugprone-unhandled-self-assignment): the same pointer is left alone
     KpHandle& operator=(const KpHandle& other) { return *this = other.pointer_; }
     KpHandle& operator=(KpHandle&& other) noexcept
     {

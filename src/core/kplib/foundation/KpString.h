@@ -54,8 +54,12 @@ public:
     {
         if (size() == 0 || size() >= capacity()) [[unlikely]]
             growForOne();
-        data()[size() - 1] = c;
-        KpDArray<char>::append('\0');
+        char* const text = data();
+        const long end =
+            size();  // read once: a store through a char pointer may change anything, for all a compiler knows
+        text[end - 1] = c;
+        text[end] = '\0';
+        setSize(end + 1);
     }
 
     /// Equality of length and of the text up to the first NUL.

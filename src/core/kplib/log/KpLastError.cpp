@@ -53,7 +53,7 @@ KpResult Tm::tmError(KpResult::Code code, const char* file, unsigned int line, c
     if (verbose)
         data = verboseData.printf("%s%sin_function=%s\ndate=%s\ntime=%s", data ? data : "", data ? "\n" : "", function,
                                   date, time);
-    const KpResult result(code, static_cast<int>(line), file, kplib::detail::resultTexts(code).shortText, data);
+    KpResult result(code, static_cast<int>(line), file, kplib::detail::resultTexts(code).shortText, data);
     if (setLastError)
         setError(result);
     return result;

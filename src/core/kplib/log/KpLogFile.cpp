@@ -93,7 +93,7 @@ std::string_view KpLogFilePrivate::timeText(KpLogFile::DateTimeFormat format)
     return text;
 }
 
-KpLogFilePrivate& logRecord(KpLogFile& log)
+KpLogFilePrivate& kplib::detail::logRecord(KpLogFile& log)
 {
     return *log.record_;
 }

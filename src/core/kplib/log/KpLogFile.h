@@ -5,6 +5,9 @@
 #include <kplib/log/KpLogLevel.h>
 
 struct KpLogFilePrivate;
+namespace kplib::detail {
+KpLogFilePrivate& logRecord(KpLogFile& log);
+}
 
 /// The log: every message of the library is a line here, on its way to disk when the call returns. Reached through
 /// getTheLogInstance(). With no file open, lines go to standard output.
@@ -85,7 +88,7 @@ public:
     void resetTimeStamp();
 
 private:
-    friend KpLogFilePrivate& logRecord(KpLogFile& log);
+    friend KpLogFilePrivate& kplib::detail::logRecord(KpLogFile& log);
 
     KpLogFilePrivate* record_;
 };

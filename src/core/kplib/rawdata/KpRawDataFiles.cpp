@@ -19,9 +19,9 @@ unsigned long sizeOf(KpTypedPointer data)
     return static_cast<unsigned long>(data.type.size());
 }
 
-}  // namespace
-
-unsigned long KpRawData::fread(void* data, unsigned long size, unsigned long count, FILE* f)
+/// Has `pass(done, chunk)` pass on the bytes piece by piece until it passes fewer than it is asked to.
+template <typename Pass>
+unsigned long wholeItems(unsigned long size, unsigned long count, Pass pass)
 {
     if (size == 0)
         return 0;
@@ -29,28 +29,28 @@ unsigned long KpRawData::fread(void* data, unsigned long size, unsigned long cou
     unsigned long done = 0;
     while (done < bytes) {
         const unsigned long chunk = std::min(bytes - done, streamChunk);
-        const unsigned long got = std::fread(static_cast<char*>(data) + done, 1, chunk, f);
-        done += got;
-        if (got < chunk)
+        const unsigned long passed = pass(done, chunk);
+        done += passed;
+        if (passed < chunk)
             break;
     }
     return done / size;
 }
 
+}  // namespace
+
+unsigned long KpRawData::fread(void* data, unsigned long size, unsigned long count, FILE* f)
+{
+    return wholeItems(size, count, [=](unsigned long done, unsigned long chunk) {
+        return std::fread(static_cast<char*>(data) + done, 1, chunk, f);
+    });
+}
+
 unsigned long KpRawData::fwrite(const void* data, unsigned long size, unsigned long count, FILE* f)
 {
-    if (size == 0)
-        return 0;
-    const unsigned long bytes = size * count;
-    unsigned long done = 0;
-    while (done < bytes) {
-        const unsigned long chunk = std::min(bytes - done, streamChunk);
-        const unsigned long put = std::fwrite(static_cast<const char*>(data) + done, 1, chunk, f);
-        done += put;
-        if (put < chunk)
-            break;
-    }
-    return done / size;
+    return wholeItems(size, count, [=](unsigned long done, unsigned long chunk) {
+        return std::fwrite(static_cast<const char*>(data) + done, 1, chunk, f);
+    });
 }
 
 long KpRawData::readBigEndian(KpTypedPointer data, unsigned long n, FILE* f)

@@ -31,5 +31,5 @@ private:
 
 protected:
     /// Cancels the work; empty while detached. Call it when the user asks for that, on the thread of the work.
-    std::function<void()> cancelCallback_;
+    std::function<void()> cancelCallback;  // for derived classes to call, and so without _
 };

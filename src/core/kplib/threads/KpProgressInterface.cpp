@@ -19,12 +19,12 @@ struct OffsetDropper {
 void KpProgressInterface::setProgressGui(KpProgressGuiInterface* gui)
 {
     if (gui_) {
-        gui_->cancelCallback_ = nullptr;
+        gui_->cancelCallback = nullptr;
         gui_->progress_ = nullptr;
     }
     gui_ = gui;
     if (gui_) {
-        gui_->cancelCallback_ = [this] { cancel(); };
+        gui_->cancelCallback = [this] { cancel(); };
         gui_->progress_ = this;
     }
 }
@@ -35,17 +35,18 @@ void KpProgressInterface::startWorking(int maximum, std::string text)
         return;
     if (text.empty() && !steps_.empty())
         text = steps_.back().text;
+    Step step{text, maximum};
     steps_.reserve(steps_.size() + 1);  // all that takes memory comes first, so that a failure leaves nothing half done
     offsets_.reserve(offsets_.size() + 1);
     if (steps_.empty()) {
         working_ = true;
         beforeStartWorking();
     }
-    steps_.push_back({std::move(text), maximum});
+    steps_.push_back(std::move(step));
     value_ *= maximum;
     offsets_.push_back(value_);
     setMaximumGlobal(globalMaximum());
-    setProgressText(steps_.back().text.c_str());
+    setProgressText(text.c_str());  // not that of the scope: a user interface may have canceled by now
     setProgressValue(0);
 }
 

@@ -41,5 +41,9 @@ struct KpLogFilePrivate {
     kplib::detail::KpLogClock clock;
 };
 
+namespace kplib::detail {
+
 /// The record of a log, for what opens its file.
 KpLogFilePrivate& logRecord(KpLogFile& log);
+
+}  // namespace kplib::detail

@@ -1,0 +1,24 @@
+#pragma once
+
+#include "OutputFolder.h"
+#include "Volume.h"
+
+/// What of the displayed values becomes black and white.
+struct Window {
+    double center = 0, width = 1;  ///< displayed values, as in DICOM's window centre and width
+    bool isInverted = false;       ///< low values are white
+    const char* origin = "";       ///< where it comes from, for the report
+};
+
+/// The window from the lowest to the highest value, leaving out half a percent at either end.
+Window windowOf(Volume& volume);
+
+/// The volume through the window, as bytes. The linear function of DICOM PS3.3, C.11.2.1.2.1.
+Volume display(Volume& volume, const Window& window);
+
+/// Writes axial.png, coronal.png and sagittal.png through the middle of a volume of bytes, the patient upright and seen
+/// as usual (left on the right side of the picture), with square pixels.
+KpResult writePlanes(Volume& shown, const OutputFolder& out);
+
+/// Writes all slices of a volume of bytes side by side.
+KpResult writeOverview(Volume& shown, const OutputFolder& out, const char* name);

@@ -1,0 +1,79 @@
+#include "Report.h"
+
+#include <kplib/rawdata/KpRawData.h>
+
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+
+namespace {
+
+const struct {
+    const char *tag, *name;
+} safeTags[] = {
+    {"G0008-0060", "modality"},         {"G0008-0070", "manufacturer"},     {"G0008-1090", "model"},
+    {"G0018-0015", "body part"},        {"G0018-1030", "protocol"},         {"G0008-103E", "series description"},
+    {"G0018-0050", "slice thickness"},  {"G0018-0080", "repetition time"},  {"G0018-0081", "echo time"},
+    {"G0018-0087", "field strength"},   {"G0018-0060", "tube voltage"},     {"G0018-1210", "kernel"},
+    {"G0018-5100", "patient position"}, {"G0028-0004", "photometric type"}, {"G0002-0010", "transfer syntax"},
+};
+
+KpResult writeText(const KpString& text, const OutputFolder& out, const char* name)
+{
+    FILE* const file = std::fopen(out.pathOf(name).c_str(), "wb");
+    const auto length = static_cast<unsigned long>(text.length());
+    const bool isWritten = file && KpRawData::fwrite(const_cast<char*>(text.c_str()), 1, length, file) == length;
+    const bool isClosed = file && std::fclose(file) == 0;
+    if (!isWritten || !isClosed)
+        return badInput("can't write %s: %s", name, std::strerror(errno));
+    return KpResult();
+}
+
+void addSafeTags(const HxParamBundle& root, KpString& text)
+{
+    for (const auto& [tag, name] : safeTags) {
+        const char* const value = root.findTag(tag, "");
+        if (*value)
+            text += KpString(0, "%-20s %s\n", name, value);
+    }
+}
+
+void addVolume(Volume& volume, KpString& text)
+{
+    float low = 0, high = 0;
+    KpRawData::getRange(volume.voxels(), static_cast<unsigned long>(volume.count()), low, high);
+    const auto displayed = [&](float v) { return static_cast<double>(v) * volume.slope + volume.intercept; };
+    text += KpString(0, "%-20s %ld x %ld x %ld voxels of %s\n", "size", volume.dims[0], volume.dims[1], volume.dims[2],
+                     volume.type.name());
+    text += KpString(0, "%-20s %.6g x %.6g x %.6g mm\n", "spacing", volume.spacing[0], volume.spacing[1],
+                     volume.spacing[2]);
+    text += KpString(0, "%-20s (%.4f, %.4f, %.4f) mm\n", "first voxel at", volume.origin[0], volume.origin[1],
+                     volume.origin[2]);
+    for (const auto& axis : volume.axes)
+        text += KpString(0, "%-20s (%.6f, %.6f, %.6f)\n", "axis", axis[0], axis[1], axis[2]);
+    text += KpString(0, "%-20s %.8g to %.8g\n", "values", displayed(low), displayed(high));
+}
+
+}  // namespace
+
+KpResult writeHeader(const HxParamBundle& root, const OutputFolder& out)
+{
+    KpString text;
+    root.print(text, 0, nullptr);
+    return writeText(text, out, "header.txt");
+}
+
+KpResult writeReport(const HxParamBundle& root, const Series& series, Volume& volume, const Window& window,
+                     const std::vector<Stage>& stages, const OutputFolder& out)
+{
+    KpString text;
+    addSafeTags(root, text);
+    text += KpString(0, "%-20s %zu (%d other files skipped)\n", "images", series.slices.size(), series.skippedFiles);
+    addVolume(volume, text);
+    text += KpString(0, "%-20s center %.6g, width %.6g (%s)\n", "window", window.center, window.width, window.origin);
+    for (const std::string& warning : series.warnings)
+        text += KpString(0, "%-20s %s\n", "warning", warning.c_str());
+    for (const Stage& stage : stages)
+        text += KpString(0, "%-20s %.3f s\n", stage.name, stage.seconds);
+    return writeText(text, out, "report.txt");
+}

@@ -1,0 +1,18 @@
+#pragma once
+
+#include "DicomSeries.h"
+#include "OutputFolder.h"
+#include "Pictures.h"
+
+/// One stage of the road and how long it took.
+struct Stage {
+    const char* name;
+    double seconds;
+};
+
+/// Writes header.txt: the whole tree in its text form, with the index of private creators.
+KpResult writeHeader(const HxParamBundle& root, const OutputFolder& out);
+
+/// Writes report.txt: what can be told without telling who the patient is.
+KpResult writeReport(const HxParamBundle& root, const Series& series, Volume& volume, const Window& window,
+                     const std::vector<Stage>& stages, const OutputFolder& out);

@@ -1,0 +1,104 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpForward.h>
+
+#include <cstddef>
+#include <cstdint>
+
+namespace kplib::detail {
+class NameKey;
+}
+
+/// A named node of the parameter tree: an HxParameter with a value, or an HxParamBundle with children.
+///
+/// A node is made outside a tree, without a parent; the bundle that takes it owns it from then on. Names follow the
+/// rules of setName(). A tree belongs to one thread at a time (HxParamBundle tells the one exception). Exhausted memory
+/// is a KpMemoryException, the node then being as before. Nodes live in blocks of kpmalloc().
+class KPLIB_API HxParamBase {
+public:
+    enum Type : std::uint8_t { TypeParameter = 0, TypeBundle = 1 };
+
+    /// Rules for a node. The setters of the tree don't ask them, but for what is said here: they serve the editors
+    /// above, through HxParamEditCheck.
+    enum Flag : int {
+        FlagNoSave = 1,          ///< left out when a tree is written to a file
+        FlagNoCopy = 2,          ///< left out by HxParamBundle::copy()
+        FlagNoDelete = 4,        ///< HxParamBundle::remove() refuses
+        FlagNoInsertBundle = 8,  ///< the bundle takes no further sub-bundles
+        FlagNoInsertParam = 16,  ///< the bundle takes no further parameters
+        FlagNoRename = 32,
+        FlagNoSetValue = 64,
+        FlagHidden = 128,  ///< never part of the text form
+    };
+
+    /// What changed at a node or below it; for clients, nothing in the tree reads it.
+    enum TouchMask : int {
+        TouchName = 1,
+        TouchValue = 2,  ///< of a bundle: its list of children
+        TouchChildName = 4,
+        TouchChildValue = 8,
+        TouchAny = 16,  ///< set with each of the others
+    };
+
+    /// A new node with the same content, outside any tree, owned by the caller.
+    virtual HxParamBase* duplicate() const = 0;
+
+    /// Drops the node; its parent isn't told.
+    virtual ~HxParamBase();
+
+    /// Takes over flags and name. What was touched is forgotten, a change of the name is recorded afresh; kind, parent
+    /// and edit check stay.
+    HxParamBase& operator=(const HxParamBase& other);
+
+    /// Names the node. A leading digit gets a `_` in front; letters, digits and `-` stay, some Latin-1 letters lose
+    /// their accents, any other byte becomes `_`. A bundle keeps only what stands before the first blank, the rest goes
+    /// into its parameter `Name`, its title, which in turn never repeats the name. Null or empty makes up a name from
+    /// a process-wide, unlocked counter. Records TouchName if the name differs from the old one.
+    void setName(const char* name);
+
+    /// Records a change here and, as one of a child, in all bundles above.
+    void touch(int mask);
+
+    /// Sets (`on` not 0) or clears the bits of `mask` in flags().
+    void setFlag(int mask, int on);
+
+    /// Lets `check` decide for this node and all below it that have none of their own; null for none. Not owned.
+    void setEditCheck(HxParamEditCheck* check) { editCheck_ = check; }
+
+    /// The nearest check on the way up, at last HxParamEditCheck::defaultEditCheck(); never null.
+    HxParamEditCheck* editCheck() const;
+
+    /// The bundle that holds the node, null outside a tree.
+    HxParamBundle* parent() const { return parent_; }
+    Type type() const { return type_; }
+    bool isBundle() const { return type_ == TypeBundle; }
+    int touched() const { return touched_; }    ///< bits of TouchMask
+    int flags() const { return flags_; }        ///< bits of Flag
+    const char* name() const { return name_; }  ///< valid until the name changes
+
+    static void* operator new(std::size_t size);
+    static void* operator new(std::size_t, void* where) noexcept { return where; }
+    static void operator delete(void* node) noexcept;
+    static void operator delete(void*, void*) noexcept {}
+
+protected:
+    HxParamBase(Type type, const char* name);
+    /// A node outside any tree and without an edit check; marks and flags are copied.
+    HxParamBase(const HxParamBase& other);
+
+private:
+    friend class HxParamBundle;
+    friend class kplib::detail::NameKey;
+
+    void adoptName(char* fresh);
+    void retitle(const char* name, const char* rest);
+
+    HxParamBundle* parent_ = nullptr;
+    Type type_ = TypeParameter;
+    std::uint8_t touched_ = 0;
+    std::uint16_t flags_ = 0;
+    std::uint32_t tag_ = 0;  // the name's tagNumber(), for quick comparison, in what is padding otherwise
+    char* name_ = nullptr;
+    HxParamEditCheck* editCheck_ = nullptr;
+};

@@ -1,0 +1,175 @@
+#include <param/Texts.h>
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cmath>
+#include <cstdio>
+#include <string>
+
+namespace {
+
+/// The bundle at the end of a row of sequences and items, which are made.
+HxParamBundle& below(HxParamBundle& bundle, std::initializer_list<const char*> path)
+{
+    HxParamBundle* at = &bundle;
+    for (const char* name : path)
+        at = at->bundle(name, 1);
+    return *at;
+}
+
+}  // namespace
+
+TEST(DicomTags, areFoundByTheirText)
+{
+    HxParamBundle root("root");
+    root.setTag("G0008-0060", "CT");
+    root.setTag("G0010-4000", "");
+    root.setTag("G0020-0013", "12");
+    root.setTag("G0028-0030", "0.5\\0.25");
+    root.dicomAllCreate()->set("G0008-0070", "no colon");
+    EXPECT_STREQ(root.findTag("g0008-0060", "none"), "CT");
+    EXPECT_STREQ(root.findTag("G0010-4000", "none"), "");
+    EXPECT_STREQ(root.findTag("G0008-0070", "none"), "none");
+    EXPECT_STREQ(root.findTag(nullptr, "none"), "none");
+
+    int number = 7;
+    float real = 7;
+    const HxParamBundle& all = *root.dicomAll();
+    EXPECT_TRUE(all.findTagInAll("G0020-0013", number));
+    EXPECT_FALSE(all.findTagInAll("G0008-0060", number));
+    EXPECT_EQ(number, 12);
+    EXPECT_TRUE(root.findTag("G0028-0030", real));
+    EXPECT_EQ(real, 0.5f);
+    EXPECT_FALSE(root.findTag("G0008-0060", real));
+    EXPECT_TRUE(std::isnan(real));
+}
+
+TEST(DicomTags, holdManyValues)
+{
+    const struct {
+        const char* text;
+        bool ok;
+        KpDArray<float> values;  // 7: as it was
+    } cases[] = {{"0.5\\0.25", true, {0.5f, 0.25f}}, {"3", true, {3}}, {"3\\", false, {3, 7}}, {"", false, {7}}};
+    for (const auto& c : cases) {
+        HxParamBundle root("root");
+        root.setTag("G0028-0030", c.text);
+        KpDArray<float> values{7, 7, 7};
+        EXPECT_FALSE(root.findTag("G0028-0031", values) || values.size() != 3);
+        EXPECT_EQ(root.findTag("G0028-0030", values), c.ok) << c.text;
+        EXPECT_TRUE(std::ranges::equal(values, c.values)) << c.text;
+    }
+}
+
+TEST(DicomTags, ofEnhancedObjectsAreFoundInTheGroups)
+{
+    HxParamBundle root("root");
+    HxParamBundle& all = *root.dicomAllCreate();
+    root.setTag("G0018-0081", "classic");
+    below(all, {"G5200-9229", "Item_0", "G0018-9112", "Item_0"}).set("G0018-9082", "Echo: shared");
+    EXPECT_STREQ(root.findTag("G0018-0081", ""), "classic") << "the shared groups alone don't count";
+    HxParamBundle& perFrame = below(all, {"G5200-9230"});
+    EXPECT_STREQ(root.findTag("G0018-0081", ""), "shared");
+    below(perFrame, {"Item_1"}).set("G0018-9082", ": second frame");
+    below(perFrame, {"Item_0", "G0019-1001", "Item_0"}).set("G0018-9082", ": private");
+    EXPECT_STREQ(root.findTag("G0018-0081", ""), "shared") << "neither other items nor odd groups are searched";
+    below(perFrame, {"Item_01"}).set("G0018-9082", ": prefix");
+    EXPECT_STREQ(root.findTag("G0018-0081", ""), "prefix");
+    below(perFrame, {"Item_0", "G0018-9114", "Item_0"}).set("G0018-9082", ": frame");
+    EXPECT_STREQ(root.findTag("G0018-0081", ""), "frame");
+    EXPECT_STREQ(perFrame.findTagInEnhancedDicomBundle("G0018-0081", "none"), "frame");
+    below(perFrame, {"Item_0", "G0018-9114", "Item_0"}).set("G0018-9082", "no value");
+    EXPECT_STREQ(root.findTag("G0018-0081", "none"), "none") << "a leaf without a value ends the search";
+    root.setTag("G0010-0010", "top level");
+    EXPECT_STREQ(root.findTag("G0010-0010", ""), "top level");
+}
+
+TEST(DicomTags, areMappedForEnhancedObjects)
+{
+    const std::string tags[] = {"G0018-0081",        "G0008-0008", "G0020-0060", "g0008-002a", "G0020-0100",
+                                "x0018.1060 and on", "G0018-0082", "G0018",      "Gwxyz-0081"};
+    std::string all;
+    for (const std::string& tag : tags) {
+        KpString mapped("-");
+        const bool isMapped = HxParamBundle::replaceTag(tag.c_str(), mapped);
+        EXPECT_EQ(isMapped, mapped != "-") << tag;
+        all += mapped;
+    }
+    EXPECT_EQ(all, "G0018-9082G0008-9007G0020-9072G0018-9074G0020-9128G0020-9153---");
+}
+
+TEST(PrivateTags, takeBlocksWithHoles)
+{
+    HxParamBundle all("All");
+    all.set("G0009-0010", "PrivateCreator: FIRST");
+    all.set("G0009-0005", ": LOW");
+    all.set("G0009-0012", ": THIRD");
+    all.set("G000B-0010", ": AN EVEN CODE");
+    all.set("G000A-0010", ": AN ODD CODE");
+    all.set("G0009-1020", ": of first");
+    EXPECT_STREQ(all.findPrivateTagInAll("FIRST", "G0009-xx20", "none"), "of first");
+    EXPECT_STREQ(all.findPrivateTagInAll(nullptr, "G0009-1020", "none"), "of first");
+    const HxParamBundle& creators = *all.bundle("PrivateCreators");
+    EXPECT_EQ(creators.flags(), HxParamBase::FlagNoSave);
+    EXPECT_EQ(creators.size(), 4);
+    EXPECT_EQ(valueOf(creators, "G000A-0010"), "AN ODD CODE");
+    EXPECT_EQ(valueOf(creators, "G000B-0010"), "-");
+
+    all.setPrivateTagInAll("NOBODY", "G0009-xx20", nullptr);
+    EXPECT_EQ(creators.size(), 4) << "no value, no reservation";
+    all.setPrivateTagInAll("SECOND", "G0009-xx20", "2");
+    all.setPrivateTagInAll("FOURTH", "G0009-xx20", "4");
+    all.setPrivateTagInAll("SECOND", "G0009-xx21", "2.1");
+    all.setPrivateTagInAll("SECOND", "G0021-xx21", "other group");
+    EXPECT_EQ(valueOf(creators, "G0009-0011"), "SECOND");
+    EXPECT_EQ(valueOf(all, "G0009-0011"), "PrivateCreator: SECOND");
+    EXPECT_EQ(valueOf(all, "G0009-1121"), ": 2.1");
+    EXPECT_EQ(valueOf(all, "G0009-1320"), ": 4");
+    EXPECT_EQ(valueOf(all, "G0021-1021"), ": other group");
+    all.setPrivateTagInAll("SECOND", "G0009-xx21", nullptr);
+    EXPECT_EQ(valueOf(all, "G0009-1121"), "-");
+    all.setPrivateTagInAll("SECOND", "short", "x");
+    all.setPrivateTagInAll("SECOND", "G0009", "x");
+    EXPECT_EQ(creators.size(), 7);
+}
+
+TEST(PrivateTags, endWithTheGroup)
+{
+    HxParamBundle all("All");
+    char name[16], creator[16];
+    for (int block = 16; block < 256; ++block) {
+        std::snprintf(name, sizeof(name), "G0009-00%02X", static_cast<unsigned>(block));
+        std::snprintf(creator, sizeof(creator), ": C%d", block);
+        if (block != 26)
+            all.set(name, creator);
+    }
+    all.setPrivateTagInAll("LATE", "G0009-xx20", "1");
+    EXPECT_EQ(valueOf(all, "G0009-001_"), "PrivateCreator: LATE") << "block 26 in digits that run past 9";
+    EXPECT_STREQ(all.findPrivateTagInAll("LATE", "G0009-xx20", ""), "1");
+    all.setPrivateTagInAll("LATER", "G0009-xx20", "2");
+    EXPECT_EQ(valueOf(all, "G0009-001_"), "PrivateCreator: LATER") << "and is given out again";
+    all.set("G0009-001A", ": C26");
+    all.remove("PrivateCreators");
+    const long before = all.size();
+    all.setPrivateTagInAll("LATEST", "G0009-xx20", "3");
+    EXPECT_EQ(all.size(), before + 1) << "the index alone is new";
+}
+
+TEST(PrivateTags, holdSequences)
+{
+    HxParamBundle all("All");
+    const HxParamBundle& constAll = all;
+    EXPECT_EQ(constAll.privateSequenceItemInAll("C", "G0009-xx30", 0), nullptr);
+    EXPECT_EQ(all.size(), 0);
+    EXPECT_EQ(all.privateSequenceItemInAll("C", "G0009-xx30", "d", 0, false), nullptr);
+    EXPECT_EQ(valueOf(all, "G0009-0010"), "PrivateCreator: C") << "reserved all the same";
+    HxParamBundle* const item = all.privateSequenceItemInAll("C", "G0009-xx30", "a description", 2, true);
+    ASSERT_TRUE(item);
+    EXPECT_STREQ(item->name(), "Item_2");
+    EXPECT_EQ(valueOf(*item, "Description"), "Item 2");
+    EXPECT_EQ(valueOf(*all.bundle("G0009-1030"), "Description"), "a description");
+    EXPECT_EQ(all.privateSequenceItemInAll("C", "G0009-xx30", "another", 2, false), item);
+    EXPECT_EQ(valueOf(*all.bundle("G0009-1030"), "Description"), "a description");
+    EXPECT_EQ(constAll.privateSequenceItemInAll("C", "G0009-xx30", 2), item);
+}

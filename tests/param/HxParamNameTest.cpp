@@ -1,0 +1,132 @@
+#include <param/Texts.h>
+
+#include <kplib/param/HxParamEditCheck.h>
+#include <kplib/param/HxParameter.h>
+#include <kplib/param/detail/ParamName.h>
+
+#include <gtest/gtest.h>
+
+#include <cctype>
+#include <random>
+#include <string>
+
+namespace {
+
+/// The order of names once more: what is cut at a blank and upper-cased is compared as strings are.
+int plainOrder(std::string a, std::string b)
+{
+    b = b.substr(0, b.find(' '));
+    for (std::string* s : {&a, &b}) {
+        for (char& c : *s)
+            c = static_cast<char>(std::toupper(c));
+    }
+    return a < b ? -1 : a > b;
+}
+
+}  // namespace
+
+TEST(ParamName, isCleaned)
+{
+    const char* const cases[][2] = {{"2D", "_2D"},
+                                    {"a b.c", "a_b_c"},
+                                    {"x-Y_9", "x-Y_9"},
+                                    {"\xC4\xD6\xDC\xDF\xE4\xE8\xE9\xEA\xF6\xFC", "AOUsaeeeou"},
+                                    {"\xC3\xC5\xE7\xEB\xF5\xFF", "______"}};
+    for (const auto& [text, name] : cases)
+        EXPECT_STREQ(HxParameter(text, 1).name(), name);
+}
+
+TEST(ParamName, ofABundleLeavesTheRestToTheTitle)
+{
+    HxParamBundle bundle("Materials of heart");
+    EXPECT_STREQ(bundle.name(), "Materials");
+    EXPECT_EQ(valueOf(bundle, "Name"), "of heart");
+    bundle.setName("of");
+    EXPECT_EQ(valueOf(bundle, "Name"), "heart") << "a title doesn't repeat the name";
+    bundle.setName("heart heart");
+    EXPECT_STREQ(bundle.name(), "heart");
+    EXPECT_EQ(valueOf(bundle, "Name"), "-");
+
+    HxParamBundle shadowed("A");
+    const unsigned number = 1;
+    shadowed.insert(new HxParameter("Name", 1, KpPrimType::UInt, &number), 0);
+    shadowed.setName("B B C");
+    ASSERT_EQ(shadowed.size(), 2) << "no lookup finds a uint";
+    EXPECT_STREQ(static_cast<HxParameter*>(shadowed[1])->getString(), "B C");
+}
+
+TEST(ParamName, isGeneratedFromTwoCounters)
+{
+    const auto numberOf = [](const HxParamBase& node, size_t prefix) { return std::stoi(node.name() + prefix); };
+    HxParameter first(nullptr, 1), second("", 1);
+    const HxParamBundle bundle(nullptr), next(nullptr);
+    const HxParameter last(nullptr, 1);
+    EXPECT_EQ(numberOf(second, 9), numberOf(first, 9) + 1);
+    EXPECT_EQ(numberOf(next, 6), numberOf(bundle, 6) + 1);
+    EXPECT_EQ(numberOf(last, 9), numberOf(second, 9) + 3) << "bundles begin as parameters";
+
+    HxParameter named("x", 1);
+    named.setName(named.name());
+    named.setName(std::string("x").c_str());
+    EXPECT_EQ(named.touched(), 0);
+    named.setName(nullptr);
+    EXPECT_EQ(named.touched(), HxParamBase::TouchName | HxParamBase::TouchAny);
+}
+
+TEST(ParamName, keysCompareAsTextsDo)
+{
+    std::mt19937 random(7);
+    const char* const pieces[] = {"G0010-001", "g0010-001", "G00", "0-0", "a", "B", "_", " ", "1", "-", "Fz", "0000"};
+    const auto text = [&] {
+        std::string result;
+        for (auto n = random() % 4; n > 0; --n)
+            result += pieces[random() % std::size(pieces)];
+        return result;
+    };
+    using kplib::detail::NameKey;
+    for (int round = 0; round < 100'000; ++round) {
+        const std::string asked = text(), wanted = text();
+        const HxParameter node(wanted.empty() ? "x" : wanted.c_str(), 1);
+        const std::string canonical = (std::isdigit(asked[0]) ? "_" : "") + asked;
+        const NameKey literal(asked.c_str(), NameKey::Literal), key(asked.c_str());
+        ASSERT_EQ(literal.order(node), plainOrder(asked, node.name())) << asked << '|' << node.name();
+        ASSERT_EQ(key.order(node), plainOrder(canonical, node.name())) << asked << '|' << node.name();
+        ASSERT_EQ(key.matches(node), plainOrder(node.name(), canonical) == 0) << asked << '|' << node.name();
+        ASSERT_EQ(key.matchesToken(wanted.c_str()), plainOrder(canonical, wanted) == 0) << asked << '|' << wanted;
+    }
+}
+
+TEST(ParamNode, tellsChangesToAllAbove)
+{
+    HxParamBundle root("root");
+    HxParamBundle* const middle = root.bundle("middle", 1);
+    middle->set("leaf", 1);
+    HxParamBase* const leaf = middle->find("leaf", 0, 255);
+    const auto masks = [&] { return std::vector<int>{leaf->touched(), middle->touched(), root.touched()}; };
+    root.untouchAll(255);
+    leaf->touch(0);
+    EXPECT_EQ(masks(), (std::vector{0, 0, 0}));
+    leaf->touch(HxParamBase::TouchValue);
+    EXPECT_EQ(masks(), (std::vector{18, 24, 24}));
+    root.untouchAll(8);
+    leaf->setName("other");
+    EXPECT_EQ(masks(), (std::vector{19, 20, 20}));
+}
+
+TEST(ParamNode, asksTheNearestEditCheck)
+{
+    struct Never : HxParamEditCheck {
+        bool checkDelete(HxParamBase*) override { return false; }
+    } never;
+    HxParamBundle root("root");
+    HxParamBundle* const child = root.bundle("child", 1);
+    EXPECT_EQ(child->editCheck(), HxParamEditCheck::defaultEditCheck());
+    root.setEditCheck(&never);
+    EXPECT_EQ(child->editCheck(), &never);
+    EXPECT_EQ(HxParamBundle(root).editCheck(), HxParamEditCheck::defaultEditCheck());
+
+    HxParamEditCheck& check = *HxParamEditCheck::defaultEditCheck();
+    EXPECT_TRUE(check.checkInsertParam(child, "x") && check.checkRename(child, "x"));
+    child->setFlag(HxParamBase::FlagNoInsertParam, 1);
+    EXPECT_TRUE(!check.checkInsertParam(child, "x") && check.checkInsertBundle(child, "x"));
+}
