@@ -41,24 +41,16 @@ Tokens stdTokensOf(const char* text, const char* delimiters)
 TEST(KpString, keepsItsCapacityRules)
 {
     const KpString empty;
-    EXPECT_EQ(empty.size(), 1);
-    EXPECT_EQ(empty.capacity(), 16);
-    EXPECT_EQ(KpString(empty).capacity(), 1);
+    EXPECT_TRUE(empty.size() == 1 && empty.capacity() == 16 && KpString(empty).capacity() == 1);
     EXPECT_EQ(KpString("abcdef", 1, 3).capacity(), 4);
     KpString text;
-    text.printf("%s", std::string(63, 'x').c_str());
-    EXPECT_EQ(text.size(), 64);
-    EXPECT_EQ(text.capacity(), 64);
-    KpString longer;
-    longer.printf("%s", std::string(100, 'x').c_str());
-    EXPECT_EQ(longer.capacity(), 101);
-    longer.printf("%d", 1);
-    EXPECT_EQ(longer.capacity(), 101);
-
-    KpString appended = "123456789012345";  // fills the 16
+    for (const auto& [length, capacity] : {std::pair(63, 64), std::pair(100, 101), std::pair(1, 101)}) {
+        text.printf("%0*d", length, 7);
+        EXPECT_TRUE(text.length() == length && text.capacity() == capacity) << length;
+    }
+    KpString appended = "123456789012345", joined = appended + "";  // the first fills the 16
     appended += 'x';
     EXPECT_EQ(appended.capacity(), 24);
-    KpString joined = "123456789012345";
     joined += "x";
     EXPECT_EQ(joined.capacity(), 22);  // half of the size without its NUL
 }
@@ -97,15 +89,11 @@ TEST(KpString, comparesWithTextAndNull)
 TEST(KpString, convertsNumbers)
 {
     bool ok = false;
-    EXPECT_EQ(KpString("-12x").toInt(ok), -12);
-    EXPECT_TRUE(ok);
-    EXPECT_EQ(KpString("x").toInt(ok), 0);
-    EXPECT_FALSE(ok);
-    EXPECT_EQ(KpString(" 1.5e2").toFloat(ok), 150.0f);
-    EXPECT_TRUE(ok);
+    EXPECT_TRUE(KpString("-12x").toInt(ok) == -12 && ok);
+    EXPECT_TRUE(KpString("x").toInt(ok) == 0 && !ok);
+    EXPECT_TRUE(KpString(" 1.5e2").toFloat(ok) == 150.0f && ok);
     EXPECT_EQ(KpString::fromInt64(-9223372036854775807LL - 1), "-9223372036854775808");
-    EXPECT_EQ(KpString("9000000000").toInt64(), 9000000000);
-    EXPECT_EQ(KpString().toInt64(), 0);
+    EXPECT_TRUE(KpString("9000000000").toInt64() == 9000000000 && KpString().toInt64() == 0);
 }
 
 TEST(KpString, inspectsAndRewrites)
@@ -114,26 +102,25 @@ TEST(KpString, inspectsAndRewrites)
     EXPECT_FALSE(KpString("\xe4").isAlpha() || KpString("a1").isDigit() || KpString("a ").isAlnum());
     EXPECT_EQ(KpString("abc").substr(2, 1), "");
     EXPECT_EQ(KpString("abc").substr(2, 2), "c");
-    struct {
-        const char *text, *from, *to, *expected;
-    } const replacements[] = {
+    const char* const replacements[][4] = {
         {"aaa", "aa", "a", "aa"}, {"abab", "ab", "abab", "abababab"}, {"abc", "", "x", "abc"}, {"abc", "b", "", "ac"}};
-    for (const auto& c : replacements) {
-        KpString text = c.text;
-        text.replaceSubStr(c.from, c.to);
-        EXPECT_EQ(text, c.expected);
+    for (const auto& [text, from, to, expected] : replacements) {
+        KpString replaced = text;
+        replaced.replaceSubStr(from, to);
+        EXPECT_EQ(replaced, expected);
     }
+}
+
+TEST(KpString, explodesAtEachSeparator)
+{
     KpDArray<KpString> pieces{"old"};
-    KpString("a,,b").explode(',', pieces);
-    ASSERT_EQ(pieces.size(), 3);
-    EXPECT_TRUE(pieces[0] == "a" && pieces[1] == "" && pieces[2] == "b");
-    KpString(",").explode(',', pieces);
-    EXPECT_EQ(pieces.size(), 2);
-    KpString().explode(',', pieces);
-    EXPECT_EQ(pieces.size(), 1);
-    std::ostringstream out;
-    out << KpString("a") + "b";
-    EXPECT_EQ(out.str(), "ab");
+    for (const char* text : {"a,,b", ",", "", "a,"}) {
+        KpString(text).explode(',', pieces);
+        std::ostringstream joined;
+        for (const KpString& piece : pieces)
+            joined << ',' << piece;
+        EXPECT_EQ(joined.str(), ',' + std::string(text));
+    }
 }
 
 TEST(KpString, protectsWhatTheTokenizerSplits)
