@@ -70,7 +70,7 @@ TEST(KpDArray, remaxAndResizeSetSizeAndCapacityByTheirRules)
     EXPECT_EQ(array.capacity(), 10);
     EXPECT_EQ(array.remax(0, 0), 10);
     EXPECT_EQ(array.data(), nullptr);
-    array.insert(0, -1, &array[1]);
+    array.insert(0, -1, array.data());
     array.insert(0, 3, std::vector<int>(3).data());
     EXPECT_EQ(KpDArray<int>(array).capacity(), 3);
 }
