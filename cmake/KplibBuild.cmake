@@ -14,10 +14,12 @@ if(KPLIB_CCACHE)
     set(CMAKE_CXX_COMPILER_LAUNCHER ${KPLIB_CCACHE})
 endif()
 
-add_compile_options(-fno-math-errno -ffp-contract=off -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor
-                    -Woverloaded-virtual -Wcast-align -Wundef -Werror)
+# Nobody replaces the library's functions from outside, so they may be inlined.
+add_compile_options(-fno-math-errno -ffp-contract=off -fno-semantic-interposition -Wall -Wextra -Wpedantic -Wshadow
+                    -Wnon-virtual-dtor -Woverloaded-virtual -Wcast-align -Wundef -Werror)
 
 if(KPLIB_SANITIZE)
+    set(CMAKE_CXX_FLAGS_RELEASE "-O1 -DNDEBUG")  # half the time to build, and another level for results to hold on
     add_compile_options(-fsanitize=${KPLIB_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer -g1)
     if(KPLIB_FUZZ)
         add_compile_options(-fsanitize=fuzzer-no-link)

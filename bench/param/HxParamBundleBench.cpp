@@ -9,6 +9,7 @@
 #include <dcmtk/dcmdata/dctk.h>
 #endif
 
+#include <algorithm>
 #include <cstdio>
 #include <random>
 #include <string>
@@ -83,9 +84,6 @@ void datasetFind(benchmark::State& state)
 {
     const auto content = tags(static_cast<int>(state.range(0)));
     DcmDataset dataset;
-    for (const Tag& tag : content)
-        dataset.insert(
-            new DcmLongString(DcmTag(static_cast<Uint16>(tag.group), static_cast<Uint16>(tag.element), EVR_LO)));
     for (const Tag& tag : content)
         dataset.putAndInsertString(DcmTag(static_cast<Uint16>(tag.group), static_cast<Uint16>(tag.element), EVR_LO),
                                    "1.25");

@@ -1,3 +1,4 @@
+#include <kplib/foundation/KpString.h>
 #include <kplib/param/HxParamBundle.h>
 #include <kplib/rawdata/KpRawData.h>
 

@@ -177,8 +177,8 @@ KpResult measureSpacing(Series& series, double& spacing)
             return badInput("'%s' and '%s' lie at the same place", slices[i - 1].path.c_str(), slices[i].path.c_str());
     }
     std::vector<double> sorted = gaps;
-    std::nth_element(sorted.begin(), sorted.begin() + static_cast<long>(sorted.size() / 2), sorted.end());
-    const double median = sorted[sorted.size() / 2];
+    std::nth_element(sorted.begin(), sorted.begin() + static_cast<long>((sorted.size() - 1) / 2), sorted.end());
+    const double median = sorted[(sorted.size() - 1) / 2];
     for (size_t i = 0; i < gaps.size(); ++i) {
         const long missing = std::lround(gaps[i] / median) - 1;
         if (missing > 0)
@@ -309,7 +309,7 @@ KpResult scanSeries(const char* folder, const std::string& uid, KpProgressInterf
         return listed;
     std::vector<SliceFile> found;
     const ProgressScope scope(&progress);
-    progress.startWorking(static_cast<int>(paths.size()), "Looking for images");
+    progress.startWorking(static_cast<int>(paths.size()), "");
     for (const std::string& path : paths) {
         if (progress.isCanceled())
             return KpResult();
@@ -342,7 +342,7 @@ KpResult readSeries(const Series& series, KpProgressInterface& progress, Volume&
     KpDArray<unsigned char> stored;
     stored.resize(volume.sliceCount() * 2);
     const ProgressScope scope(&progress);
-    progress.startWorking(static_cast<int>(series.slices.size()), "Reading images");
+    progress.startWorking(static_cast<int>(series.slices.size()), "");
     for (size_t i = 0; i < series.slices.size(); ++i) {
         if (progress.isCanceled())
             return KpResult();

@@ -124,7 +124,7 @@ KpResult loadDicom(const char* path, DcmFileFormat& file)
 KpResult readHeader(const char* path, HxParamBundle& root)
 {
     DcmFileFormat file;
-    const KpResult loaded = loadDicom(path, file);
+    KpResult loaded = loadDicom(path, file);
     if (loaded.isOk())
         fillHeader(root, file);
     return loaded;

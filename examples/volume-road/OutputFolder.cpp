@@ -27,9 +27,9 @@ KpResult OutputFolder::open(const std::string& target)
     if (fs::exists(path, error) && !fs::is_directory(path, error))
         return badInput("'%s' is no folder", target.c_str());
     fs::create_directories(path.parent_path(), error);
-    std::string pattern = (path.parent_path() / ("." + path.filename().string() + ".XXXXXX")).string();
+    KpString pattern(0, "%s/.%s.XXXXXX", path.parent_path().c_str(), path.filename().c_str());
     if (!error && mkdtemp(pattern.data())) {
-        working_ = pattern;
+        working_ = pattern.c_str();
         fs::permissions(working_, fs::perms(0755), error);
         return KpResult();
     }

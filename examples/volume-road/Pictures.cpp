@@ -94,7 +94,7 @@ Picture cut(Volume& shown, const Along& across, const Along& down, const Along& 
             const double top = at[0] + x.share * (at[x.step] - at[0]);
             const double bottom = at[y.step] + x.share * (at[y.step + x.step] - at[y.step]);
             picture.pixels[row * picture.width + column] =
-                static_cast<unsigned char>(top + y.share * (bottom - top) + 0.5);
+                static_cast<unsigned char>(std::lround(top + y.share * (bottom - top)));
         }
     }
     return picture;
@@ -107,6 +107,24 @@ Along reversed(Along along)
 }
 
 }  // namespace
+
+Window windowOf(Volume& volume)
+{
+    KpDArray<float> values;
+    values.resize(volume.count());
+    KpRawData::memcpy({values.data(), KpPrimType::Float}, volume.voxels(), volume.count());
+    const auto quantile = [&](double p) {
+        float* const at = values.data() + static_cast<long>(p * static_cast<double>(values.size() - 1));
+        std::nth_element(values.begin(), at, values.end());
+        return static_cast<double>(*at) * volume.slope + volume.intercept;
+    };
+    const double a = quantile(0.005), b = quantile(0.995);
+    Window window;
+    window.center = (a + b) / 2;
+    window.width = std::max(std::abs(b - a), 1.0) + 1;
+    window.origin = "from the values, none in the header";
+    return window;
+}
 
 Volume display(Volume& volume, const Window& window)
 {

@@ -10,6 +10,9 @@ struct Window {
     const char* origin = "";       ///< where it comes from, for the report
 };
 
+/// The window from the lowest to the highest value, leaving out half a percent at either end.
+Window windowOf(Volume& volume);
+
 /// The volume through the window, as bytes. The linear function of DICOM PS3.3, C.11.2.1.2.1.
 Volume display(Volume& volume, const Window& window);
 

@@ -51,7 +51,7 @@ Volume reducedByMaximum(Volume& volume, std::array<int, 3> f, KpProgressInterfac
     return small;
 }
 
-/// The window of the header, or else the values between the lowest and the highest half percent.
+/// The window of the header, or else one that suits the values.
 Window chooseWindow(const HxParamBundle& root, Volume& small)
 {
     Window window;
@@ -65,18 +65,9 @@ Window chooseWindow(const HxParamBundle& root, Volume& small)
         window.origin = "from the header";
         return window;
     }
-    KpDArray<float> values;
-    values.resize(small.count());
-    KpRawData::memcpy({values.data(), KpPrimType::Float}, small.voxels(), small.count());
-    const auto quantile = [&](double p) {
-        float* const at = values.data() + static_cast<long>(p * static_cast<double>(values.size() - 1));
-        std::nth_element(values.begin(), at, values.end());
-        return static_cast<double>(*at) * small.slope + small.intercept;
-    };
-    const double a = quantile(0.005), b = quantile(0.995);
-    window.center = (a + b) / 2;
-    window.width = std::max(std::abs(b - a), 1.0) + 1;
-    window.origin = "from the values, none in the header";
+    const bool isInverted = window.isInverted;
+    window = windowOf(small);
+    window.isInverted = isInverted;
     return window;
 }
 
@@ -139,7 +130,7 @@ KpResult runRoad(const char* folder, const std::string& uid, const std::string& 
     if (KpResult opened = out.open(target); opened.isBad())
         return opened;
     const ProgressScope scope(&progress);
-    progress.startWorking(7, "Starting");
+    progress.startWorking(7, "");
     Road road(progress);
     Series series;
     HxParamBundle root("Volume");

@@ -5,11 +5,11 @@
 #include "NiftiVolume.h"
 #include "OutputFolder.h"
 #include "Phantom.h"
+#include "Pictures.h"
 #include "RunRoad.h"
 #include "TerminalProgress.h"
 
 #include <kplib/foundation/KpException.h>
-#include <kplib/rawdata/KpRawData.h>
 
 #include <CLI/CLI.hpp>
 #include <dcmtk/config/osconfig.h>
@@ -32,12 +32,9 @@ KpResult makeSeries(const std::string& nifti, const std::string& target, KpProgr
     OutputFolder out;
     if (KpResult opened = out.open(target); opened.isBad())
         return opened;
-    float low = 0, high = 0;
-    KpRawData::getRange(volume.voxels(), static_cast<unsigned long>(volume.count()), low, high);
-    const double a = static_cast<double>(low) * volume.slope + volume.intercept;
-    const double b = static_cast<double>(high) * volume.slope + volume.intercept;
+    const Window window = windowOf(volume);
     const SeriesText text{"Example study", nifti.empty() ? "Head phantom" : "Head", nifti.empty() ? "phantom" : "NIfTI",
-                          (a + b) / 2, b - a + 1};
+                          window.center, window.width};
     KpResult result = writeSeries(volume, text, out.working().c_str(), progress);
     if (progress.isCanceled())
         return KpResult(KpResult::Interrupted, "cancelled, nothing was written", nullptr);

@@ -1,8 +1,7 @@
+#include <param/Texts.h>
 #include <support/FailingMalloc.h>
 
 #include <kplib/foundation/KpMemoryException.h>
-#include <kplib/foundation/KpString.h>
-#include <kplib/param/HxParamBundle.h>
 #include <kplib/param/HxParameter.h>
 
 #include <gtest/gtest.h>
@@ -49,12 +48,7 @@ struct Tree {
         root.dicomAllCreate()->setPrivateTagInAll("CREATOR", "G0009-xx20", "value");
         root.untouchAll(255);
     }
-    std::string text() const
-    {
-        KpString out;
-        root.print(out);
-        return std::to_string(root.touched()) + out.c_str();
-    }
+    std::string text() const { return std::to_string(root.touched()) + textOf(root); }
     HxParamBundle root;
 };
 
@@ -94,9 +88,9 @@ TEST(ParamFailure, leavesTheTreeAsItWas)
         {"boundary", [](HxParamBundle& root) { root.bundle("BoundaryIds", 1); }},
         {"assign", [&](HxParamBundle& root) { root = other; }},
         {"assign a value", [](HxParamBundle& root) { *root.find("value", 0, 255) = HxParameter("renamed", "new"); }},
-        {"reserve a block",
-         [](HxParamBundle& root) { root.dicomAllCreate()->privateSequenceItemInAll("X", "G0009-xx20", "", 0, false); }},
-    };
+        {"reserve a block", [](HxParamBundle& root) {
+             root.dicomAllCreate()->privateSequenceItemInAll("X", "G0009-xx20", "", 0, false);
+         }}};
     for (const auto& c : cases) {
         long failures = 0;
         for (bool failed = true; failed; ++failures) {

@@ -37,6 +37,9 @@
 #include <kplib/param/HxParamBundle.h>
 #include <kplib/param/HxParamEditCheck.h>
 #include <kplib/param/HxParameter.h>
+#include <kplib/rawdata/KpRawData.h>
+#include <kplib/rawdata/KpTypedElement.h>
+#include <kplib/rawdata/KpTypedPointer.h>
 #include <kplib/system/KpWatch.h>
 #include <kplib/threads/KpProgressGuiInterface.h>
 #include <kplib/threads/KpProgressInterface.h>

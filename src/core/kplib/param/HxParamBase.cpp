@@ -133,7 +133,8 @@ HxParamBase& HxParamBase::operator=(const HxParamBase& other)
     const auto oldTouched = std::exchange(touched_, std::uint8_t{0});
     const auto oldFlags = std::exchange(flags_, other.flags_);
     try {
-        setName(other.name_);
+        if (this != &other)
+            setName(other.name_);
     } catch (...) {
         touched_ |= oldTouched;
         flags_ = oldFlags;

@@ -31,6 +31,7 @@ HxParamBundle::HxParamBundle(const HxParamBundle& other) : HxParamBundle(other, 
     copy(other);
 }
 
+// NOLINTNEXTLINE(performance-noexcept-move-constructor): the copied name needs memory
 HxParamBundle::HxParamBundle(HxParamBundle&& other) : HxParamBundle(other, Untitled())
 {
     move(other);

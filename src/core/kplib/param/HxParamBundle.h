@@ -33,7 +33,7 @@ public:
     HxParamBundle& operator=(const HxParamBundle& other);
 
     /// Copies flags and name and takes the children. Assignment leaves flags and name as they are.
-    HxParamBundle(HxParamBundle&& other);
+    HxParamBundle(HxParamBundle&& other);  // NOLINT(performance-noexcept-move-constructor): the name needs memory
     HxParamBundle& operator=(HxParamBundle&& other) noexcept;
 
     HxParamBundle* duplicate() const override;

@@ -73,7 +73,7 @@ void HxParamBundle::sortParameters() const
     if (!isSorted()) {
         const long first = nBundles(), count = size() - first;
         if (count > 1)
-            std::qsort(children_.data() + first, static_cast<size_t>(count), sizeof(HxParamBase*), compareParamNames);
+            std::qsort(children_.data() + first, static_cast<size_t>(count), sizeof(void*), compareParamNames);
         counts_.fetch_or(sortedBit, std::memory_order_release);
     }
     sortLock_.store(0, std::memory_order_release);

@@ -231,7 +231,7 @@ int HxParameter::getNum(int i) const
         if constexpr (std::is_floating_point_v<decltype(v)>)
             result = rounded(static_cast<double>(v));
         else
-            result = static_cast<int>(v);
+            result = static_cast<int>(+v);
     });
     return result;
 }

@@ -1,0 +1,140 @@
+#include <kplib/rawdata/KpRawData.h>
+
+#include <kplib/log/KpLogFile.h>
+#include <kplib/rawdata/detail/KpBlockwise.h>
+#include <kplib/rawdata/detail/KpLoose.h>
+#include <kplib/rawdata/detail/KpPrimTypeVisit.h>
+#include <kplib/rawdata/detail/KpRawDataKernels.h>
+
+#include <cmath>
+#include <limits>
+#include <type_traits>
+
+namespace {
+
+using namespace kplib::detail;
+
+template <typename T>
+void fill(Loose<T>* to, long n, T value)
+{
+    for (long i = 0; i < n; ++i)
+        to[i].value = value;
+}
+
+template <typename T>
+void fillAll(void* dst, T value, long n)
+{
+    constexpr long perBlock = 4096 / sizeof(T);
+    auto* to = static_cast<Loose<T>*>(dst);
+    if (sizeof(T) == 1) {
+        std::memset(dst, static_cast<int>(value), static_cast<unsigned long>(n));
+    } else if (!isStreamed(dst, n, sizeof(T))) {
+        fill(to, n, value);
+    } else {
+        Loose<T> block[perBlock];
+        fill(block, perBlock, value);
+        const long head = toCacheLine(dst, sizeof(T));
+        fill(to, head, value);
+        to += head;
+        for (n -= head; n >= perBlock; n -= perBlock, to += perBlock)
+            streamCopy(to, block, sizeof block);
+        fill(to, n, value);
+        streamFence();
+    }
+}
+
+/// What `n` counts in floats for complex numbers, which are walked as such.
+KpTypedPointer asNumbers(KpTypedPointer data, unsigned long& n)
+{
+    if (data.type != KpPrimType::Complex)
+        return data;
+    n *= 2;
+    return {data.data, KpPrimType::Float};
+}
+
+void swapWords(void* data, unsigned long n, int width)
+{
+    static SwapLoops* const loops = best(swapPaths());
+    loops(width)(data, static_cast<long>(n));
+}
+
+}  // namespace
+
+void KpRawData::memset(KpTypedPointer dst, int value, long n)
+{
+    const bool isDone = visitNumberType(dst.type, [&]<typename T>(ElementTag<T>) {
+        if (n > 0)
+            fillAll(dst.data, static_cast<T>(value), n);
+    });
+    if (!isDone)
+        getTheLogInstance().errorf("Unsupported data type %s in KpRawData::memset()\n", dst.type.name());
+}
+
+void KpRawData::memset(KpTypedPointer dst, double value, long n)
+{
+    if (dst.type == KpPrimType::Float || dst.type == KpPrimType::Double) {
+        visitNumberType(dst.type, [&]<typename T>(ElementTag<T>) {
+            if (n > 0)
+                fillAll(dst.data, static_cast<T>(value), n);
+        });
+        return;
+    }
+    const double rounded = std::floor(value + 0.5);
+    const bool fits = rounded >= -2147483648.0 && rounded < 2147483648.0;
+    memset(dst, fits ? static_cast<int>(rounded) : std::numeric_limits<int>::min(), n);
+}
+
+void KpRawData::getRange(KpTypedPointer data, unsigned long n, float& min, float& max)
+{
+    static RangeLoops* const loops = best(rangePaths());
+    const KpTypedPointer numbers = asNumbers(data, n);
+    visitNumberType(numbers.type, [&]<typename T>(ElementTag<T>) {
+        T low = *static_cast<const Loose<T>*>(numbers.data);
+        T high = low;
+        loops(numbers.type)(numbers.data, static_cast<long>(n), &low, &high);
+        min = static_cast<float>(low);
+        max = static_cast<float>(high);
+    });
+}
+
+bool KpRawData::isConstant(KpTypedPointer data, unsigned long n)
+{
+    static DiffersLoops* const loops = best(differsPaths());
+    const KpTypedPointer numbers = asNumbers(data, n);
+    bool isOneValue = false;
+    visitNumberType(numbers.type, [&]<typename T>(ElementTag<T>) {
+        if (n < 1) {
+            isOneValue = true;
+            return;
+        }
+        const T head = *static_cast<const Loose<T>*>(numbers.data);
+        isOneValue = head == head && !loops(numbers.type)(numbers.data, static_cast<long>(n), &head);
+    });
+    return isOneValue;
+}
+
+void KpRawData::swapBytes(KpTypedPointer data, unsigned long n)
+{
+    const int size = data.type.size();
+    if (size == 8 && data.type != KpPrimType::Double)
+        swapWords(data.data, 2 * n, 4);
+    else if (size == 2 || size == 4 || size == 8)
+        swapWords(data.data, n, size);
+    else if (size != 1)
+        getTheLogInstance().warnf("Swapping of %d-byte words not supported.", size);
+}
+
+void KpRawData::swapBytesWord2(void* data, unsigned long n)
+{
+    swapWords(data, n, 2);
+}
+
+void KpRawData::swapBytesWord4(void* data, unsigned long n)
+{
+    swapWords(data, n, 4);
+}
+
+void KpRawData::swapBytesWord8(void* data, unsigned long n)
+{
+    swapWords(data, n, 8);
+}

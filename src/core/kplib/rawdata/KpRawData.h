@@ -1,0 +1,147 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpForward.h>
+#include <kplib/rawdata/KpTypedPointer.h>
+
+#include <cstdio>
+
+/// Operations on flat runs of elements whose type is known at run time only, and on the dense 3D blocks made of them.
+///
+/// Numbers here are byte, short, int, float, double and ushort; complex is served where an operation says so. Counts
+/// are counts of elements of the buffer's own type: one of complex is a pair of floats. Elements are packed, x fastest,
+/// then y, then z, and interleaved components sit together; their addresses need no alignment. The host is
+/// little-endian.
+///
+/// Nothing here keeps state or throws: a failure is a line in the log, and the target stays as it was. Any number of
+/// threads may work on distinct buffers. The loop for an element type is chosen once a call, and for the processor at
+/// hand: results are the same to the bit on all of them.
+class KPLIB_API KpRawData {
+public:
+    KpRawData() = delete;
+
+    /// @name Conversion and mapping
+    /// Source and target may be one buffer, or overlap with the target first, if target elements are no larger.
+    /// @{
+
+    /// Copies `n` elements into the type of `dst`; none if `n` is below 1. Equal types, of any kind, are copied as
+    /// bytes.
+    ///
+    /// Values are limited to the target's range, then cut towards zero, never rounded: 254.9 is 254 as a byte, 300 is
+    /// 255. NaN becomes 0, and the smallest value as an int. Ushort to short keeps the bits (40000 is -25536), floats
+    /// of 2147483648 and more are -2147483648 as an int, and doubles stop at -2147483646: peers rely on these three. An
+    /// error is logged, and nothing written, if one type is complex or the target is no number; a source that is no
+    /// number is ignored without a word.
+    static void memcpy(KpTypedPointer dst, KpTypedPointer src, long n);
+
+    /// Converts (element + offset) * scale as memcpy() does, and limits ushort to short and equal types too.
+    ///
+    /// The sum and the product are rounded in single precision, to which element, offset and scale are brought first;
+    /// for double targets, and for int and float targets of a double source, in double precision. Complex maps to
+    /// complex only, real and imaginary parts alike. Errors as in memcpy().
+    static void mapLinear(KpTypedPointer dst, KpTypedPointer src, unsigned long n, double offset, double scale);
+
+    /// Sets `n` elements to `value`, of which integers take the low bits. An error is logged if they are no numbers.
+    static void memset(KpTypedPointer dst, int value, long n);
+
+    /// The same, rounded half up for integers: 2.5 is 3, -2.5 is -2. Not limited: 300 leaves 44 in a byte. What no int
+    /// holds counts as the smallest int, so its low bits are 0.
+    static void memset(KpTypedPointer dst, double value, long n);
+    /// @}
+
+    /// @name Questions
+    /// @{
+
+    /// Smallest and largest of `n` elements, rounded to float; the first one is always read. The parts of complex
+    /// numbers share one range. NaN is skipped, but stays in both results if it comes first. For other types the
+    /// results are left as they were.
+    static void getRange(KpTypedPointer data, unsigned long n, float& min, float& max);
+
+    /// Whether no element, and no part of a complex one, is less or greater than the first; true if `n` is 0. NaN at
+    /// the head gives false, later NaN is skipped. False for other types. Stops at the first difference.
+    static bool isConstant(KpTypedPointer data, unsigned long n);
+    /// @}
+
+    /// @name Byte order, in place
+    /// @{
+
+    /// Reverses the bytes of each element; of the two halves of complex numbers and string references each by itself.
+    static void swapBytes(KpTypedPointer data, unsigned long n);
+
+    /// Reverses the bytes of `n` words of that many bytes.
+    static void swapBytesWord2(void* data, unsigned long n);
+    static void swapBytesWord4(void* data, unsigned long n);
+    static void swapBytesWord8(void* data, unsigned long n);
+    /// @}
+
+    /// @name Files
+    /// @{
+
+    /// Reads or writes `count` items of `size` bytes, at least 1, by pieces of 1 MiB up to the first short one. The
+    /// number of whole items transferred.
+    static unsigned long fread(void* data, unsigned long size, unsigned long count, FILE* f);
+    static unsigned long fwrite(const void* data, unsigned long size, unsigned long count, FILE* f);
+
+    /// Elements in a file of the named byte order; the number of whole ones transferred. readBigEndian() swaps all `n`
+    /// elements in memory, however few it read. writeBigEndian() swaps the caller's buffer for the time of the call:
+    /// nobody may look at it meanwhile.
+    static long readBigEndian(KpTypedPointer data, unsigned long n, FILE* f);
+    static long writeBigEndian(KpTypedPointer data, unsigned long n, FILE* f);
+    static long readLittleEndian(KpTypedPointer data, unsigned long n, FILE* f);
+    static long writeLittleEndian(KpTypedPointer data, unsigned long n, FILE* f);
+
+    /// Reads from a descriptor until `size` bytes have come or it ends, by calls of 4 MiB at most if `limitChunkSize`
+    /// is set. The bytes read; a failure, an interrupted call included, is logged and ends it.
+    static long long read(int fd, void* data, long long size, bool limitChunkSize);
+
+    /// Writes all `size` bytes to a descriptor and returns their number; all bits set at the first failure.
+    static unsigned long write(int fd, const void* data, unsigned long size);
+    /// @}
+
+    /// @name Blocks in memory
+    /// @{
+
+    /// Mirrors a block of `dims` voxels in place along `axis`, 0 to 2. False, and nothing changes, for another axis, an
+    /// empty block, null, or if there is no memory for the exchange.
+    static bool flip(void* data, int bytesPerVoxel, const int* dims, int axis);
+
+    /// Cuts or extends a block to the box from `min` to `max`, both inclusive. `data`, a block of malloc, and `dims`
+    /// then tell the new block; addresses into the old one are void. Voxels outside of it are copies of `fillValue`, or
+    /// of the nearest voxel if that is null. False, and nothing changes, for an empty box or block, null, or if there
+    /// is no memory.
+    static bool crop(void*& data, int bytesPerVoxel, int* dims, const int* min, const int* max, const void* fillValue);
+    /// @}
+
+    /// @name Down-sampling by whole factors
+    /// A block of fx * fy * fz voxels of the source becomes one of the target, which is of the same type, holds dx / fx
+    /// by dy / fy by dz / fz voxels and is the caller's. What is left over at the far edges is never read. Factors and
+    /// `nDataVar` are at least 1; nothing is done for others, or for factors above their sizes.
+    ///
+    /// `progress` may be null. It gets a scope of `dz` steps, closed on return, and after each layer of voxels the step
+    /// reached, unless it is canceled: then the rest of the target is left as it was. An error is logged if the
+    /// elements are no numbers.
+    /// @{
+
+    /// The mean of each block, cut towards zero for integers. Sums run along x, then y, then z: those of real numbers
+    /// are kept in the element's own precision and so depend on that order.
+    static void downSample3D(void* dst, KpTypedPointer src, unsigned long dx, unsigned long dy, unsigned long dz,
+                             int fx, int fy, int fz, KpProgressInterface* progress);
+
+    /// The mean of each of `nDataVar` components.
+    static void downSample3DN(void* dst, KpTypedPointer src, unsigned long dx, unsigned long dy, unsigned long dz,
+                              int fx, int fy, int fz, int nDataVar, KpProgressInterface* progress);
+
+    /// The largest value of each of `nDataVar` components, which may so come from different voxels. NaN counts only in
+    /// the first voxel of a block, and then stays.
+    static void downSampleMaxFilterComponents3DN(void* dst, KpTypedPointer src, unsigned long dx, unsigned long dy,
+                                                 unsigned long dz, int fx, int fy, int fz, int nDataVar,
+                                                 KpProgressInterface* progress);
+
+    /// The first voxel of each block as it stands: labels must not be mixed.
+    ///
+    /// For ushort, `b` is the source and `a` the target; for all other types `a` is the source and `b` the target, and
+    /// that is meant.
+    static void downSampleLabels3D(void* a, KpTypedPointer b, unsigned long dx, unsigned long dy, unsigned long dz,
+                                   int fx, int fy, int fz, KpProgressInterface* progress);
+    /// @}
+};

@@ -1,0 +1,62 @@
+#include <kplib/rawdata/KpRawData.h>
+
+#include <kplib/log/KpLogFile.h>
+#include <kplib/rawdata/detail/KpBlockwise.h>
+#include <kplib/rawdata/detail/KpPrimTypeVisit.h>
+#include <kplib/rawdata/detail/KpRawDataKernels.h>
+
+namespace {
+
+using namespace kplib::detail;
+
+/// Whether both types are numbers. A target that isn't one is an error, a source that isn't is left out without a word,
+/// and that is meant.
+bool areNumbers(KpPrimType to, KpPrimType from)
+{
+    if (!isNumberType(to)) {
+        getTheLogInstance().errorf("Unsupported data type %s in KpRawData()\n", to.name());
+        return false;
+    }
+    return isNumberType(from);
+}
+
+void mapNumbers(KpTypedPointer dst, KpTypedPointer src, unsigned long n, double offset, double scale)
+{
+    static MapLoops* const loops = best(mapPaths());
+    MapLoop* const loop = loops(dst.type, src.type);
+    transfer({dst.data, src.data, static_cast<long>(n), dst.type.size(), src.type.size()},
+             [=](void* to, const void* from, long count) { loop(to, from, count, offset, scale); });
+}
+
+}  // namespace
+
+void KpRawData::memcpy(KpTypedPointer dst, KpTypedPointer src, long n)
+{
+    static ConvertLoops* const loops = best(convertPaths());
+    if (dst.type == src.type) {
+        if (n > 0)
+            std::memmove(dst.data, src.data, static_cast<unsigned long>(n) * static_cast<unsigned>(dst.type.size()));
+        return;
+    }
+    if (dst.type == KpPrimType::Complex || src.type == KpPrimType::Complex) {
+        getTheLogInstance().errorf("ERROR: KpRawData::memcpy(), complex data are not supported\n");
+        return;
+    }
+    if (areNumbers(dst.type, src.type) && n > 0)
+        transfer({dst.data, src.data, n, dst.type.size(), src.type.size()}, loops(dst.type, src.type));
+}
+
+void KpRawData::mapLinear(KpTypedPointer dst, KpTypedPointer src, unsigned long n, double offset, double scale)
+{
+    if (dst.type == KpPrimType::Complex && src.type == KpPrimType::Complex) {
+        mapNumbers({dst.data, KpPrimType::Float}, {src.data, KpPrimType::Float}, 2 * n, offset, scale);
+        return;
+    }
+    if (dst.type == KpPrimType::Complex || src.type == KpPrimType::Complex) {
+        // One text for both directions, and that is meant.
+        getTheLogInstance().errorf("ERROR: KpRawData::mapLinear(), mapping from complex to real is not supported\n");
+        return;
+    }
+    if (areNumbers(dst.type, src.type))
+        mapNumbers(dst, src, n, offset, scale);
+}
