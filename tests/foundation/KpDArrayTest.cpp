@@ -28,6 +28,10 @@ int Traced::alive = 0;
 struct Zeroing {  // plain, although its constructor does something
     int value = 0;
 };
+struct Tree {
+    KpDArray<Tree> children;
+};
+static_assert(sizeof(Tree) == 24);
 static_assert(KpElementTraits<int*>::kind == KpElementKind::Bytes);
 static_assert(KpElementTraits<Zeroing>::kind == KpElementKind::Plain);
 static_assert(KpElementTraits<KpString>::kind == KpElementKind::Managed && KpElementTraits<KpString>::movesAsBytes);
