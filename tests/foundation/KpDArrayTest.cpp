@@ -1,10 +1,11 @@
 #include <kplib/foundation/KpDArray.h>
 #include <kplib/foundation/KpMemoryException.h>
 #include <kplib/foundation/KpString.h>
-#include <support/FailingMalloc.h>
+#include <support/ExhaustedMemory.h>
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <climits>
 #include <memory>
 #include <random>
@@ -27,6 +28,10 @@ int Traced::alive = 0;
 struct Zeroing {  // plain, although its constructor does something
     int value = 0;
 };
+struct Tree {
+    KpDArray<Tree> children;
+};
+static_assert(sizeof(Tree) == 24);
 static_assert(KpElementTraits<int*>::kind == KpElementKind::Bytes);
 static_assert(KpElementTraits<Zeroing>::kind == KpElementKind::Plain);
 static_assert(KpElementTraits<KpString>::kind == KpElementKind::Managed && KpElementTraits<KpString>::movesAsBytes);
@@ -69,20 +74,9 @@ TEST(KpDArray, remaxAndResizeSetSizeAndCapacityByTheirRules)
     EXPECT_EQ(array.capacity(), 10);
     EXPECT_EQ(array.remax(0, 0), 10);
     EXPECT_EQ(array.data(), nullptr);
-}
-
-TEST(KpDArray, takesItsOwnElementsThroughAReallocation)
-{
-    KpDArray<KpString> array{"a", "b", "c"};
-    array.insert(3, 3, array.data());
-    array.remax();
-    array.append(array[0]);
-    array.remax();
-    array.insert(1, 1, &array[2]);
-    array.insert(0, 0, array.data());
     array.insert(0, -1, array.data());
-    EXPECT_EQ(contents(array), (std::vector<KpString>{"a", "c", "b", "c", "a", "b", "c", "a"}));
-    EXPECT_EQ(KpDArray<KpString>(array).capacity(), array.size());
+    array.insert(0, 3, std::vector<int>(3).data());
+    EXPECT_EQ(KpDArray<int>(array).capacity(), 3);
 }
 
 template <typename T>
@@ -112,13 +106,17 @@ TYPED_TEST(KpDArrayModel, behavesAsAVectorThroughRandomChanges)
             const TypeParam value = makeValue<TypeParam>(random());
             switch (random() % 7) {
             case 0:
-            case 1:
                 array.append(value);
                 model.push_back(value);
                 break;
-            case 2: {
-                const std::vector<TypeParam> items(random() % 5, value);
-                array.insert(pos, static_cast<long>(items.size()), items.data());
+            case 1:
+                array.append(pos < size ? array[pos] : value);
+                model.push_back(pos < size ? TypeParam(model[pos]) : value);
+                break;
+            case 2: {  // some of its own, from before or behind the place
+                const unsigned from = random() % 2 ? pos / 2 : pos, to = from < pos ? pos : size;
+                const std::vector<TypeParam> items(model.begin() + from, model.begin() + to);
+                array.insert(pos, to - from, array.data() + from);
                 model.insert(model.begin() + pos, items.begin(), items.end());
                 break;
             }
@@ -133,7 +131,7 @@ TYPED_TEST(KpDArrayModel, behavesAsAVectorThroughRandomChanges)
                 model.resize(pos);
                 break;
             case 5:
-                array.remax(static_cast<long>(random() % 50));
+                array.remax(static_cast<long>(random() % 50));  // so that what comes next reallocates
                 break;
             default:
                 array = KpDArray<TypeParam>(array);
@@ -168,28 +166,19 @@ TEST(KpDArray, insertsSortedBehindEqualElements)
     KpDArray<int> array{1, 5, 9};
     EXPECT_EQ(array.insertSorted(5, kpStandardCompare<int>), 2);
     EXPECT_EQ(array.insertSorted(0, kpStandardCompare<int>, 0, -1), 1);  // element 0 counts as known to be less
-    KpDArray<KpString> names;
-    for (const char* name : {"b", "a", "B", "c"})
-        names.insertSorted(name, kpStandardCompare<KpString>);
-    EXPECT_EQ(contents(names), (std::vector<KpString>{"B", "a", "b", "c"}));
+    EXPECT_EQ(contents(array), (std::vector<int>{1, 0, 5, 5, 9}));
 }
 
 TEST(KpDArray, survivesFailingAllocations)
 {
     KpDArray<KpString> array{"a", "b"};
     array.remax(100);
-    for (long failing = 0; failing < 8; ++failing) {
-        const long before = array.size();
-        try {
-            const kplib::test::FailingMalloc failures(failing);
+    kplib::test::failAtEachAllocation(
+        [&] {
             array.insert(1, 2, array.data());
             array.resize(array.size() + 3);
-        } catch (const KpMemoryException&) {
-            EXPECT_LE(array.size() - before, 5);
-        }
-        for (const KpString& text : array)
-            ASSERT_LE(text.length(), 1);  // no raw element is left
-    }
+        },
+        [&] { ASSERT_TRUE(std::all_of(array.begin(), array.end(), [](auto& text) { return text.length() < 2; })); });
     EXPECT_GT(array.size(), 4);
     KpDArray<double> numbers;
     EXPECT_THROW(numbers.remax(LONG_MAX / 4, 0), KpMemoryException);

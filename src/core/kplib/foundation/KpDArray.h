@@ -35,11 +35,9 @@ struct KpElementTraits {
 /// the insertions change it; positions are not checked. Exhausted memory is a KpMemoryException. If copying or making a
 /// managed element throws, the array is as before, without the new elements; if the storage itself can't grow in
 /// insertMemory() and what stands on it, the capacity is already changed and the array is good for destruction only.
-/// One thread at a time.
+/// T may be incomplete where an array is only declared, as within T itself. One thread at a time.
 template <typename T>
 class KpDArray {
-    static_assert(alignof(T) <= alignof(std::max_align_t), "the heap gives no larger alignment");
-
 public:
     using value_type = T;
     using iterator = T*;
@@ -125,6 +123,7 @@ private:
     static unsigned long bytes(long count)
     {
         unsigned long size = 0;  // an impossible count asks for all there is, and so fails
+        // NOLINTNEXTLINE(bugprone-sizeof-expression): the elements may be pointers
         return __builtin_mul_overflow(static_cast<unsigned long>(count), sizeof(T), &size) ? ULONG_MAX : size;
     }
     static long sum(long a, long b)
@@ -245,6 +244,7 @@ void KpDArray<T>::remove(long pos)
 template <typename T>
 void KpDArray<T>::relocate(long count)
 {
+    static_assert(alignof(T) <= alignof(std::max_align_t), "the heap gives no larger alignment");
     if constexpr (Traits::movesAsBytes) {
         data_ = static_cast<T*>(kprealloc(data_, bytes(count)));
     } else {

@@ -21,6 +21,7 @@ public:
     const KpTypeInfo* getTypeId() const override;
     ~KpInterfaceOwner() override;
 
+    /// Count one handle more or less.
     virtual void ref() = 0;
     virtual void unref() = 0;
 
@@ -31,6 +32,7 @@ public:
     static KpTypeInfo* getClassTypeId();
     static void initClass() { getClassTypeId(); }
 
+    /// Adds an interface to the list; with OwnerDeletes it becomes the owner's, without memory it stays the caller's.
     void registerInterface(KpTypedObject* object, MemoryPolicy policy);
     void registerInterfaceStaticMemory(KpTypedObject* object);
 

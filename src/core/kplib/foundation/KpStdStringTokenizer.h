@@ -14,6 +14,7 @@ public:
     /// Number of tokens in the whole text, however many have been read; O(length) the first time.
     size_t countTokens() const;
 
+    /// Whether nextToken() has one to give.
     bool hasMoreTokens() const { return begin_ != end_; }
 
     /// The next token into `token`; behind the last one, `token` stays.

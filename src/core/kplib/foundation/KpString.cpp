@@ -125,12 +125,7 @@ bool KpString::operator!=(const char* s) const
 {
     if (!s)
         return size() == 0;
-    return static_cast<size_t>(length()) != std::strlen(s) || std::strcmp(c_str(), s) != 0;
-}
-
-bool operator<(const KpString& a, const KpString& b)
-{
-    return std::strcmp(a, b) < 0;
+    return static_cast<size_t>(size()) != std::strlen(s) + 1 || std::strcmp(c_str(), s) != 0;
 }
 
 std::ostream& operator<<(std::ostream& out, const KpString& text)
@@ -157,6 +152,7 @@ char* KpString::vprintf(const char* format, va_list args)
     if (n < capacity()) {
         resize(n + 1);
     } else {
+        data()[size() - 1] = '\0';  // a whole text again, for the case that there is no memory
         remax(n + 1, n + 1);
         std::vsnprintf(data(), static_cast<size_t>(size()), format, again);
     }

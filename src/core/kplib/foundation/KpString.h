@@ -3,14 +3,16 @@
 #include <kplib/foundation/KpDArray.h>
 #include <kplib/foundation/KpExport.h>
 
+#include <compare>
 #include <cstdarg>
 #include <iosfwd>
 #include <string_view>
 
 /// The library's string: an array of char whose last element is the NUL, so size() is length() + 1.
 ///
-/// Text is bytes, of whatever encoding. Only raw array operations and a move away from it leave a string without its
-/// NUL (an array of size 0); it then reads as "". No positions are checked. One thread at a time.
+/// Text is bytes, of whatever encoding. Only raw array operations, a move away from it and a format that the platform
+/// refuses leave a string without its NUL (an array of size 0); it then reads as "". No positions are checked. One
+/// thread at a time.
 class KPLIB_API KpString : public KpDArray<char> {
 public:
     /// Selects the constructor that takes no memory.
@@ -66,16 +68,23 @@ public:
     bool operator==(const KpString& other) const;
     /// As !=, turned round.
     bool operator==(const char* s) const { return !(*this != s); }
-    /// True when the texts differ. A null `s` differs only from a string without a NUL, not from any proper one, empty
-    /// or not: odd, and meant.
+    /// True when the texts differ; a string without a NUL differs from every text, "" too. A null `s` differs only from
+    /// such a one, not from any proper string, empty or not: odd, and meant.
     bool operator!=(const char* s) const;
     bool operator!=(char* s) const { return *this != static_cast<const char*>(s); }
     bool operator!=(std::nullptr_t) const { return *this != static_cast<const char*>(nullptr); }
+    friend bool operator==(const char* s, const KpString& text) { return text == s; }
 
-    /// Replaces the content by the formatted text and returns it. The string itself must not be among the arguments.
+    /// The order of strcmp, so that no comparison ever falls back on the addresses of the texts.
+    std::weak_ordering operator<=>(const KpString& other) const { return *this <=> other.c_str(); }
+    std::weak_ordering operator<=>(const char* s) const { return std::strcmp(c_str(), s) <=> 0; }
+
+    /// Replaces the content by the formatted text and returns it. The string itself must not be among the arguments. If
+    /// there is no memory, the content is undefined text.
     char* printf(const char* format, ...);
     char* vprintf(const char* format, va_list args);
 
+    /// The number in decimal, in place of the content or as a new string.
     void setInt64(long long v);
     static KpString fromInt64(long long v);
     /// The decimal number at the start of the text; without one, 0.
@@ -111,8 +120,5 @@ private:
 
 /// `a` followed by `b`; a null `b` adds nothing.
 KPLIB_API KpString operator+(const KpString& a, const char* b);
-
-/// The order of strcmp.
-KPLIB_API bool operator<(const KpString& a, const KpString& b);
 
 KPLIB_API std::ostream& operator<<(std::ostream& out, const KpString& text);

@@ -13,6 +13,7 @@ public:
 
     /// The same with new text.
     KpStringTokenizer& operator=(const char* text);
+    KpStringTokenizer& operator=(const KpString& text) { return *this = text.c_str(); }
 
     KpStringTokenizer(const KpStringTokenizer&) = default;
     KpStringTokenizer& operator=(const KpStringTokenizer&) = default;
@@ -24,6 +25,7 @@ public:
     /// Goes on to the next character that is no separator.
     void skipSpace();
 
+    /// Whether there is text left.
     bool hasMoreTokens() { return pos_ < length_; }
 
     /// The next token, valid until the next call; empty behind the last one.

@@ -17,6 +17,7 @@ public:
     /// Gives the slot up. Values that threads still hold are not visited.
     ~KpThreadLocalStorageBase();
 
+    /// This thread's value, null before the first set().
     void* get() const;
 
     /// Replaces this thread's value; the old one is the caller's to destroy.

@@ -19,6 +19,7 @@ public:
     /// change of the system time moves it.
     bool wait(KpMutex* mutex, unsigned long milliseconds);
 
+    /// Wakes one of those who wait, or all; nothing happens when nobody waits.
     void wakeOne();
     void wakeAll();
 

@@ -184,7 +184,7 @@ void KpLogFile::writeLine(KpLogLevel level, const KpString& line)
 void KpLogFile::writeCharBuffer(const char* text)
 {
     const Lock lock(&record_->mutex);
-    const std::string_view bytes = text;
+    const std::string_view bytes = text ? text : "";
     if (record_->file) {
         put(bytes, false, record_->file);
         record_->bytesWritten += bytes.size();

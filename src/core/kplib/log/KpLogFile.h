@@ -59,6 +59,7 @@ public:
     /// The text as it stands, whatever the thresholds, to the open file and to the console if lines are copied there.
     void writeCharBuffer(const char* text);
 
+    /// Hands all that was written on to the system.
     void flush();
 
     /// The least level that reaches file and console; KpLogInfo at first.

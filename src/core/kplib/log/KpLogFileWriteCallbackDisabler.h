@@ -11,6 +11,7 @@ public:
     KpLogFileWriteCallbackDisabler(const KpLogFileWriteCallbackDisabler&) = delete;
     KpLogFileWriteCallbackDisabler& operator=(const KpLogFileWriteCallbackDisabler&) = delete;
 
+    /// No callback and KpLogOff.
     void disableWriteCallback();
     /// Sets what was remembered.
     void restoreWriteCallback();

@@ -19,8 +19,14 @@ double seconds(std::uint64_t ticks)
 
 unsigned int milliseconds(std::uint64_t ticks)
 {
-    return static_cast<unsigned int>(
-        std::rint(static_cast<double>(ticks) * 1000.0 * cFactor.load(std::memory_order_relaxed)));
+    const double value = std::rint(static_cast<double>(ticks) * 1000.0 * cFactor.load(std::memory_order_relaxed));
+    return static_cast<unsigned int>(static_cast<std::uint64_t>(value));  // what doesn't fit wraps
+}
+
+// Towards zero; what doesn't fit wraps, as a watch that was only ever stopped counts from the start of the system.
+int truncated(double value)
+{
+    return static_cast<int>(static_cast<std::int64_t>(value));
 }
 
 }  // namespace
@@ -108,11 +114,11 @@ void KpWatch::dump(int index)
     if (!name_ || name_->isEmpty())
         return;
     const double t = getTime2();
-    const int ms = static_cast<int>(1000.0 * t);
+    const int ms = truncated(1000.0 * t);
     KpString line = index != 0 ? KpString(0, " --- %s [%02d]: %d msec", name_->c_str(), index, ms)
                                : KpString(0, " --- %s: %d msec", name_->c_str(), ms);
     if (lastDump_ >= 0)
-        line += KpString(0, "  (+ %d ms)", static_cast<int>((t - lastDump_) * 1000));
+        line += KpString(0, "  (+ %d ms)", truncated((t - lastDump_) * 1000));
     getTheLogInstance().printf(line);  // as the format, and that is meant
     lastDump_ = static_cast<float>(t);
 }

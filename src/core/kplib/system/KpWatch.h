@@ -14,6 +14,8 @@ public:
     explicit KpWatch(bool startNow);
     /// The same with a label for dump(), copied; null for none.
     KpWatch(const char* name, bool startNow);
+    template <typename T>
+    explicit KpWatch(T* name) = delete;  // a name alone would be taken for the flag
     KpWatch(const KpWatch&) = delete;
     KpWatch& operator=(const KpWatch&) = delete;
     ~KpWatch();

@@ -16,6 +16,7 @@ public:
     /// Detaches itself.
     virtual ~KpProgressGuiInterface();
 
+    /// `text` is gone once the work is canceled: take what you need of it first.
     virtual void setText(const std::string& text) = 0;
     virtual void setMaximum(int maximum) = 0;
     virtual void setValue(int value) = 0;

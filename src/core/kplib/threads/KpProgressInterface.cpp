@@ -134,6 +134,8 @@ void KpProgressInterface::setMaximumGlobal(int maximum)
 
 void KpProgressInterface::setProgressText(const char* text)
 {
+    if (!text)
+        text = "";
     if (steps_.empty()) {
         if (gui_)
             gui_->setText(text);
