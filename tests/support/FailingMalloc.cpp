@@ -5,7 +5,7 @@
 #include <new>
 
 // The linker leads malloc, realloc and calloc of the library's objects here (-Wl,--wrap); the operators new of this
-// binary serve what they and the standard library's inline code allocate.
+// binary serve what they and the standard library's inline code allocate. Those for arrays lead to these by default.
 
 namespace {
 
@@ -55,32 +55,12 @@ void* operator new(size_t size, const std::nothrow_t&) noexcept
     return fails() ? nullptr : __real_malloc(size);
 }
 
-void* operator new[](size_t size)
-{
-    return operator new(size);
-}
-
-void* operator new[](size_t size, const std::nothrow_t& tag) noexcept
-{
-    return operator new(size, tag);
-}
-
 void operator delete(void* ptr) noexcept
 {
     std::free(ptr);
 }
 
 void operator delete(void* ptr, size_t) noexcept
-{
-    std::free(ptr);
-}
-
-void operator delete[](void* ptr) noexcept
-{
-    std::free(ptr);
-}
-
-void operator delete[](void* ptr, size_t) noexcept
 {
     std::free(ptr);
 }

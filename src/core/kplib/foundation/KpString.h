@@ -4,6 +4,7 @@
 #include <kplib/foundation/KpExport.h>
 
 #include <compare>
+#include <concepts>
 #include <cstdarg>
 #include <iosfwd>
 #include <string_view>
@@ -106,7 +107,8 @@ public:
     /// `from` changes nothing.
     void replaceSubStr(const char* from, const char* to);
 
-    /// Splits at each separator, empty pieces included: always one piece more than there are separators.
+    /// Splits at each separator, empty pieces included: always one piece more than there are separators. `out` must not
+    /// hold this string, as it is emptied first.
     void explode(char separator, KpDArray<KpString>& out) const;
 
     /// The text as a token: a backslash before each " and \, and quotes around all when it is empty, holds white space,
@@ -120,5 +122,13 @@ private:
 
 /// `a` followed by `b`; a null `b` adds nothing.
 KPLIB_API KpString operator+(const KpString& a, const char* b);
+/// `a` followed by the character. Of exactly char, so that `a + 1` stays the address of the second character.
+template <std::same_as<char> Char>
+KpString operator+(const KpString& a, Char c)
+{
+    KpString result(a);
+    result += c;
+    return result;
+}
 
 KPLIB_API std::ostream& operator<<(std::ostream& out, const KpString& text);

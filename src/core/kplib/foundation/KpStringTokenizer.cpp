@@ -2,21 +2,23 @@
 
 #include <cctype>
 
-KpStringTokenizer::KpStringTokenizer(const char* text)
+KpStringTokenizer::KpStringTokenizer(std::string_view text)
 {
     retarget(text);
     while (pos_ < length_ && KpStringTokenizer::isSpace(text_[pos_]))
         ++pos_;
 }
 
-KpStringTokenizer::KpStringTokenizer(const char* text, NoSkip)
+KpStringTokenizer& KpStringTokenizer::operator=(const KpString& text)
 {
     retarget(text);
+    skipSpace();
+    return *this;
 }
 
 KpStringTokenizer& KpStringTokenizer::operator=(const char* text)
 {
-    retarget(text);
+    retarget(text ? text : "");
     skipSpace();
     return *this;
 }
@@ -50,11 +52,11 @@ KpString& KpStringTokenizer::nextToken()
     return token_;
 }
 
-void KpStringTokenizer::retarget(const char* text)
+void KpStringTokenizer::retarget(std::string_view text)
 {
-    text_ = text ? text : "";
+    text_ = text.data();
     pos_ = 0;
-    length_ = static_cast<long>(std::strlen(text_));
+    length_ = static_cast<long>(text.size());
 }
 
 void KpStringTokenizer::takeQuoted()
