@@ -33,11 +33,7 @@ TEST(KpInterfaceOwner, attachesOnceFindsTheNewestAndEndsWhatItOwns)
     static int calls = 0;
     struct Part : KpInterface {
         explicit Part(KpInterfaceOwner* itsOwner) : KpInterface(itsOwner, KpInterfaceOwner::OwnerDeletes) {}
-        ~Part() override
-        {
-            ends += name;
-            owner()->notifyDelete();  // a way back into the owner that has to be safe
-        }
+        ~Part() override { ends += name, owner()->notifyDelete(); }  // a way back into the owner that has to be safe
         const char name = next++;
     };
     KpHandle<KpInterfaceOwner> owner(new KpInterfaceOwnerDefaultImpl);

@@ -9,20 +9,17 @@
 #include <string>
 #include <thread>
 
-static void wait()
-{
-    std::this_thread::sleep_for(std::chrono::milliseconds(10));
-}
+constexpr auto pauseALittle = [] { std::this_thread::sleep_for(std::chrono::milliseconds(10)); };
 
 TEST(KpWatch, addsUpItsRuns)
 {
     KpWatch watch(true);
-    wait();
+    pauseALittle();
     const double first = watch.stop2();
-    wait();
+    pauseALittle();
     EXPECT_TRUE(first >= 0.01 && !watch.isRunning() && watch.getTime2() == first);
     watch.cont();
-    wait();
+    pauseALittle();
     const double second = watch.stop2();
     EXPECT_GE(second, first + 0.01);
     EXPECT_GE(watch.stop2(), second + 0.01) << "stopped twice, the last run counts twice";
@@ -31,9 +28,8 @@ TEST(KpWatch, addsUpItsRuns)
 TEST(KpWatch, dumpWritesALineForANamedWatch)
 {
     const kplib::test::LogCapture log;
-    KpWatch watch("load 100%%", true), emptyName("", true);
-    emptyName.dump(1);
-    wait();
+    KpWatch watch("load 100%%", true);
+    pauseALittle();
     watch.dump(0);
     watch.dump(7);
     watch.start();
@@ -51,7 +47,7 @@ TEST(KpScopedWatch, leavesARunningWatchRunning)
 {
     for (bool reset : {false, true}) {
         KpWatch watch(true);
-        wait();
+        pauseALittle();
         KpScopedWatch(watch, reset);
         EXPECT_TRUE(watch.isRunning() == !reset && (watch.getTime2() < 0.01) == reset);
     }

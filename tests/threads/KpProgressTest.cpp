@@ -7,7 +7,6 @@
 
 #include <gtest/gtest.h>
 
-#include <functional>
 #include <memory>
 #include <string>
 #include <utility>
@@ -26,50 +25,44 @@ struct Gui : KpProgressGuiInterface {
     std::string told;
 };
 
-class KpProgressTest : public testing::Test {
-protected:
-    KpProgressTest() { progress.setProgressGui(&gui); }
-
-    kplib::test::LogCapture log{KpLogError};
-    Gui gui;
-    KpProgressInterface progress;
-};
-
 }  // namespace
 
-TEST_F(KpProgressTest, nestedScopesShareOneScale)
+TEST(KpProgress, nestedScopesShareOneScale)
 {
-    const std::pair<std::function<void()>, const char*> steps[] = {
-        // clang-format off
-        {[&] { progress.nextStep(); progress.setProgressValue(3); }, ""},
-        {[&] { progress.startWorking(0, "x"); }, ""},
-        {[&] { progress.startWorking(10, "a"); }, "m10 \"a\" v0 "},
-        {[&] { progress.setProgressValue(3); }, "v3 "},
-        {[&] { progress.startWorking(5, "b"); }, "m50 \"b\" v15 "},
-        {[&] { progress.setProgressValue(2); }, "v17 "},
-        {[&] { progress.startWorking(2, ""); }, "m100 \"b\" v34 "},  // no text takes over that of the scope around
-        {[&] { progress.nextStep(); }, "v35 "},
-        {[&] { progress.stopWorking(); }, "\"b\" m50 v18 "},
-        {[&] { progress.setProgressValue(99); }, "v20 "},  // clipped to the end of the scope,
-        {[&] { progress.setProgressValue(-1); }, "v14 "},  // and not below
-        {[&] { progress.stopWorking(); }, "\"a\" m10 v4 "},
-        {[&] { progress.setProgressInfo("c"); }, "\"c\" "},
-        {[&] { progress.stopWorking(); }, "c0"},
-        // clang-format on
-    };
-    for (const auto& [step, told] : steps) {
-        step();
-        EXPECT_EQ(gui.take(), told);
-    }
+    Gui gui;
+    KpProgressInterface progress;
+    progress.setProgressGui(&gui);
+    progress.nextStep();
+    progress.startWorking(0, "x");
+    EXPECT_EQ(gui.take(), "") << "no step without a scope, and no scope without steps";
+    progress.startWorking(10, "a");
+    progress.setProgressValue(3);
+    progress.startWorking(5, "b");
+    progress.setProgressValue(2);
+    EXPECT_EQ(gui.take(), "m10 \"a\" v0 v3 m50 \"b\" v15 v17 ");
+    progress.startWorking(2, "");
+    progress.nextStep();
+    progress.stopWorking();
+    EXPECT_EQ(gui.take(), "m100 \"b\" v34 v35 \"b\" m50 v18 ") << "no text takes over that of the scope around";
+    progress.setProgressValue(99);
+    progress.setProgressValue(-1);
+    EXPECT_EQ(gui.take(), "v20 v14 ") << "clipped to the end of the scope, not to its start";
+    progress.stopWorking();
+    progress.setProgressInfo("c");
+    progress.stopWorking();
+    EXPECT_EQ(gui.take(), "\"a\" m10 v4 \"c\" c0");
     EXPECT_TRUE(progress.currentProgressValue() == 10 && progress.globalMaximum() == 1 && !progress.isWorking());
 }
 
-TEST_F(KpProgressTest, cancelAndFailureEndAllWork)
+TEST(KpProgress, cancelAndFailureEndAllWork)
 {
+    const kplib::test::LogCapture log(KpLogError);
+    Gui gui, heard;
+    KpProgressInterface progress, failing;
+    progress.setProgressGui(&gui);
     progress.disableCancel();
-    progress.startWorking(4, "a");
     gui.cancelCallback();
-    EXPECT_FALSE(progress.isCanceled());
+    progress.startWorking(1, "a");
     progress.stopWorking();
     progress.startWorking(4, "a");
     progress.startWorking(3, "b");
@@ -78,8 +71,6 @@ TEST_F(KpProgressTest, cancelAndFailureEndAllWork)
     EXPECT_EQ(gui.take(), "\"a\" m4 c11") << "and no more values";
     progress.startWorking(4, "a");
     EXPECT_TRUE(progress.isCanceled() && !progress.isWorking());
-    KpProgressInterface failing;
-    Gui heard;
     failing.startWorking(4, "a");
     failing.setProgressGui(&heard);
     failing.setFailed(KpResult(5000, "inner", "inner"), "bad");
@@ -88,17 +79,6 @@ TEST_F(KpProgressTest, cancelAndFailureEndAllWork)
     failing.cancel();
     failing.afterStopWorking();
     EXPECT_EQ(failing.result().code(), 5000) << "which a later cancel doesn't hide";
-}
-
-TEST_F(KpProgressTest, scopeClosesWhatIsOpen)
-{
-    progress.startWorking(10, "outer");
-    {
-        const ProgressScope scope(&progress), none(nullptr);
-        progress.startWorking(5, "inner");
-        progress.startWorking(5, "innermost");
-    }
-    EXPECT_TRUE(progress.globalMaximum() == 10 && progress.currentProgressValue() == 1);
 }
 
 TEST(KpProgressGui, isDetachedByWhicheverGoesFirst)
@@ -113,12 +93,12 @@ TEST(KpProgressGui, isDetachedByWhicheverGoesFirst)
     EXPECT_FALSE(last->cancelCallback);
 }
 
-TEST(KpProgress, exhaustedMemoryLeavesTheScopesInOrder)
+TEST(KpProgress, scopeClosesWhatIsOpenEvenWithoutMemory)
 {
     KpProgressInterface progress;
     kplib::test::failAtEachAllocation(
         [&] {
-            const ProgressScope scope(&progress);
+            const ProgressScope scope(&progress), none(nullptr);
             progress.startWorking(3, std::string(100, 't'));
             progress.startWorking(4, "");
         },
