@@ -13,6 +13,7 @@
 #include <regex>
 #include <string>
 #include <thread>
+#include <tuple>
 #include <utility>
 
 namespace {
@@ -89,23 +90,21 @@ TEST_F(KpLogFileTest, thresholdsOfFileAndCallbackAreIndependent)
 
 TEST_F(KpLogFileTest, linesGoWhereTheFlagsLead)
 {
-    const struct {
-        bool hasFile, consoleToLog, logToConsole;
-        const char *toFile, *toConsole;
-    } cases[] = {{true, false, false, "E [] x\nraw", ""}, {true, false, true, "E [] x\nraw", "E [] x\nraw"},
-                 {true, true, false, "raw", "E [] x\n"},  {true, true, true, "raw", "E [] x\nraw"},
-                 {false, false, false, "", "E [] x\n"},   {false, false, true, "", "E [] x\nraw"}};
+    const std::tuple<bool, bool, bool, const char*, const char*> cases[] = {
+        {true, false, false, "E [] x\nraw", ""}, {true, false, true, "E [] x\nraw", "E [] x\nraw"},
+        {true, true, false, "raw", "E [] x\n"},  {true, true, true, "raw", "E [] x\nraw"},
+        {false, false, false, "", "E [] x\n"},   {false, false, true, "", "E [] x\nraw"}};
     FILE* const file = record.file;
-    for (const auto& c : cases) {
-        record.file = c.hasFile ? file : nullptr;
-        record.consoleToLogEnabled = c.consoleToLog;
-        record.logToConsoleEnabled = c.logToConsole;
+    for (const auto& [hasFile, consoleToLog, logToConsole, toFile, toConsole] : cases) {
+        record.file = hasFile ? file : nullptr;
+        record.consoleToLogEnabled = consoleToLog;
+        record.logToConsoleEnabled = logToConsole;
         testing::internal::CaptureStdout();
         log->error(nullptr, "x");
         log->writeCharBuffer("raw");
-        EXPECT_EQ(testing::internal::GetCapturedStdout(), c.toConsole);
+        EXPECT_EQ(testing::internal::GetCapturedStdout(), toConsole);
         record.file = file;
-        EXPECT_EQ(take(), c.toFile);
+        EXPECT_EQ(take(), toFile);
     }
 }
 

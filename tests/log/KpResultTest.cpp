@@ -43,26 +43,21 @@ TEST(KpResult, recordsAFailureOnceAndNoSuccess)
     EXPECT_TRUE(shared.isBad() && shared.code() == 5000 && shared.line() == 12 && shared.text() == result.text());
 }
 
-TEST(KpResult, codesHaveTheirOwnTexts)
+TEST_F(TmTest, codesHaveTheirOwnTexts)
 {
-    const LogCapture log;
-    const struct {
-        int code;
-        const char *given, *data, *text;
-    } cases[] = {{1, nullptr, "", ""},
-                 {2, "given", "given", "internal error"},
-                 {12, "", "", "failed to write file"},
-                 {17, nullptr, "one of the arguments is invalid", "one of the arguments is invalid"},
-                 {4112, nullptr, "Resource busy.", ""}};
-    for (const auto& c : cases) {
-        const KpResult made = Tm::tmError(KpResult::Code(c.code), "f", 3, "fn", "d", "t", c.given, false, false);
-        EXPECT_EQ(made.text() + std::string("|") + made.data(), c.text + std::string("|") + c.data);
-    }
+    const auto texts = [](int code, const char* data) {
+        const KpResult made = Tm::tmError(KpResult::Code(code), "f", 3, "fn", "d", "t", data, false, false);
+        return std::string(made.text()) + '|' + made.data();
+    };
+    EXPECT_EQ(texts(1, nullptr), "|");
+    EXPECT_EQ(texts(2, "given"), "internal error|given");
+    EXPECT_EQ(texts(12, ""), "failed to write file|");
+    EXPECT_EQ(texts(17, nullptr), "one of the arguments is invalid|one of the arguments is invalid");
+    EXPECT_EQ(texts(4112, nullptr), "|Resource busy.");
 }
 
-TEST(KpResult, firstFailureWins)
+TEST_F(TmTest, firstFailureWins)
 {
-    const LogCapture log;
     const KpResult ok, first(1, "first", nullptr), second(2, "second", nullptr);
     KpResult sum;
     EXPECT_STREQ((sum << ok << first << second << ok).text(), "first");

@@ -27,38 +27,40 @@ struct Gui : KpProgressGuiInterface {
 
 }  // namespace
 
-TEST(KpProgress, nestedScopesShareOneScale)
+TEST(KpProgress, nestedScopesShareOneScaleToTheirEnd)
 {
+    const kplib::test::LogCapture log(KpLogError);
     Gui gui;
     KpProgressInterface progress;
     progress.setProgressGui(&gui);
     progress.nextStep();
     progress.startWorking(0, "x");
-    EXPECT_EQ(gui.take(), "") << "no step without a scope, and no scope without steps";
-    progress.startWorking(10, "a");
+    progress.startWorking(10, "a");  // before which there is no scope and no step
     progress.setProgressValue(3);
     progress.startWorking(5, "b");
     progress.setProgressValue(2);
-    EXPECT_EQ(gui.take(), "m10 \"a\" v0 v3 m50 \"b\" v15 v17 ");
-    progress.startWorking(2, "");
+    progress.startWorking(2, "");  // no text takes over that of the scope around
     progress.nextStep();
     progress.stopWorking();
-    EXPECT_EQ(gui.take(), "m100 \"b\" v34 v35 \"b\" m50 v18 ") << "no text takes over that of the scope around";
+    EXPECT_EQ(gui.take(), "m10 \"a\" v0 v3 m50 \"b\" v15 v17 m100 \"b\" v34 v35 \"b\" m50 v18 ");
     progress.setProgressValue(99);
     progress.setProgressValue(-1);
-    EXPECT_EQ(gui.take(), "v20 v14 ") << "clipped to the end of the scope, not to its start";
     progress.stopWorking();
+    EXPECT_EQ(gui.take(), "v20 v14 \"a\" m10 v4 ") << "clipped to the end of the scope, not to its start";
     progress.setProgressInfo("c");
     progress.stopWorking();
-    EXPECT_EQ(gui.take(), "\"a\" m10 v4 \"c\" c0");
+    EXPECT_EQ(gui.take(), "\"c\" c0");
     EXPECT_TRUE(progress.currentProgressValue() == 10 && progress.globalMaximum() == 1 && !progress.isWorking());
+    progress.startWorking(1, "a");
+    progress.setFailed(KpResult(5000, "inner", "inner"), "bad");
+    EXPECT_EQ(gui.take(), "m1 \"a\" v0 c5000bad");
+    EXPECT_EQ(log.lines(), kplib::test::Lines{"E [] Operation failed: 'bad'"});
 }
 
-TEST(KpProgress, cancelAndFailureEndAllWork)
+TEST(KpProgress, cancelEndsAllWorkForGood)
 {
-    const kplib::test::LogCapture log(KpLogError);
-    Gui gui, heard;
-    KpProgressInterface progress, failing;
+    Gui gui;
+    KpProgressInterface progress;
     progress.setProgressGui(&gui);
     progress.disableCancel();
     gui.cancelCallback();
@@ -71,26 +73,17 @@ TEST(KpProgress, cancelAndFailureEndAllWork)
     EXPECT_EQ(gui.take(), "\"a\" m4 c11") << "and no more values";
     progress.startWorking(4, "a");
     EXPECT_TRUE(progress.isCanceled() && !progress.isWorking());
-    failing.startWorking(4, "a");
-    failing.setProgressGui(&heard);
-    failing.setFailed(KpResult(5000, "inner", "inner"), "bad");
-    EXPECT_EQ(heard.take(), "c5000bad");
-    EXPECT_EQ(log.lines(), kplib::test::Lines{"E [] Operation failed: 'bad'"});
-    failing.cancel();
-    failing.afterStopWorking();
-    EXPECT_EQ(failing.result().code(), 5000) << "which a later cancel doesn't hide";
 }
 
 TEST(KpProgressGui, isDetachedByWhicheverGoesFirst)
 {
+    Gui last;
     auto progress = std::make_unique<KpProgressInterface>();
-    auto first = std::make_unique<Gui>(), last = std::make_unique<Gui>();
-    progress->setProgressGui(first.get());
-    first.reset();
+    progress->setProgressGui(std::make_unique<Gui>().get());  // gone with the statement
     progress->startWorking(1, "a");
-    progress->setProgressGui(last.get());
+    progress->setProgressGui(&last);
     progress.reset();
-    EXPECT_FALSE(last->cancelCallback);
+    EXPECT_FALSE(last.cancelCallback);
 }
 
 TEST(KpProgress, scopeClosesWhatIsOpenEvenWithoutMemory)
