@@ -55,7 +55,8 @@ TEST(KpWaitConditionThreads, wakesThoseWhoWait)
     int waiting = 0, go = 0;
     const auto waitWith = [&](unsigned long milliseconds) {
         const Lock lock(&mutex);
-        for (++waiting; go == 0;)
+        ++waiting;
+        while (go == 0)
             EXPECT_TRUE(condition.wait(&mutex, milliseconds));
         --go;
     };
