@@ -9,8 +9,6 @@
 
 namespace {
 
-constexpr int changed = HxParamBase::TouchValue | HxParamBase::TouchAny;
-
 std::string printed(const HxParameter& parameter)
 {
     KpString text("old");
@@ -70,7 +68,7 @@ TEST(HxParameter, countsEachSetAsAChangeButThatOfItsOwnBlock)
     text.set(text.getString());
     EXPECT_EQ(text.touched(), 0);
     text.set(std::string("abc").c_str());
-    EXPECT_EQ(text.touched(), changed);
+    EXPECT_EQ(text.touched(), HxParamBase::TouchValue | HxParamBase::TouchAny);
     text.set(text.getString() + 1);
     EXPECT_STREQ(text.getString(), "bc") << "from inside the old value";
     const int number = 5;
@@ -90,11 +88,9 @@ TEST(HxParameter, isEqualOnlyInBytes)
     const HxParameter parameter("x", 2, KpPrimType::Byte, bytes);
     EXPECT_TRUE(parameter.isEqual(2, KpPrimType::Byte, bytes));
     EXPECT_FALSE(parameter.isEqual(2, KpPrimType::Byte, others));
-    EXPECT_FALSE(parameter.isEqual(2, KpPrimType::SByte, bytes));
     EXPECT_FALSE(parameter.isEqual(2, KpPrimType::Byte, nullptr));
     EXPECT_TRUE(parameter.isEqual(7, KpPrimType::String, parameter.value()));
     EXPECT_TRUE(parameter == HxParameter("x", 2, KpPrimType::Byte, bytes));
-    EXPECT_FALSE(parameter == HxParameter("X", 2, KpPrimType::Byte, bytes));
     EXPECT_FALSE(HxParameter("x", 1) == HxParameter("x", 1));
     const HxParameter odd("x", 1000, KpPrimType::String, "short");
     EXPECT_FALSE(odd.isEqual(1000, KpPrimType::Byte, std::string(1000, 's').c_str()))
