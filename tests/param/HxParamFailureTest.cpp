@@ -81,6 +81,7 @@ TEST(ParamFailure, leavesTheTreeAsItWas)
     } cases[] = {
         {"set", [&](HxParamBundle& root) { root.set("value", 100, many); }},
         {"rename", [](HxParamBundle& root) { root.setName("Another new title"); }},
+        {"rename into the title", [](HxParamBundle& root) { root.setName("with"); }},
         {"create", [](HxParamBundle& root) { root.bundle("New with title", 1); }},
         {"boundary", [](HxParamBundle& root) { root.bundle("BoundaryIds", 1); }},
         {"assign", [&](HxParamBundle& root) { root = other; }},

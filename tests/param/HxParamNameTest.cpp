@@ -6,19 +6,20 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cctype>
 #include <random>
 #include <string>
 
-#include <strings.h>
-
 namespace {
 
-/// The order of names once more: what is cut at a blank is compared as strings are.
-int plainOrder(const std::string& a, const std::string& b)
+/// The order of names once more: what is cut at a blank and upper-cased is compared as strings are.
+int plainOrder(std::string a, std::string b)
 {
-    const int order = strcasecmp(a.c_str(), b.substr(0, b.find(' ')).c_str());
-    return order < 0 ? -1 : order > 0;
+    b = b.substr(0, b.find(' '));
+    for (std::string* s : {&a, &b})
+        std::ranges::transform(*s, s->begin(), [](int c) { return std::toupper(c); });
+    return a < b ? -1 : a > b;
 }
 
 }  // namespace
