@@ -1,4 +1,5 @@
-// Both tokenizers and KpString::protect: nothing is read outside the text, and what protect() writes comes back as one token.
+// Both tokenizers and KpString::protect: nothing is read outside the text, and what protect() writes comes back as one
+// token.
 
 #include <kplib/foundation/KpStdStringTokenizer.h>
 #include <kplib/foundation/KpString.h>

@@ -126,9 +126,8 @@ Window windowOf(Volume& volume)
     return window;
 }
 
-Volume display(Volume& volume, const Window& window)
+void display(Volume& volume, const Window& window, Volume& shown)
 {
-    Volume shown;
     shown.dims = volume.dims;
     shown.spacing = volume.spacing;
     shown.axes = volume.axes;
@@ -140,7 +139,6 @@ Volume display(Volume& volume, const Window& window)
     const double scale = (window.isInverted != (volume.slope < 0) ? -255 : 255) / width;
     const double offset = -center + (scale > 0 ? width / 2 : -width / 2) + 0.5 / scale;  // the last for rounding
     KpRawData::mapLinear(shown.voxels(), volume.voxels(), static_cast<unsigned long>(volume.count()), offset, scale);
-    return shown;
 }
 
 KpResult writePlanes(Volume& shown, const OutputFolder& out)

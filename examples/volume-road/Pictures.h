@@ -13,8 +13,9 @@ struct Window {
 /// The window from the lowest to the highest value, leaving out half a percent at either end.
 Window windowOf(Volume& volume);
 
-/// The volume through the window, as bytes. The linear function of DICOM PS3.3, C.11.2.1.2.1.
-Volume display(Volume& volume, const Window& window);
+/// The volume through the window, as bytes, into `shown`, whose memory is used again. The linear function of DICOM
+/// PS3.3, C.11.2.1.2.1.
+void display(Volume& volume, const Window& window, Volume& shown);
 
 /// Writes axial.png, coronal.png and sagittal.png through the middle of a volume of bytes, the patient upright and seen
 /// as usual (left on the right side of the picture), with square pixels.

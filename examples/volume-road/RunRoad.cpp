@@ -134,7 +134,7 @@ KpResult runRoad(const char* folder, const std::string& uid, const std::string& 
     Road road(progress);
     Series series;
     HxParamBundle root("Volume");
-    Volume volume, mean, maximum;
+    Volume volume, mean, maximum, shown;
     Window window;
     road.nested("look for images", [&] { return scanSeries(folder, uid, progress, series); });
     for (const std::string& warning : series.warnings)
@@ -150,13 +150,13 @@ KpResult runRoad(const char* folder, const std::string& uid, const std::string& 
     });
     road.plain("draw planes", [&] {
         window = chooseWindow(root, mean);
-        Volume shown = display(volume, window);
+        display(volume, window, shown);
         return writePlanes(shown, out);
     });
     road.plain("draw overviews", [&] {
-        Volume shown = display(mean, window);
+        display(mean, window, shown);
         KpResult written = writeOverview(shown, out, "overview-mean.png");
-        shown = display(maximum, window);
+        display(maximum, window, shown);
         written << writeOverview(shown, out, "overview-maximum.png");
         return written;
     });

@@ -14,7 +14,6 @@ TEST(KpColor, readsTexts)
     } cases[] = {{"0.5", true, {0.5f, 0.5f, 0.5f}},
                  {" \t128", true, {grey, grey, grey}},
                  {"255 0 0", true, {1, 0, 0}},
-                 {"1 0 0", true, {1, 0, 0}},
                  {"#1FF8000", true, {1, grey, 0}},
                  {"0.25 0.5 x", false, {0.25f, 0.5f, 9}},
                  {"red", false, {0, 0, 0}},
@@ -30,12 +29,10 @@ TEST(KpColor, readsTexts)
     KpColor color;
     EXPECT_TRUE(color.setValue(3, words));
     EXPECT_EQ(color, KpColor(0.5f, 0.25f, 1));
-    color.setValue(0xFF8001u);
-    EXPECT_TRUE(color.equals(KpColor(1, grey, 1 / 255.0f), 1e-6f));
-    EXPECT_FALSE(color.equals(KpColor(1, grey, 0), 1e-6f));
+    color.setValue(0xFF8001);
+    EXPECT_TRUE(color.equals(KpColor(1, grey, 1 / 255.0f), 1e-6f) && !color.equals(KpColor(1, grey, 0), 1e-6f));
     KpColor::getColorFromName = [](float* red, float*, float*, const char* name) { *red = name[0] == 'r' ? 0.5f : 0; };
-    EXPECT_TRUE(color.setValue("  red"));
-    EXPECT_EQ(color.red(), 0.5f);
+    EXPECT_TRUE(color.setValue("  red") && color.red() == 0.5f);
     KpColor::getColorFromName = nullptr;
 }
 

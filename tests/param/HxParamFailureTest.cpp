@@ -80,10 +80,8 @@ TEST(ParamFailure, leavesTheTreeAsItWas)
         std::function<void(HxParamBundle&)> change;
     } cases[] = {
         {"set", [&](HxParamBundle& root) { root.set("value", 100, many); }},
-        {"add", [&](HxParamBundle& root) { root.set("new", 100, many); }},
         {"rename", [](HxParamBundle& root) { root.setName("Another new title"); }},
         {"rename into the title", [](HxParamBundle& root) { root.setName("with"); }},
-        {"generated name", [](HxParamBundle& root) { root.setName(nullptr); }},
         {"create", [](HxParamBundle& root) { root.bundle("New with title", 1); }},
         {"boundary", [](HxParamBundle& root) { root.bundle("BoundaryIds", 1); }},
         {"assign", [&](HxParamBundle& root) { root = other; }},

@@ -6,6 +6,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cctype>
 #include <random>
 #include <string>
@@ -16,10 +17,8 @@ namespace {
 int plainOrder(std::string a, std::string b)
 {
     b = b.substr(0, b.find(' '));
-    for (std::string* s : {&a, &b}) {
-        for (char& c : *s)
-            c = static_cast<char>(std::toupper(c));
-    }
+    for (std::string* s : {&a, &b})
+        std::ranges::transform(*s, s->begin(), [](int c) { return std::toupper(c); });
     return a < b ? -1 : a > b;
 }
 
@@ -41,11 +40,14 @@ TEST(ParamName, ofABundleLeavesTheRestToTheTitle)
     HxParamBundle bundle("Materials of heart");
     EXPECT_STREQ(bundle.name(), "Materials");
     EXPECT_EQ(valueOf(bundle, "Name"), "of heart");
+    EXPECT_TRUE(bundle.touched() == 27 && bundle[0]->touched() == 18) << "a title is set twice";
     bundle.setName("of");
     EXPECT_EQ(valueOf(bundle, "Name"), "heart") << "a title doesn't repeat the name";
     bundle.setName("heart heart");
     EXPECT_STREQ(bundle.name(), "heart");
     EXPECT_EQ(valueOf(bundle, "Name"), "-");
+    bundle.setName("A \"\" A");
+    EXPECT_EQ(valueOf(bundle, "Name"), "") << "an empty word is one";
 
     HxParamBundle shadowed("A");
     const unsigned number = 1;
@@ -58,13 +60,10 @@ TEST(ParamName, ofABundleLeavesTheRestToTheTitle)
 TEST(ParamName, isGeneratedFromTwoCounters)
 {
     const auto numberOf = [](const HxParamBase& node, size_t prefix) { return std::stoi(node.name() + prefix); };
-    HxParameter first(nullptr, 1), second("", 1);
-    const HxParamBundle bundle(nullptr), next(nullptr);
-    const HxParameter last(nullptr, 1);
-    EXPECT_EQ(numberOf(second, 9), numberOf(first, 9) + 1);
+    const HxParameter first(nullptr, 1);
+    const HxParamBundle bundle(nullptr), next("");
     EXPECT_EQ(numberOf(next, 6), numberOf(bundle, 6) + 1);
-    EXPECT_EQ(numberOf(last, 9), numberOf(second, 9) + 3) << "bundles begin as parameters";
-
+    EXPECT_EQ(numberOf(HxParameter("", 1), 9), numberOf(first, 9) + 3) << "bundles begin as parameters";
     HxParameter named("x", 1);
     named.setName(named.name());
     named.setName(std::string("x").c_str());
@@ -77,15 +76,10 @@ TEST(ParamName, keysCompareAsTextsDo)
 {
     std::mt19937 random(7);
     const char* const pieces[] = {"G0010-001", "g0010-001", "G00", "0-0", "a", "B", "_", " ", "1", "-", "Fz", "0000"};
-    const auto text = [&] {
-        std::string result;
-        for (auto n = random() % 4; n > 0; --n)
-            result += pieces[random() % std::size(pieces)];
-        return result;
-    };
+    const auto piece = [&] { return std::string(random() % 3 ? pieces[random() % std::size(pieces)] : ""); };
     using kplib::detail::NameKey;
     for (int round = 0; round < 100'000; ++round) {
-        const std::string asked = text(), wanted = text();
+        const std::string asked = piece() + piece() + piece(), wanted = piece() + piece() + piece();
         const HxParameter node(wanted.empty() ? "x" : wanted.c_str(), 1);
         const std::string canonical = (std::isdigit(asked[0]) ? "_" : "") + asked;
         const NameKey literal(asked.c_str(), NameKey::Literal), key(asked.c_str());
@@ -105,7 +99,6 @@ TEST(ParamNode, tellsChangesToAllAbove)
     const auto masks = [&] { return std::vector<int>{leaf->touched(), middle->touched(), root.touched()}; };
     root.untouchAll(255);
     leaf->touch(0);
-    EXPECT_EQ(masks(), (std::vector{0, 0, 0}));
     leaf->touch(HxParamBase::TouchValue);
     EXPECT_EQ(masks(), (std::vector{18, 24, 24}));
     root.untouchAll(8);
@@ -126,7 +119,6 @@ TEST(ParamNode, asksTheNearestEditCheck)
     EXPECT_EQ(HxParamBundle(root).editCheck(), HxParamEditCheck::defaultEditCheck());
 
     HxParamEditCheck& check = *HxParamEditCheck::defaultEditCheck();
-    EXPECT_TRUE(check.checkInsertParam(child, "x") && check.checkRename(child, "x"));
     child->setFlag(HxParamBase::FlagNoInsertParam, 1);
     EXPECT_TRUE(!check.checkInsertParam(child, "x") && check.checkInsertBundle(child, "x"));
 }

@@ -23,8 +23,9 @@ public:
     /// The same for texts, put together with blanks.
     bool setValue(int argc, char** argv);
     bool setValue(int argc, const char* const* argv);
-    /// From 0xRRGGBB.
+    /// From 0xRRGGBB; the form with int is for literals, of which 0 would be a null text as well.
     void setValue(unsigned int rgb);
+    void setValue(int rgb) { setValue(static_cast<unsigned int>(rgb)); }
 
     /// Whether no component differs by more than `tolerance`.
     bool equals(const KpColor& other, float tolerance) const;

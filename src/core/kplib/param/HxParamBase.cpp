@@ -84,18 +84,20 @@ char cleaned(char c)
     }
 }
 
-KpString tokensOtherThan(const char* name, const char* title)
+/// Puts the tokens of `title` other than `name` together; false without any. Quotes may hold an empty one.
+bool tokensOtherThan(const char* name, const char* title, KpString& others)
 {
-    KpString others;
+    bool any = false;
     for (KpStringTokenizer tokens(title); tokens.hasMoreTokens();) {
         const KpString& token = tokens.nextToken();
         if (std::strcmp(token, name) == 0)
             continue;
-        if (!others.isEmpty())
+        if (any)
             others += ' ';
         others += token;
+        any = true;
     }
-    return others;
+    return any;
 }
 
 }  // namespace
@@ -182,10 +184,13 @@ void HxParamBase::retitle(const char* name, const char* rest)
         bundle.set("Name", rest);
         return;
     }
-    const KpString others = tokensOtherThan(name, title);
-    if (rest || !others.isEmpty())
-        bundle.set("Name", others.isEmpty() ? rest : others.c_str());
-    if (others.isEmpty())
+    KpString others;
+    const bool any = tokensOtherThan(name, title, others);
+    if (rest || any)
+        bundle.set("Name", any ? others.c_str() : rest);
+    if (any)
+        bundle.find("Name", 1, 64)->touch(TouchValue);  // a new title too is marked as changed
+    else
         bundle.remove("Name");
 }
 

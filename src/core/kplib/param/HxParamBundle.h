@@ -11,15 +11,17 @@
 /// The inner node of the parameter tree: a container of sub-bundles, which stand first and in the order of insertion,
 /// and of parameters. It owns its children.
 ///
-/// Lookups ignore the case of ASCII letters, put a `_` in front of a leading digit, as names have it, and end a name at
-/// its first blank. A bundle answers to its name and to the first 16 words of its parameter `Name`, its title. What
-/// isn't there is never an error: lookups give null or false and leave what they should fill as it is.
+/// Lookups ignore the case of ASCII letters and put a `_` in front of a leading digit, as names have it. A name with a
+/// blank in it also matches what is named by the part before, but for titles and sorted parameters. A bundle answers to
+/// its name and to the first 16 words of its parameter `Name`, its title. What isn't there is never an error: lookups
+/// give null or false and leave what they should fill as it is.
 ///
 /// One thread at a time uses a tree, but any number may look parameters up by findSorted() and what stands on it:
 /// the first lookup sorts, under a lock of its own.
 ///
-/// Exhausted memory is a KpMemoryException. A node that couldn't be inserted is deleted; operations on many children
-/// stop at the failure and keep what they did so far, the others leave the tree as it was.
+/// Exhausted memory is a KpMemoryException. A node that couldn't be inserted is deleted; operations on many children,
+/// and those that make bundles or reservations on their way, stop at the failure and keep what they did so far, the
+/// others leave the tree as it was.
 class KPLIB_API HxParamBundle : public HxParamBase {
 public:
     /// A new bundle, owned by the caller.
@@ -44,7 +46,8 @@ public:
     void copy(const HxParamBase& src);
 
     /// As copy(), but always merging and replacing, heedless of FlagNoCopy in `src` and in its children, with their
-    /// edit checks. Copies of whole sub-bundles still leave out what has FlagNoCopy inside them.
+    /// edit checks. Copies of whole sub-bundles still leave out what has FlagNoCopy inside them, and those with the
+    /// flag themselves come without children.
     void copyAll(const HxParamBase& src);
 
     /// Takes all children out of `other` and inserts them here, replacing those of the same name. O(1) if empty.
@@ -98,9 +101,14 @@ public:
 
     /// The parameter of that name, taken as it stands, by binary search, after sorting if need be. O(log n). Which one
     /// of equal names is found isn't defined.
+    HxParameter* findSorted(const char* name)
+    {
+        return const_cast<HxParameter*>(std::as_const(*this).findSorted(name));
+    }
     const HxParameter* findSorted(const char* name) const;
 
-    /// Sorts the parameters by name, once, until the next insertion.
+    /// Sorts the parameters by name, once, until the next insertion. A new name doesn't move a parameter: lookups may
+    /// miss those that were renamed in between.
     void sortParameters() const;
     bool isSorted() const { return (counts() & sortedBit) != 0; }
 
@@ -135,6 +143,7 @@ public:
     // "description: value"; a sequence is a bundle of that name with bundles Item_0, Item_1 ... All of it lies in the
     // bundle `All` in the bundle `DICOM`. Texts that are returned lie in the tree (see HxParameter::getString()).
 
+    HxParamBundle* dicomAll() { return const_cast<HxParamBundle*>(std::as_const(*this).dicomAll()); }
     const HxParamBundle* dicomAll() const;
     HxParamBundle* dicomAllCreate();
 
@@ -165,6 +174,10 @@ public:
     const char* findTagInEnhancedDicomBundle(const char* tag, const char* defaultValue) const;
 
     /// The parameter here or, depth first, in the standard sequences and first items below.
+    HxParameter* findRecursive(const char* name)
+    {
+        return const_cast<HxParameter*>(std::as_const(*this).findRecursive(name));
+    }
     const HxParameter* findRecursive(const char* name) const;
 
     /// The tag that holds in enhanced objects what `tag` holds in classic ones; false, and `mapped` stays, if the tag
