@@ -53,19 +53,33 @@ void takePlace(const nifti_image& image, Volume& volume)
         volume.origin[i] = (i < 2 ? -1.0 : 1.0) * static_cast<double>(toWorld.m[i][3]);
 }
 
-/// Slices of a DICOM series go along the cross product of row and column; a left-handed volume is turned over.
-void makeRightHanded(Volume& volume)
+/// Turns the volume over along one axis; every voxel keeps its place in the patient.
+void turnOver(Volume& volume, size_t axis)
 {
-    const Vector normal = cross(volume.axes[0], volume.axes[1]);
-    if (dot(normal, volume.axes[2]) >= 0)
-        return;
-    const int dims[3] = {static_cast<int>(volume.dims[0]), static_cast<int>(volume.dims[1]),
-                         static_cast<int>(volume.dims[2])};
-    KpRawData::flip(volume.bytes.data(), volume.type.size(), dims, 2);
-    const double extent = static_cast<double>(volume.dims[2] - 1) * volume.spacing[2];
-    for (size_t i = 0; i < 3; ++i)
-        volume.origin[i] += extent * volume.axes[2][i];
-    volume.axes[2] = normal;
+    const int dims[] = {static_cast<int>(volume.dims[0]), static_cast<int>(volume.dims[1]),
+                        static_cast<int>(volume.dims[2])};
+    KpRawData::flip(volume.bytes.data(), volume.type.size(), dims, static_cast<int>(axis));
+    const double extent = static_cast<double>(volume.dims[axis] - 1) * volume.spacing[axis];
+    for (size_t i = 0; i < 3; ++i) {
+        volume.origin[i] += extent * volume.axes[axis][i];
+        volume.axes[axis][i] = -volume.axes[axis][i];
+    }
+}
+
+/// Rows and columns as scanners write them, to the left, the back or the feet of the patient, and slices along their
+/// cross product, as a series has to be.
+void turnUpright(Volume& volume)
+{
+    for (size_t axis = 0; axis < 2; ++axis) {
+        const Vector& a = volume.axes[axis];
+        size_t along = 0;
+        for (size_t i = 1; i < 3; ++i)
+            along = std::abs(a[i]) > std::abs(a[along]) ? i : along;
+        if ((a[along] < 0) != (along == 2))
+            turnOver(volume, axis);
+    }
+    if (dot(cross(volume.axes[0], volume.axes[1]), volume.axes[2]) < 0)
+        turnOver(volume, 2);
 }
 
 /// To 16 bits: small integers as they are, all else spread over 0 to 4095 with the scale that leads back.
@@ -103,6 +117,6 @@ KpResult readNifti(const char* path, Volume& volume)
         volume.intercept = volume.intercept * image->scl_slope + image->scl_inter;
         volume.slope *= image->scl_slope;
     }
-    makeRightHanded(volume);
+    turnUpright(volume);
     return KpResult();
 }
