@@ -1,57 +1,48 @@
 #include "Elements.h"
 
-#include <kplib/rawdata/KpRawData.h>
 #include <kplib/rawdata/detail/KpDownSampleKernels.h>
 #include <kplib/threads/KpProgressInterface.h>
-
-#include <support/LogCapture.h>
-
-#include <gtest/gtest.h>
-
-#include <functional>
 
 using namespace kplib::test;
 using namespace kplib::detail;
 
 namespace {
 
-struct Case {
+const struct Case {
     long dx, dy, dz;
     int fx, fy, fz, n;
-    long elements() const { return dx * dy * dz * n; }
-};
+} cases[] = {{5, 5, 5, 2, 2, 2, 1},       {131, 7, 5, 2, 2, 2, 1},  {133, 9, 5, 4, 4, 2, 1},
+             {70, 6, 4, 3, 1, 2, 1},      {37, 6, 4, 1, 2, 3, 2},   {41, 4, 4, 2, 2, 2, 3},
+             {29, 7, 3, 5, 3, 1, 4},      {64, 2, 2, 1, 1, 1, 1},   {4300, 2, 2, 2, 1, 2, 1},
+             {2500, 2, 1, 2100, 2, 1, 1}, {3, 2, 2, 2, 1, 2, 1500}, {40, 35, 33, 17, 16, 16, 1},
+             {6, 5, 4, 7, 1, 1, 1},       {6, 5, 4, 6, 5, 4, 1},    {6, 5, 4, 1, 6, 1, 2}};
 
-const Case cases[] = {{5, 5, 5, 2, 2, 2, 1},       {131, 7, 5, 2, 2, 2, 1},  {133, 9, 5, 4, 4, 2, 1},
-                      {70, 6, 4, 3, 1, 2, 1},      {37, 6, 4, 1, 2, 3, 2},   {41, 4, 4, 2, 2, 2, 3},
-                      {29, 7, 3, 5, 3, 1, 4},      {64, 2, 2, 1, 1, 1, 1},   {4300, 2, 2, 2, 1, 2, 1},
-                      {2500, 2, 1, 2100, 2, 1, 1}, {3, 2, 2, 2, 1, 2, 1500}, {40, 35, 33, 17, 16, 16, 1},
-                      {6, 5, 4, 7, 1, 1, 1},       {6, 5, 4, 6, 5, 4, 1},    {6, 5, 4, 1, 6, 1, 2}};
+enum Rule { mean, greatest, corner };
 
-/// The definition, voxel by voxel.
+/// The definition, voxel by voxel, of all three rules; sums of real numbers depend on its order.
 template <typename T>
-std::vector<T> reference(const std::vector<T>& src, const Case& c, BlockRule rule)
+std::array<std::vector<T>, 3> reference(const std::vector<T>& src, const Case& c)
 {
     using Sum = std::conditional_t<std::is_integral_v<T>, std::int64_t, T>;
-    std::vector<T> result;
+    std::array<std::vector<T>, 3> results;
     for (long z = 0; z + c.fz <= c.dz; z += c.fz)
         for (long y = 0; y + c.fy <= c.dy; y += c.fy)
             for (long x = 0; x + c.fx <= c.dx; x += c.fx)
                 for (long k = 0; k < c.n; ++k) {
-                    const auto at = [&](long i, long j, long l) {
-                        return src[(((z + l) * c.dy + y + j) * c.dx + x + i) * c.n + k];
-                    };
+                    const auto at = [&](long i, long j, long l) { return src[((l * c.dy + j) * c.dx + i) * c.n + k]; };
                     Sum sum = 0;
-                    T greatest = at(0, 0, 0);
-                    for (long l = 0; l < c.fz; ++l)
-                        for (long j = 0; j < c.fy; ++j)
-                            for (long i = 0; i < c.fx; ++i) {
+                    T most = at(x, y, z);
+                    for (long l = z; l < z + c.fz; ++l)
+                        for (long j = y; j < y + c.fy; ++j)
+                            for (long i = x; i < x + c.fx; ++i) {
                                 sum += at(i, j, l);
-                                greatest = at(i, j, l) > greatest ? at(i, j, l) : greatest;
+                                most = at(i, j, l) > most ? at(i, j, l) : most;
                             }
-                    const auto mean = static_cast<T>(sum / static_cast<Sum>(long{c.fx} * c.fy * c.fz));
-                    result.push_back(rule == BlockRule::Mean ? mean : greatest);
+                    results[mean].push_back(static_cast<T>(sum / static_cast<Sum>(long{c.fx} * c.fy * c.fz)));
+                    results[greatest].push_back(most);
+                    results[corner].push_back(at(x, y, z));
                 }
-    return result;
+    return results;
 }
 
 /// All layers by one loop, as KpRawData walks them.
@@ -65,46 +56,17 @@ void runPath(BlockLoop* loop, const Case& c, void* dst, const void* src, int siz
                   c.fz, c.n, rowStride, sliceStride});
 }
 
-template <typename T>
-std::vector<T> voxels(const Case& c, unsigned seed)
-{
-    std::vector<T> values = someValues<T>(c.elements(), seed);
-    if (seed % 2 && std::is_integral_v<T>)  // quotients near the limits
-        for (T& v : values)
-            v = v > 0 ? std::numeric_limits<T>::min() : std::numeric_limits<T>::max();
-    return values;
-}
-
-/// Notes the calls: w9 for work of 9 steps, 3 for a step reached, c for a question, s for the end.
+/// Notes the calls: w for work begun, 3/9 for step 3 of 9, c for a question, s for the end.
 class Recorder : public KpProgressInterface {
 public:
-    void startWorking(int maximum, std::string text) override
-    {
-        note('w' + std::to_string(maximum) + text);
-        KpProgressInterface::startWorking(maximum, text);
-    }
-    void stopWorking() override
-    {
-        note("s");
-        KpProgressInterface::stopWorking();
-    }
-    void setProgressValue(int value) override
-    {
-        note(std::to_string(value));
-        KpProgressInterface::setProgressValue(value);
-    }
-    bool isCanceled() const override
-    {
-        note("c");
-        return --cancelAfter == 0 || KpProgressInterface::isCanceled();
-    }
-    std::string take() { return std::exchange(told, {}); }
+    explicit Recorder(int questions) : cancelAfter(questions) {}
+    void beforeStartWorking() override { told += "w "; }
+    void afterStopWorking() override { told += "s "; }
+    void setProgressValue(int v) override { told += std::to_string(v) + "/" + std::to_string(globalMaximum()) + " "; }
+    bool isCanceled() const override { return told += "c ", --cancelAfter == 0; }
 
-    mutable int cancelAfter = 0;
-
-private:
-    void note(const std::string& what) const { told += what + ' '; }
     mutable std::string told;
+    mutable int cancelAfter;
 };
 
 }  // namespace
@@ -112,98 +74,57 @@ private:
 TEST(DownSample, everyPathEqualsTheDefinition)
 {
     eachType([]<typename T>(ElementTag<T>) {
-        for (const Case& c : cases) {
-            for (BlockRule rule : {BlockRule::Mean, BlockRule::Maximum}) {
-                for (unsigned seed : {12, 13}) {
-                    const std::vector<T> values = voxels<T>(c, seed), expected = reference(values, c, rule);
-                    Elements<T> src(values, seed % 2);
-                    eachUsable(blockPaths(), [&](const auto& path) {
-                        Elements<T> dst(long(expected.size()), seed % 2);
-                        runPath(path.run(src.typed().type, rule), c, dst.data(), src.data(), sizeof(T));
-                        EXPECT_EQ(dst, expected)
-                            << path.name << ' ' << src.typed().type.name() << ' ' << c.dx << ' ' << c.fx;
+        for (const Case& c : cases)
+            for (bool isAtTheLimits : {false, true}) {
+                SCOPED_TRACE(std::to_string(c.dx) + " by " + std::to_string(c.fx));
+                auto values = someValues<T>(c.dx * c.dy * c.dz * c.n, 12);
+                for (T& v : values)
+                    if (isAtTheLimits && std::is_integral_v<T>)
+                        v = v > 0 ? std::numeric_limits<T>::min() : std::numeric_limits<T>::max();
+                const auto expected = reference(values, c);
+                for (const Rule rule : {mean, greatest}) {
+                    expectOfEachPath(blockPaths(), expected[rule], values, [&](auto loops, void* dst, void* src) {
+                        runPath(loops(typeOf<T>, rule == mean ? BlockRule::Mean : BlockRule::Maximum), c, dst, src,
+                                sizeof(T));
                     });
-                    Elements<T> dst(long(expected.size()));
-                    (rule == BlockRule::Mean ? KpRawData::downSample3DN : KpRawData::downSampleMaxFilterComponents3DN)(
-                        dst.data(), src.typed(), c.dx, c.dy, c.dz, c.fx, c.fy, c.fz, c.n, nullptr);
-                    EXPECT_EQ(dst, expected);
+                    std::vector<T> dst(expected[rule].size());
+                    (rule == mean ? KpRawData::downSample3DN : KpRawData::downSampleMaxFilterComponents3DN)(
+                        dst.data(), values.data(), c.dx, c.dy, c.dz, c.fx, c.fy, c.fz, c.n, nullptr);
+                    EXPECT_TRUE(areSame(dst, expected[rule]));
                 }
+                std::vector<T> labels(expected[corner].size());
+                const bool toFirst = std::is_same_v<T, std::uint16_t>;
+                if (c.n == 1)
+                    KpRawData::downSampleLabels3D((toFirst ? labels : values).data(),
+                                                  (toFirst ? values : labels).data(), c.dx, c.dy, c.dz, c.fx, c.fy,
+                                                  c.fz, nullptr);
+                EXPECT_TRUE(c.n > 1 || areSame(labels, expected[corner]));
             }
-        }
-    });
-}
-
-TEST(DownSample, sumsOfRealNumbersKeepTheirOrder)
-{
-    float row[] = {1e8f, 1.0f, -1e8f, 1.0f}, mean = 0;
-    KpRawData::downSample3D(&mean, row, 4, 1, 1, 4, 1, 1, nullptr);
-    EXPECT_EQ(mean, 0.25f);
-}
-
-TEST(DownSample, labelsKeepTheCornerAndTheirDirection)
-{
-    eachType([]<typename T>(ElementTag<T>) {
-        for (const Case& c : cases) {
-            if (c.n > 1)
-                continue;
-            const std::vector<T> values = someValues<T>(c.elements(), 14);
-            std::vector<T> expected;
-            for (long z = 0; z < c.dz / c.fz; ++z)
-                for (long y = 0; y < c.dy / c.fy; ++y)
-                    for (long x = 0; x < c.dx / c.fx; ++x)
-                        expected.push_back(values[(z * c.fz * c.dy + y * c.fy) * c.dx + x * c.fx]);
-            Elements<T> src(values, 0), dst(long(expected.size()));
-            const bool toFirst = std::is_same_v<T, std::uint16_t>;
-            KpRawData::downSampleLabels3D(toFirst ? dst.data() : src.data(), toFirst ? src.typed() : dst.typed(), c.dx,
-                                          c.dy, c.dz, c.fx, c.fy, c.fz, nullptr);
-            EXPECT_EQ(dst, expected) << src.typed().type.name() << ' ' << c.dx;
-        }
     });
 }
 
 TEST(DownSample, progressFollowsTheLayers)
 {
-    using Call = std::function<void(void*, KpTypedPointer, int, KpProgressInterface*)>;
-    const Call mean = [](void* a, KpTypedPointer b, int f, KpProgressInterface* p) {
-        KpRawData::downSample3D(a, b, 2, 2, 9, 1, f, f, p);
-    };
-    const Call labels = [](void* a, KpTypedPointer b, int f, KpProgressInterface* p) {
-        KpRawData::downSampleLabels3D(a, b, 2, 2, 9, 1, f, f, p);
-    };
-    std::vector<std::uint16_t> src(36, 5);
-    const struct {
-        const Call& call;
-        int factor, cancelAfter;
-        KpPrimType type;
-        const char* told;
-        long written;
-    } runs[] = {
-        {mean, 2, 0, KpPrimType::UShort, "w9 0 c 1 c 3 c 5 c 7 s ", 8},
-        {labels, 2, 0, KpPrimType::UShort, "w9 0 c 1 c 2 c 3 c 4 s ", 8},
-        {mean, 2, 1, KpPrimType::UShort, "w9 0 c s ", 2},
-        {labels, 2, 2, KpPrimType::UShort, "w9 0 c 1 c s ", 4},
-        {mean, 3, 0, KpPrimType::UShort, "w9 0 c 1 c 4 c 7 s ", 0},  // one above the size: layers without rows
-        {labels, 3, 0, KpPrimType::UShort, "w9 0 c 1 c 2 c 3 s ", 0},
-        {mean, 4, 0, KpPrimType::UShort, "", 0},  // beyond that
-        {mean, 0, 0, KpPrimType::UShort, "", 0},
-        {labels, 0, 0, KpPrimType::UShort, "", 0},
-        {mean, 2, 0, KpPrimType::UInt, "", 0},
-        {labels, 2, 0, KpPrimType(-3), "", 0},
-    };
+    auto *const means = KpRawData::downSample3D, *const labels = KpRawData::downSampleLabels3D;
+    // clang-format off
+    const struct { decltype(means) call; int f, cancelAfter, type; const char* told; long written; } runs[] = {
+        {means, 2, 0, 7, "w 0/9 c 1/9 c 3/9 c 5/9 c 7/9 s ", 8}, {labels, 2, 0, 7, "w 0/9 c 1/9 c 2/9 c 3/9 c 4/9 s ", 8},
+        {means, 2, 1, 7, "w 0/9 c s ", 2},                           {labels, 2, 2, 7, "w 0/9 c 1/9 c s ", 4},
+        {means, 3, 0, 7, "w 0/9 c 1/9 c 4/9 c 7/9 s ", 0},       {labels, 3, 0, 7, "w 0/9 c 1/9 c 2/9 c 3/9 s ", 0},
+        {means, 4, 0, 7, "", 0},  // more than one above the size
+        {means, 0, 0, 7, "", 0}, {labels, 0, 0, 7, "", 0}, {means, 2, 0, 8, "", 0}, {labels, 2, 0, -3, "", 0}};
+    // clang-format on
     for (const auto& run : runs) {
-        SCOPED_TRACE(run.told);
-        Recorder progress;
-        progress.cancelAfter = run.cancelAfter;
-        std::vector<std::uint16_t> dst(8, 1), expected = dst;
+        Recorder progress(run.cancelAfter);
+        const KpPrimType type(run.type);
+        std::vector<std::uint16_t> src(36, 5), dst(8, 1), expected = dst;
         std::fill_n(expected.begin(), run.written, 5);
-        const LogCapture log;
-        run.call(dst.data(), {src.data(), run.type}, run.factor, &progress);
-        EXPECT_EQ(progress.take(), run.told);
-        EXPECT_EQ(dst, expected);
-        EXPECT_EQ(log.lines().size(), run.type == KpPrimType::UShort ? 0u : 1u);
-        if (!log.lines().empty()) {
-            EXPECT_TRUE(log.lines()[0].ends_with(std::string("Unsupported data type ") + run.type.name() +
-                                                 " in KpRawData::downSample3D\n"));
-        }
+        void* const to = run.f == 3 ? nullptr : dst.data();  // an empty target may be null
+        const std::string error = std::string("E Unsupported data type ") + type.name();
+        EXPECT_EQ(logged([&] {
+                      run.call(to, {src.data(), type}, 2, 2, 9, 1, run.f, run.f, &progress);
+                  }),
+                  type == KpPrimType::UShort ? "" : error + " in KpRawData::downSample3D\n");
+        EXPECT_TRUE(progress.told == run.told && dst == expected) << progress.told;
     }
 }

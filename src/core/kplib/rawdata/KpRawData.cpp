@@ -108,7 +108,7 @@ bool KpRawData::isConstant(KpTypedPointer data, unsigned long n)
             return;
         }
         const T head = *static_cast<const Loose<T>*>(numbers.data);
-        isOneValue = head == head && !loops(numbers.type)(numbers.data, static_cast<long>(n), &head);
+        isOneValue = !std::isnan(head) && !loops(numbers.type)(numbers.data, static_cast<long>(n), &head);
     });
     return isOneValue;
 }

@@ -115,7 +115,7 @@ public:
     /// @name Down-sampling by whole factors
     /// A block of fx * fy * fz voxels of the source becomes one of the target, which is of the same type, holds dx / fx
     /// by dy / fy by dz / fz voxels and is the caller's. What is left over at the far edges is never read. Factors and
-    /// `nDataVar` are at least 1; nothing is done for others, or for factors above their sizes.
+    /// `nDataVar` are at least 1; nothing is written for others, or for factors above their sizes.
     ///
     /// `progress` may be null. It gets a scope of `dz` steps, closed on return, and after each layer of voxels the step
     /// reached, unless it is canceled: then the rest of the target is left as it was. An error is logged if the

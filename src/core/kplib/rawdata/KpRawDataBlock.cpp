@@ -46,20 +46,22 @@ void flipItems(char* items, long count, unsigned long size, char* buffer)
         exchange(first, last, size, buffer);
 }
 
-/// The same in pieces: the reversed end goes to the front, the reversed front to the end.
+/// The same in pieces: the reversed end goes to the front, the reversed front to the end. What fits into the buffer is
+/// copied there and comes back reversed: memory is then read and written upwards only, as the processor foresees it.
 void flipWords(char* words, long count, long size, ReverseLoop* reverse, char* buffer)
 {
     const long pieces = static_cast<long>(exchangeSize) / size;
-    for (long left = 0, right = count; right - left > 1;) {
-        const long n = std::min(pieces, (right - left) / 2);
-        char* const front = words + left * size;
-        char* const end = words + (right - n) * size;
-        reverse(buffer, front, n);
-        reverse(front, end, n);
+    while (count > pieces) {
+        const long n = std::min(pieces, count / 2);
+        char* const end = words + (count - n) * size;
+        reverse(buffer, words, n);
+        reverse(words, end, n);
         std::memcpy(end, buffer, static_cast<unsigned long>(n * size));
-        left += n;
-        right -= n;
+        words += n * size;
+        count -= 2 * n;
     }
+    std::memcpy(buffer, words, static_cast<unsigned long>(count * size));
+    reverse(words, buffer, count);
 }
 
 struct Box {
@@ -118,7 +120,8 @@ char* extendRow(char* to, const char* row, long voxel, const Box& box, const voi
     const long inside = box.count[0] - before - behind;
     const char* const last = row + (box.size[0] - 1) * voxel;
     to = repeat(to, fillValue ? fillValue : row, voxel, before);
-    std::memcpy(to, row + (box.first[0] + before) * voxel, static_cast<unsigned long>(inside * voxel));
+    const long from = std::clamp(box.first[0] + before, 0L, box.size[0] - 1);  // stays in the row if nothing is inside
+    std::memcpy(to, row + from * voxel, static_cast<unsigned long>(inside * voxel));
     return repeat(to + inside * voxel, fillValue ? fillValue : last, voxel, behind);
 }
 

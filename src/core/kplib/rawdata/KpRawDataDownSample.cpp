@@ -21,6 +21,11 @@ struct Grid {
     bool hasFactors() const { return factor[0] >= 1 && factor[1] >= 1 && factor[2] >= 1; }
     /// Whether no factor exceeds its size by more than one, which is an axis without blocks.
     bool isWithin() const { return within(0) && within(1) && within(2); }
+    /// Null will do where nothing is read and written; the progress runs all the same.
+    bool accepts(const void* dst, const void* src) const
+    {
+        return (dst && src) || !(blocks(0) && blocks(1) && blocks(2));
+    }
     long blocks(int axis) const { return static_cast<long>(size[axis] / static_cast<unsigned long>(factor[axis])); }
     long voxels(int axis) const { return static_cast<long>(size[axis]); }
 
@@ -58,7 +63,9 @@ void downSample(BlockRule rule, void* dst, KpTypedPointer src, const Grid& grid,
                 KpProgressInterface* progress)
 {
     static BlockLoops* const loops = best(blockPaths());
-    if (!isSupported(src.type) || !grid.hasFactors() || !grid.isWithin() || components < 1 || !dst || !src.data)
+    if (!isSupported(src.type) || !grid.hasFactors() || !grid.isWithin() || components < 1)
+        return;
+    if (!grid.accepts(dst, src.data))
         return;
     BlockLoop* const loop = loops(src.type, rule);
     const long size = src.type.size(), voxel = components * size;
@@ -132,7 +139,7 @@ void KpRawData::downSampleLabels3D(void* a, KpTypedPointer b, unsigned long dx, 
                                    int fx, int fy, int fz, KpProgressInterface* progress)
 {
     const Grid grid{{dx, dy, dz}, {fx, fy, fz}};
-    if (!isSupported(b.type) || !grid.hasFactors() || !a || !b.data)
+    if (!isSupported(b.type) || !grid.hasFactors() || !grid.accepts(a, b.data))
         return;
     // Only ushort goes from `b` to `a`, and that is meant: callers hand source and target accordingly.
     const bool toA = b.type == KpPrimType::UShort;

@@ -308,7 +308,9 @@ BlockLoop* blockLoop(KpPrimType type, BlockRule rule)
 {
     BlockLoop* loop = nullptr;
     visitNumberType(type, [&]<typename T>(ElementTag<T>) {
-        loop = rule == BlockRule::Mean ? Rows::template loop<MeanOf<T>> : Rows::template loop<Maximum<T>>;
+        BlockLoop* const mean = Rows::template loop<MeanOf<T>>;
+        BlockLoop* const maximum = Rows::template loop<Maximum<T>>;
+        loop = rule == BlockRule::Mean ? mean : maximum;
     });
     return loop;
 }

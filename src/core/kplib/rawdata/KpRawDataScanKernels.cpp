@@ -3,6 +3,7 @@
 #include <kplib/rawdata/detail/KpRawDataKernels.h>
 
 #include <algorithm>
+#include <cmath>
 #include <cstring>
 
 namespace kplib::detail {
@@ -104,8 +105,8 @@ struct RangeWide {
         using L = Lanes<T, Bytes>;
         auto* values = static_cast<const Loose<T>*>(elements);
         T low = *static_cast<T*>(min), high = *static_cast<T*>(max);
-        if (low != low)
-            return;  // NaN at the head stays
+        if (std::isnan(low))
+            return;  // at the head it stays
         while (n >= L::step) {
             const long count = std::min(n - n % L::step, L::block);
             T blockLow = low, blockHigh = high;

@@ -35,9 +35,9 @@ struct CopyReversed {
     KPLIB_KERNEL_BODY static void run(void* dst, const void* src, long n)
     {
         auto* __restrict to = static_cast<Loose<Word>*>(dst);
-        auto* __restrict last = static_cast<const Loose<Word>*>(src) + n - 1;
+        auto* __restrict end = static_cast<const Loose<Word>*>(src) + n;
         for (long i = 0; i < n; ++i)
-            to[i].value = last[-i].value;
+            to[i].value = end[-1 - i].value;
     }
 };
 

@@ -45,13 +45,13 @@ struct RealBounds<std::int32_t, double> {
 template <typename To, typename From>
 KPLIB_KERNEL_BODY To converted(From value)
 {
-    if constexpr (std::is_floating_point_v<To>) {
+    // Ushort to short: the bits as they are, not clamped, and that is meant.
+    constexpr bool keepsBits = std::is_same_v<To, std::int16_t> && std::is_same_v<From, std::uint16_t>;
+    if constexpr (std::is_floating_point_v<To> || keepsBits) {
         return static_cast<To>(value);
     } else if constexpr (std::is_floating_point_v<From>) {
         using Bounds = RealBounds<To, From>;
         return static_cast<To>(truncatedToInt(clamped(value, Bounds::low, Bounds::high)));
-    } else if constexpr (std::is_same_v<To, std::int16_t> && std::is_same_v<From, std::uint16_t>) {
-        return static_cast<To>(value);  // the bits as they are, not clamped, and that is meant
     } else {
         using Limits = std::numeric_limits<To>;
         return static_cast<To>(clamped<std::int32_t>(value, Limits::min(), Limits::max()));
