@@ -17,7 +17,7 @@ const struct Case {
              {2500, 2, 1, 2100, 2, 1, 1}, {3, 2, 2, 2, 1, 2, 1500}, {40, 35, 33, 17, 16, 16, 1},
              {6, 5, 4, 7, 1, 1, 1},       {6, 5, 4, 6, 5, 4, 1},    {6, 5, 4, 1, 6, 1, 2}};
 
-enum Rule { mean, greatest, corner };
+enum { mean, greatest, corner };
 
 /// The definition, voxel by voxel, of all three rules; sums of real numbers depend on its order.
 template <typename T>
@@ -82,22 +82,23 @@ TEST(DownSample, everyPathEqualsTheDefinition)
                     if (isAtTheLimits && std::is_integral_v<T>)
                         v = v > 0 ? std::numeric_limits<T>::min() : std::numeric_limits<T>::max();
                 const auto expected = reference(values, c);
-                for (const Rule rule : {mean, greatest}) {
-                    expectOfEachPath(blockPaths(), expected[rule], values, [&](auto loops, void* dst, void* src) {
-                        runPath(loops(typeOf<T>, rule == mean ? BlockRule::Mean : BlockRule::Maximum), c, dst, src,
-                                sizeof(T));
+                for (const BlockRule rule : {BlockRule::Mean, BlockRule::Maximum}) {
+                    const auto& results = expected[rule == BlockRule::Mean ? mean : greatest];
+                    auto* const operation = rule == BlockRule::Mean ? KpRawData::downSample3DN
+                                                                    : KpRawData::downSampleMaxFilterComponents3DN;
+                    expectOfEachPath(blockPaths(), results, values, [&](auto loops, void* dst, void* src) {
+                        runPath(loops(typeOf<T>, rule), c, dst, src, sizeof(T));
                     });
-                    std::vector<T> dst(expected[rule].size());
-                    (rule == mean ? KpRawData::downSample3DN : KpRawData::downSampleMaxFilterComponents3DN)(
-                        dst.data(), values.data(), c.dx, c.dy, c.dz, c.fx, c.fy, c.fz, c.n, nullptr);
-                    EXPECT_TRUE(areSame(dst, expected[rule]));
+                    std::vector<T> dst(results.size());
+                    operation(dst.data(), values.data(), c.dx, c.dy, c.dz, c.fx, c.fy, c.fz, c.n, nullptr);
+                    EXPECT_TRUE(areSame(dst, results));
                 }
                 std::vector<T> labels(expected[corner].size());
-                const bool toFirst = std::is_same_v<T, std::uint16_t>;
+                T *a = values.data(), *b = labels.data();
+                if (std::is_same_v<T, std::uint16_t>)
+                    std::swap(a, b);
                 if (c.n == 1)
-                    KpRawData::downSampleLabels3D((toFirst ? labels : values).data(),
-                                                  (toFirst ? values : labels).data(), c.dx, c.dy, c.dz, c.fx, c.fy,
-                                                  c.fz, nullptr);
+                    KpRawData::downSampleLabels3D(a, b, c.dx, c.dy, c.dz, c.fx, c.fy, c.fz, nullptr);
                 EXPECT_TRUE(c.n > 1 || areSame(labels, expected[corner]));
             }
     });

@@ -42,11 +42,10 @@ TEST(IsConstant, everyPathFindsOneDifference)
 {
     eachType([]<typename T>(ElementTag<T>) {
         for (long n : {1, 2, 127, 1000})
-            for (long different : {-1L, 0L, 1L, n / 2, n - 1})
-                for (int step : {-1, 1}) {
+            for (long different : {0L, 1L, n / 2, n - 1})
+                for (int step : {-1, 0, 1}) {
                     std::vector<T> values(n, static_cast<T>(200.5));
-                    if (different >= 0 && different < n)
-                        values[different] = static_cast<T>(values[0] + step);
+                    values[different % n] = static_cast<T>(values[0] + step);
                     const bool differs = std::count(values.begin(), values.end(), values[0]) != n;
                     EXPECT_EQ(KpRawData::isConstant(values.data(), n), !differs);
                     expectOfEachPath(differsPaths(), Bytes{differs}, values, [&](auto loops, void* dst, void* src) {
@@ -78,26 +77,20 @@ TEST(Memset, cutsIntegersAndRoundsReals)
     // clang-format on
     eachType([&]<typename T>(ElementTag<T>) {
         const auto expectFilled = [](auto value, T expected, long n, long start) {
-            EXPECT_TRUE(areSame(std::vector<T>(n, expected), worked(std::vector<T>(n), start,
-                                                                    [=](void* to) {
-                                                                        KpRawData::memset({to, typeOf<T>}, value, n);
-                                                                        KpRawData::memset({to, typeOf<T>}, 5, -1);
-                                                                    })))
-                << value;
+            const auto fill = [=](void* to) {
+                KpRawData::memset({to, typeOf<T>}, value, n);
+                KpRawData::memset({to, typeOf<T>}, 5, -1);
+            };
+            EXPECT_TRUE(areSame(worked(std::vector<T>(n), start, fill), std::vector<T>(n, expected))) << value;
         };
         for (const auto& [value, stored] : cases)
             expectFilled(value, std::is_integral_v<T> ? T(stored) : T(value), 101, 1);
         expectFilled(-1000, static_cast<T>(-1000), 2, 0);
         expectFilled(77, T(77), (9L << 20) / sizeof(T), sizeof(T));
     });
-    EXPECT_EQ(logged([] {
-                  KpRawData::memset({nullptr, KpPrimType::UInt}, 5, 1);
-              }),
-              "E Unsupported data type uint in KpRawData::memset()\n");
-    EXPECT_EQ(logged([] {
-                  KpRawData::memset({nullptr, KpPrimType::Complex}, 5.0, 1);
-              }),
-              "E Unsupported data type complex in KpRawData::memset()\n");
+    const auto error = logged([] { KpRawData::memset({nullptr, KpPrimType::UInt}, 5, 1); });
+    const auto same = logged([] { KpRawData::memset({nullptr, KpPrimType::UInt}, 5.0, 0); });
+    EXPECT_TRUE(error == "E Unsupported data type uint in KpRawData::memset()\n" && same == error) << error;
 }
 
 TEST(SwapBytes, reversesTheBytesOfEachWord)
@@ -122,8 +115,6 @@ TEST(SwapBytes, reversesTheBytesOfEachWord)
         KpRawData::swapBytes({words.data(), KpPrimType(type)}, 16UL / KpPrimType(type).size());
         EXPECT_EQ(words, expected) << type;
     }
-    EXPECT_EQ(logged([] {
-                  KpRawData::swapBytes({nullptr, KpPrimType(12)}, 1);
-              }),
-              "W Swapping of 0-byte words not supported.");
+    const auto warning = logged([] { KpRawData::swapBytes({nullptr, KpPrimType(12)}, 1); });
+    EXPECT_EQ(warning, "W Swapping of 0-byte words not supported.");
 }
