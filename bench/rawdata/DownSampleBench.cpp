@@ -50,11 +50,16 @@ template <typename T, typename Run>
 void downSample(benchmark::State& state, const Job& job, const std::string& baseline, double limit, Run run)
 {
     const Sizes sizes(job);
-    const Memory src = noise<T>(sizes.n), dst = touched(sizes.made * static_cast<long>(sizeof(T)));
-    auto* from = reinterpret_cast<T*>(src.get());
+    const long count = turns(sizes.n * static_cast<long>(sizeof(T)));
+    const Memory src = noise<T>(sizes.n * count), dst = touched(sizes.made * static_cast<long>(sizeof(T)));
+    auto* const volumes = reinterpret_cast<T*>(src.get());
+    T* from = volumes;
+    long turn = 0;
     for (auto _ : state) {
+        from = volumes + turn * sizes.n;
         run(dst.get(), from, sizes);
         benchmark::ClobberMemory();
+        turn = (turn + 1) % count;
     }
     if (!isRight(job, reinterpret_cast<T*>(dst.get()), from, sizes.dx, sizes.dy))
         state.SkipWithError("wrong voxel");

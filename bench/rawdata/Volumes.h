@@ -2,6 +2,7 @@
 
 #include <support/Bench.h>
 
+#include <algorithm>
 #include <cstdint>
 #include <cstdlib>
 #include <cstring>
@@ -45,12 +46,21 @@ inline std::string copyOf(long bytes)
     return "std::memcpy/" + std::to_string(bytes);
 }
 
+/// How many blocks of that size to take in turn, so that none is in a cache when it is read again.
+inline long turns(long bytes)
+{
+    return std::max(1L, (256L << 20) / bytes);
+}
+
 inline void copyBytes(benchmark::State& state, long bytes)
 {
-    const Memory from = touched(bytes / 2), to = touched(bytes / 2);
+    const long size = bytes / 2, count = turns(size);
+    const Memory from = touched(size * count), to = touched(size * count);
+    long turn = 0;
     for (auto _ : state) {
-        std::memcpy(to.get(), from.get(), static_cast<size_t>(bytes / 2));
+        std::memcpy(to.get() + turn * size, from.get() + turn * size, static_cast<size_t>(size));
         benchmark::ClobberMemory();
+        turn = (turn + 1) % count;
     }
     report(state, static_cast<double>(bytes / 2), static_cast<double>(bytes));
 }
