@@ -1,0 +1,49 @@
+#pragma once
+
+#include <kplib/geometry/KpVec2f.h>
+
+/// An axis-aligned rectangle: the lower corner, then the upper one, so xmin, ymin, xmax, ymax - two corners, other than
+/// the boxes in space, which are intervals. Both bounds belong to it; it is empty when a minimum is above its maximum.
+/// A default-made one is empty, from (1, 1) to (0, 0).
+class KpBox2f {
+public:
+    constexpr KpBox2f() = default;
+    constexpr KpBox2f(float xmin, float ymin, float xmax, float ymax) : min_(xmin, ymin), max_(xmax, ymax) {}
+    constexpr KpBox2f(const KpVec2f& min, const KpVec2f& max) : min_(min), max_(max) {}
+
+    constexpr float& xmin() { return min_.x(); }
+    constexpr float xmin() const { return min_.x(); }
+    constexpr float& ymin() { return min_.y(); }
+    constexpr float ymin() const { return min_.y(); }
+    constexpr float& xmax() { return max_.x(); }
+    constexpr float xmax() const { return max_.x(); }
+    constexpr float& ymax() { return max_.y(); }
+    constexpr float ymax() const { return max_.y(); }
+
+    constexpr const KpVec2f& min() const { return min_; }
+    constexpr const KpVec2f& max() const { return max_; }
+    /// max() - min(), also of an empty rectangle.
+    constexpr KpVec2f size() const { return max_ - min_; }
+
+    constexpr bool isEmpty() const { return min_.x() > max_.x() || min_.y() > max_.y(); }
+
+    /// Makes it hold `point`: an empty one becomes that point, else bounds move that it lies strictly outside of.
+    constexpr void extendBy(const KpVec2f& point)
+    {
+        const bool wasEmpty = isEmpty();
+        for (int axis = 0; axis < 2; ++axis) {
+            if (wasEmpty || point[axis] < min_[axis])
+                min_[axis] = point[axis];
+            if (wasEmpty || point[axis] > max_[axis])
+                max_[axis] = point[axis];
+        }
+    }
+
+    /// Exact, bound by bound.
+    friend constexpr bool operator==(const KpBox2f&, const KpBox2f&) = default;
+
+private:
+    KpVec2f min_{1, 1}, max_{0, 0};
+};
+
+static_assert(sizeof(KpBox2f) == 16);

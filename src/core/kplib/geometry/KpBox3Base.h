@@ -1,0 +1,93 @@
+#pragma once
+
+#include <kplib/geometry/KpVecBase.h>
+
+/// What the axis-aligned boxes in space share: xmin, xmax, ymin, ymax, zmin, zmax and nothing else, so that the object
+/// is its own byte image. `Box` is the class that derives from it, `Vector` its corner.
+///
+/// Both bounds belong to the box; it is empty when on any axis the minimum is above the maximum. A default-made box is
+/// empty, from 1 to 0 on each axis.
+template <typename Box, typename Vector>
+class KpBox3Base {
+public:
+    using value_type = typename Vector::value_type;
+
+    constexpr value_type& xmin() { return b_[0]; }
+    constexpr value_type xmin() const { return b_[0]; }
+    constexpr value_type& xmax() { return b_[1]; }
+    constexpr value_type xmax() const { return b_[1]; }
+    constexpr value_type& ymin() { return b_[2]; }
+    constexpr value_type ymin() const { return b_[2]; }
+    constexpr value_type& ymax() { return b_[3]; }
+    constexpr value_type ymax() const { return b_[3]; }
+    constexpr value_type& zmin() { return b_[4]; }
+    constexpr value_type zmin() const { return b_[4]; }
+    constexpr value_type& zmax() { return b_[5]; }
+    constexpr value_type zmax() const { return b_[5]; }
+
+    /// Bound `i` in the order above; not checked.
+    constexpr value_type& operator[](int i) { return b_[i]; }
+    constexpr value_type operator[](int i) const { return b_[i]; }
+    constexpr const value_type* data() const { return b_; }
+
+    constexpr Vector min() const { return {b_[0], b_[2], b_[4]}; }
+    constexpr Vector max() const { return {b_[1], b_[3], b_[5]}; }
+    /// Corner `i` from 0 to 7: x from the maximum if bit 0 of `i` is set, y if bit 1 is, z if bit 2 is.
+    constexpr Vector corner(int i) const { return {b_[i & 1], b_[2 + (i >> 1 & 1)], b_[4 + (i >> 2 & 1)]}; }
+    /// max() - min(), also of an empty box.
+    constexpr Vector size() const { return max() - min(); }
+
+    constexpr bool isEmpty() const { return b_[0] > b_[1] || b_[2] > b_[3] || b_[4] > b_[5]; }
+
+    /// Whether `point` lies in the box, of which each bound is moved out by `tolerance`; bounds are inside, NaN is not.
+    constexpr bool contains(const Vector& point, value_type tolerance = 0) const
+    {
+        for (int axis = 0; axis < 3; ++axis) {
+            if (!(b_[2 * axis] - tolerance <= point[axis] && point[axis] <= b_[2 * axis + 1] + tolerance))
+                return false;
+        }
+        return true;
+    }
+
+    /// Makes the box hold `point`: an empty one becomes that point, else bounds move that it lies strictly outside of.
+    constexpr void extendBy(const Vector& point)
+    {
+        const bool wasEmpty = isEmpty();
+        for (int axis = 0; axis < 3; ++axis) {
+            if (wasEmpty || point[axis] < b_[2 * axis])
+                b_[2 * axis] = point[axis];
+            if (wasEmpty || point[axis] > b_[2 * axis + 1])
+                b_[2 * axis + 1] = point[axis];
+        }
+    }
+    /// Makes the box hold `other`, unless that is empty.
+    constexpr void extendBy(const Box& other)
+    {
+        if (other.isEmpty())
+            return;
+        const Vector last = other.max();  // `other` may be this box
+        extendBy(other.min());
+        extendBy(last);
+    }
+
+    /// Exact, bound by bound.
+    friend constexpr bool operator==(const Box& a, const Box& b)
+    {
+        for (int i = 0; i < 6; ++i) {
+            if (a.b_[i] != b.b_[i])
+                return false;
+        }
+        return true;
+    }
+
+protected:
+    constexpr KpBox3Base() = default;
+    constexpr KpBox3Base(value_type xmin, value_type xmax, value_type ymin, value_type ymax, value_type zmin,
+                         value_type zmax) :
+        b_{xmin, xmax, ymin, ymax, zmin, zmax}
+    {
+    }
+
+private:
+    value_type b_[6] = {1, 0, 1, 0, 1, 0};
+};

@@ -1,0 +1,25 @@
+#pragma once
+
+#include <kplib/geometry/KpBox3Base.h>
+#include <kplib/geometry/KpVec3i.h>
+
+#include <algorithm>
+
+/// An axis-aligned box of voxels: three intervals of 32-bit integers, both ends inside.
+class KpBox3i : public KpBox3Base<KpBox3i, KpVec3i> {
+public:
+    constexpr KpBox3i() = default;
+    constexpr KpBox3i(std::int32_t xmin, std::int32_t xmax, std::int32_t ymin, std::int32_t ymax, std::int32_t zmin,
+                      std::int32_t zmax) :
+        KpBox3Base(xmin, xmax, ymin, ymax, zmin, zmax)
+    {
+    }
+    /// From any two opposite corners, sorted on each axis: never empty.
+    constexpr KpBox3i(const KpVec3i& a, const KpVec3i& b) :
+        KpBox3Base(std::min(a.x(), b.x()), std::max(a.x(), b.x()), std::min(a.y(), b.y()), std::max(a.y(), b.y()),
+                   std::min(a.z(), b.z()), std::max(a.z(), b.z()))
+    {
+    }
+};
+
+static_assert(sizeof(KpBox3i) == 24);

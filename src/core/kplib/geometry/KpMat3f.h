@@ -1,0 +1,93 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/geometry/KpVec3f.h>
+
+#include <array>
+#include <string>
+
+class KpMat4f;
+
+/// A 3x3 matrix of floats, row by row and nothing else, so that the object is its own byte image.
+///
+/// Points are row vectors and a matrix stands to their right: a product applies its left factor first. A plain value; a
+/// default-made one is not set to anything.
+class KPLIB_API KpMat3f {
+public:
+    constexpr KpMat3f() = default;
+    constexpr KpMat3f(float m00, float m01, float m02, float m10, float m11, float m12, float m20, float m21,
+                      float m22) :
+        m_{{m00, m01, m02}, {m10, m11, m12}, {m20, m21, m22}}
+    {
+    }
+    explicit KpMat3f(const float (&rows)[3][3]) { setValue(rows); }
+    /// From three columns - other than the form with an array, which takes rows.
+    KpMat3f(const KpVec3f& column0, const KpVec3f& column1, const KpVec3f& column2);
+    /// From three rows - other than the form with three vectors, which takes columns.
+    explicit KpMat3f(const std::array<KpVec3f, 3>& rows) { setValue(rows); }
+
+    static constexpr KpMat3f identity() { return {1, 0, 0, 0, 1, 0, 0, 0, 1}; }
+    void makeIdentity() { *this = identity(); }
+    void setValue(const float (&rows)[3][3]);
+    void setValue(const std::array<KpVec3f, 3>& rows);
+    /// The upper left of `matrix`.
+    void setValue(const KpMat4f& matrix);
+    void getValue(float (&rows)[3][3]) const;
+    KpMat3f& operator=(const float (&rows)[3][3]);
+
+    /// The three floats of a row; m[row][column].
+    constexpr float* operator[](int row) { return m_[row]; }
+    constexpr const float* operator[](int row) const { return m_[row]; }
+    /// The nine floats, row by row.
+    constexpr const float* data() const { return m_[0]; }
+
+    KpMat3f& operator*=(const KpMat3f& right) { return *this = *this * right; }
+    KpMat3f& operator+=(const KpMat3f& other) { return *this = *this + other; }
+    KpMat3f& operator*=(float factor) { return *this = *this * factor; }
+    /// Applies `a` first, then `b`.
+    friend KPLIB_API KpMat3f operator*(const KpMat3f& a, const KpMat3f& b);
+    friend KPLIB_API KpMat3f operator+(const KpMat3f& a, const KpMat3f& b);
+    friend KPLIB_API KpMat3f operator-(const KpMat3f& a, const KpMat3f& b);
+    friend KPLIB_API KpMat3f operator*(const KpMat3f& m, float factor);
+    friend KPLIB_API KpMat3f operator*(float factor, const KpMat3f& m) { return m * factor; }
+    /// Exact; a matrix that holds a NaN equals none.
+    friend constexpr bool operator==(const KpMat3f& a, const KpMat3f& b) = default;
+    /// False as soon as one element differs by strictly more than `tolerance`.
+    bool equals(const KpMat3f& other, float tolerance) const;
+
+    KpMat3f transpose() const;
+    float det3() const;
+
+    /// The inverse; of a matrix whose determinant is exactly 0 the adjugate.
+    KpMat3f inverse() const;
+    /// The adjugate divided by `det`, which the caller knows already.
+    KpMat3f inverse(float det) const;
+    /// The same for a symmetric matrix, of which only the upper half is read.
+    KpMat3f symmInverse(float det) const;
+
+    /// The column product: result[i] = sum over j of m[i][j] * v[j]. Input and output may be one object.
+    void multMatrixVec(const KpVec3f& v, KpVec3f& result) const { result = multMatrixVec(v); }
+    KpVec3f multMatrixVec(const KpVec3f& v) const;
+    /// The row product, the way a point is transformed: result[j] = sum over i of v[i] * m[i][j].
+    void multVecMatrix(const KpVec3f& v, KpVec3f& result) const { result = multVecMatrix(v); }
+    KpVec3f multVecMatrix(const KpVec3f& v) const;
+
+    /// Eigenvalues and eigenvectors of a symmetric matrix by cyclic Jacobi rotations in single precision;
+    /// `evectors[j]`, of length 1, belongs to `evalues[j]`, and they come unsorted. `rotations` counts the rotations.
+    /// After 50 sweeps without an end, one warning in the log and `evectors` unwritten. Press et al., "Numerical
+    /// Recipes", 11.1.
+    void jacobi(float (&evalues)[3], KpVec3f (&evectors)[3], int& rotations) const;
+
+    /// In place: the unit lower factor below the diagonal, the upper one on and above it, of the rows in the order
+    /// `index`. The first element of a column that is not 0 is its pivot. `parity` is 0 for an even number of
+    /// exchanges, else 1. False for a matrix with no pivot in column 0 or 1; the last element is not tested.
+    bool LUDecomposition(int (&index)[3], float& parity);
+
+    /// {"m00":"1.000000","m01": ... ,"m22":"1.000000"}
+    std::string dump() const;
+
+private:
+    float m_[3][3];
+};
+
+static_assert(sizeof(KpMat3f) == 36);

@@ -1,0 +1,134 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/geometry/KpVec3f.h>
+#include <kplib/geometry/KpVec4f.h>
+
+#include <cstdio>
+#include <span>
+#include <string>
+
+class KpMat3f;
+class KpRotation;
+
+/// A 4x4 matrix of floats, row by row and nothing else, so that the object is its own byte image: an affine or
+/// projective transformation of space.
+///
+/// Points are row vectors and a matrix stands to their right: a product applies its left factor first, a translation
+/// stands in the last row, and the last column is (0, 0, 0, 1) for an affine matrix. A plain value; a default-made one
+/// is not set to anything.
+class KPLIB_API KpMat4f {
+public:
+    constexpr KpMat4f() = default;
+    constexpr KpMat4f(float m00, float m01, float m02, float m03, float m10, float m11, float m12, float m13, float m20,
+                      float m21, float m22, float m23, float m30, float m31, float m32, float m33) :
+        m_{{m00, m01, m02, m03}, {m10, m11, m12, m13}, {m20, m21, m22, m23}, {m30, m31, m32, m33}}
+    {
+    }
+    explicit KpMat4f(const float (&rows)[4][4]) { setValue(rows); }
+    /// `matrix` in the upper left, 1 in the lower right, else 0.
+    explicit KpMat4f(const KpMat3f& matrix);
+
+    static constexpr KpMat4f identity() { return {1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1}; }
+    void makeIdentity() { *this = identity(); }
+    void setValue(const float (&rows)[4][4]);
+    /// The rows (r0, 0), (r1, 0), (r2, 0), (r3, 1).
+    void setValue(const KpVec3f& r0, const KpVec3f& r1, const KpVec3f& r2, const KpVec3f& r3);
+    void getValue(float (&rows)[4][4]) const;
+    KpMat4f& operator=(const float (&rows)[4][4]);
+
+    /// The matrix of a translation.
+    void setTranslate(const KpVec3f& translation);
+    /// The matrix of a scale.
+    void setScale(float factor) { setScale(KpVec3f(factor, factor, factor)); }
+    void setScale(const KpVec3f& factors);
+    /// The matrix of a rotation.
+    void setRotate(const KpRotation& rotation);
+
+    /// The four floats of a row; m[row][column].
+    constexpr float* operator[](int row) { return m_[row]; }
+    constexpr const float* operator[](int row) const { return m_[row]; }
+    /// The sixteen floats, row by row.
+    constexpr const float* data() const { return m_[0]; }
+
+    KpMat4f& operator*=(const KpMat4f& right) { return *this = *this * right; }
+    /// Applies `a` first, then `b`.
+    friend KPLIB_API KpMat4f operator*(const KpMat4f& a, const KpMat4f& b);
+    /// Exact; a matrix that holds a NaN equals none.
+    friend constexpr bool operator==(const KpMat4f& a, const KpMat4f& b) = default;
+    /// False as soon as one element differs by strictly more than `tolerance`.
+    bool equals(const KpMat4f& other, float tolerance) const;
+
+    /// Whether no element is NaN.
+    bool isNumber() const;
+    /// Whether this is exactly the identity.
+    bool isIdentity() const;
+
+    KpMat4f transpose() const;
+    /// The determinant of the given rows and columns, from 0 to 3.
+    float det3(int r1, int r2, int r3, int c1, int c2, int c3) const;
+    /// The determinant of the upper left.
+    float det3() const { return det3(0, 1, 2, 0, 1, 2); }
+    float det4() const;
+
+    /// The inverse: affine_inverse() where it applies, else by LUDecomposition(). A singular matrix has no error: what
+    /// comes out is large.
+    KpMat4f inverse() const;
+    /// The inverse of an affine matrix, its determinant in double precision. False, and `out` as it was, if the last
+    /// column isn't exactly (0, 0, 0, 1), or if the determinant is below 1e-15 of the sum of its terms' magnitudes.
+    static bool affine_inverse(const KpMat4f& in, KpMat4f& out);
+
+    /// In place, by Crout's method with scaled partial pivoting; `index` receives the pivot rows, `sign` 1 or -1 for an
+    /// even or odd number of exchanges. Rows of zeros and pivots of 0 are replaced by tiny numbers, so true always.
+    /// Press et al., "Numerical Recipes", 2.3.
+    bool LUDecomposition(int (&index)[4], float& sign);
+    /// Solves M x = b for the matrix M that was decomposed, in place.
+    void LUBackSubstitution(const int (&index)[4], float (&b)[4]) const;
+
+    /// The row product, the way a point is transformed: (v, 1) M, divided by its fourth component w; w = 0 is not
+    /// guarded against. Input and output may be one object.
+    void multVecMatrix(const KpVec3f& v, KpVec3f& result) const { result = multVecMatrix(v); }
+    KpVec3f multVecMatrix(const KpVec3f& v) const;
+    /// The same for many points at once, to the bit: `results` has as many places as `points`, and may be the same
+    /// memory.
+    void multVecMatrix(std::span<const KpVec3f> points, KpVec3f* results) const;
+    /// The column product M (v, 1), divided by its fourth component: the transposed transformation.
+    void multMatrixVec(const KpVec3f& v, KpVec3f& result) const { result = multMatrixVec(v); }
+    KpVec3f multMatrixVec(const KpVec3f& v) const;
+    /// The row product with the upper left alone, the way a direction is transformed: no translation, no division.
+    void multDirMatrix(const KpVec3f& v, KpVec3f& result) const { result = multDirMatrix(v); }
+    KpVec3f multDirMatrix(const KpVec3f& v) const;
+    /// The products with all four components, without a division.
+    void multVecMatrix(const KpVec4f& v, KpVec4f& result) const { result = multVecMatrix(v); }
+    KpVec4f multVecMatrix(const KpVec4f& v) const;
+    void multMatrixVec(const KpVec4f& v, KpVec4f& result) const { result = multMatrixVec(v); }
+    KpVec4f multMatrixVec(const KpVec4f& v) const;
+
+    /// Eigenvalues and eigenvectors of the upper left, a symmetric matrix, by cyclic Jacobi rotations in double
+    /// precision. Eigenvector j is column j of `evectors`, of length 1; they come unsorted. `rotations` grows by 3 a
+    /// sweep, and after 50 sweeps it ends silently. Press et al., "Numerical Recipes", 11.1.
+    void jacobi3(float (&evalues)[3], float (&evectors)[3][3], int& rotations) const;
+
+    /// The polar decomposition M = r s r^T u t: scales `s` along the axes of the rotation `r`, a rotation `u`, a
+    /// translation `t`; `proj` is the identity. False for a singular matrix, which writes `t` and `proj` alone.
+    /// Shoemake and Duff, "Matrix animation and polar decomposition", 1992.
+    bool factor(KpMat4f& r, KpVec3f& s, KpMat4f& u, KpVec3f& t, KpMat4f& proj) const;
+    /// What setTransform() makes this matrix from, by factor(). A singular matrix gives identity rotations and leaves
+    /// `scaleFactor`.
+    void getTransform(KpVec3f& translation, KpRotation& rotation, KpVec3f& scaleFactor, KpRotation& scaleOrientation,
+                      const KpVec3f& center = KpVec3f(0, 0, 0)) const;
+    /// Moves by -`center`, scales by `scaleFactor` along the axes of `scaleOrientation`, rotates, and moves by `center`
+    /// and `translation`, in this order of application.
+    void setTransform(const KpVec3f& translation, const KpRotation& rotation, const KpVec3f& scaleFactor,
+                      const KpRotation& scaleOrientation, const KpVec3f& center = KpVec3f(0, 0, 0));
+
+    /// Writes each row as two lines, the second of one element; does nothing for null.
+    void print(std::FILE* file) const;
+    /// {"m00":"1.000000","m01": ... ,"m33":"1.000000"}
+    std::string dump() const;
+
+private:
+    float m_[4][4];
+};
+
+static_assert(sizeof(KpMat4f) == 64);

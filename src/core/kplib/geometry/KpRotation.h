@@ -1,0 +1,95 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/geometry/KpMat3f.h>
+#include <kplib/geometry/KpVec3f.h>
+
+class KpMat4f;
+
+/// A rotation in space: the quaternion x, y, z, w with w the scalar part, four floats and nothing else, so that the
+/// object is its own byte image.
+///
+/// Products follow those of matrices: a * b applies a first. A positive angle about +z takes +x to +y. A plain value; a
+/// default-made one is not set to anything.
+class KPLIB_API KpRotation {
+public:
+    constexpr KpRotation() = default;
+    // Each is what setValue() makes of the same arguments.
+    KpRotation(float x, float y, float z, float w) { setValue(x, y, z, w); }
+    explicit KpRotation(const float* xyzw) { setValue(xyzw); }
+    KpRotation(const KpVec3f& axis, float angle) { setValue(axis, angle); }
+    explicit KpRotation(const KpMat4f& matrix) { setValue(matrix); }
+    explicit KpRotation(const KpMat3f& matrix) { setValue(matrix); }
+    KpRotation(const KpVec3f& from, const KpVec3f& to) { setValue(from, to); }
+    KpRotation(const KpVec3f& from1, const KpVec3f& from2, const KpVec3f& to1, const KpVec3f& to2)
+    {
+        setValue(from1, from2, to1, to2);
+    }
+
+    static KpRotation identity();
+
+    /// The four, normalised; all 0 is not guarded against.
+    void setValue(float x, float y, float z, float w);
+    void setValue(const float* xyzw) { setValue(xyzw[0], xyzw[1], xyzw[2], xyzw[3]); }
+    /// The turn by `angle` (radians) about `axis`, of any length but 0.
+    void setValue(const KpVec3f& axis, float angle);
+    /// The rotation of a matrix, whose upper left has to be one. Not normalised afterwards. Shoemake, "Animating
+    /// rotation with quaternion curves", 1985.
+    void setValue(const KpMat4f& matrix);
+    void setValue(const KpMat3f& matrix);
+    /// The smallest turn that takes the direction `from` to the direction `to`; opposite ones have an axis chosen for
+    /// them.
+    void setValue(const KpVec3f& from, const KpVec3f& to);
+    /// The turn that takes `from1` to `to1`, and `from2` as near to `to2` as can be. All four are of length 1.
+    void setValue(const KpVec3f& from1, const KpVec3f& from2, const KpVec3f& to1, const KpVec3f& to2);
+
+    /// The four as stored.
+    void getValue(float& x, float& y, float& z, float& w) const;
+    /// Axis of length 1 and angle in radians; (0, 0, 1) and 0 where there is nearly no turn.
+    void getValue(KpVec3f& axis, float& angle) const;
+    void getValue(KpMat4f& matrix) const;
+    void getValue(KpMat3f& matrix) const { matrix = toMat3f(); }
+    /// The matrix for row vectors; the diagonal in double precision, rounded to float.
+    KpMat3f toMat3f() const;
+
+    constexpr float operator[](int i) const { return q_[i]; }
+    /// x, y, z, w
+    constexpr const float* data() const { return q_; }
+
+    /// Divides by the square root of norm(), which is taken in double precision.
+    void normalize();
+    /// The sum of the four squares: no root is taken, and that is meant.
+    float norm() const { return q_[0] * q_[0] + q_[1] * q_[1] + q_[2] * q_[2] + q_[3] * q_[3]; }
+    void invert();
+    KpRotation inverse() const
+    {
+        KpRotation result = *this;
+        result.invert();
+        return result;
+    }
+    /// Multiplies the angle.
+    void scaleAngle(float factor);
+
+    /// This * r, then normalised.
+    KpRotation& operator*=(const KpRotation& r);
+    /// Applies `a` first, then `b`; not normalised.
+    friend KPLIB_API KpRotation operator*(const KpRotation& a, const KpRotation& b);
+    /// Exact; q and -q, the same rotation, differ.
+    friend constexpr bool operator==(const KpRotation& a, const KpRotation& b) = default;
+    /// Whether the four, or their negatives, differ by strictly less than `tolerance`.
+    bool equals(const KpRotation& other, float tolerance) const;
+
+    /// `v` turned, by way of the matrix. Input and output may be one object.
+    void multVec(const KpVec3f& v, KpVec3f& result) const { result = multVec(v); }
+    KpVec3f multVec(const KpVec3f& v) const;
+    KpVec3f operator*(const KpVec3f& v) const { return multVec(v); }
+
+    /// From `a` at t = 0 to `b` (or its negative) at t = 1 at a steady speed along the shorter way; not normalised.
+    /// Shoemake, "Animating rotation with quaternion curves", 1985.
+    static KpRotation slerp(const KpRotation& a, const KpRotation& b, float t);
+
+private:
+    float q_[4];
+};
+
+static_assert(sizeof(KpRotation) == 16);

@@ -1,0 +1,23 @@
+#include <kplib/geometry/KpVec2f.h>
+
+#include <cmath>
+
+float KpVec2f::normalize()
+{
+    const auto length = static_cast<float>(std::hypot(static_cast<double>(x()), static_cast<double>(y())));
+    if (length != 0)
+        *this /= length;
+    return length;
+}
+
+float KpVec2f::angle(const KpVec2f& other) const
+{
+    const double lengths = std::hypot(static_cast<double>(x()), static_cast<double>(y())) *
+                           std::hypot(static_cast<double>(other.x()), static_cast<double>(other.y()));
+    const double cosine = dot(other) / lengths;
+    if (cosine < -1)
+        return 3.1415927F;
+    if (cosine > 1)
+        return 0;
+    return static_cast<float>(std::acos(cosine));
+}

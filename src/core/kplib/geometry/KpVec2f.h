@@ -1,0 +1,24 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/geometry/KpVecBase.h>
+
+/// Two floats: a point on a screen or in a picture.
+class KPLIB_API KpVec2f : public KpVecBase<KpVec2f, float, 2> {
+public:
+    constexpr KpVec2f() = default;
+    constexpr KpVec2f(float x, float y) : KpVecBase(x, y) {}
+    /// From a vector of another component type, each component converted as by static_cast.
+    template <typename Vector, typename Component>
+    constexpr explicit KpVec2f(const KpVecBase<Vector, Component, 2>& other) : KpVecBase(other)
+    {
+    }
+
+    /// Makes the length 1 and gives the former one, hypot() in double rounded to float. A vector of length 0 stays, and
+    /// 0 is given.
+    float normalize();
+    /// The unsigned angle between the two in radians, from 0 to pi; NaN if one of them is zero.
+    float angle(const KpVec2f& other) const;
+};
+
+static_assert(sizeof(KpVec2f) == 8);

@@ -1,0 +1,158 @@
+#pragma once
+
+#include <cmath>
+#include <concepts>
+#include <iosfwd>
+
+/// What the fixed-size vectors share: `Size` components of type `Component` and nothing else, so that the object is its
+/// own byte image. `Vector` is the class that derives from it (KpVec3f ...) and is what the operators give.
+///
+/// All arithmetic is done in the width of the component, sums from x to the last. A plain value: no errors, no
+/// allocation; different objects may be used by different threads. A default-made vector is not set to anything.
+template <typename Vector, typename Component, int Size>
+class KpVecBase {
+public:
+    using value_type = Component;
+    static constexpr int size() { return Size; }
+
+    /// Component `i`, from 0; not checked.
+    constexpr Component& operator[](int i) { return v_[i]; }
+    constexpr Component operator[](int i) const { return v_[i]; }
+    /// The components one after the other, x first.
+    constexpr Component* data() { return v_; }
+    constexpr const Component* data() const { return v_; }
+    constexpr Component* begin() { return v_; }
+    constexpr Component* end() { return v_ + Size; }
+    constexpr const Component* begin() const { return v_; }
+    constexpr const Component* end() const { return v_ + Size; }
+
+    constexpr Component& x() { return v_[0]; }
+    constexpr Component x() const { return v_[0]; }
+    constexpr Component& y() { return v_[1]; }
+    constexpr Component y() const { return v_[1]; }
+    constexpr Component& z() requires(Size > 2) { return v_[2]; }
+    constexpr Component z() const requires(Size > 2) { return v_[2]; }
+    constexpr Component& w() requires(Size > 3) { return v_[3]; }
+    constexpr Component w() const requires(Size > 3) { return v_[3]; }
+
+    /// The sum of the products of the components.
+    constexpr Component dot(const Vector& other) const
+    {
+        Component sum = v_[0] * other.v_[0];
+        for (int i = 1; i < Size; ++i)
+            sum += v_[i] * other.v_[i];
+        return sum;
+    }
+    /// At a right angle to both, by the right-hand rule.
+    constexpr Vector cross(const Vector& other) const requires(Size == 3)
+    {
+        return {y() * other.z() - z() * other.y(), z() * other.x() - x() * other.z(),
+                x() * other.y() - y() * other.x()};
+    }
+    constexpr Component squaredLength() const { return dot(static_cast<const Vector&>(*this)); }
+    /// The square root of squaredLength(); of integers its whole part.
+    Component length() const
+    {
+        if constexpr (std::floating_point<Component>)
+            return std::sqrt(squaredLength());
+        else
+            return static_cast<Component>(std::sqrt(static_cast<long double>(squaredLength())));
+    }
+
+    // Operators between two vectors work component by component, those with a number on each component.
+
+    constexpr Vector& operator+=(const Vector& other)
+    {
+        for (int i = 0; i < Size; ++i)
+            v_[i] += other.v_[i];
+        return self();
+    }
+    constexpr Vector& operator-=(const Vector& other)
+    {
+        for (int i = 0; i < Size; ++i)
+            v_[i] -= other.v_[i];
+        return self();
+    }
+    constexpr Vector& operator*=(const Vector& other)
+    {
+        for (int i = 0; i < Size; ++i)
+            v_[i] *= other.v_[i];
+        return self();
+    }
+    constexpr Vector& operator/=(const Vector& other)
+    {
+        for (int i = 0; i < Size; ++i)
+            v_[i] /= other.v_[i];
+        return self();
+    }
+    constexpr Vector& operator*=(Component factor)
+    {
+        for (Component& c : v_)
+            c *= factor;
+        return self();
+    }
+    /// Divides each component; of integers toward zero, and by 0 not at all allowed.
+    constexpr Vector& operator/=(Component divisor)
+    {
+        for (Component& c : v_)
+            c /= divisor;
+        return self();
+    }
+
+    friend constexpr Vector operator+(Vector a, const Vector& b) { return a += b; }
+    friend constexpr Vector operator-(Vector a, const Vector& b) { return a -= b; }
+    friend constexpr Vector operator*(Vector a, const Vector& b) { return a *= b; }
+    friend constexpr Vector operator/(Vector a, const Vector& b) { return a /= b; }
+    friend constexpr Vector operator*(Vector a, Component factor) { return a *= factor; }
+    friend constexpr Vector operator*(Component factor, Vector a) { return a *= factor; }
+    friend constexpr Vector operator/(Vector a, Component divisor) { return a /= divisor; }
+    friend constexpr Vector operator-(Vector a)
+    {
+        for (Component& c : a.v_)
+            c = -c;
+        return a;
+    }
+    /// Exact; a vector that holds a NaN equals none.
+    friend constexpr bool operator==(const Vector& a, const Vector& b)
+    {
+        for (int i = 0; i < Size; ++i) {
+            if (a.v_[i] != b.v_[i])
+                return false;
+        }
+        return true;
+    }
+    /// "(x, y, z)"
+    template <typename Traits>
+    friend std::basic_ostream<char, Traits>& operator<<(std::basic_ostream<char, Traits>& out, const Vector& vector)
+    {
+        for (int i = 0; i < Size; ++i)
+            out << (i == 0 ? "(" : ", ") << vector.v_[i];
+        return out << ')';
+    }
+
+protected:
+    constexpr KpVecBase() = default;
+    template <std::same_as<Component>... Components>
+    requires(sizeof...(Components) == Size) constexpr KpVecBase(Components... components) : v_{components...} {}
+    /// Each component converted as by static_cast.
+    template <typename OtherVector, typename OtherComponent>
+    constexpr explicit KpVecBase(const KpVecBase<OtherVector, OtherComponent, Size>& other)
+    {
+        for (int i = 0; i < Size; ++i)
+            v_[i] = static_cast<Component>(other[i]);
+    }
+
+    /// Divides by length() and gives it; a length of exactly 0 changes nothing.
+    Component normalizeByLength()
+    {
+        const Component length = this->length();
+        if (length != 0)
+            *this /= length;
+        return length;
+    }
+
+private:
+    constexpr Vector& self() { return static_cast<Vector&>(*this); }
+
+    Component v_[Size];
+};
