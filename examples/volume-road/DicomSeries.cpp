@@ -71,6 +71,7 @@ SliceFile describe(const std::string& path, DcmFileFormat& file)
     slice.seriesUid = textOf(data, DCM_SeriesInstanceUID);
     slice.seriesDescription = textOf(data, DCM_SeriesDescription);
     slice.instanceUid = textOf(data, DCM_SOPInstanceUID);
+    slice.frameUid = textOf(data, DCM_FrameOfReferenceUID);
     const DcmXfer transfer(data.getOriginalXfer());
     slice.transferSyntax = transfer.getXferName();
     slice.isCompressed = transfer.isEncapsulated();

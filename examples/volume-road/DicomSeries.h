@@ -10,7 +10,7 @@
 
 /// One image of a series, as its header tells.
 struct SliceFile {
-    std::string path, seriesUid, seriesDescription, instanceUid, transferSyntax;
+    std::string path, seriesUid, seriesDescription, instanceUid, frameUid, transferSyntax;
     bool isCompressed = false, isColour = false, hasPlace = false, isInverted = false;
     int rows = 0, columns = 0, frames = 1, bitsAllocated = 0, bitsStored = 0, highBit = 0, isSigned = 0, number = 0;
     Vector position{}, rowAxis{1, 0, 0}, columnAxis{0, 1, 0};
@@ -27,6 +27,13 @@ struct Series {
     std::vector<std::string> warnings;
     double spacing = 1;    ///< mm along the normal
     int skippedFiles = 0;  ///< files that are no images
+
+    /// What the images name as the space they lie in; without such a name each series is a space of its own.
+    const std::string& frameUid() const
+    {
+        const SliceFile& first = slices.front();
+        return first.frameUid.empty() ? first.seriesUid : first.frameUid;
+    }
 };
 
 /// Finds the images below `folder` and picks one series: the only one, or that of `uid`. All images of it must agree in

@@ -1,36 +1,14 @@
 #include "Pictures.h"
 
-#include <kplib/rawdata/KpRawData.h>
+#include "Letters.h"
+#include "Space.h"
 
-#include <png.h>
+#include <kplib/rawdata/KpRawData.h>
 
 #include <algorithm>
 #include <cmath>
 
 namespace {
-
-struct Picture {
-    long width, height;
-    KpDArray<unsigned char> pixels;  // top row first
-
-    Picture(long w, long h) : width(w), height(h)
-    {
-        pixels.resize(w * h);
-        KpRawData::memset({pixels.data(), KpPrimType::Byte}, 0, w * h);
-    }
-};
-
-KpResult writePng(const Picture& picture, const OutputFolder& out, const char* name)
-{
-    png_image image{};
-    image.version = PNG_IMAGE_VERSION;
-    image.width = static_cast<png_uint_32>(picture.width);
-    image.height = static_cast<png_uint_32>(picture.height);
-    image.format = PNG_FORMAT_GRAY;
-    if (!png_image_write_to_file(&image, out.pathOf(name).c_str(), 0, picture.pixels.data(), 0, nullptr))
-        return badInput("can't write %s: %s", name, image.message);
-    return KpResult();
-}
 
 /// The volume's axis that runs most along a patient's axis, and which way.
 struct Along {
@@ -38,6 +16,7 @@ struct Along {
     bool isReversed;
     long size, stride;
     double spacing;
+    KpVec3f direction;  // in the patient, as the picture shows it
 };
 
 std::array<Along, 3> alongPatientAxes(const Volume& volume)
@@ -57,7 +36,10 @@ std::array<Along, 3> alongPatientAxes(const Volume& volume)
     std::array<Along, 3> along{};
     for (size_t p = 0; p < 3; ++p) {
         const size_t axis = best[p];
-        along[p] = {axis, volume.axes[axis][p] < 0, volume.dims[axis], strides[axis], volume.spacing[axis]};
+        const bool isReversed = volume.axes[axis][p] < 0;
+        const KpVec3f direction = toVec(volume.axes[axis]);
+        along[p] = {axis,          isReversed,           volume.dims[axis],
+                    strides[axis], volume.spacing[axis], isReversed ? -direction : direction};
     }
     return along;
 }
@@ -97,12 +79,14 @@ Picture cut(Volume& shown, const Along& across, const Along& down, const Along& 
                 static_cast<unsigned char>(std::lround(top + y.share * (bottom - top)));
         }
     }
+    drawLetters(picture, lettersOf(across.direction, down.direction));
     return picture;
 }
 
 Along reversed(Along along)
 {
     along.isReversed = !along.isReversed;
+    along.direction = -along.direction;
     return along;
 }
 
@@ -163,5 +147,6 @@ KpResult writeOverview(Volume& shown, const OutputFolder& out, const char* name)
         for (long y = 0; y < height; ++y, row += width, to += picture.width)
             std::copy_n(row, width, to);
     }
+    drawLetters(picture, lettersOf(toVec(shown.axes[0]), toVec(shown.axes[1])));
     return writePng(picture, out, name);
 }

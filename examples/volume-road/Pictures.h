@@ -18,8 +18,8 @@ Window windowOf(Volume& volume);
 void display(Volume& volume, const Window& window, Volume& shown);
 
 /// Writes axial.png, coronal.png and sagittal.png through the middle of a volume of bytes, the patient upright and seen
-/// as usual (left on the right side of the picture), with square pixels.
+/// as usual (left on the right side of the picture), with square pixels and the orientation's letters at the edges.
 KpResult writePlanes(Volume& shown, const OutputFolder& out);
 
-/// Writes all slices of a volume of bytes side by side.
+/// Writes all slices of a volume of bytes side by side, with the letters of a slice at the edges.
 KpResult writeOverview(Volume& shown, const OutputFolder& out, const char* name);

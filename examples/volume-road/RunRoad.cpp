@@ -1,6 +1,7 @@
 #include "RunRoad.h"
 
 #include "DicomSeries.h"
+#include "Oblique.h"
 #include "Report.h"
 
 #include <kplib/rawdata/KpRawData.h>
@@ -130,7 +131,7 @@ KpResult runRoad(const char* folder, const std::string& uid, const std::string& 
     if (KpResult opened = out.open(target); opened.isBad())
         return opened;
     const ProgressScope scope(&progress);
-    progress.startWorking(7, "");
+    progress.startWorking(8, "");
     Road road(progress);
     Series series;
     HxParamBundle root("Volume");
@@ -153,6 +154,7 @@ KpResult runRoad(const char* folder, const std::string& uid, const std::string& 
         display(volume, window, shown);
         return writePlanes(shown, out);
     });
+    road.plain("cut obliquely", [&] { return writeOblique(shown, Space(series.frameUid(), volume), out); });
     road.plain("draw overviews", [&] {
         display(mean, window, shown);
         KpResult written = writeOverview(shown, out, "overview-mean.png");

@@ -1,0 +1,8 @@
+#pragma once
+
+#include "Picture.h"
+
+#include <kplib/imaging/KpOrientationLetters.h>
+
+/// Draws into the middle of each edge of the picture which way the patient lies there, white in a black rim.
+void drawLetters(Picture& picture, const KpOrientationLetters& letters);

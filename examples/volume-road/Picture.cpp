@@ -1,0 +1,25 @@
+#include "Picture.h"
+
+#include "Volume.h"
+
+#include <kplib/rawdata/KpRawData.h>
+
+#include <png.h>
+
+Picture::Picture(long w, long h) : width(w), height(h)
+{
+    pixels.resize(w * h);
+    KpRawData::memset({pixels.data(), KpPrimType::Byte}, 0, w * h);
+}
+
+KpResult writePng(const Picture& picture, const OutputFolder& out, const char* name)
+{
+    png_image image{};
+    image.version = PNG_IMAGE_VERSION;
+    image.width = static_cast<png_uint_32>(picture.width);
+    image.height = static_cast<png_uint_32>(picture.height);
+    image.format = PNG_FORMAT_GRAY;
+    if (!png_image_write_to_file(&image, out.pathOf(name).c_str(), 0, picture.pixels.data(), 0, nullptr))
+        return badInput("can't write %s: %s", name, image.message);
+    return KpResult();
+}

@@ -1,0 +1,25 @@
+#pragma once
+
+#include "Volume.h"
+
+#include <kplib/geometry/KpCoordinateSystem.h>
+#include <kplib/imaging/KpOrientationLetters.h>
+
+#include <string>
+
+/// The patient's space of a series: its frame of reference, and in it the system of the voxels, in which the middle of
+/// voxel (x, y, z) is the point (x, y, z).
+struct Space {
+    KpHandle<const KpFrameOfReference> patient;
+    KpHandle<KpCoordinateSystem> voxels;
+
+    Space(const std::string& frameUid, const Volume& volume);
+};
+
+inline KpVec3f toVec(const Vector& v)
+{
+    return {static_cast<float>(v[0]), static_cast<float>(v[1]), static_cast<float>(v[2])};
+}
+
+/// The letters of a picture whose columns run to `right` and whose rows run to `down`, in the patient's space.
+KpOrientationLetters lettersOf(const KpVec3f& right, const KpVec3f& down);
