@@ -60,6 +60,8 @@
 #include <kplib/rawdata/KpRawData.h>
 #include <kplib/rawdata/KpTypedElement.h>
 #include <kplib/rawdata/KpTypedPointer.h>
+#include <kplib/system/KpDataBase.h>
+#include <kplib/system/KpTable.h>
 #include <kplib/system/KpWatch.h>
 #include <kplib/threads/KpProgressGuiInterface.h>
 #include <kplib/threads/KpProgressInterface.h>

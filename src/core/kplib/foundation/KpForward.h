@@ -51,3 +51,6 @@ class ProgressScope;
 
 class KpScopedWatch;
 class KpWatch;
+
+class KpDataBase;
+class KpTable;

@@ -1,0 +1,283 @@
+#include <kplib/system/KpDataBase.h>
+#include <kplib/system/KpTable.h>
+
+#include <gtest/gtest.h>
+
+#include <map>
+#include <memory>
+#include <random>
+#include <vector>
+
+namespace {
+
+constexpr int valueColumn = 1, pointerColumn = 2, listColumn = 3, lateColumn = 4;
+
+/// What a row should hold; `row` is followed by the table when rows move.
+struct ModelRow {
+    std::unique_ptr<char*> row;
+    long value;
+    long partner = -1;       // a key of the other table
+    std::vector<long> list;  // keys of the row's own table
+    long late = 0;
+};
+using Model = std::map<long, ModelRow>;
+
+long valueOf(const KpTable& table, const char* row, int column = valueColumn)
+{
+    long value = 0;
+    std::memcpy(&value, row + table.columnOffset(column) + (column == valueColumn ? 8 : 0), sizeof value);
+    return value;
+}
+
+void setValue(const KpTable& table, char* row, long value, int column = valueColumn)
+{
+    std::memcpy(row + table.columnOffset(column) + (column == valueColumn ? 8 : 0), &value, sizeof value);
+}
+
+/// Two tables whose rows point to each other and list rows of their own, beside a model of them.
+class Pair {
+public:
+    Pair()
+    {
+        for (int t = 0; t < 2; ++t)
+            tables[t] = database.table(database.createTable());
+        for (int t = 0; t < 2; ++t) {
+            tables[t]->columnAdd(valueColumn, KpTable::Plain, 16, nullptr);  // its first four bytes are the table's
+            tables[t]->columnAdd(pointerColumn, KpTable::RowPointer, 0, tables[1 - t]);
+            tables[t]->columnAdd(listColumn, KpTable::Relation, 0, tables[t]);
+        }
+    }
+
+    void step()
+    {
+        const int t = random() % 2;
+        const long key = any(models[t]), other = any(models[1 - t]);
+        switch (random() % 16) {
+        case 0:
+            remove(t, key);
+            break;
+        case 1:
+            link(t, key, other);
+            break;
+        case 2:
+        case 3:
+        case 4:
+        case 5:
+            for (int i = 0; i < 3; ++i)
+                relate(t, key, any(models[t]));
+            break;
+        case 6:
+            unrelate(t, key);
+            break;
+        case 7:
+            if (random() % 50 == 0)
+                tables[t]->expand(static_cast<int>(tables[t]->rowCount() + 700 + random() % 9), 0);
+            break;
+        case 8:
+            if (random() % 50 == 0)
+                tables[t]->relationReserve(2000, tables[t]->columnOffset(listColumn));
+            break;
+        default:
+            add(t);
+        }
+    }
+
+    void addLateColumn(int t)
+    {
+        tables[t]->columnAdd(lateColumn, KpTable::Plain, 8, nullptr);
+        long next = 1;
+        for (auto& [key, model] : models[t])
+            setValue(*tables[t], *model.row, model.late = next++, lateColumn);
+    }
+
+    void expectHolds(const KpDataBase& held, bool isClone = false) const
+    {
+        ASSERT_TRUE(held.check());
+        for (int t = 0; t < 2; ++t) {
+            const KpTable& table = *held.table(tables[t]->tableId());
+            ASSERT_EQ(table.rowCount(), static_cast<long>(models[t].size()));
+            for (const auto& [key, model] : models[t]) {
+                char* const row =
+                    isClone ? table.rowFind(lateColumn, *model.row + table.columnOffset(lateColumn)) : *model.row;
+                ASSERT_TRUE(row && table.checkRowPointer(row));
+                expectRow(held, table, row, model, models[1 - t], models[t]);
+            }
+        }
+    }
+
+    KpDataBase database;
+    KpTable* tables[2];
+    Model models[2];
+    std::mt19937 random{7};
+
+private:
+    long any(const Model& model)
+    {
+        const auto hit =
+            model.lower_bound(model.empty() ? 0 : static_cast<long>(random() % static_cast<unsigned>(nextKey)));
+        return hit == model.end() ? -1 : hit->first;
+    }
+    void add(int t)
+    {
+        ModelRow model{std::make_unique<char*>(tables[t]->rowAdd()), static_cast<long>(random()), -1, {}, 0};
+        setValue(*tables[t], *model.row, model.value);
+        tables[t]->externalRowPointers().append(model.row.get());
+        models[t].emplace(nextKey++, std::move(model));
+    }
+    void link(int t, long key, long other)
+    {
+        if (key < 0 || other < 0)
+            return;
+        models[t].at(key).partner = other;
+        KpTable::pointerSet(*models[t].at(key).row, tables[t]->columnOffset(pointerColumn),
+                            *models[1 - t].at(other).row);
+    }
+    void relate(int t, long key, long target)
+    {
+        if (key < 0 || target < 0)
+            return;
+        models[t].at(key).list.push_back(target);
+        tables[t]->relationAdd(*models[t].at(key).row, tables[t]->columnOffset(listColumn), *models[t].at(target).row);
+    }
+    void unrelate(int t, long key)
+    {
+        if (key < 0 || models[t].at(key).list.empty())
+            return;
+        std::vector<long>& list = models[t].at(key).list;
+        const long target = list[random() % list.size()];
+        list.erase(std::find(list.begin(), list.end(), target));
+        tables[t]->relationDel(*models[t].at(key).row, tables[t]->columnOffset(listColumn), *models[t].at(target).row);
+    }
+    void remove(int t, long key)
+    {
+        if (key < 0)
+            return;
+        for (auto& [k, model] : models[1 - t]) {
+            if (model.partner == key) {
+                model.partner = -1;
+                KpTable::pointerSet(*model.row, tables[1 - t]->columnOffset(pointerColumn), nullptr);
+            }
+        }
+        for (auto& [k, model] : models[t]) {
+            const auto removed = std::erase(model.list, key);
+            for (unsigned long i = 0; i < removed; ++i)
+                tables[t]->relationDel(*model.row, tables[t]->columnOffset(listColumn), *models[t].at(key).row);
+        }
+        ModelRow& model = models[t].at(key);
+        EXPECT_TRUE(tables[t]->rowDel(*model.row));
+        EXPECT_FALSE(tables[t]->rowDel(*model.row));
+        KpDArray<char**>& external = tables[t]->externalRowPointers();
+        external.remove(std::find(external.begin(), external.end(), model.row.get()) - external.begin());
+        models[t].erase(key);
+    }
+    static void expectRow(const KpDataBase& held, const KpTable& table, const char* row, const ModelRow& model,
+                          const Model& partners, const Model& own)
+    {
+        const KpTable& other = *held.table(table.tableId() == 400 ? 401 : 400);
+        ASSERT_EQ(valueOf(table, row), model.value);
+        ASSERT_EQ(valueOf(table, row, lateColumn), model.late);
+        const char* const partner = KpTable::pointer(row, table.columnOffset(pointerColumn));
+        ASSERT_EQ(partner != nullptr, model.partner >= 0);
+        if (partner) {
+            ASSERT_TRUE(other.checkRowPointer(partner));
+            ASSERT_EQ(valueOf(other, partner), partners.at(model.partner).value);
+        }
+        std::vector<long> listed, expected;
+        const int offset = table.columnOffset(listColumn);
+        for (char** cell = KpTable::relationFirst(row, offset); cell; cell = KpTable::relationNext(cell))
+            listed.push_back(valueOf(table, KpTable::relationTarget(cell)));
+        for (const long key : model.list)
+            expected.push_back(own.at(key).value);
+        ASSERT_EQ(listed, expected);
+        ASSERT_EQ(KpTable::relationGetCount(row, offset), static_cast<int>(expected.size()));
+    }
+
+    long nextKey = 0;
+};
+
+}  // namespace
+
+TEST(KpTable, agreesWithAMapThroughMovesOfRowsAndCells)
+{
+    Pair pair;
+    for (int t = 0; t < 2; ++t)
+        pair.addLateColumn(t);
+    for (int i = 0; i < 9000; ++i) {
+        pair.step();
+        ASSERT_TRUE(pair.database.check()) << i;
+        if (i % 1000 == 999)
+            ASSERT_NO_FATAL_FAILURE(pair.expectHolds(pair.database)) << i;
+    }
+    ASSERT_GT(pair.models[0].size(), 600U);  // beyond the first block
+}
+
+TEST(KpTable, clonesAreEqualAndIndependent)
+{
+    Pair pair;
+    for (int i = 0; i < 3000; ++i)
+        pair.step();
+    for (int t = 0; t < 2; ++t)
+        pair.addLateColumn(t);  // a column for rows that are there; its values tell the rows of the clone
+    KpDataBase copy;
+    pair.database.clone(copy);
+    ASSERT_NO_FATAL_FAILURE(pair.expectHolds(pair.database));
+    ASSERT_NO_FATAL_FAILURE(pair.expectHolds(copy, true));
+    EXPECT_EQ(copy.createTable(), 402);
+    for (int t = 0; t < 2; ++t) {
+        copy.table(400 + t)->expand(5000, 24);
+        while (char* const row = copy.table(401 - t)->rowNext(nullptr)) {
+            KpTable::pointerSet(row, copy.table(401 - t)->columnOffset(pointerColumn), nullptr);
+            copy.table(401 - t)->relationRemoveAll(row, copy.table(401 - t)->columnOffset(listColumn));
+            copy.table(401 - t)->rowDel(row);
+        }
+    }
+    EXPECT_NO_FATAL_FAILURE(pair.expectHolds(pair.database));
+}
+
+TEST(KpTable, refusesColumnsThatTheRowFormHasNoPlaceFor)
+{
+    KpDataBase database;
+    KpTable& table = *database.table(database.createTable());
+    EXPECT_EQ(table.rowAdd(), nullptr);
+    EXPECT_EQ(table.columnAdd(1, KpTable::Relation, 0, &table), -1);  // the table's id has to stand there
+    EXPECT_EQ(table.columnAdd(1, KpTable::Plain, 2, nullptr), -1);
+    EXPECT_EQ(table.columnAdd(16, KpTable::Plain, 8, nullptr), -1);
+    EXPECT_EQ(table.columnAdd(5, KpTable::Plain, 508, nullptr), 1);
+    EXPECT_EQ(table.columnAdd(5, KpTable::Plain, 8, nullptr), 1);     // is there: nothing is done
+    EXPECT_EQ(table.columnAdd(6, KpTable::Relation, 0, &table), -1);  // would start at 512
+    EXPECT_EQ(table.columnAdd(6, KpTable::RowPointer, 0, &table), 2);
+    EXPECT_EQ(table.rowSize(), 4 + 508 + 8);
+    EXPECT_EQ(table.columnOffset(6), 512);
+    EXPECT_EQ(table.columnOffset(7), -1);
+}
+
+TEST(KpTable, checkFindsWhatDoesNotHoldUnlessItIsSkipped)
+{
+    KpDataBase database;
+    KpTable& table = *database.table(database.createTable());
+    table.columnAdd(1, KpTable::Plain, 4, nullptr);
+    table.columnAdd(2, KpTable::RowPointer, 0, &table);
+    table.columnAdd(3, KpTable::Relation, 0, &table);
+    char* const row = table.rowAdd();
+    table.relationAdd(row, table.columnOffset(3), row);
+    ASSERT_TRUE(database.check());
+    for (const int offset : {0, 4, table.columnOffset(2), table.columnOffset(3)}) {
+        char saved[8];
+        std::memcpy(saved, row + offset, 8);
+        const char* const wrong = saved;
+        std::memcpy(row + offset, &wrong, 8);
+        EXPECT_FALSE(database.check()) << offset;
+        EXPECT_EQ(table.lockRelation(9999), -1);  // which skips the check instead
+        EXPECT_TRUE(database.check());
+        table.unskipCheck();
+        database.skipCheck();
+        EXPECT_TRUE(database.check());
+        database.unskipCheck();
+        std::memcpy(row + offset, saved, 8);
+    }
+    EXPECT_EQ(table.lockRelation(table.columnOffset(3)), 3);
+    table.clear();
+    EXPECT_EQ(table.rowCount(), 0);
+    EXPECT_EQ(table.rowSize(), 32);
+    EXPECT_TRUE(database.check());
+}
