@@ -47,12 +47,16 @@
 #include <kplib/geometry/KpVecBase.h>
 #include <kplib/geometry/MathUtils.h>
 #include <kplib/imaging/KpColor.h>
+#include <kplib/log/KpCrashDump.h>
+#include <kplib/log/KpDbC.h>
 #include <kplib/log/KpLastError.h>
 #include <kplib/log/KpLogFile.h>
 #include <kplib/log/KpLogFileDefaultModuleModifier.h>
 #include <kplib/log/KpLogFileWriteCallbackDisabler.h>
 #include <kplib/log/KpLogLevel.h>
+#include <kplib/log/KpMessageCollector.h>
 #include <kplib/log/KpResult.h>
+#include <kplib/log/KpTerminateProcess.h>
 #include <kplib/param/HxParamBase.h>
 #include <kplib/param/HxParamBundle.h>
 #include <kplib/param/HxParamEditCheck.h>
@@ -60,8 +64,10 @@
 #include <kplib/rawdata/KpRawData.h>
 #include <kplib/rawdata/KpTypedElement.h>
 #include <kplib/rawdata/KpTypedPointer.h>
+#include <kplib/system/KpBuildInfo.h>
 #include <kplib/system/KpDataBase.h>
 #include <kplib/system/KpTable.h>
+#include <kplib/system/KpVersion.h>
 #include <kplib/system/KpWatch.h>
 #include <kplib/threads/KpProgressGuiInterface.h>
 #include <kplib/threads/KpProgressInterface.h>

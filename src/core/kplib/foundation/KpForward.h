@@ -33,6 +33,7 @@ class KpEditable;
 class KpEditingListener;
 
 class KpLogFile;
+class KpMessageCollector;
 class KpResult;
 
 class HxParamBase;
@@ -52,5 +53,7 @@ class ProgressScope;
 class KpScopedWatch;
 class KpWatch;
 
+class KpBuildInfo;
 class KpDataBase;
 class KpTable;
+class KpVersion;

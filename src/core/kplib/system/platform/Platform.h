@@ -23,4 +23,7 @@ struct WallTime {
 };
 WallTime wallTime();
 
+/// The system's name, as in a build string.
+const char* name();
+
 }  // namespace kplib::platform

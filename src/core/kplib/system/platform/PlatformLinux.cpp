@@ -23,4 +23,9 @@ WallTime wallTime()
     return {now.tv_sec, static_cast<int>(now.tv_nsec / 1'000'000)};
 }
 
+const char* name()
+{
+    return "Linux";
+}
+
 }  // namespace kplib::platform

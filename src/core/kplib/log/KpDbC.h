@@ -1,0 +1,27 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+// Design by contract: switches and a hook that the checking macros of an application share. The library itself keeps
+// them and asks nothing of them. To be set at start-up, before other threads run.
+
+/// What kind of promise was broken.
+enum DbCEventType : int {
+    DbCPrecondition = 0,
+    DbCPostcondition = 1,
+    DbCInvariant = 2,
+    DbCAssertion = 3,
+};
+
+/// Whether broken contracts are handled at all.
+extern KPLIB_API bool kp_DbC_handleEvents;
+/// Whether a handled one stops at a breakpoint.
+extern KPLIB_API bool kp_DbC_breakOnEvent;
+
+/// Told of a broken contract: kind, condition, file, line, function and a message for the reader; texts may be null.
+using DbCCallback = void (*)(DbCEventType type, const char* condition, const char* file, unsigned int line,
+                             const char* function, const char* message);
+
+/// The hook that the macros call; null (the default) for none.
+KPLIB_API DbCCallback kp_DbC_callback();
+KPLIB_API void kp_DbC_callbackSet(DbCCallback callback);

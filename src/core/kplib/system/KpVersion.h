@@ -1,0 +1,54 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/geometry/KpVec4i.h>
+
+#include <array>
+#include <compare>
+#include <string>
+#include <utility>
+
+/// A version number in four parts, ordered part by part. A plain value; all zero is the null version.
+class KPLIB_API KpVersion {
+public:
+    KpVersion() = default;
+    constexpr KpVersion(unsigned major, unsigned minor, unsigned patch, unsigned build) :
+        majorVersion_(major), minorVersion_(minor), patchLevel_(patch), buildNumber_(build)
+    {
+    }
+    /// From one to four numbers joined by dots; what follows the fourth is ignored. Null for any other text.
+    explicit KpVersion(const std::string& text);
+
+    constexpr unsigned majorVersion() const { return majorVersion_; }
+    constexpr unsigned minorVersion() const { return minorVersion_; }
+    constexpr unsigned patchLevel() const { return patchLevel_; }
+    constexpr unsigned buildNumber() const { return buildNumber_; }
+    void setMajorVersion(unsigned major) { majorVersion_ = major; }
+    void setMinorVersion(unsigned minor) { minorVersion_ = minor; }
+    void setPatchLevel(unsigned patch) { patchLevel_ = patch; }
+    void setBuildNumber(unsigned build) { buildNumber_ = build; }
+    void setValues(unsigned major, unsigned minor, unsigned patch, unsigned build)
+    {
+        *this = KpVersion(major, minor, patch, build);
+    }
+    void setValues(const std::array<unsigned, 4>& values) { setValues(values[0], values[1], values[2], values[3]); }
+
+    void makeNull() { *this = KpVersion(); }
+    bool isNull() const { return *this == KpVersion(); }
+
+    friend constexpr auto operator<=>(const KpVersion& a, const KpVersion& b) = default;
+    friend constexpr bool operator==(const KpVersion& a, const KpVersion& b) = default;
+    /// low <= this <= high
+    bool isBetween(const KpVersion& low, const KpVersion& high) const { return low <= *this && *this <= high; }
+    bool sameMajorMinor(const KpVersion& other) const;
+    /// This object's and the other's value in the first part in which they differ; 0 and 0 if they are equal.
+    std::pair<unsigned, unsigned> firstMismatchingValues(const KpVersion& other) const;
+
+    /// "1.2.0.0": always all four.
+    std::string toString() const;
+    /// The four, each converted as by static_cast.
+    KpVec4i asKpVec4i() const;
+
+private:
+    unsigned majorVersion_ = 0, minorVersion_ = 0, patchLevel_ = 0, buildNumber_ = 0;
+};

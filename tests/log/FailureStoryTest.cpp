@@ -1,0 +1,55 @@
+#include <kplib/log/KpCrashDump.h>
+#include <kplib/log/KpDbC.h>
+#include <kplib/log/KpMessageCollector.h>
+#include <kplib/log/KpTerminateProcess.h>
+
+#include <gtest/gtest.h>
+
+#include <csignal>
+
+TEST(KpMessageCollector, reportsWhatWasCountedInOrder)
+{
+    KpMessageCollector collector;
+    KpString report("before\n");
+    EXPECT_FALSE(collector.generateReport(report, true));
+    const long first = collector.addMessageSlot("first %s"), second = collector.addMessageSlot("second"),
+               third = collector.addMessageSlot("third");
+    for (const long slot : {third, first, first, 3L, -1L})
+        collector.countMessage(slot);
+    EXPECT_TRUE(collector.generateReport(report, false));
+    EXPECT_STREQ(report, "before\nfirst %s (2 times)\nthird (1 times)\n");
+    collector.resetSlotCounter(first);
+    collector.countMessage(second);
+    report = "";
+    EXPECT_TRUE(collector.generateReport(report, true));
+    EXPECT_STREQ(report, "second (1 times)\nthird (1 times)\n");
+    EXPECT_FALSE(collector.generateReport(report, false));
+}
+
+TEST(KpDbC, keepsSwitchesAndHook)
+{
+    EXPECT_TRUE(kp_DbC_handleEvents && kp_DbC_breakOnEvent);
+    EXPECT_EQ(kp_DbC_callback(), nullptr);
+    const DbCCallback hook = [](DbCEventType, const char*, const char*, unsigned, const char*, const char*) {};
+    kp_DbC_callbackSet(hook);
+    EXPECT_EQ(kp_DbC_callback(), hook);
+    kp_DbC_callbackSet(nullptr);
+}
+
+TEST(KpCrashDump, answersNothing)
+{
+    EXPECT_EQ(kpCrashDumpConfig(), nullptr);
+    EXPECT_EQ(kpInitCrashDumpWriter("/tmp"), 0);
+    EXPECT_EQ(kpEnableProbeDellBackupAndRecoveryCrash(true), 0);
+}
+
+TEST(KpTerminateProcessDeathTest, endsBySignalOrByStatusWithoutExitHandlers)
+{
+    const auto end = [](void (*handler)(int)) {
+        std::atexit([] { std::fputs("exit handler\n", stderr); });
+        std::signal(SIGTERM, handler);
+        KpTerminateProcess(3);
+    };
+    EXPECT_EXIT(end(SIG_DFL), testing::KilledBySignal(SIGTERM), "^$");
+    EXPECT_EXIT(end(SIG_IGN), testing::ExitedWithCode(3), "^$");
+}
