@@ -1,0 +1,30 @@
+#pragma once
+
+#include <kplib/geometry/KpVec3d.h>
+#include <kplib/geometry/KpVec3f.h>
+
+#include <algorithm>
+#include <cmath>
+#include <limits>
+#include <random>
+
+constexpr float NaN = std::numeric_limits<float>::quiet_NaN();
+constexpr KpVec3f untouched(7, 8, 9);
+
+inline bool isNan(const KpVec3f& v)
+{
+    return std::all_of(v.begin(), v.end(), [](float c) { return std::isnan(c); });
+}
+
+// Components within `range` of 0.
+inline KpVec3f someVector(std::mt19937& random, float range)
+{
+    std::uniform_real_distribution<float> components(-range, range);
+    const float x = components(random), y = components(random);
+    return {x, y, components(random)};
+}
+
+inline double distance(const KpVec3f& a, const KpVec3d& b)
+{
+    return (KpVec3d(a) - b).length();
+}
