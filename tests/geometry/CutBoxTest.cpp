@@ -143,27 +143,21 @@ TEST(KpCutBoxPlane, countsCornersInThePlaneAsAbove)
 
 TEST(KpCutBoxPlane, isMadeInManyWays)
 {
-    const std::vector<KpVec3f> expected = {{0.5F, 0, 0}, {0.5F, 0, 1}, {0.5F, 1, 0}, {0.5F, 1, 1}};
-    const auto isExpected = [&](const auto& vertices) {
-        return std::is_permutation(vertices.begin(), vertices.end(), expected.begin(), expected.end());
-    };
-    const KpVec3f min(0, 0, 0), max(1, 1, 1), normal(1, 0, 0);
-    const KpPlane plane(normal, 0.5F);
-    EXPECT_TRUE(isExpected(KpCutBoxPlane().cutPlane(0.5F)));
-    EXPECT_TRUE(isExpected(KpCutBoxPlane(min, max, normal).cutPlane(0.5F)));
-    EXPECT_TRUE(isExpected(KpCutBoxPlane::cutPlane(unit, plane)));
-    EXPECT_TRUE(isExpected(KpCutBoxPlane::cutPlane(min, max, plane)));
-    std::vector<KpVec3f> first(4), second(4);
-    ASSERT_EQ(KpCutBoxPlane::cutPlane(KpBox3f(-1, 2, 0, 2, 1, 2), unit, plane, first.data(), second.data()), 4);
-    EXPECT_TRUE(isExpected(second));
-    KpVec3d vertices[6];
-    ASSERT_EQ(KpCutBoxPlaneDouble().cutPlane(0.5, vertices), 4);
-    std::transform(vertices, vertices + 4, first.begin(), [](const KpVec3d& v) { return KpVec3f(v); });
-    EXPECT_TRUE(isExpected(first));
+    const KpVec3f min(0, 0, 0), max(1, 1, 1);
+    const KpPlane plane(x, 0.5F);
+    KpVec3f first[6], second[6];
+    KpVec3d inDouble[6];
+    const int count = KpCutBoxPlane::cutPlane(KpBox3f(-1, 2, 0, 2, 1, 2), unit, plane, first, second);
+    const int countDouble = KpCutBoxPlaneDouble().cutPlane(0.5, inDouble);
+    const Polygon expected = {{0.5, 0, 0}, {0.5, 0, 1}, {0.5, 1, 1}, {0.5, 1, 0}};
+    EXPECT_TRUE(isSame(polygon(second, count), expected, 0));
+    EXPECT_TRUE(isSame(polygon(inDouble, countDouble), expected, 0));
+    for (const auto& vertices : {KpCutBoxPlane().cutPlane(0.5F), KpCutBoxPlane(min, max, x).cutPlane(0.5F),
+                                 KpCutBoxPlane::cutPlane(unit, plane), KpCutBoxPlane::cutPlane(min, max, plane)})
+        EXPECT_TRUE(isSame(polygon(vertices.data(), static_cast<int>(vertices.size())), expected, 0));
 
-    KpVec3f thin[6];
-    ASSERT_EQ(KpCutBoxPlane(KpBox3f(0, 8e-9F, 0, 1, 0, 1), normal).cutPlane(1e-9F, thin, nullptr), 4);
-    EXPECT_EQ(thin[0].x(), 4e-9F) << "edges too short to divide by are cut in the middle";
+    ASSERT_EQ(KpCutBoxPlane(KpBox3f(0, 8e-9F, 0, 1, 0, 1), x).cutPlane(1e-9F, first, nullptr), 4);
+    EXPECT_EQ(first[0].x(), 4e-9F) << "edges too short to divide by are cut in the middle";
 }
 
 }  // namespace

@@ -7,7 +7,6 @@
 
 namespace {
 
-const KpVec3f origin(0, 0, 0), x(1, 0, 0);
 const KpLine alongX(origin, x);
 
 double determinant(const KpVec3d& a, const KpVec3d& b, const KpVec3d& c)
@@ -15,11 +14,10 @@ double determinant(const KpVec3d& a, const KpVec3d& b, const KpVec3d& c)
     return a.cross(b).dot(c);
 }
 
-TEST(KpLine, withoutLengthIsNanOrKeepsItsZero)
+TEST(KpLine, withoutLengthIsNaNOrKeepsItsZero)
 {
-    const KpLine none(x, x);
-    EXPECT_TRUE(isNan(none.position()) && isNan(none.direction()));
-    KpLine line;
+    KpLine line(x, x);
+    EXPECT_TRUE(isNaN(line.position()) && isNaN(line.direction()));
     EXPECT_EQ(line.setPosDir(x, origin), 0);
     EXPECT_EQ(line.direction(), origin);
     EXPECT_EQ(line.setPosDir(x, x * 4), 4);
@@ -47,7 +45,7 @@ TEST(KpLine, hasClosestPoints)
     }
     KpVec3f onThis, onOther;
     EXPECT_FALSE(alongX.getClosestPoints(KpLine({0, 1, 0}, {-1, 1, 0}), onThis, onOther));
-    EXPECT_TRUE(isNan(onThis) && isNan(onOther));
+    EXPECT_TRUE(isNaN(onThis) && isNaN(onOther));
 }
 
 TEST(KpLine, goesThroughBoxes)
@@ -61,7 +59,7 @@ TEST(KpLine, goesThroughBoxes)
         for (int axis = 0; axis < 3; ++axis) {
             const double direction = line.direction()[axis], position = line.position()[axis];
             const auto [low, high] =
-                std::minmax((min[axis] - position) / direction, (max[axis] - position) / direction);
+                std::minmax({(min[axis] - position) / direction, (max[axis] - position) / direction});
             entry = std::max(entry, low);
             exit = std::min(exit, high);
             slowest = std::min(slowest, std::abs(direction));
@@ -76,7 +74,7 @@ TEST(KpLine, goesThroughBoxes)
             EXPECT_LE(distance(first, position + direction * entry), 1e-5);  // some 4 of 2^-24 of 30
             EXPECT_LE(distance(last, position + direction * exit), 1e-5);
         } else {
-            EXPECT_TRUE(isNan(first) && isNan(last));
+            EXPECT_TRUE(isNaN(first) && isNaN(last));
         }
     }
     EXPECT_GT(hits, 500);
@@ -112,7 +110,7 @@ TEST(KpLine, meetsBoxesAtTheirEdges)
         KpVec3f enter = untouched, exit = untouched;
         EXPECT_EQ(line.intersect(c.box, enter, exit, c.tolerance), c.outputs != Nan);
         if (c.outputs == Nan) {
-            EXPECT_TRUE(isNan(enter) && isNan(exit));
+            EXPECT_TRUE(isNaN(enter) && isNaN(exit));
         } else {
             const bool moves = c.direction.x() != 0;
             EXPECT_EQ(enter.x(), c.outputs == Untouched ? untouched.x() : moves ? 1 : 2);
@@ -139,21 +137,20 @@ TEST(KpLine, picksWhatIsNearerThanAnAngleOrARadius)
         EXPECT_EQ(alongX.intersect(c.angle, box), c.box);
         EXPECT_EQ(alongX.intersect(c.angle, point), c.point);
         EXPECT_EQ(alongX.intersect(c.angle, below, above, out), c.segment);
-        EXPECT_TRUE(c.segment ? out == KpVec3f(4, 1, 0) : isNan(out));
+        EXPECT_TRUE(c.segment ? out == KpVec3f(4, 1, 0) : isNaN(out));
         EXPECT_EQ(alongX.intersect(c.angle, end, above, out), c.end);
-        EXPECT_TRUE(c.end ? out == end : isNan(out));
+        EXPECT_TRUE(c.end ? out == end : isNaN(out));
         EXPECT_EQ(alongX.intersect(c.angle, above, end, out), c.end);
     }
     KpVec3f out;
     EXPECT_TRUE(alongX.intersect(0, KpBox3f(2, 3, -1, 1, -1, 1))) << "angle 0, and the line crosses";
     EXPECT_FALSE(alongX.intersect(-9, KpBox3f(3, 2, -1, 1, -1, 1))) << "empty";
-    EXPECT_FALSE(alongX.intersect(-9, origin)) << "at the position";
-    EXPECT_FALSE(alongX.intersect(-9, -x)) << "behind it";
+    for (const KpVec3f& behind : {origin, -x})
+        EXPECT_FALSE(alongX.intersect(-9, behind));
     EXPECT_FALSE(alongX.intersect(-9, {0, 1, 0}, {5, 1, 0}, out)) << "parallel";
-    EXPECT_FALSE(alongX.intersect(-9, point, point, out)) << "a segment without length";
-    const KpVec3f slanted(0.1F, 0.7F, 0.3F);
+    EXPECT_FALSE(alongX.intersect(-9, point, point, out)) << "without length";
     for (float t = 1; t < 100; ++t)
-        EXPECT_TRUE(KpLine(origin, slanted).intersect(1e-3F, slanted * t)) << "on the line, whatever rounding leaves";
+        EXPECT_TRUE(KpLine(origin, {0.1F, 0.7F, 0.3F}).intersect(1e-3F, KpVec3f(0.1F, 0.7F, 0.3F) * t)) << t;
 }
 
 // Small whole numbers bring edges along axes, normals that tie between axes and lines through edges and corners.
@@ -173,7 +170,7 @@ TEST(KpLine, goesThroughTriangles)
         const bool isHit = line.intersect(a, b, c, hit, weights, front);
         if (e.cross(f).length() == 0) {
             EXPECT_FALSE(isHit || front);
-            EXPECT_TRUE(isNan(hit) && isNan(weights));
+            EXPECT_TRUE(isNaN(hit) && isNaN(weights));
         }
         if (std::abs(volume) < 0.1)
             continue;

@@ -9,9 +9,9 @@
 #include <random>
 
 constexpr float NaN = std::numeric_limits<float>::quiet_NaN();
-constexpr KpVec3f untouched(7, 8, 9);
+constexpr KpVec3f origin(0, 0, 0), x(1, 0, 0), y(0, 1, 0), z(0, 0, 1), untouched(7, 8, 9);
 
-inline bool isNan(const KpVec3f& v)
+inline bool isNaN(const KpVec3f& v)
 {
     return std::all_of(v.begin(), v.end(), [](float c) { return std::isnan(c); });
 }
@@ -20,8 +20,7 @@ inline bool isNan(const KpVec3f& v)
 inline KpVec3f someVector(std::mt19937& random, float range)
 {
     std::uniform_real_distribution<float> components(-range, range);
-    const float x = components(random), y = components(random);
-    return {x, y, components(random)};
+    return {components(random), components(random), components(random)};
 }
 
 inline double distance(const KpVec3f& a, const KpVec3d& b)

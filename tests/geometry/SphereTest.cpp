@@ -39,7 +39,7 @@ TEST(KpSphere, isHitByLinesAndSegments)
                 EXPECT_EQ(enter, at(segment ? c.segmentEnter : c.enter, c.aside));
                 EXPECT_EQ(exit, at(segment ? c.segmentExit : c.exit, c.aside));
             } else {
-                EXPECT_TRUE(isNan(enter) && isNan(exit));
+                EXPECT_TRUE(isNaN(enter) && isNaN(exit));
             }
         }
     }
