@@ -11,6 +11,8 @@
 #include <set>
 #include <vector>
 
+using namespace kplib::test;
+
 namespace {
 
 using Polygon = std::vector<KpVec3d>;
@@ -29,10 +31,8 @@ Polygon reference(const KpBox3f& box, const KpVec3d& normal, double distance)
             if (a != b && t > 0 && t < 1)
                 middle += vertices.emplace_back(from + (to - from) * t);
         }
-    if (vertices.empty())
-        return vertices;
     middle /= static_cast<double>(vertices.size());
-    const KpVec3d u = vertices[0] - middle, v = normal.cross(u) / normal.length();
+    const KpVec3d u = (vertices.empty() ? middle : vertices[0]) - middle, v = normal.cross(u) / normal.length();
     const auto angle = [&](const KpVec3d& p) { return std::atan2((p - middle).dot(v), (p - middle).dot(u)); };
     std::sort(vertices.begin(), vertices.end(), [&](auto& p, auto& q) { return angle(p) < angle(q); });
     return vertices;
@@ -64,14 +64,13 @@ TEST(CutBoxTable, holdsEachDividedEdgeOnce)
     for (int mask = 0; mask < 128; ++mask) {
         const std::uint8_t* row = kplib::detail::cuts[mask];
         ++rows[row[0]];
-        std::set<int> edges;
-        for (int i = 1; i <= row[0]; ++i) {
-            const int a = row[i] >> 4, b = row[i] & 15;
-            EXPECT_TRUE(a < 8 && std::has_single_bit(static_cast<unsigned>(a ^ b))) << mask;
-            EXPECT_NE(mask >> a & 1, mask >> b & 1) << mask;
-            edges.insert(std::min(a, b) * 8 + std::max(a, b));
-        }
+        const std::set<int> edges(row + 1, row + 1 + row[0]);
         EXPECT_EQ(edges.size(), row[0]) << mask;
+        for (const int edge : edges) {
+            const unsigned a = edge >> 4, b = edge & 15;
+            EXPECT_TRUE(b < a && a < 8 && std::has_single_bit(a ^ b)) << mask;
+            EXPECT_NE(mask >> a & 1, mask >> b & 1) << mask;
+        }
     }
     const int expected[] = {49, 0, 0, 8, 15, 24, 32};
     EXPECT_TRUE(std::equal(rows, rows + 7, expected));

@@ -8,6 +8,8 @@
 #include <limits>
 #include <random>
 
+namespace kplib::test {
+
 constexpr float NaN = std::numeric_limits<float>::quiet_NaN();
 constexpr KpVec3f origin(0, 0, 0), x(1, 0, 0), y(0, 1, 0), z(0, 0, 1), untouched(7, 8, 9);
 
@@ -27,3 +29,5 @@ inline double distance(const KpVec3f& a, const KpVec3d& b)
 {
     return (KpVec3d(a) - b).length();
 }
+
+}  // namespace kplib::test
