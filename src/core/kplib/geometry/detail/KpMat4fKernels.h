@@ -1,0 +1,15 @@
+#pragma once
+
+#include <kplib/rawdata/detail/KpKernelPath.h>
+
+#include <span>
+
+namespace kplib::detail {
+
+/// Transforms `n` points, three floats each, by the 16 floats of `matrix`, as KpMat4f::multVecMatrix() does one. `from`
+/// and `to` are the same or don't overlap.
+using TransformLoop = void(const float* matrix, const float* from, float* to, long n);
+
+std::span<const KernelPath<TransformLoop>> transformPaths();
+
+}  // namespace kplib::detail
