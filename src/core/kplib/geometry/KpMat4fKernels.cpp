@@ -67,7 +67,8 @@ struct TransformTogether {
         long i = 0;
         for (; i + Lanes <= n; i += Lanes, from += 3 * Lanes, to += 3 * Lanes) {
             Vector points[3], v[3];
-            std::memcpy(points, from, sizeof points);
+            for (int k = 0; k < 3; ++k)  // one at a time: a single copy goes by way of memory
+                std::memcpy(&points[k], from + k * Lanes, sizeof points[k]);
             collect<0>(points, v[0], Places());
             collect<1>(points, v[1], Places());
             collect<2>(points, v[2], Places());

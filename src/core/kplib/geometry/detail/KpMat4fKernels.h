@@ -12,4 +12,10 @@ using TransformLoop = void(const float* matrix, const float* from, float* to, lo
 
 std::span<const KernelPath<TransformLoop>> transformPaths();
 
+/// The inverse of `in`, of which the last column is (0, 0, 0, 1), into `out`, which may be the same. False, and nothing
+/// written, if the determinant vanishes among its terms.
+using AffineInverse = bool(const float* in, float* out);
+
+std::span<const KernelPath<AffineInverse>> affineInversePaths();
+
 }  // namespace kplib::detail
