@@ -52,7 +52,8 @@ private:
             rotate<P, Q>(g, shifts);
     }
 
-    static bool isLostIn(Real value, Real g) { return g + std::abs(value) == std::abs(value); }
+    /// An eigenvalue is a float, so that is what it has to be lost in.
+    static bool isLostIn(float value, Real g) { return static_cast<float>(g + std::abs(value)) == std::abs(value); }
 
     template <int P, int Q>
     [[gnu::always_inline]] void rotate(Real g, Real (&shifts)[3])
