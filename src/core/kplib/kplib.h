@@ -30,12 +30,16 @@
 #include <kplib/geometry/KpBox3Base.h>
 #include <kplib/geometry/KpBox3f.h>
 #include <kplib/geometry/KpBox3i.h>
+#include <kplib/geometry/KpCutBoxPlane.h>
+#include <kplib/geometry/KpCutBoxPlaneDouble.h>
 #include <kplib/geometry/KpFuzzyCompare.h>
+#include <kplib/geometry/KpLine.h>
 #include <kplib/geometry/KpMat3f.h>
 #include <kplib/geometry/KpMat4f.h>
 #include <kplib/geometry/KpMat4fCache.h>
 #include <kplib/geometry/KpPlane.h>
 #include <kplib/geometry/KpRotation.h>
+#include <kplib/geometry/KpSphere.h>
 #include <kplib/geometry/KpVec2f.h>
 #include <kplib/geometry/KpVec2i.h>
 #include <kplib/geometry/KpVec3d.h>

@@ -40,6 +40,12 @@ class HxParamBundle;
 class HxParamEditCheck;
 class HxParameter;
 
+class KpCutBoxPlane;
+class KpCutBoxPlaneDouble;
+class KpLine;
+class KpPlane;
+class KpSphere;
+
 class KpColor;
 class KpRawData;
 class KpTypedElement;

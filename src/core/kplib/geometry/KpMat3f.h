@@ -22,7 +22,12 @@ public:
     }
     explicit KpMat3f(const float (&rows)[3][3]) { setValue(rows); }
     /// From three columns - other than the form with an array, which takes rows.
-    KpMat3f(const KpVec3f& column0, const KpVec3f& column1, const KpVec3f& column2);
+    constexpr KpMat3f(const KpVec3f& column0, const KpVec3f& column1, const KpVec3f& column2) :
+        m_{{column0.x(), column1.x(), column2.x()},
+           {column0.y(), column1.y(), column2.y()},
+           {column0.z(), column1.z(), column2.z()}}
+    {
+    }
     /// From three rows - other than the form with three vectors, which takes columns.
     explicit KpMat3f(const std::array<KpVec3f, 3>& rows) { setValue(rows); }
 
@@ -45,18 +50,37 @@ public:
     KpMat3f& operator+=(const KpMat3f& other) { return *this = *this + other; }
     KpMat3f& operator*=(float factor) { return *this = *this * factor; }
     /// Applies `a` first, then `b`.
-    friend KPLIB_API KpMat3f operator*(const KpMat3f& a, const KpMat3f& b);
-    friend KPLIB_API KpMat3f operator+(const KpMat3f& a, const KpMat3f& b);
-    friend KPLIB_API KpMat3f operator-(const KpMat3f& a, const KpMat3f& b);
-    friend KPLIB_API KpMat3f operator*(const KpMat3f& m, float factor);
-    friend KPLIB_API KpMat3f operator*(float factor, const KpMat3f& m) { return m * factor; }
+    friend constexpr KpMat3f operator*(const KpMat3f& a, const KpMat3f& b)
+    {
+        return fromEach(
+            [&](int i, int j) { return a.m_[i][0] * b.m_[0][j] + a.m_[i][1] * b.m_[1][j] + a.m_[i][2] * b.m_[2][j]; });
+    }
+    friend constexpr KpMat3f operator+(const KpMat3f& a, const KpMat3f& b)
+    {
+        return fromEach([&](int i, int j) { return a.m_[i][j] + b.m_[i][j]; });
+    }
+    friend constexpr KpMat3f operator-(const KpMat3f& a, const KpMat3f& b)
+    {
+        return fromEach([&](int i, int j) { return a.m_[i][j] - b.m_[i][j]; });
+    }
+    friend constexpr KpMat3f operator*(const KpMat3f& m, float factor)
+    {
+        return fromEach([&](int i, int j) { return m.m_[i][j] * factor; });
+    }
+    friend constexpr KpMat3f operator*(float factor, const KpMat3f& m) { return m * factor; }
     /// Exact; a matrix that holds a NaN equals none.
     friend constexpr bool operator==(const KpMat3f& a, const KpMat3f& b) = default;
     /// False as soon as one element differs by strictly more than `tolerance`.
     bool equals(const KpMat3f& other, float tolerance) const;
 
-    KpMat3f transpose() const;
-    float det3() const;
+    constexpr KpMat3f transpose() const
+    {
+        return fromEach([&](int i, int j) { return m_[j][i]; });
+    }
+    constexpr float det3() const
+    {
+        return m_[0][0] * cofactor(0, 0) + m_[0][1] * cofactor(0, 1) + m_[0][2] * cofactor(0, 2);
+    }
 
     /// The inverse; of a matrix whose determinant is exactly 0 the adjugate.
     KpMat3f inverse() const;
@@ -67,10 +91,20 @@ public:
 
     /// The column product: result[i] = sum over j of m[i][j] * v[j]. Input and output may be one object.
     void multMatrixVec(const KpVec3f& v, KpVec3f& result) const { result = multMatrixVec(v); }
-    KpVec3f multMatrixVec(const KpVec3f& v) const;
+    constexpr KpVec3f multMatrixVec(const KpVec3f& v) const
+    {
+        return {m_[0][0] * v.x() + m_[0][1] * v.y() + m_[0][2] * v.z(),
+                m_[1][0] * v.x() + m_[1][1] * v.y() + m_[1][2] * v.z(),
+                m_[2][0] * v.x() + m_[2][1] * v.y() + m_[2][2] * v.z()};
+    }
     /// The row product, the way a point is transformed: result[j] = sum over i of v[i] * m[i][j].
     void multVecMatrix(const KpVec3f& v, KpVec3f& result) const { result = multVecMatrix(v); }
-    KpVec3f multVecMatrix(const KpVec3f& v) const;
+    constexpr KpVec3f multVecMatrix(const KpVec3f& v) const
+    {
+        return {v.x() * m_[0][0] + v.y() * m_[1][0] + v.z() * m_[2][0],
+                v.x() * m_[0][1] + v.y() * m_[1][1] + v.z() * m_[2][1],
+                v.x() * m_[0][2] + v.y() * m_[1][2] + v.z() * m_[2][2]};
+    }
 
     /// Eigenvalues and eigenvectors of a symmetric matrix by cyclic Jacobi rotations in single precision;
     /// `evectors[j]`, of length 1, belongs to `evalues[j]`, and they come unsorted. `rotations` counts the rotations.
@@ -87,6 +121,19 @@ public:
     std::string dump() const;
 
 private:
+    template <typename Element>
+    static constexpr KpMat3f fromEach(Element element)
+    {
+        return {element(0, 0), element(0, 1), element(0, 2), element(1, 0), element(1, 1),
+                element(1, 2), element(2, 0), element(2, 1), element(2, 2)};
+    }
+    /// The determinant that remains without row i and column j, with its sign.
+    constexpr float cofactor(int i, int j) const
+    {
+        const int r1 = (i + 1) % 3, r2 = (i + 2) % 3, c1 = (j + 1) % 3, c2 = (j + 2) % 3;
+        return m_[r1][c1] * m_[r2][c2] - m_[r1][c2] * m_[r2][c1];
+    }
+
     float m_[3][3];
 };
 

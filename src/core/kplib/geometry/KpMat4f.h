@@ -53,7 +53,14 @@ public:
 
     KpMat4f& operator*=(const KpMat4f& right) { return *this = *this * right; }
     /// Applies `a` first, then `b`.
-    friend KPLIB_API KpMat4f operator*(const KpMat4f& a, const KpMat4f& b);
+    friend KpMat4f operator*(const KpMat4f& a, const KpMat4f& b)
+    {
+        const Row b0 = b.row(0), b1 = b.row(1), b2 = b.row(2), b3 = b.row(3);
+        KpMat4f product;
+        for (int i = 0; i < 4; ++i)
+            product.setRow(i, a.m_[i][0] * b0 + a.m_[i][1] * b1 + a.m_[i][2] * b2 + a.m_[i][3] * b3);
+        return product;
+    }
     /// Exact; a matrix that holds a NaN equals none.
     friend constexpr bool operator==(const KpMat4f& a, const KpMat4f& b) = default;
     /// False as soon as one element differs by strictly more than `tolerance`.
@@ -64,7 +71,11 @@ public:
     /// Whether this is exactly the identity.
     bool isIdentity() const;
 
-    KpMat4f transpose() const;
+    constexpr KpMat4f transpose() const
+    {
+        return {m_[0][0], m_[1][0], m_[2][0], m_[3][0], m_[0][1], m_[1][1], m_[2][1], m_[3][1],
+                m_[0][2], m_[1][2], m_[2][2], m_[3][2], m_[0][3], m_[1][3], m_[2][3], m_[3][3]};
+    }
     /// The determinant of the given rows and columns, from 0 to 3.
     float det3(int r1, int r2, int r3, int c1, int c2, int c3) const;
     /// The determinant of the upper left.
@@ -88,21 +99,39 @@ public:
     /// The row product, the way a point is transformed: (v, 1) M, divided by its fourth component w; w = 0 is not
     /// guarded against. Input and output may be one object.
     void multVecMatrix(const KpVec3f& v, KpVec3f& result) const { result = multVecMatrix(v); }
-    KpVec3f multVecMatrix(const KpVec3f& v) const;
+    KpVec3f multVecMatrix(const KpVec3f& v) const
+    {
+        return projected(v.x() * row(0) + v.y() * row(1) + v.z() * row(2) + row(3));
+    }
     /// The same for many points at once, to the bit: `results` has as many places as `points`, and may be the same
     /// memory.
     void multVecMatrix(std::span<const KpVec3f> points, KpVec3f* results) const;
     /// The column product M (v, 1), divided by its fourth component: the transposed transformation.
     void multMatrixVec(const KpVec3f& v, KpVec3f& result) const { result = multMatrixVec(v); }
-    KpVec3f multMatrixVec(const KpVec3f& v) const;
+    KpVec3f multMatrixVec(const KpVec3f& v) const
+    {
+        return projected(v.x() * column(0) + v.y() * column(1) + v.z() * column(2) + column(3));
+    }
     /// The row product with the upper left alone, the way a direction is transformed: no translation, no division.
     void multDirMatrix(const KpVec3f& v, KpVec3f& result) const { result = multDirMatrix(v); }
-    KpVec3f multDirMatrix(const KpVec3f& v) const;
+    KpVec3f multDirMatrix(const KpVec3f& v) const
+    {
+        const Row sums = v.x() * row(0) + v.y() * row(1) + v.z() * row(2);
+        return {sums[0], sums[1], sums[2]};
+    }
     /// The products with all four components, without a division.
     void multVecMatrix(const KpVec4f& v, KpVec4f& result) const { result = multVecMatrix(v); }
-    KpVec4f multVecMatrix(const KpVec4f& v) const;
+    KpVec4f multVecMatrix(const KpVec4f& v) const
+    {
+        const Row sums = v.x() * row(0) + v.y() * row(1) + v.z() * row(2) + v.w() * row(3);
+        return {sums[0], sums[1], sums[2], sums[3]};
+    }
     void multMatrixVec(const KpVec4f& v, KpVec4f& result) const { result = multMatrixVec(v); }
-    KpVec4f multMatrixVec(const KpVec4f& v) const;
+    KpVec4f multMatrixVec(const KpVec4f& v) const
+    {
+        const Row sums = v.x() * column(0) + v.y() * column(1) + v.z() * column(2) + v.w() * column(3);
+        return {sums[0], sums[1], sums[2], sums[3]};
+    }
 
     /// Eigenvalues and eigenvectors of the upper left, a symmetric matrix, by cyclic Jacobi rotations in double
     /// precision. Eigenvector j is column j of `evectors`, of length 1; they come unsorted. `rotations` grows by 3 a
@@ -128,6 +157,25 @@ public:
     std::string dump() const;
 
 private:
+    // Four sums side by side, each in the order of a plain loop: one instruction where the processor has vectors.
+    using Row = float __attribute__((vector_size(16)));
+
+    Row row(int i) const
+    {
+        Row row;
+        __builtin_memcpy(&row, m_[i], sizeof row);
+        return row;
+    }
+    void setRow(int i, Row row) { __builtin_memcpy(m_[i], &row, sizeof row); }
+    Row column(int j) const { return Row{m_[0][j], m_[1][j], m_[2][j], m_[3][j]}; }
+
+    /// Divided by the fourth component, by way of its reciprocal.
+    static KpVec3f projected(Row point)
+    {
+        const Row scaled = point * (1 / point[3]);
+        return {scaled[0], scaled[1], scaled[2]};
+    }
+
     float m_[4][4];
 };
 

@@ -26,7 +26,7 @@ public:
         setValue(from1, from2, to1, to2);
     }
 
-    static KpRotation identity();
+    static constexpr KpRotation identity() { return asStored(0, 0, 0, 1); }
 
     /// The four, normalised; all 0 is not guarded against.
     void setValue(float x, float y, float z, float w);
@@ -73,7 +73,17 @@ public:
     /// This * r, then normalised.
     KpRotation& operator*=(const KpRotation& r);
     /// Applies `a` first, then `b`; not normalised.
-    friend KPLIB_API KpRotation operator*(const KpRotation& a, const KpRotation& b);
+    friend constexpr KpRotation operator*(const KpRotation& a, const KpRotation& b)
+    {
+        const auto [x1, y1, z1, w1] = a.q_;
+        const auto [x2, y2, z2, w2] = b.q_;
+        const float p = (x1 + y1) * (x2 + z2);
+        const float q = (x1 - y1) * (x2 - z2);
+        const float r = (w1 - z1) * (w2 + y2);
+        const float s = (w1 + z1) * (w2 - y2);
+        return asStored((w1 + x1) * (w2 + x2) - (p + q + r + s) / 2, (p - q + r - s) / 2 - (y1 + z1) * (x2 - w2),
+                        (p - q - r + s) / 2 - (x1 - w1) * (z2 + y2), (r + s - p - q) / 2 + (y1 - z1) * (z2 - y2));
+    }
     /// Exact; q and -q, the same rotation, differ.
     friend constexpr bool operator==(const KpRotation& a, const KpRotation& b) = default;
     /// Whether the four, or their negatives, differ by strictly less than `tolerance`.
@@ -89,6 +99,19 @@ public:
     static KpRotation slerp(const KpRotation& a, const KpRotation& b, float t);
 
 private:
+    static constexpr KpRotation asStored(float x, float y, float z, float w)
+    {
+        KpRotation rotation;
+        rotation.q_[0] = x;
+        rotation.q_[1] = y;
+        rotation.q_[2] = z;
+        rotation.q_[3] = w;
+        return rotation;
+    }
+    static KpRotation withAxis(const KpVec3f& unit, double sine, double cosine);
+    /// From the rows of a matrix, of which the first three are read; `corner` is its last element.
+    void setFromRows(const float* row0, const float* row1, const float* row2, float corner);
+
     float q_[4];
 };
 
