@@ -1,7 +1,6 @@
 #include <kplib/geometry/KpMat4f.h>
 
 #include <kplib/geometry/KpMat3f.h>
-#include <kplib/geometry/KpRotation.h>
 #include <kplib/geometry/detail/KpMatrixElements.h>
 
 #include <algorithm>
@@ -17,12 +16,6 @@ void KpMat4f::setValue(const float (&rows)[4][4])
     std::copy_n(rows[0], 16, m_[0]);
 }
 
-void KpMat4f::setValue(const KpVec3f& r0, const KpVec3f& r1, const KpVec3f& r2, const KpVec3f& r3)
-{
-    *this = {r0.x(), r0.y(), r0.z(), 0, r1.x(), r1.y(), r1.z(), 0,
-             r2.x(), r2.y(), r2.z(), 0, r3.x(), r3.y(), r3.z(), 1};
-}
-
 void KpMat4f::getValue(float (&rows)[4][4]) const
 {
     std::copy_n(m_[0], 16, rows[0]);
@@ -34,19 +27,9 @@ KpMat4f& KpMat4f::operator=(const float (&rows)[4][4])
     return *this;
 }
 
-void KpMat4f::setTranslate(const KpVec3f& translation)
-{
-    setValue(KpVec3f(1, 0, 0), KpVec3f(0, 1, 0), KpVec3f(0, 0, 1), translation);
-}
-
 void KpMat4f::setScale(const KpVec3f& factors)
 {
     setValue(KpVec3f(factors.x(), 0, 0), KpVec3f(0, factors.y(), 0), KpVec3f(0, 0, factors.z()), KpVec3f(0, 0, 0));
-}
-
-void KpMat4f::setRotate(const KpRotation& rotation)
-{
-    *this = KpMat4f(rotation.toMat3f());
 }
 
 bool KpMat4f::equals(const KpMat4f& other, float tolerance) const
@@ -57,11 +40,6 @@ bool KpMat4f::equals(const KpMat4f& other, float tolerance) const
 bool KpMat4f::isNumber() const
 {
     return std::none_of(data(), data() + 16, [](float element) { return std::isnan(element); });
-}
-
-bool KpMat4f::isIdentity() const
-{
-    return *this == identity();
 }
 
 float KpMat4f::det3(int r1, int r2, int r3, int c1, int c2, int c3) const

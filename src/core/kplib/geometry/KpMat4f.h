@@ -33,12 +33,23 @@ public:
     void makeIdentity() { *this = identity(); }
     void setValue(const float (&rows)[4][4]);
     /// The rows (r0, 0), (r1, 0), (r2, 0), (r3, 1).
-    void setValue(const KpVec3f& r0, const KpVec3f& r1, const KpVec3f& r2, const KpVec3f& r3);
+    void setValue(const KpVec3f& r0, const KpVec3f& r1, const KpVec3f& r2, const KpVec3f& r3)
+    {
+        const Row rows[] = {{r0.x(), r0.y(), r0.z(), 0},
+                            {r1.x(), r1.y(), r1.z(), 0},
+                            {r2.x(), r2.y(), r2.z(), 0},
+                            {r3.x(), r3.y(), r3.z(), 1}};
+        for (int i = 0; i < 4; ++i)
+            setRow(i, rows[i]);
+    }
     void getValue(float (&rows)[4][4]) const;
     KpMat4f& operator=(const float (&rows)[4][4]);
 
     /// The matrix of a translation.
-    void setTranslate(const KpVec3f& translation);
+    void setTranslate(const KpVec3f& translation)
+    {
+        setValue(KpVec3f(1, 0, 0), KpVec3f(0, 1, 0), KpVec3f(0, 0, 1), translation);
+    }
     /// The matrix of a scale.
     void setScale(float factor) { setScale(KpVec3f(factor, factor, factor)); }
     void setScale(const KpVec3f& factors);
@@ -69,7 +80,7 @@ public:
     /// Whether no element is NaN.
     bool isNumber() const;
     /// Whether this is exactly the identity.
-    bool isIdentity() const;
+    constexpr bool isIdentity() const { return *this == identity(); }
 
     constexpr KpMat4f transpose() const
     {
@@ -175,6 +186,8 @@ private:
         const Row scaled = point * (1 / point[3]);
         return {scaled[0], scaled[1], scaled[2]};
     }
+
+    KpMat4f inverseByDecomposition() const;
 
     float m_[4][4];
 };

@@ -1,12 +1,14 @@
 #include <kplib/geometry/KpMat4f.h>
 
+#include <kplib/geometry/detail/KpMat4fKernels.h>
+
 #include <algorithm>
 #include <cmath>
 #include <utility>
 
 namespace {
 
-/// The reciprocal of a row's largest magnitude; a row of zeros gets a tiny diagonal element first.
+/// The reciprocal of a row's largest magnitude; a row of zeros gets a tiny diagonal element p0.
 float scaleOfRow(float (&row)[4], int i)
 {
     if (std::all_of(row, row + 4, [](float element) { return element == 0; }))
@@ -23,44 +25,29 @@ KpMat4f KpMat4f::inverse() const
 {
     KpMat4f result;
     if (isIdentity())
-        return identity();
-    if (affine_inverse(*this, result))
-        return result;
-    KpMat4f factors = *this;
+        result.makeIdentity();
+    else if (!affine_inverse(*this, result))
+        result = inverseByDecomposition();
+    return result;
+}
+
+KpMat4f KpMat4f::inverseByDecomposition() const
+{
+    KpMat4f factors = *this, rows = identity();
     int index[4];
     float sign;
     factors.LUDecomposition(index, sign);
-    result.makeIdentity();
-    for (auto& row : result.m_)
+    for (auto& row : rows.m_)
         factors.LUBackSubstitution(index, row);
-    return result.transpose();
+    return rows.transpose();
 }
 
 bool KpMat4f::affine_inverse(const KpMat4f& in, KpMat4f& out)
 {
+    static kplib::detail::AffineInverse* const run = best(kplib::detail::affineInversePaths());
     const auto& m = in.m_;
-    if (m[0][3] != 0 || m[1][3] != 0 || m[2][3] != 0 || m[3][3] != 1)
-        return false;
-
-    const double a[3][3] = {{m[0][0], m[0][1], m[0][2]}, {m[1][0], m[1][1], m[1][2]}, {m[2][0], m[2][1], m[2][2]}};
-    double positive = 0, negative = 0;
-    for (const double term : {a[0][0] * a[1][1] * a[2][2], a[0][1] * a[1][2] * a[2][0], a[0][2] * a[1][0] * a[2][1],
-                              -a[0][2] * a[1][1] * a[2][0], -a[0][1] * a[1][0] * a[2][2], -a[0][0] * a[1][2] * a[2][1]})
-        (term >= 0 ? positive : negative) += term;
-    const double det = positive + negative;
-    if (std::abs(det / (positive - negative)) < 1e-15)
-        return false;
-
-    const double scale = 1 / det;
-    const auto element = [&](int i, int j) {
-        const int r1 = (j + 1) % 3, r2 = (j + 2) % 3, c1 = (i + 1) % 3, c2 = (i + 2) % 3;
-        return static_cast<float>((a[r1][c1] * a[r2][c2] - a[r1][c2] * a[r2][c1]) * scale);
-    };
-    const KpVec3f r0(element(0, 0), element(0, 1), element(0, 2));
-    const KpVec3f r1(element(1, 0), element(1, 1), element(1, 2));
-    const KpVec3f r2(element(2, 0), element(2, 1), element(2, 2));
-    out.setValue(r0, r1, r2, -(m[3][0] * r0 + m[3][1] * r1 + m[3][2] * r2));
-    return true;
+    const bool isAffine = m[0][3] == 0 && m[1][3] == 0 && m[2][3] == 0 && m[3][3] == 1;
+    return isAffine && run(in.data(), out.m_[0]);
 }
 
 bool KpMat4f::LUDecomposition(int (&index)[4], float& sign)
@@ -72,10 +59,8 @@ bool KpMat4f::LUDecomposition(int (&index)[4], float& sign)
     for (int j = 0; j < 4; ++j) {
         float largest = 0;
         int pivot = j;
-        for (int i = 0; i < 4; ++i) {
-            for (int k = 0; k < std::min(i, j); ++k)
-                m_[i][j] -= m_[i][k] * m_[k][j];
-            if (const float size = scales[i] * std::abs(m_[i][j]); i >= j && size >= largest) {
+        for (int i = j; i < 4; ++i) {
+            if (const float size = scales[i] * std::abs(m_[i][j]); size >= largest) {
                 largest = size;
                 pivot = i;
             }
@@ -89,8 +74,11 @@ bool KpMat4f::LUDecomposition(int (&index)[4], float& sign)
         if (m_[j][j] == 0)
             m_[j][j] = 1e-20F;
         const float reciprocal = 1 / m_[j][j];
-        for (int i = j + 1; i < 4; ++i)
+        for (int i = j + 1; i < 4; ++i) {
             m_[i][j] *= reciprocal;
+            for (int k = j + 1; k < 4; ++k)
+                m_[i][k] -= m_[i][j] * m_[j][k];
+        }
     }
     return true;
 }

@@ -116,12 +116,17 @@ void KpRotation::getValue(KpVec3f& axis, float& angle) const
 
 void KpRotation::getValue(KpMat4f& matrix) const
 {
-    matrix.setRotate(*this);
+    matrix = KpMat4f(toMat3f());
+}
+
+void KpMat4f::setRotate(const KpRotation& rotation)
+{
+    rotation.getValue(*this);
 }
 
 KpMat3f KpRotation::toMat3f() const
 {
-    const auto [x, y, z, w] = q_;
+    const auto& [x, y, z, w] = q_;
     const auto diagonal = [](double a, double b) { return static_cast<float>(1 - 2 * (a * a + b * b)); };
     return {diagonal(y, z),      2 * (x * y + z * w), 2 * (z * x - y * w), 2 * (x * y - z * w), diagonal(x, z),
             2 * (x * w + y * z), 2 * (y * w + z * x), 2 * (y * z - x * w), diagonal(x, y)};
@@ -150,8 +155,8 @@ void KpRotation::scaleAngle(float factor)
 
 KpRotation& KpRotation::operator*=(const KpRotation& r)
 {
-    const auto [x1, y1, z1, w1] = q_;
-    const auto [x2, y2, z2, w2] = r.q_;
+    const auto& [x1, y1, z1, w1] = q_;
+    const auto& [x2, y2, z2, w2] = r.q_;
     setValue(w2 * x1 + x2 * w1 + y2 * z1 - z2 * y1, w2 * y1 + y2 * w1 + z2 * x1 - x2 * z1,
              w2 * z1 + z2 * w1 + x2 * y1 - y2 * x1, w2 * w1 - x2 * x1 - y2 * y1 - z2 * z1);
     return *this;

@@ -75,8 +75,8 @@ public:
     /// Applies `a` first, then `b`; not normalised.
     friend constexpr KpRotation operator*(const KpRotation& a, const KpRotation& b)
     {
-        const auto [x1, y1, z1, w1] = a.q_;
-        const auto [x2, y2, z2, w2] = b.q_;
+        const auto& [x1, y1, z1, w1] = a.q_;
+        const auto& [x2, y2, z2, w2] = b.q_;
         const float p = (x1 + y1) * (x2 + z2);
         const float q = (x1 - y1) * (x2 - z2);
         const float r = (w1 - z1) * (w2 + y2);

@@ -1,0 +1,174 @@
+#include "SomeVectors.h"
+
+#include <kplib/geometry/KpBox3f.h>
+#include <kplib/geometry/KpLine.h>
+
+#include <gtest/gtest.h>
+
+using namespace kplib::test;
+
+namespace {
+
+const KpLine alongX(origin, x);
+
+double determinant(const KpVec3d& a, const KpVec3d& b, const KpVec3d& c)
+{
+    return a.cross(b).dot(c);
+}
+
+TEST(KpLine, withoutLengthIsNaNOrKeepsItsZero)
+{
+    KpLine line(x, x);
+    EXPECT_TRUE(isNaN(line.position()) && isNaN(line.direction()));
+    EXPECT_EQ(line.setPosDir(x, origin), 0);
+    EXPECT_EQ(line.direction(), origin);
+    EXPECT_EQ(line.setPosDir(x, x * 4), 4);
+    EXPECT_EQ(line, KpLine(x, x * 2));
+}
+
+TEST(KpLine, hasClosestPoints)
+{
+    std::mt19937 random(1);
+    const auto someLine = [&] { return KpLine{someVector(random, 10), someVector(random, 10)}; };
+    KpVec3f onThis, onOther;
+    for (int i = 0; i < 3000; ++i) {
+        const KpLine a = someLine(), b = someLine();
+        const KpVec3d d1(a.direction()), d2(b.direction()), p1(a.position()), p2(b.position()), across = d1.cross(d2);
+        const double sine = across.length();
+        ASSERT_TRUE(a.getClosestPoints(b, onThis, onOther));
+        // Products of lengths up to 17 round to about 20 of 2^-24, the parameter (up to 35 / sine) with its divisor.
+        const double bound = 4e-5 / std::pow(sine, 2) + 6e-5 / std::pow(sine, 3);
+        EXPECT_LE(distance(onThis, p1 + d1 * (determinant(p2 - p1, d2, across) / sine / sine)), bound);
+        EXPECT_LE(distance(onOther, p2 + d2 * (determinant(p2 - p1, d1, across) / sine / sine)), bound);
+        EXPECT_LE((onThis - a.getClosestPoint(onOther)).length(), bound);
+    }
+    EXPECT_FALSE(alongX.getClosestPoints(KpLine(y, y - x), onThis, onOther));
+    EXPECT_TRUE(isNaN(onThis) && isNaN(onOther));
+}
+
+TEST(KpLine, goesThroughBoxes)
+{
+    std::mt19937 random(2);
+    int hits = 0;
+    for (int i = 0; i < 3000; ++i) {
+        const KpLine line(someVector(random, 10), someVector(random, 3));
+        const KpVec3f min = someVector(random, 4) - KpVec3f(4, 4, 4), max = someVector(random, 3) + KpVec3f(4, 4, 4);
+        const KpVec3d d(line.direction()), p(line.position()), low = (KpVec3d(min) - p) / d,
+                                                               high = (KpVec3d(max) - p) / d;
+        double entry = -1e38, exit = 1e38, slowest = 1;
+        for (int axis = 0; axis < 3; ++axis) {
+            entry = std::max(entry, std::min(low[axis], high[axis]));
+            exit = std::min(exit, std::max(low[axis], high[axis]));
+            slowest = std::min(slowest, std::abs(d[axis]));
+        }
+        if (std::abs(exit - entry) * slowest < 1e-3)  // may go either way
+            continue;
+        KpVec3f first, last;
+        ASSERT_EQ(line.intersect(KpBox3f(min, max), first, last, 1e-4F), entry < exit);
+        hits += entry < exit;
+        // Some 4 of 2^-24 of 30.
+        EXPECT_TRUE(entry < exit ? distance(first, p + d * entry) < 1e-5 && distance(last, p + d * exit) < 1e-5
+                                 : isNaN(first) && isNaN(last));
+    }
+    EXPECT_GT(hits, 500);
+}
+
+TEST(KpLine, meetsBoxesAtTheirEdges)
+{
+    const KpBox3f box(1, 3, -1, 1, -1, 1);
+    const struct {
+        const char* what;
+        KpBox3f box;
+        KpVec3f position, direction;
+        float tolerance, enter, exit;  // x of the points; NaN is a miss
+    } cases[] = {
+        {"along x", box, {9, 0, 0}, x, 0, 1, 3},
+        {"against x", box, {9, 0, 0}, -x, 0, 3, 1},
+        {"in a face", box, y, x, 0, 1, 3},
+        {"beside a face, within the tolerance", box, y * 1.25F, x, 0.5F, 1, 3},
+        {"beside a face", box, y * 1.25F, x, 0.125F, NaN, NaN},
+        {"thin, before y tells of the miss", box, y * 9, x, 2.5F, untouched.x(), untouched.x()},
+        {"as thick as the tolerance", box, origin, x, 2, 1, 3},
+        {"a slope that counts as parallel", box, origin, {1, 9e-7F, 0}, 1e-5F, 1, 3},
+        {"empty", {3, 1, -1, 1, -1, 1}, origin, x, 9, NaN, NaN},
+        {"no direction, inside", box, x * 2, origin, 0, 2, 2},
+        {"not a number", box, {0, NaN, 0}, x, 0, NaN, NaN},
+    };
+    for (const auto& c : cases) {
+        KpLine line;
+        line.setPosDir(c.position, c.direction);
+        KpVec3f enter = untouched, exit = untouched;
+        const bool isHit = line.intersect(c.box, enter, exit, c.tolerance);
+        EXPECT_EQ(isHit, !std::isnan(c.enter)) << c.what;
+        EXPECT_TRUE(isHit ? enter.x() == c.enter && exit.x() == c.exit : isNaN(enter) && isNaN(exit)) << c.what;
+    }
+}
+
+TEST(KpLine, picksWhatIsNearerThanAnAngleOrARadius)
+{
+    const KpBox3f box(2, 3, 1, 2, -1, 1);
+    const KpVec3f point(2, 1, 0), below(4, 1, -5), above(4, 1, 5), end(4, 1, 3);
+    const struct {
+        float angle;
+        bool box, point, segment, end;  // `end` runs from there on away from the line
+    } cases[] = {
+        {-1.5F, true, true, true, false}, {-1, true, false, false, false},  {-0.5F, false, false, false, false},
+        {0.6F, true, true, true, false},  {0.3F, true, false, true, false}, {0.2F, false, false, false, false},
+        {0, false, false, false, false},  {-3.5F, true, true, true, true},  {0.9F, true, true, true, true},
+    };
+    KpVec3f out;
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.angle);
+        EXPECT_EQ(alongX.intersect(c.angle, box), c.box);
+        EXPECT_EQ(alongX.intersect(c.angle, point), c.point);
+        EXPECT_EQ(alongX.intersect(c.angle, below, above, out), c.segment);
+        EXPECT_TRUE(c.segment ? out == KpVec3f(4, 1, 0) : isNaN(out));
+        EXPECT_EQ(alongX.intersect(c.angle, above, end, out), c.end);
+        EXPECT_EQ(alongX.intersect(c.angle, end, above, out), c.end);
+        EXPECT_TRUE(c.end ? out == end : isNaN(out));
+    }
+    EXPECT_TRUE(alongX.intersect(0, KpBox3f(2, 3, -1, 1, -1, 1))) << "angle 0, and the line crosses";
+    EXPECT_FALSE(alongX.intersect(-9, KpBox3f(3, 2, -1, 1, -1, 1))) << "empty";
+    EXPECT_FALSE(alongX.intersect(-9, origin) || alongX.intersect(-9, -x)) << "not in front";
+    EXPECT_FALSE(alongX.intersect(-9, y, y + x, out)) << "parallel";
+    EXPECT_FALSE(alongX.intersect(-9, point, point, out)) << "without length";
+    for (float t = 1; t < 100; ++t)  // on the line, whatever rounding leaves
+        EXPECT_TRUE(KpLine(origin, {0.1F, 0.7F, 0.3F}).intersect(1e-3F, KpVec3f(0.1F, 0.7F, 0.3F) * t)) << t;
+}
+
+// Small whole numbers bring edges along axes and normals that tie between axes.
+TEST(KpLine, goesThroughTriangles)
+{
+    std::mt19937 random(3);
+    std::uniform_int_distribution<int> numbers(-3, 3);
+    const auto corner = [&] { return KpVec3f(numbers(random), numbers(random), numbers(random)); };
+    KpVec3f hit, weights;
+    bool front;
+    int hits = 0;
+    for (int i = 0; i < 20000; ++i) {
+        const KpVec3f a = corner(), b = corner(), c = corner();
+        const KpLine line{corner() + someVector(random, 0.3F), corner()};
+        const KpVec3d e(b - a), f(c - a), g(line.position() - a), d(line.direction());
+        const double volume = determinant(e, f, d), ofB = determinant(g, f, d), ofC = determinant(e, g, d);
+        const double margin = std::min({ofB / volume, ofC / volume, 1 - (ofB + ofC) / volume});
+        const bool isFlat = e.cross(f).length() == 0;
+        if (!isFlat && !(std::abs(volume) > 0.1 && std::abs(margin) > 1e-4))  // may go either way
+            continue;
+        ASSERT_EQ(line.intersect(a, b, c, hit, weights, front), !isFlat && margin > 0);
+        EXPECT_EQ(front, !isFlat && margin > 0 && volume > 0);
+        if (!isFlat && margin > 0) {
+            ++hits;
+            // 2^-24 times numbers up to 9^2, over 0.1.
+            EXPECT_LE(distance(weights, KpVec3d(volume - ofB - ofC, ofB, ofC) / volume), 1e-4);
+            EXPECT_LE(distance(hit, KpVec3d(a) + (e * ofB + f * ofC) / volume), 1e-4);
+        } else {
+            EXPECT_TRUE(isNaN(hit) && isNaN(weights));
+        }
+    }
+    EXPECT_GT(hits, 1000);
+    EXPECT_TRUE(KpLine(x, x - z).intersect(origin, x * 2, y * 2, hit, weights, front));
+    EXPECT_EQ(weights, KpVec3f(0.5F, 0.5F, 0)) << "an edge belongs to it";
+    EXPECT_FALSE(alongX.intersect(origin, x, y, hit, weights, front)) << "in its plane";
+}
+
+}  // namespace

@@ -1,0 +1,46 @@
+#include "SomeVectors.h"
+
+#include <kplib/geometry/KpLine.h>
+#include <kplib/geometry/KpSphere.h>
+
+#include <gtest/gtest.h>
+
+using namespace kplib::test;
+
+namespace {
+
+TEST(KpSphere, isHitByLinesAndSegments)
+{
+    const KpSphere sphere({0, 0, 5}, 2);
+    const auto at = [](float along, float aside) { return KpVec3f(aside, 0, along); };
+    const struct {
+        const char* what;
+        float p0, p1, aside;
+        float first, enter, exit, segmentEnter, segmentExit;  // along z, NaN for none
+    } cases[] = {
+        {"through all of it", 0, 9, 0, 3, 3, 7, 3, 7},
+        {"from inside", 6, 20, 0, 7, 3, 7, 6, 7},
+        {"behind the position", 8, 9, 0, NaN, 3, 7, 8, 8},
+        {"the segment ends before it", 0, 1, 0, 3, 3, 7, 1, 1},
+        {"backwards", 9, 4, 0, 7, 7, 3, 7, 4},
+        {"tangent", 0, 9, 2, 5, 5, 5, 5, 5},
+        {"beside it", 0, 9, 2.1F, NaN, NaN, NaN, NaN, NaN},
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.what);
+        const KpVec3f p0 = at(c.p0, c.aside), p1 = at(c.p1, c.aside);
+        KpVec3f first = untouched, enter, exit, segmentEnter, segmentExit;
+        EXPECT_EQ(sphere.intersect(KpLine(p0, p1), first), !std::isnan(c.first));
+        EXPECT_EQ(first, std::isnan(c.first) ? untouched : at(c.first, c.aside));
+        const bool isHit = sphere.intersect(KpLine(p0, p1), enter, exit);
+        EXPECT_EQ(isHit, !std::isnan(c.enter));
+        EXPECT_EQ(sphere.intersect(p0, p1, segmentEnter, segmentExit), isHit);
+        EXPECT_TRUE(isHit ? enter == at(c.enter, c.aside) && exit == at(c.exit, c.aside) : isNaN(enter) && isNaN(exit));
+        EXPECT_TRUE(isHit ? segmentEnter == at(c.segmentEnter, c.aside) && segmentExit == at(c.segmentExit, c.aside)
+                          : isNaN(segmentEnter) && isNaN(segmentExit));
+    }
+    EXPECT_EQ(KpSphere::emptySphere(), KpSphere({0, 0, 0}, -1));
+    EXPECT_EQ(&KpSphere::emptySphere(), &KpSphere::emptySphere());
+}
+
+}  // namespace
