@@ -42,6 +42,9 @@ TEST(KpSphereSheetProjector, isASphereThatTurnsIntoASheet)
     const KpVec3f foot(0, 3, 0), toEye = (KpVec3f(0, 0, 8) - foot) / std::sqrt(73.0F);
     expectNear(projector(false, true).project(screen(0, 3)), foot + toEye * (0.5F / 3), 1e-4F);
     expectNear(projector(false, false).project(screen(0, 3)), foot + KpVec3f(0, 0, 0.5F / 3), 1e-4F);
+    // This one hits the sphere beyond the seam, at (0.8, 0, 0.6): from below there.
+    const KpVec3f below(0.8F, 0, 0), up = (KpVec3f(0, 0, 8) - below) / std::sqrt(64.64F);
+    expectNear(projector(false, true).project(screen(6.4F / 7.4F, 0)), below + up * 0.625F, 1e-4F);
 }
 
 TEST(KpSphereSheetProjector, takesLinesOfTheWorldWithTheirOwnDirection)
@@ -54,7 +57,9 @@ TEST(KpSphereSheetProjector, takesLinesOfTheWorldWithTheirOwnDirection)
         KpVec3f slope(x / 10, y / 10, -1);
         slope.normalize();
         const KpVec3f onSphere(0.1F, 0.2F, std::sqrt(0.95F)), foot(3, 0, 0);
+        p.setFront(true);  // so that it takes up the direction of the next line
         expectNear(p.intersect(KpLine(onSphere - slope, onSphere)), onSphere);
+        expectNear(p.planeDir(), round % 2 ? -slope : KpVec3f(0, 0, 1));
         p.setOrientToEye(false);
         expectNear(p.intersect(KpLine(foot - slope, foot)), foot - slope * (0.5F / 3));
         p.setFront(false);
@@ -90,11 +95,13 @@ TEST(KpSphereSheetProjector, worksInItsOwnSpace)
     place.setTransform(KpVec3f(1, 2, 0), KpRotation(KpVec3f(0, 0, 1), 0.5F), KpVec3f(2, 2, 2), KpRotation::identity());
     for (const bool isBox : {true, false}) {
         auto inWorld = projector(isBox, true, KpSphere(KpVec3f(1, 2, 0), 2)), inSpace = projector(isBox, true);
+        inSpace.project(screen(0, 0));
         inSpace.setWorkingSpace(place);
         for (float d = -3; d < 3; d += 0.25F) {
-            const KpVec3f point = inSpace.project(screen(d, 1));
-            expectNear(place.multVecMatrix(point), inWorld.project(screen(d, 1)));
+            const KpVec3f point = inSpace.project(screen(d, 1)), world = inWorld.project(screen(d, 1));
+            expectNear(place.multVecMatrix(point), world);
             EXPECT_TRUE(inSpace.isPointInFront(point) && !inSpace.isPointInFront(-point));
+            EXPECT_TRUE(inWorld.isPointInFront(world) && !inWorld.isPointInFront(place.multVecMatrix(-point)));
         }
     }
 }
@@ -104,9 +111,9 @@ TEST(KpSphereSheetProjector, takesUpChangesWithItsNextProjection)
     auto p = projector(false, true);
     p.project(screen(0, 0));
     KpViewVolume fromX = p.viewVolume();
-    KpMat4f turn;
-    turn.setRotate(KpRotation(KpVec3f(0, 1, 0), 1.5707964F));
-    fromX.transform(turn);
+    fromX.translateCamera(KpVec3f(0, 0, -8));
+    fromX.rotateCamera(KpRotation(KpVec3f(0, 1, 0), 1.5707964F));
+    fromX.translateCamera(KpVec3f(8, 0, 0));
     p.setViewVolume(fromX);
     p.setOrientToEye(true);
     p.project(screen(0, 0));

@@ -73,8 +73,7 @@ TEST(KpViewVolume, takesTheWorldToTheScreenAndBack)
     Volume v;
     v.ortho(-1, 1, -1, 1, 1, 3);
     expectNear(toScreen(v, KpVec3f(0, 0, -2)), KpVec3f(0.5F, 0.5F, 0.5F));
-    const KpVec2f size = v.projectBox(KpBox3f(-0.5F, 0.5F, -0.25F, 0, -2, -1));
-    EXPECT_TRUE(std::abs(size.x() - 0.5F) < 1e-6F && std::abs(size.y() - 0.125F) < 1e-6F);
+    EXPECT_FLOAT_EQ(v.projectBox(KpBox3f(-0.5F, 0.5F, -0.25F, 0, -2, -1)).y(), 0.125F);
     v.frustum(-1, 2, -3, 4, 5, 7);
     EXPECT_TRUE(v.llf() == KpVec3f(-1, -3, 5) && v.nearToFar() == 2 && v.type() == Volume::Perspective);
 }
@@ -112,11 +111,10 @@ TEST(KpViewVolume, shiftsStereoEyesAgainstEachOther)
         if (c.offset != 0)
             v.setCameraOffset(c.offset);
         EXPECT_NEAR(toScreen(v.narrow(0, 0, 1, 1), KpVec3f(0, 0, -2)).x(), 0.5F + c.shift, 1e-5);
-        Volume transformed = v;
-        transformed.transform(KpMat4f::identity());
-        for (const Volume& reset : {transformed, v.zNarrow(1, 0)})
-            EXPECT_TRUE(reset.stereoMode() == 0 && reset.stereoEyeScale() * reset.stereoOffsetScale() == 1 &&
-                        !reset.isCameraOffsetSet());
+        Volume slab = v.zNarrow(1, 0);
+        v.transform(KpMat4f::identity());
+        for (const Volume* reset : {&v, &slab})
+            EXPECT_TRUE(reset->stereoMode() == 0 && reset->stereoEyeScale() == 1 && !reset->isCameraOffsetSet());
     }
 }
 
@@ -149,15 +147,16 @@ TEST(KpViewVolume, changesShape)
         move.setTranslate(someVector(random, 2));
         scale.setScale(KpVec3f(isMirror ? -2.0F : 2.0F, 2, 2));
         const KpMat4f matrix = turn * scale * move;
-        Volume changed = v, moved = v, alsoMoved = v;
+        Volume changed = v;
         changed.transform(matrix);
         EXPECT_NEAR(changed.nearDist(), 2 * v.nearDist(), 1e-3);
         const KpVec3f mirrored(isMirror ? 1 - place.x() : place.x(), place.y(), place.z());
         expectNear(toWorld(changed, mirrored), matrix.multVecMatrix(toWorld(v, place)), 5e-3F);
-        moved.translateCamera(move.multVecMatrix(KpVec3f(0, 0, 0)));
-        alsoMoved.transform(move);
-        expectSameShape(moved, alsoMoved);
     }
+    Volume behind;
+    behind.ortho(-1, 1, -1, 1, -2, 3);
+    behind.transform(KpMat4f::identity());
+    EXPECT_EQ(behind.nearDist(), -2);
 }
 
 TEST(KpViewVolume, tellsWhatIsInside)
