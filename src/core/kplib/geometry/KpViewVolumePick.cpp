@@ -13,6 +13,11 @@ KpVec3f fromNormalisedDevice(const KpMat4f& toWorld, float x, float y, float z)
     return KpVec3f(point.x(), point.y(), point.z()) / point.w();
 }
 
+KpVec3f toScreen(const KpMat4f& matrix, const KpVec3f& world)
+{
+    return (matrix.multVecMatrix(world) + KpVec3f(1, 1, 1)) / 2;
+}
+
 // Of the four turns about y that can follow a turn of y to an axis, the one that brings x nearest to `right`.
 KpRotation alignToAxes(const KpVec3f& up, const KpVec3f& right)
 {
@@ -64,18 +69,18 @@ void KpViewVolume::projectPointToLine(const KpVec2f& point, KpLine& line) const
 
 void KpViewVolume::projectToScreen(const KpVec3f& world, KpVec3f& screen) const
 {
-    screen = (getMatrix().multVecMatrix(world) + KpVec3f(1, 1, 1)) / 2;
+    screen = toScreen(getMatrix(), world);
 }
 
 KpVec2f KpViewVolume::projectBox(const KpBox3f& box) const
 {
-    KpBox2f onScreen;
+    const KpMat4f matrix = getMatrix();
+    KpBox2f extent;
     for (int i = 0; i < 8; ++i) {
-        KpVec3f corner;
-        projectToScreen(box.corner(i), corner);
-        onScreen.extendBy(KpVec2f(corner.x(), corner.y()));
+        const KpVec3f corner = toScreen(matrix, box.corner(i));
+        extent.extendBy(KpVec2f(corner.x(), corner.y()));
     }
-    return onScreen.size();
+    return extent.size();
 }
 
 KpPlane KpViewVolume::getPlane(float distance) const

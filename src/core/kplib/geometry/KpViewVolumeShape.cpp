@@ -47,8 +47,10 @@ void KpViewVolume::scaleHeight(float factor)
 
 void KpViewVolume::scale(float factor)
 {
-    scaleWidth(factor);
-    scaleHeight(factor);
+    const float share = (1 - std::abs(factor)) / 2;
+    const KpVec3f u = width() * share, v = height() * share;
+    moveSidesIn(u);
+    moveBottomAndTopIn(v);
 }
 
 void KpViewVolume::transform(const KpMat4f& matrix)
