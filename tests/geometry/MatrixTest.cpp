@@ -201,7 +201,15 @@ TEST(KpMat4f, leavesWhatIsNotAffineToDecomposition)
 
     Random random(8);
     for (int i = 0; i < 500; ++i) {
-        KpMat4f m = random.matrix4();
+        KpMat4f m = random.affine();
+        for (int j = 0; j < 3; ++j) {
+            m[0][j] = std::round(m[0][j] * 0x1p20F);
+            m[1][j] = std::round(m[1][j] * 0x1p20F);
+            m[2][j] = m[0][j] + m[1][j];  // exactly, so that the determinant is nothing but what rounding leaves of it
+        }
+        EXPECT_FALSE(KpMat4f::affine_inverse(m, untouched));
+
+        m = random.matrix4();
         for (int k = 0; k < 4; ++k)
             m[k][k] += k % 2 ? 8.0F : -8.0F;
         std::swap_ranges(m[0], m[0] + 4, m[i % 4]);
@@ -214,7 +222,7 @@ TEST(KpMat4f, leavesWhatIsNotAffineToDecomposition)
     }
 }
 
-TEST(KpMat4f, prefersTheLaterOfEqualPivots)
+TEST(KpMat4f, measuresPivotsByTheirRowsAndPrefersTheLater)
 {
     KpMat4f m(1, 2, 0, 0, 5, 10, 1, 0, 2, 1, 4, 0, 0, 0, 0, 0);  // each begins with half of its largest
     int index[4];
@@ -222,6 +230,10 @@ TEST(KpMat4f, prefersTheLaterOfEqualPivots)
     EXPECT_TRUE(m.LUDecomposition(index, sign));
     EXPECT_EQ(index[0], 2);
     EXPECT_EQ(m[3][3], 1e-6F);
+    m = KpMat4f(0, 1, 100, 0, 0, 0.5F, 0, 1, 1, 0, 0, 0, 0, 0, 0, 1);  // the first row keeps its measure as it moves
+    EXPECT_TRUE(m.LUDecomposition(index, sign));
+    EXPECT_EQ(index[0], 2);
+    EXPECT_EQ(index[1], 1);
 }
 
 /// The eigenvectors are the columns of `v`: A v = v diag(evalues), and v is orthogonal.

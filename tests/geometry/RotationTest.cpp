@@ -139,8 +139,8 @@ TEST(KpRotation, slerpGoesTheShorterWayAtSteadySpeed)
         (a.inverse() * KpRotation::slerp(a, b, 0.25F)).getValue(axis, part);
         EXPECT_NEAR(std::min(part, 2 * pi - part), whole / 4, 5e-3F);
     }
-    const KpRotation a(z, 0.5F), near(z, 0.501F);
-    EXPECT_TRUE(KpRotation::slerp(a, near, 0.5F).equals(KpRotation(z, 0.5005F), 1e-7F));
+    for (const float angle : {0.001F, 0.1F})
+        EXPECT_TRUE(KpRotation::slerp(KpRotation(z, 0), KpRotation(z, angle), 0.25F).equals({z, angle / 4}, 1e-6F));
 }
 
 }  // namespace
