@@ -38,7 +38,7 @@ void drawGlyph(Picture& picture, const Glyph& glyph, long left, long top, long d
 /// Draws a text with its middle at the given place, as a share of what room the picture leaves within its margin.
 void drawText(Picture& picture, const std::string& text, double across, double down)
 {
-    const long dot = std::clamp(std::min(picture.width, picture.height) / 120, 1L, 4L);
+    const long dot = std::clamp(std::min(picture.width, picture.height) / 70, 1L, 4L);
     const long margin = 3 * dot, advance = (glyphWidth + 1) * dot;
     const long width = static_cast<long>(text.size()) * advance - dot;
     const auto room = [&](long size, long own, double share) {

@@ -3,6 +3,7 @@
 #include "Volume.h"
 
 #include <kplib/geometry/KpCoordinateSystem.h>
+#include <kplib/geometry/KpFrameOfReference.h>
 #include <kplib/imaging/KpOrientationLetters.h>
 
 #include <string>

@@ -3,6 +3,8 @@
 #include <kplib/geometry/KpVec3d.h>
 #include <kplib/geometry/KpVec3f.h>
 
+#include <gtest/gtest.h>
+
 #include <algorithm>
 #include <cmath>
 #include <limits>
@@ -25,9 +27,19 @@ inline KpVec3f someVector(std::mt19937& random, float range)
     return {components(random), components(random), components(random)};
 }
 
+inline float someNumber(std::mt19937& random, float low, float high)
+{
+    return std::uniform_real_distribution<float>(low, high)(random);
+}
+
 inline double distance(const KpVec3f& a, const KpVec3d& b)
 {
     return (KpVec3d(a) - b).length();
+}
+
+inline void expectNear(const KpVec3f& a, const KpVec3f& b, float tolerance = 1e-3F)
+{
+    EXPECT_LT((a - b).length(), tolerance) << a << " and " << b;
 }
 
 }  // namespace kplib::test

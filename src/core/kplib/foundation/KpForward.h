@@ -41,6 +41,15 @@ class HxParamBundle;
 class HxParamEditCheck;
 class HxParameter;
 
+class KpAbstractCoordinateSystem;
+class KpCoordinateSystem;
+class KpFrameOfReference;
+class KpProjector;
+class KpSphereProjector;
+class KpSphereSheetProjector;
+class KpViewVolume;
+class KpOrientationLetters;
+
 class KpCutBoxPlane;
 class KpCutBoxPlaneDouble;
 class KpLine;

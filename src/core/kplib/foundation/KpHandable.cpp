@@ -4,14 +4,14 @@ KpHandable::~KpHandable() = default;
 
 void KpHandable::notifyDelete() {}
 
-void KpHandable::unrefLast()
+void KpHandable::unrefLast() const
 {
     if (destructionInProgress_) {
         ++refCount_;  // the count was 0 or less and stays so: what unref() took from it was taken in vain
         return;
     }
     destructionInProgress_ = true;
-    notifyDelete();
+    const_cast<KpHandable*>(this)->notifyDelete();
     destructionNotified_ = true;
     delete this;
 }

@@ -6,7 +6,7 @@
 ///
 /// The count is the number of handles, 0 for a new object. An object that no handle ever holds lives and dies as any
 /// other; one that a handle has held is deleted with its last handle, never by hand. A copy of an object is an object
-/// of its own, with a count of 0.
+/// of its own, with a count of 0. Constant objects are counted too, so that handles may be to const.
 class KPLIB_API KpHandable {
 public:
     KpHandable() = default;
@@ -17,14 +17,14 @@ public:
     /// Runs once before the object is deleted, while it is whole. It may take and drop handles to the object.
     virtual void notifyDelete();
 
-    void ref()
+    void ref() const
     {
         if (!destructionInProgress_)
             ++refCount_;
     }
 
     /// Deletes the object when the count is no longer positive.
-    void unref()
+    void unref() const
     {
         if (--refCount_ <= 0) [[unlikely]]
             unrefLast();
@@ -33,9 +33,9 @@ public:
     int refCount() const { return refCount_; }
 
 private:
-    void unrefLast();
+    void unrefLast() const;
 
-    int refCount_ = 0;
-    bool destructionInProgress_ = false;  // from then on the count stands still
-    bool destructionNotified_ = false;
+    mutable int refCount_ = 0;
+    mutable bool destructionInProgress_ = false;  // from then on the count stands still
+    mutable bool destructionNotified_ = false;
 };

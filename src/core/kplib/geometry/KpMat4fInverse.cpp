@@ -8,7 +8,7 @@
 
 namespace {
 
-/// The reciprocal of a row's largest magnitude; a row of zeros gets a tiny diagonal element p0.
+/// The reciprocal of a row's largest magnitude; a row of zeros gets a tiny diagonal element first.
 float scaleOfRow(float (&row)[4], int i)
 {
     if (std::all_of(row, row + 4, [](float element) { return element == 0; }))

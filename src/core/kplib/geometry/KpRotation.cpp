@@ -55,19 +55,19 @@ void KpRotation::setFromRows(const float* row0, const float* row1, const float* 
     const int i = m[0][0] > m[1][1] ? (m[0][0] > m[2][2] ? 0 : 2) : (m[1][1] > m[2][2] ? 1 : 2);
     const int j = (i + 1) % 3, k = (i + 2) % 3;
     const float trace = m[0][0] + m[1][1] + m[2][2];
-    float quarter;
+    float divisor;
     if (trace > m[i][i]) {
         q_[3] = static_cast<float>(root(trace + corner) / 2);
-        quarter = 4 * q_[3];
-        q_[0] = (m[1][2] - m[2][1]) / quarter;
-        q_[1] = (m[2][0] - m[0][2]) / quarter;
-        q_[2] = (m[0][1] - m[1][0]) / quarter;
+        divisor = 4 * q_[3];
+        q_[0] = (m[1][2] - m[2][1]) / divisor;
+        q_[1] = (m[2][0] - m[0][2]) / divisor;
+        q_[2] = (m[0][1] - m[1][0]) / divisor;
     } else {
         q_[i] = static_cast<float>(root(m[i][i] - m[j][j] - m[k][k] + corner) / 2);
-        quarter = 4 * q_[i];
-        q_[j] = (m[i][j] + m[j][i]) / quarter;
-        q_[k] = (m[i][k] + m[k][i]) / quarter;
-        q_[3] = (m[j][k] - m[k][j]) / quarter;
+        divisor = 4 * q_[i];
+        q_[j] = (m[i][j] + m[j][i]) / divisor;
+        q_[k] = (m[i][k] + m[k][i]) / divisor;
+        q_[3] = (m[j][k] - m[k][j]) / divisor;
     }
 }
 

@@ -40,7 +40,8 @@ public:
     /// The smallest turn that takes the direction `from` to the direction `to`; opposite ones have an axis chosen for
     /// them.
     void setValue(const KpVec3f& from, const KpVec3f& to);
-    /// The turn that takes `from1` to `to1`, and `from2` as near to `to2` as can be. All four are of length 1.
+    /// The turn that takes `from1` to `to1`, and `from2` as near to `to2` as can be where each pair is at a right
+    /// angle. All four are of length 1.
     void setValue(const KpVec3f& from1, const KpVec3f& from2, const KpVec3f& to1, const KpVec3f& to2);
 
     /// The four as stored.

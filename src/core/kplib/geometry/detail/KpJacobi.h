@@ -11,11 +11,16 @@ namespace kplib::detail {
 template <typename Real>
 class Jacobi {
 public:
+    float evalues[3];
+    float evectors[3][3] = {{1, 0, 0}, {0, 1, 0}, {0, 0, 1}};  ///< one a column
+    int rotations = 0;
+    int sweeps = 0;
+
     /// Small elements are left alone while the sweep is below `thresholdSweeps`; from `skipSweep` on those are dropped
     /// that the eigenvalues don't feel.
     Jacobi(const float* rows, int stride, int thresholdSweeps, int skipSweep) :
-        thresholdSweeps_(thresholdSweeps), skipSweep_(skipSweep), off_{rows[stride + 2], rows[2], rows[1]},
-        evalues{rows[0], rows[stride + 1], rows[2 * stride + 2]}, sums_{evalues[0], evalues[1], evalues[2]}
+        evalues{rows[0], rows[stride + 1], rows[2 * stride + 2]}, thresholdSweeps_(thresholdSweeps),
+        skipSweep_(skipSweep), off_{rows[stride + 2], rows[2], rows[1]}, sums_{evalues[0], evalues[1], evalues[2]}
     {
     }
 
@@ -97,15 +102,7 @@ private:
 
     int thresholdSweeps_, skipSweep_;
     Real off_[3];
-
-public:
-    float evalues[3];
-    float evectors[3][3] = {{1, 0, 0}, {0, 1, 0}, {0, 0, 1}};  ///< one a column
-    int rotations = 0;
-    int sweeps = 0;
-
-private:
-    Real sums_[3];
+    Real sums_[3];  ///< the eigenvalues, to which the shifts of a whole sweep are added at once
 };
 
 }  // namespace kplib::detail

@@ -1,0 +1,110 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/geometry/KpAbstractCoordinateSystem.h>
+#include <kplib/geometry/KpMat3f.h>
+#include <kplib/geometry/KpRotation.h>
+#include <kplib/geometry/KpVec3f.h>
+
+#include <array>
+#include <string>
+#include <vector>
+
+class KpPlane;
+
+/// A coordinate system in the space of its parent: an origin and three axes, which need not be of length 1 or at right
+/// angles. The point (u, v, w) is at origin + u x + v y + w z in the parent's space.
+///
+/// Without a parent it floats: it has no frame of reference and is compatible with nothing, itself included. Input from
+/// which no system can be made leaves NaN in the numbers, which isValid() tells; there are no other errors. See
+/// KpAbstractCoordinateSystem for who holds whom.
+class KPLIB_API KpCoordinateSystem : public KpAbstractCoordinateSystem {
+public:
+    enum AxisIndex { AxisX, AxisY, AxisZ };  ///< what the operations with an `axis` from 0 to 2 take
+
+    /// Origin zero, unit axes, no parent.
+    KpCoordinateSystem() = default;
+    /// No parent; all NaN if the result is not isValid().
+    KpCoordinateSystem(const KpVec3f& origin, const std::array<KpVec3f, 3>& axes);
+    /// No parent, otherwise as setByMatrix().
+    explicit KpCoordinateSystem(const KpMat4f& matrix) { setByMatrix(matrix); }
+
+    /// The rows are the axes and the origin; the last column is ignored and nothing is tested.
+    void setByMatrix(const KpMat4f& matrix);
+    /// Origin zero, unit axes; the parent stays.
+    void makeIdentity();
+    /// All twelve numbers NaN; the parent stays.
+    void makeNaN();
+
+    /// Null makes it float. That no system is above itself is the caller's duty.
+    void setParent(const KpAbstractCoordinateSystem* parent) { parent_ = parent; }
+    void setOrigin(const KpVec3f& origin) { origin_ = origin; }
+    void setAxis(int axis, const KpVec3f& value) { axes_[axis] = value; }
+    void setAxes(const std::array<KpVec3f, 3>& axes) { axes_ = axes; }
+    /// Right-handed unit axes at right angles, with z along `zAxis` and x as near to `xHint` as can be; any x if
+    /// `xHint` is zero. An `xHint` along `zAxis` leaves x and y zero.
+    void setAxes(const KpVec3f& zAxis, const KpVec3f& xHint);
+    /// The unit axes turned by `rotation`.
+    void setAxesByRotation(const KpRotation& rotation);
+    /// Keeps `axis` and brings the two others to right angles with it and each other; their lengths change.
+    /// With `keepDirection` neither turns by more than a right angle, which may keep the system left-handed.
+    void makePerpendicular(int axis, bool keepDirection);
+    void normalizeAxes();
+    /// Right-handed unit axes with z along the normal and the origin at `point`, wherever that is, or at the plane's
+    /// point nearest to the parent's origin. An empty plane makes the origin NaN and leaves the axes.
+    void setSystemByPlane(const KpPlane& plane, const KpVec3f& point);
+    void setSystemByPlane(const KpPlane& plane);
+
+    const KpVec3f& origin() const { return origin_; }
+    const KpVec3f& axis(int axis) const { return axes_[axis]; }
+    /// No number is NaN, and the determinant of the axes is not 0.
+    bool isValid() const;
+    /// Each two axes have a dot product within 1e-6 of 0; their lengths count.
+    bool isPerpendicular() const;
+    bool isRightHanded() const;
+    /// The axes as rows.
+    KpMat3f orientationAsMatrix() const { return KpMat3f(axes_); }
+    /// The rotation of that matrix; the axes have to be one.
+    KpRotation orientationAsQuaternion() const { return KpRotation(orientationAsMatrix()); }
+    /// Origins within, but not at, `tolerance` in each component, and equalsAxis(). Parents play no part.
+    bool equals(const KpCoordinateSystem& other, float tolerance) const;
+    /// Axes that match in length and direction, to about 1e-4.
+    bool equalsAxis(const KpCoordinateSystem& other) const;
+
+    /// The parent's.
+    KpHandle<const KpFrameOfReference> frameOfReference() const override;
+    KpHandle<const KpAbstractCoordinateSystem> parent() const override;
+    KpMat4f asTransformation() const override;
+    KpMat4f asTransformationToFrameOfReference() const override;
+    /// "KpCoordinateSystem":{"origin":{...},"x_axis":{...},"y_axis":{...},"z_axis":{...},"parent": {the parent's}}
+    std::string dump() const override;
+
+    /// From this system through the matrix of `ancestor`, which is included, and so to the parent of `ancestor`; to the
+    /// root if `ancestor` is not above.
+    KpMat4f asTransformationUpTo(const KpAbstractCoordinateSystem& ancestor) const;
+    /// This system, its parent, and so on; as long as the systems live.
+    std::vector<const KpAbstractCoordinateSystem*> path() const;
+
+    /// Whether both have a frame of reference, and the same one by its id.
+    bool isCompatibleWith(const KpAbstractCoordinateSystem& other) const;
+    /// From this system to `other`. False, and `result` unwritten, if they are not compatible.
+    bool transformationTo(const KpAbstractCoordinateSystem& other, KpMat4f& result) const;
+    /// From `other` to this system, in the same way.
+    bool transformationFrom(const KpAbstractCoordinateSystem& other, KpMat4f& result) const;
+    /// The same for callers that know isCompatibleWith(); NaN throughout if they are not.
+    KpMat4f transformationTo(const KpAbstractCoordinateSystem& other) const;
+    KpMat4f transformationFrom(const KpAbstractCoordinateSystem& other) const;
+    /// The lowest system that is above both or one of the two; null if there is none, which may be so for compatible
+    /// ones too. What comes back is held by a handle, so it has to live on the heap, as parents do.
+    KpHandle<const KpAbstractCoordinateSystem> commonAncestor(const KpAbstractCoordinateSystem& other) const;
+
+    /// A new system in the same place whose parent is the parent's parent; a copy if there is no parent.
+    KpHandle<KpCoordinateSystem> mergedWithParent() const;
+    /// A new system in the same place whose parent is `other`; a default-made one if they are not compatible.
+    KpHandle<KpCoordinateSystem> asChildOf(const KpAbstractCoordinateSystem& other) const;
+
+private:
+    KpHandle<const KpAbstractCoordinateSystem> parent_;
+    KpVec3f origin_{0, 0, 0};
+    std::array<KpVec3f, 3> axes_{KpVec3f(1, 0, 0), KpVec3f(0, 1, 0), KpVec3f(0, 0, 1)};
+};

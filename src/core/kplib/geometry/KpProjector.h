@@ -1,0 +1,42 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/geometry/KpLine.h>
+#include <kplib/geometry/KpMat4f.h>
+#include <kplib/geometry/KpVec2f.h>
+#include <kplib/geometry/KpVec3f.h>
+#include <kplib/geometry/KpViewVolume.h>
+
+/// Turns positions of a pointer on the screen into positions in a working space, for handles that are dragged.
+///
+/// One thread at a time uses a projector. Nothing raises an error: where there is no answer it is NaN.
+class KPLIB_API KpProjector {
+public:
+    /// The position in working space for `point` on the screen, from (0, 0) at the lower left to (1, 1).
+    virtual KpVec3f project(const KpVec2f& point) = 0;
+    /// The same for a line in the world.
+    virtual KpVec3f intersect(const KpLine& line) = 0;
+    virtual void setViewVolume(const KpViewVolume& viewVolume);
+    /// From the working space to the world; the identity at the start.
+    virtual void setWorkingSpace(const KpMat4f& workingToWorld);
+    /// A new object in the same state, which the caller owns and deletes.
+    virtual KpProjector* copy() const = 0;
+    virtual ~KpProjector();
+
+    const KpViewVolume& viewVolume() const { return viewVolume_; }
+    const KpMat4f& worldToWorking() const { return worldToWorking_; }
+    const KpMat4f& workingToWorld() const { return workingToWorld_; }
+    /// What is seen at `point` of the screen, as a line in working space.
+    KpLine getWorkingLine(const KpVec2f& point) const;
+
+protected:
+    KpProjector() = default;
+    KpProjector(const KpProjector&) = default;
+    KpProjector& operator=(const KpProjector&) = default;
+
+    KpLine toWorkingSpace(const KpLine& worldLine) const;
+
+private:
+    KpViewVolume viewVolume_;
+    KpMat4f worldToWorking_ = KpMat4f::identity(), workingToWorld_ = KpMat4f::identity();
+};
