@@ -77,8 +77,17 @@
 #include <kplib/rawdata/KpTypedElement.h>
 #include <kplib/rawdata/KpTypedPointer.h>
 #include <kplib/system/KpBuildInfo.h>
+#include <kplib/system/KpCPUInfo.h>
+#include <kplib/system/KpDSO.h>
 #include <kplib/system/KpDataBase.h>
+#include <kplib/system/KpDirectory.h>
+#include <kplib/system/KpFilename.h>
+#include <kplib/system/KpFilenameCollector.h>
+#include <kplib/system/KpOSInfo.h>
+#include <kplib/system/KpProcessInfo.h>
+#include <kplib/system/KpSysInfo.h>
 #include <kplib/system/KpTable.h>
+#include <kplib/system/KpTmpDir.h>
 #include <kplib/system/KpVersion.h>
 #include <kplib/system/KpWatch.h>
 #include <kplib/threads/KpProgressGuiInterface.h>

@@ -69,6 +69,15 @@ class KpScopedWatch;
 class KpWatch;
 
 class KpBuildInfo;
+class KpCPUInfo;
 class KpDataBase;
+class KpDirectory;
+class KpDSO;
+class KpFilename;
+class KpFilenameCollector;
+class KpOSInfo;
+class KpProcessInfo;
+class KpSysInfo;
 class KpTable;
+class KpTmpDir;
 class KpVersion;

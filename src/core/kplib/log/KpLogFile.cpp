@@ -108,8 +108,7 @@ KpLogFile::KpLogFile() : record_(new KpLogFilePrivate) {}
 
 KpLogFile::~KpLogFile()
 {
-    if (record_->file)
-        std::fclose(record_->file);
+    record_->closeFile();
     delete record_;
 }
 
@@ -174,6 +173,8 @@ void KpLogFile::writeLine(KpLogLevel level, const KpString& line)
 {
     if (record_->logLevel <= level) {
         const Lock lock(&record_->mutex);
+        if (record_->chunkIsFull())
+            chunkTryOpenNext();
         record_->write(line);
     }
     const WriteCallback callback = record_->writeCallback;

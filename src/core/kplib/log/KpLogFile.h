@@ -4,13 +4,17 @@
 #include <kplib/foundation/KpForward.h>
 #include <kplib/log/KpLogLevel.h>
 
+#include <atomic>
+#include <string>
+
 struct KpLogFilePrivate;
 namespace kplib::detail {
 KpLogFilePrivate& logRecord(KpLogFile& log);
 }
 
 /// The log: every message of the library is a line here, on its way to disk when the call returns. Reached through
-/// getTheLogInstance(). With no file open, lines go to standard output.
+/// getTheLogInstance(). With no file open, lines go to standard output; the log opens none by itself, but goes on in a
+/// new one where one is open and has grown beyond its limit.
 ///
 /// A line is time, ": ", a letter for the level, the module in brackets, a blank and the text:
 ///
@@ -88,8 +92,53 @@ public:
     /// From now on TimeOnly shows the time since this call; hours wrap at 24, and that is meant.
     void resetTimeStamp();
 
+    // Files. Their names are time (to the second) and process; where such a file is there already it is continued.
+
+    /// Opens a new file in the base folder, closes the one that is open, and removes old ones. False if one is open
+    /// already, unless `force`, or if it can't be written, which leaves the log as it was.
+    bool open(bool force);
+    /// Lines go to standard output from now on; filePath() stays.
+    void close();
+    /// Goes on in the file `path`, whose size counts for the limit; false, with no file open, if it can't be written. A
+    /// file that was open stays so, unused: close() it before.
+    bool append(KpString path);
+    bool isOpen() const;
+    KpFilename filePath() const;
+
+    /// Where files are made; empty stands for the system's temporary folder. Old logs are removed from it: all *.log
+    /// there.
+    void setBaseFolder(const std::string& folder);
+    std::string baseFolder() const;
+    /// Whether files are sorted into folders by year, month and day; old ones stay then.
+    void setDateFoldersEnabled(bool enabled);
+    bool dateFoldersEnabled() const;
+    /// How many files are kept, 40 at first, of which the one that is opened is the last but one; 0 for all.
+    void setMaxNumLogFiles(long count);
+    long maxNumLogFiles() const;
+    /// Beyond how many bytes the next line goes to a new file, which begins with "This file continues" and the path of
+    /// the one before; 50000000 at first, 0 for no limit.
+    void setMaxLogFileSizeInBytes(unsigned long long size);
+    unsigned long long maxLogFileSizeInBytes() const;
+
+    /// Whether the open file is beyond its limit.
+    bool chunkIsFull() const;
+    /// Goes on in a new file; if that can't be had, in the old one.
+    void chunkTryOpenNext();
+    /// Removes the oldest files; no-op with date folders or no limit.
+    void cleanUp();
+
+    /// Whether standard output and standard error go into the file; changing it starts a new file. Switched off, they
+    /// go to the terminal, if there is one.
+    void setConsoleToLogEnabled(bool enabled);
+    bool consoleToLogEnabled() const;
+    /// Whether lines go to standard output beside the file; changing it starts a new file.
+    void setLogToConsoleEnabled(bool enabled);
+    bool logToConsoleEnabled() const;
+
 private:
     friend KpLogFilePrivate& kplib::detail::logRecord(KpLogFile& log);
+
+    void setConsoleFlag(std::atomic<bool>& flag, bool enabled);
 
     KpLogFilePrivate* record_;
 };

@@ -39,7 +39,7 @@ bool walk(const char* dir, const char* pattern, Visit visit)
     }
     while (const dirent* entry = readdir(folder.get())) {
         if (isWanted(entry->d_name, pattern))
-            visit(entry->d_name, [&] { return kplib::platform::isFolder(folder.get(), *entry); });
+            visit(entry->d_name, [&] { return kplib::platform::isFolder(dirfd(folder.get()), *entry); });
     }
     return true;
 }
@@ -55,8 +55,8 @@ unsigned long long since1601(std::time_t seconds)
     return static_cast<unsigned long long>(seconds) * unitsPerSecond + from1601To1970;
 }
 
-/// Copies what is in `source` to the folder `target`, which it makes; `newFolder`, the outermost such one, is no part of what
-/// is copied where it lies within the source.
+/// Copies what is in `source` to the folder `target`, which it makes; `newFolder`, the outermost such one, is no part
+/// of what is copied where it lies within the source.
 int copyTree(const char* source, const char* target, const struct stat* newFolder)
 {
     KpDArray<KpString> files, folders;
@@ -90,7 +90,8 @@ int deleted(int result, const char* path)
 
 }  // namespace
 
-long KpDirectory::scanSortedByName(const char* dir, KpDArray<KpString>& names, const char* pattern, bool onlyDirectories)
+long KpDirectory::scanSortedByName(const char* dir, KpDArray<KpString>& names, const char* pattern,
+                                   bool onlyDirectories)
 {
     const bool isOpen = walk(dir, pattern, [&](const char* name, auto isFolder) {
         if (!onlyDirectories || isFolder())

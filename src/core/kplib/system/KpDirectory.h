@@ -8,14 +8,14 @@
 
 /// Lists, copies and measures folders.
 ///
-/// `pattern` is for kpWildMatch(). With one, names that begin with a dot are left out; without (null), only "." and "..". A
-/// link to a folder is no folder here. A folder that can't be opened is a line in the log.
+/// `pattern` is for kpWildMatch(). With one, names that begin with a dot are left out; without (null), only "." and
+/// "..". A link to a folder is no folder here. A folder that can't be opened is a line in the log.
 class KPLIB_API KpDirectory {
 public:
     struct FileInfo {
-        KpString name;                          ///< without its folder
-        unsigned long long creationTime;        ///< of the last change of status, 100 ns since 1601-01-01, to the second
-        unsigned long long modificationTime;    ///< likewise
+        KpString name;                        ///< without its folder
+        unsigned long long creationTime;      ///< of the last change of status, 100 ns since 1601-01-01, to the second
+        unsigned long long modificationTime;  ///< likewise
     };
 
     /// Appends the names in `dir`, sorts all of `names` by bytes and gives their number, or -1.
@@ -24,23 +24,24 @@ public:
     /// The same with files and folders apart; false for -1.
     static bool scanSortedByName(const char* dir, KpDArray<KpString>& files, KpDArray<KpString>& directories,
                                  const char* pattern = nullptr);
-    /// The names in `dir` and their times, in place of the content, sorted by name; those that can't be asked are left out.
-    /// Gives their number, 0 for a folder that can't be opened.
+    /// The names in `dir` and their times, in place of the content, sorted by name; those that can't be asked are left
+    /// out. Gives their number, 0 for a folder that can't be opened.
     static long scan(const char* dir, std::vector<FileInfo>& out, const char* pattern = nullptr,
                      bool onlyDirectories = false);
     /// As scan(), sorted by creationTime, the oldest first; `times`, if not null, receives it.
-    static long scanSortedByCreationTime(const char* dir, KpDArray<KpString>& names, KpDArray<unsigned long long>* times,
-                                         const char* pattern = nullptr, bool onlyDirectories = false);
+    static long scanSortedByCreationTime(const char* dir, KpDArray<KpString>& names,
+                                         KpDArray<unsigned long long>* times, const char* pattern = nullptr,
+                                         bool onlyDirectories = false);
 
     /// Whether it can be opened as a folder, also by way of a link.
     static bool isDirectory(const char* path);
-    /// Copies the folder `source` with all that is in it: as `target`, or into `target` where that is a folder. Links are
-    /// copied as the files they lead to. 0, also if single entries fail, or -1 if the new folder can't be made.
+    /// Copies the folder `source` with all that is in it: as `target`, or into `target` where that is a folder. Links
+    /// are copied as the files they lead to. 0, also if single entries fail, or -1 if the new folder can't be made.
     static int copy(const char* source, const char* target);
     /// Bytes that a user can write where the file `path` lies (its folder is asked); -1 if unknown.
     static long long freeSpace(const char* path);
 };
 
-/// Deletes a folder with all that is in it; links are deleted, not followed. 0, or -1 if something stays, which is a line in
-/// the log unless `path` is no folder.
+/// Deletes a folder with all that is in it; links are deleted, not followed. 0, or -1 if something stays, which is a
+/// line in the log unless `path` is no folder.
 KPLIB_API int remove_dir(const char* path);

@@ -95,5 +95,5 @@ void KpFilename::generateFilePath(KpString& dir, KpString& name, const KpString&
     name.printf("%04d%02d%02d-%02d%02d%02d-%u", year, month, now.tm_mday, now.tm_hour, now.tm_min, now.tm_sec,
                 static_cast<unsigned>(getpid()));
     if (withUuid)
-        name += "_" + std::string(KpUUID::generateUUID().toString().c_str());
+        name = name + '_' + KpUUID::generateUUID().toString();
 }

@@ -10,7 +10,8 @@
 #include <string_view>
 #include <sys/stat.h>
 
-KpTmpDir::KpTmpDir(const char* name, bool createNow, bool removeOnDestruction) : removeOnDestruction_(removeOnDestruction)
+KpTmpDir::KpTmpDir(const char* name, bool createNow, bool removeOnDestruction) :
+    removeOnDestruction_(removeOnDestruction)
 {
     makeUnique(name);
     if (createNow)
@@ -29,9 +30,10 @@ void KpTmpDir::makeUnique(const char* name)
         path_ = name;
     const std::string_view text = path_;
     const bool isPlaced = text.starts_with('/') || text.starts_with("./");
-    const KpString leaf(KpFilename::basename(path_));
-    KpString base = isPlaced ? KpFilename(path_).dirname() : KpString(getSystemTmpPath());
-    base += leaf.isEmpty() ? "tmp" : leaf.c_str();
+    const char* const leaf = KpFilename::basename(path_);
+    KpString base =
+        isPlaced ? KpString(path_, 0, static_cast<int>(leaf - path_.c_str())) : KpString(getSystemTmpPath());
+    base += *leaf ? leaf : "tmp";
     KpFilename candidate(base);
     for (int number = 2; candidate.doesExist(); ++number)
         candidate = base + KpString(0, ".%d", number).c_str();

@@ -6,16 +6,16 @@
 /// A folder of its own for temporary files, which can remove itself.
 class KPLIB_API KpTmpDir {
 public:
-    /// Takes a new name by makeUnique(), and makes the folder if `createNow`; doesExist() tells whether that worked. The
-    /// destructor removes the folder with all that is in it if `removeOnDestruction`.
+    /// Takes a new name by makeUnique(), and makes the folder if `createNow`; doesExist() tells whether that worked.
+    /// The destructor removes the folder with all that is in it if `removeOnDestruction`.
     KpTmpDir(const char* name, bool createNow, bool removeOnDestruction);
     KpTmpDir(const KpTmpDir&) = delete;
     KpTmpDir& operator=(const KpTmpDir&) = delete;
     ~KpTmpDir();
 
-    /// Takes the path `name` (null: as it is) where nothing exists: with .2, .3 ... if needed, and a slash at the end. A name
-    /// that begins with neither "/" nor "./" lies in the system's temporary folder with its last part alone; a name that ends
-    /// in a slash gets "tmp" behind it. Another process may take the name before create().
+    /// Takes the path `name` (null: as it is) where nothing exists: with .2, .3 ... if needed, and a slash at the end.
+    /// A name that begins with neither "/" nor "./" lies in the system's temporary folder with its last part alone; a
+    /// name that ends in a slash gets "tmp" behind it. Another process may take the name before create().
     void makeUnique(const char* name);
     /// Makes the folder with exactly the rights `mode`.
     bool create(int mode);
@@ -26,8 +26,8 @@ public:
     /// With a slash at the end, once makeUnique() has run.
     const KpString& path() const { return path_; }
 
-    /// The first of TMPDIR, TEMP and TMP that is set, else /tmp, with a slash at the end; valid until this thread's next
-    /// call.
+    /// The first of TMPDIR, TEMP and TMP that is set, else /tmp, with a slash at the end; valid until this thread's
+    /// next call.
     static const char* getSystemTmpPath();
 
 private:

@@ -4,13 +4,17 @@
 #include <kplib/foundation/KpString.h>
 #include <kplib/log/KpLogFile.h>
 #include <kplib/log/detail/KpLogClock.h>
+#include <kplib/system/KpFilename.h>
 
 #include <atomic>
 #include <cstdio>
 #include <string>
 
-/// What a log knows. The mutex guards all but the atomics, which are set during start-up, and the console flags.
+/// What a log knows. The mutex guards all but the atomics, of which those of the level and the callback are set during
+/// start-up.
 struct KpLogFilePrivate {
+    KpLogFilePrivate();
+
     /// The line of a message; takes the mutex.
     KpString formatLine(KpLogLevel level, const char* module, const char* text);
 
@@ -18,20 +22,24 @@ struct KpLogFilePrivate {
     void write(std::string_view line);
     void flush();
     std::string_view timeText(KpLogFile::DateTimeFormat format);
+    bool chunkIsFull() const;
+    bool openFile(const KpFilename& path);
+    void closeFile();
+    void cleanUp() const;
 
     KpMutex mutex{true};
     std::string baseFolder;
     bool dateFoldersEnabled = false;
     FILE* file = nullptr;
     FILE* consoleFile = nullptr;
-    KpString filePath;
+    KpFilename filePath;
     long maxNumLogFiles = 40;
     unsigned long long maxLogFileSizeInBytes = 50000000;
     std::atomic<KpLogFile::WriteCallback> writeCallback = nullptr;
     std::atomic<KpLogLevel> logLevel = KpLogInfo;
     std::atomic<KpLogLevel> writeCallbackLogLevel = KpLogOff;
-    bool consoleToLogEnabled = false;
-    bool logToConsoleEnabled = false;
+    std::atomic<bool> consoleToLogEnabled = false;
+    std::atomic<bool> logToConsoleEnabled = false;
     KpLogFile::DateTimeFormat dateTimeFormat = KpLogFile::TimeOnly;
     KpString defaultModule;
     unsigned long long bytesWritten = 0;

@@ -2,6 +2,8 @@
 
 #include <cstdint>
 
+struct dirent;
+
 // What the library asks of the operating system beyond plain POSIX; one source a system answers.
 
 namespace kplib::platform {
@@ -25,5 +27,34 @@ WallTime wallTime();
 
 /// The system's name, as in a build string.
 const char* name();
+
+/// The system's version; zeros where it doesn't tell.
+struct Version {
+    int major, minor, bugFix;
+};
+Version version();
+
+/// What of this machine is online. False, and `counts` as it was, if it doesn't tell.
+struct ProcessorCounts {
+    int packages, physicalCores, logicalProcessors;
+};
+bool processorCounts(ProcessorCounts& counts);
+
+/// Bytes of physical memory; 0 if unknown.
+std::uint64_t totalMemory();
+/// Bytes that processes can have without swapping. False if unknown.
+bool availableMemory(std::uint64_t& bytes);
+
+/// Memory of a process, in bytes. False where the system has no such figures.
+struct ProcessMemory {
+    std::int64_t workingSet, peakWorkingSet, pagefile, peakPagefile;
+};
+bool processMemory(std::int64_t process, ProcessMemory& memory);
+
+/// What this system calls a shared object that others call ".so".
+const char* sharedObjectSuffix();
+
+/// Whether an entry of the folder that is open at a descriptor is a folder itself; a link to one is not.
+bool isFolder(int folder, const dirent& entry);
 
 }  // namespace kplib::platform

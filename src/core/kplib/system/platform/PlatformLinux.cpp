@@ -1,8 +1,29 @@
 #include <kplib/system/platform/Platform.h>
 
+#include <cstdio>
 #include <ctime>
+#include <dirent.h>
+#include <fcntl.h>
+#include <fstream>
+#include <set>
+#include <string>
+#include <sys/stat.h>
+#include <sys/sysinfo.h>
+#include <sys/utsname.h>
+#include <unistd.h>
+#include <utility>
 
 namespace kplib::platform {
+namespace {
+
+/// The number that the file of a processor's topology holds; false for a processor that is offline.
+bool readTopology(long processor, const char* file, int& value)
+{
+    std::ifstream in("/sys/devices/system/cpu/cpu" + std::to_string(processor) + "/topology/" + file);
+    return static_cast<bool>(in >> value);
+}
+
+}  // namespace
 
 std::uint64_t ticks()
 {
@@ -26,6 +47,71 @@ WallTime wallTime()
 const char* name()
 {
     return "Linux";
+}
+
+Version version()
+{
+    utsname system{};
+    Version version{0, 0, 0};
+    if (uname(&system) == 0)
+        std::sscanf(system.release, "%d.%d.%d", &version.major, &version.minor, &version.bugFix);
+    return version;
+}
+
+bool processorCounts(ProcessorCounts& counts)
+{
+    std::set<int> packages;
+    std::set<std::pair<int, int>> cores;
+    int processors = 0;
+    for (long i = 0; i < sysconf(_SC_NPROCESSORS_CONF); ++i) {
+        int package = 0, core = 0;
+        if (!readTopology(i, "physical_package_id", package) || !readTopology(i, "core_id", core))
+            continue;
+        packages.insert(package);
+        cores.emplace(package, core);
+        ++processors;
+    }
+    if (processors == 0)
+        return false;
+    counts = {static_cast<int>(packages.size()), static_cast<int>(cores.size()), processors};
+    return true;
+}
+
+std::uint64_t totalMemory()
+{
+    struct sysinfo info {};
+    return sysinfo(&info) == 0 ? static_cast<std::uint64_t>(info.totalram) * info.mem_unit : 0;
+}
+
+bool availableMemory(std::uint64_t& bytes)
+{
+    std::ifstream in("/proc/meminfo");
+    for (std::string line; std::getline(in, line);) {
+        unsigned long long kibibytes = 0;
+        if (std::sscanf(line.c_str(), "MemAvailable: %llu kB", &kibibytes) == 1) {
+            bytes = kibibytes * 1024;
+            return true;
+        }
+    }
+    return false;
+}
+
+bool processMemory(std::int64_t /*process*/, ProcessMemory& /*memory*/)
+{
+    return false;  // no figures here that mean the same as where these are read
+}
+
+const char* sharedObjectSuffix()
+{
+    return ".so";
+}
+
+bool isFolder(int folder, const dirent& entry)
+{
+    if (entry.d_type != DT_UNKNOWN)
+        return entry.d_type == DT_DIR;
+    struct stat status {};
+    return fstatat(folder, entry.d_name, &status, AT_SYMLINK_NOFOLLOW) == 0 && S_ISDIR(status.st_mode);
 }
 
 }  // namespace kplib::platform

@@ -1,0 +1,231 @@
+#include <kplib/log/KpLogFile.h>
+
+#include <kplib/log/detail/KpLogFilePrivate.h>
+#include <kplib/system/KpDirectory.h>
+#include <kplib/system/KpTmpDir.h>
+
+#include <algorithm>
+#include <cstdlib>
+#include <fcntl.h>
+#include <unistd.h>
+
+namespace {
+
+using Lock = KpScopedLockT<KpMutex>;
+
+/// Leads standard output and standard error to a file or a device; leaves them as they are where that can't be opened.
+bool leadConsoleTo(const char* path, int mode)
+{
+    const int descriptor = ::open(path, O_WRONLY | O_CLOEXEC | mode, 0666);
+    if (descriptor < 0)
+        return false;
+    std::fflush(stdout);
+    std::fflush(stderr);
+    dup2(descriptor, STDOUT_FILENO);
+    dup2(descriptor, STDERR_FILENO);
+    ::close(descriptor);
+    return true;
+}
+
+}  // namespace
+
+KpLogFilePrivate::KpLogFilePrivate() : baseFolder(KpTmpDir::getSystemTmpPath())
+{
+    if (const char* const count = std::getenv("TAMRIN_MAXNUMLOGFILES"))
+        maxNumLogFiles = std::atoi(count);
+    if (const char* const debug = std::getenv("TAMRIN_DEBUG_LOG"); debug && std::atoi(debug) > 0)
+        logLevel = KpLogDebug;
+}
+
+bool KpLogFilePrivate::chunkIsFull() const
+{
+    return file && maxLogFileSizeInBytes != 0 && bytesWritten > maxLogFileSizeInBytes;
+}
+
+/// Opens for appending, always: two files of one second have one name, and no line is lost to that.
+bool KpLogFilePrivate::openFile(const KpFilename& path)
+{
+    if (consoleToLogEnabled)
+        file = leadConsoleTo(path, O_CREAT | O_APPEND) ? stdout : nullptr;
+    else
+        file = std::fopen(path, "ae");
+    filePath = path;
+    bytesWritten = 0;
+    return file != nullptr;
+}
+
+void KpLogFilePrivate::closeFile()
+{
+    if (!file)
+        return;
+    if (consoleToLogEnabled) {
+        leadConsoleTo("/dev/tty", 0);  // where there is none, standard output stays on the file, and usable
+        if (consoleFile)
+            std::fclose(consoleFile);
+        consoleFile = nullptr;
+    }
+    if (file != stdout)
+        std::fclose(file);
+    file = nullptr;
+}
+
+/// Names sort by time. That one more is removed than would do is meant: it is the place of the file being opened.
+void KpLogFilePrivate::cleanUp() const
+{
+    if (maxNumLogFiles == 0 || dateFoldersEnabled || !KpDirectory::isDirectory(baseFolder.c_str()))
+        return;
+    KpDArray<KpString> names;
+    KpDirectory::scanSortedByName(baseFolder.c_str(), names, "*.log");
+    const long excess = names.size() - maxNumLogFiles;
+    for (long i = 0; i <= excess && i < names.size(); ++i)
+        KpFilename(KpString(0, "%s/%s", baseFolder.c_str(), names[i].c_str())).unlink();
+}
+
+bool KpLogFile::open(bool force)
+{
+    const Lock lock(&record_->mutex);
+    if (record_->file && !force)
+        return false;
+    KpString folder, name;
+    KpFilename::generateFilePath(folder, name, record_->baseFolder.c_str(), record_->dateFoldersEnabled, false);
+    if (folder.isEmpty())
+        return false;
+    const KpFilename path = KpString(0, "%s/%s.log", folder.c_str(), name.c_str());
+    const bool isContinued = path == record_->filePath && path.doesExist();
+    FILE* const test = std::fopen(path, "ae");
+    if (!test)
+        return false;
+    std::fclose(test);
+    record_->closeFile();
+    if (!isContinued)
+        record_->cleanUp();
+    return record_->openFile(path);
+}
+
+void KpLogFile::close()
+{
+    const Lock lock(&record_->mutex);
+    record_->closeFile();
+}
+
+bool KpLogFile::append(KpString path)
+{
+    const Lock lock(&record_->mutex);
+    record_->file = std::fopen(path, "ae");  // what was open stays so: the caller may have plans with it
+    record_->filePath = record_->file ? path : KpString();
+    record_->bytesWritten = record_->file ? record_->filePath.fileSize() : 0;
+    return record_->file != nullptr;
+}
+
+bool KpLogFile::isOpen() const
+{
+    const Lock lock(&record_->mutex);
+    return record_->file != nullptr;
+}
+
+KpFilename KpLogFile::filePath() const
+{
+    const Lock lock(&record_->mutex);
+    return record_->filePath;
+}
+
+void KpLogFile::setBaseFolder(const std::string& folder)
+{
+    const Lock lock(&record_->mutex);
+    record_->baseFolder = folder.empty() ? KpTmpDir::getSystemTmpPath() : folder;
+}
+
+std::string KpLogFile::baseFolder() const
+{
+    const Lock lock(&record_->mutex);
+    return record_->baseFolder;
+}
+
+void KpLogFile::setDateFoldersEnabled(bool enabled)
+{
+    const Lock lock(&record_->mutex);
+    record_->dateFoldersEnabled = enabled;
+}
+
+bool KpLogFile::dateFoldersEnabled() const
+{
+    const Lock lock(&record_->mutex);
+    return record_->dateFoldersEnabled;
+}
+
+void KpLogFile::setMaxNumLogFiles(long count)
+{
+    const Lock lock(&record_->mutex);
+    record_->maxNumLogFiles = count;
+}
+
+long KpLogFile::maxNumLogFiles() const
+{
+    const Lock lock(&record_->mutex);
+    return record_->maxNumLogFiles;
+}
+
+void KpLogFile::setMaxLogFileSizeInBytes(unsigned long long size)
+{
+    const Lock lock(&record_->mutex);
+    record_->maxLogFileSizeInBytes = size;
+}
+
+unsigned long long KpLogFile::maxLogFileSizeInBytes() const
+{
+    const Lock lock(&record_->mutex);
+    return record_->maxLogFileSizeInBytes;
+}
+
+bool KpLogFile::chunkIsFull() const
+{
+    const Lock lock(&record_->mutex);
+    return record_->chunkIsFull();
+}
+
+void KpLogFile::chunkTryOpenNext()
+{
+    const Lock lock(&record_->mutex);
+    const KpFilename before = record_->filePath;
+    if (open(true))
+        printf("This file continues %s", before.c_str());
+}
+
+void KpLogFile::cleanUp()
+{
+    const Lock lock(&record_->mutex);
+    record_->cleanUp();
+}
+
+/// Stores a flag of the console; where a file is open that takes a new one.
+void KpLogFile::setConsoleFlag(std::atomic<bool>& flag, bool enabled)
+{
+    const Lock lock(&record_->mutex);
+    if (flag == enabled)
+        return;
+    const bool wasOpen = record_->file != nullptr;
+    record_->closeFile();  // by the flag as it was
+    flag = enabled;
+    if (wasOpen)
+        chunkTryOpenNext();
+}
+
+void KpLogFile::setConsoleToLogEnabled(bool enabled)
+{
+    setConsoleFlag(record_->consoleToLogEnabled, enabled);
+}
+
+bool KpLogFile::consoleToLogEnabled() const
+{
+    return record_->consoleToLogEnabled;
+}
+
+void KpLogFile::setLogToConsoleEnabled(bool enabled)
+{
+    setConsoleFlag(record_->logToConsoleEnabled, enabled);
+}
+
+bool KpLogFile::logToConsoleEnabled() const
+{
+    return record_->logToConsoleEnabled;
+}

@@ -1,0 +1,53 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+#include <cstdint>
+
+/// The machine's processors: counts and features. Read once on first use; any thread may ask.
+class KPLIB_API KpCPUInfo {
+public:
+    enum Feature : unsigned {
+        MMX = 1,
+        MMXExtensions = 2,
+        ThreeDNow = 4,
+        ThreeDNowExtensions = 8,
+        SSE = 16,
+        SSE2 = 32,
+        ConditionalMove = 64,
+        SSE3 = 512,
+        SSSE3 = 1024,
+        SSE4_1 = 2048,
+        SSE4_2 = 4096,
+        AVX = 8192,
+    };
+
+    static const KpCPUInfo& instance();
+
+    /// Whether the counts were read from the system; else each is 1.
+    bool cpuInfoSucceed() const { return succeeded_; }
+    /// Packages, cores of a package, logical processors of a core.
+    int getCPUCount() const { return cpuCount_; }
+    int getCoreCount() const { return coreCount_; }
+    int getLPUCount() const { return lpuCount_; }
+
+    /// Whether the processor has the CPUID instruction.
+    bool hasCPUID() const;
+    /// The highest function of CPUID, and of its extended ones.
+    unsigned getMaxCPUIDFunc() const;
+    unsigned getMaxCPUIDExtFunc() const;
+    /// The features as a mask of Feature.
+    unsigned detectCPUFeatures() const;
+    /// "GenuineIntel" and the like, 12 characters; empty without CPUID.
+    const char* vendor() const { return vendor_; }
+
+private:
+    KpCPUInfo();
+    bool initCPUInfo();
+    void readCPUID();
+
+    bool succeeded_ = false;
+    char vendor_[13] = {};
+    std::uint32_t features_[4] = {};  // EDX and ECX of function 1, EDX and ECX of function 0x80000001
+    int cpuCount_ = 1, coreCount_ = 1, lpuCount_ = 1;
+};

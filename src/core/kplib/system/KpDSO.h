@@ -1,0 +1,77 @@
+#pragma once
+
+#include <kplib/foundation/KpDArray.h>
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpString.h>
+
+#include <concepts>
+
+class KpFilename;
+
+/// A shared object that is loaded at run time: a plug-in package, by its short name.
+///
+/// What is loaded stays in the process, also beyond close() and the object. One thread at a time; the static members
+/// are set before the first load.
+class KPLIB_API KpDSO {
+public:
+    /// Folders to search, the last one first; the texts stay the application's.
+    static KpDArray<char*> dsoSearchPath;
+    /// Other than 0 for more lines in the log.
+    static int verbose;
+
+    /// Opens `name`, if it isn't null; isOpen() tells whether that worked.
+    explicit KpDSO(const char* name);
+    KpDSO(const KpDSO&) = delete;
+    KpDSO& operator=(const KpDSO&) = delete;
+    ~KpDSO();
+
+    /// Loads the object that fixPath() makes of `name`: an absolute path as it is, else below the folders of the search
+    /// path, and at last by the system's own search. Calls its function orlinpackage_NAME_init(), if it has one, NAME
+    /// being the file's name without "lib" and what follows its last dot. 0, or -1 with a line in the log unless
+    /// `quiet`.
+    int open(const char* name, bool quiet);
+    /// Forgets the object, which stays loaded.
+    void close();
+    bool isOpen() const;
+
+    /// Makes "libNAME.so" of a bare NAME, and leaves what has a dot.
+    static void fixPath(KpFilename& name);
+    /// Loads the file `path`; 0, or -1. Either way `message` tells.
+    int tryOpen(const char* path, KpString& message);
+
+    /// The address of a symbol, also if it has a '_' in front there; null if there is none or nothing is open.
+    void* getSymbol(const char* name) const;
+
+    // Call a function of the object with zero to five pointers. Without an object or such a symbol nothing is called,
+    // and the result is 0.
+
+    template <std::convertible_to<void*>... Arguments>
+    requires(sizeof...(Arguments) <= 5) void execute(const char* name, Arguments... arguments) const
+    {
+        call<void>(name, static_cast<void*>(arguments)...);
+    }
+    template <std::convertible_to<void*>... Arguments>
+    requires(sizeof...(Arguments) <= 5) int executeInt(const char* name, Arguments... arguments) const
+    {
+        return call<int>(name, static_cast<void*>(arguments)...);
+    }
+    template <std::convertible_to<void*>... Arguments>
+    requires(sizeof...(Arguments) <= 5) void* executePtr(const char* name, Arguments... arguments) const
+    {
+        return call<void*>(name, static_cast<void*>(arguments)...);
+    }
+
+private:
+    struct Private;
+
+    template <typename Result, typename... Pointers>
+    Result call(const char* name, Pointers... pointers) const
+    {
+        void* const symbol = isOpen() ? getSymbol(name) : nullptr;
+        return symbol ? reinterpret_cast<Result (*)(Pointers...)>(symbol)(pointers...) : Result();
+    }
+    int load(const KpFilename& name, KpString& messages);
+    void initPackage(const KpFilename& name) const;
+
+    Private* private_;
+};

@@ -1,0 +1,26 @@
+#pragma once
+
+#include <kplib/foundation/KpDArray.h>
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpString.h>
+
+/// The machine's memory and processes, asked anew at each call.
+class KPLIB_API KpSysInfo {
+public:
+    struct ProcessEntry {
+        KpString name;  ///< the first word of the command
+        long long processId = 0;
+        KpString command;  ///< the same text
+    };
+
+    /// Bytes of physical memory; 0 if unknown.
+    static unsigned long long physmem_total();
+    /// Bytes that processes can have, at most what 32 bits hold; a quarter of the total if unknown.
+    static unsigned int physmem_available();
+    /// Both are the total physical memory.
+    static unsigned long long virtualmem_total() { return physmem_total(); }
+    static unsigned long long virtualmem_available() { return physmem_total(); }
+
+    /// All processes, in place of the content, by the command "ps"; false if it can't be started.
+    static bool process_list(KpDArray<ProcessEntry>& list);
+};
