@@ -10,6 +10,10 @@ template <typename T>
 class KpThreadLocalStorage;
 template <typename Lock>
 class KpScopedLockT;
+template <typename T, T empty>
+class KpID;
+template <typename T>
+class KpID_C;
 
 class KpAllocator;
 class KpException;
@@ -32,6 +36,13 @@ class KpInterfaceOwnerDefaultImpl;
 class KpEditable;
 class KpEditingListener;
 
+struct Kp128;
+class KpFrameID;
+class KpRemotificationID;
+class KpTransferID;
+class KpUniqueID;
+class TmSessionContextID;
+
 class KpLogFile;
 class KpMessageCollector;
 class KpResult;
@@ -41,11 +52,25 @@ class HxParamBundle;
 class HxParamEditCheck;
 class HxParameter;
 
+class KpBox2f;
+class KpBox3f;
+class KpBox3i;
 class KpCutBoxPlane;
 class KpCutBoxPlaneDouble;
 class KpLine;
+class KpMat3f;
+class KpMat4f;
 class KpPlane;
+class KpRotation;
 class KpSphere;
+class KpVec2f;
+class KpVec2i;
+class KpVec3d;
+class KpVec3f;
+class KpVec3i;
+class KpVec3l;
+class KpVec4f;
+class KpVec4i;
 
 class KpColor;
 class KpRawData;
@@ -60,6 +85,14 @@ class KpScopedWatch;
 class KpWatch;
 
 class KpBuildInfo;
+class KpCoder;
 class KpDataBase;
 class KpTable;
+class KpUUID;
 class KpVersion;
+
+namespace KpLib {
+class MD5;
+class MD5Coder;
+class MD5List;
+}  // namespace KpLib
