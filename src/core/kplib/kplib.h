@@ -2,15 +2,20 @@
 
 // All of the library, for a quick start; headers of their own keep a build faster.
 
+#include <kplib/foundation/Kp128.h>
 #include <kplib/foundation/KpAllocator.h>
 #include <kplib/foundation/KpDArray.h>
 #include <kplib/foundation/KpEditable.h>
 #include <kplib/foundation/KpException.h>
 #include <kplib/foundation/KpExport.h>
 #include <kplib/foundation/KpForward.h>
+#include <kplib/foundation/KpFrameID.h>
 #include <kplib/foundation/KpHandable.h>
 #include <kplib/foundation/KpHandableThreaded.h>
 #include <kplib/foundation/KpHandle.h>
+#include <kplib/foundation/KpHash.h>
+#include <kplib/foundation/KpID.h>
+#include <kplib/foundation/KpInt64ID.h>
 #include <kplib/foundation/KpInterface.h>
 #include <kplib/foundation/KpInterfaceOwner.h>
 #include <kplib/foundation/KpInterfaceOwnerDefaultImpl.h>
@@ -18,14 +23,18 @@
 #include <kplib/foundation/KpMemoryException.h>
 #include <kplib/foundation/KpMutex.h>
 #include <kplib/foundation/KpPrimType.h>
+#include <kplib/foundation/KpRemotificationID.h>
 #include <kplib/foundation/KpStdStringTokenizer.h>
 #include <kplib/foundation/KpString.h>
 #include <kplib/foundation/KpStringTokenizer.h>
 #include <kplib/foundation/KpThreadLocalStorage.h>
+#include <kplib/foundation/KpTransferID.h>
 #include <kplib/foundation/KpTypeInfo.h>
 #include <kplib/foundation/KpTypedObject.h>
+#include <kplib/foundation/KpUniqueID.h>
 #include <kplib/foundation/KpWaitCondition.h>
 #include <kplib/foundation/StringUtils.h>
+#include <kplib/foundation/TmSessionContextID.h>
 #include <kplib/geometry/KpAbstractCoordinateSystem.h>
 #include <kplib/geometry/KpBox2f.h>
 #include <kplib/geometry/KpBox3Base.h>
@@ -78,16 +87,21 @@
 #include <kplib/rawdata/KpTypedPointer.h>
 #include <kplib/system/KpBuildInfo.h>
 #include <kplib/system/KpCPUInfo.h>
+#include <kplib/system/KpCoder.h>
 #include <kplib/system/KpDSO.h>
 #include <kplib/system/KpDataBase.h>
 #include <kplib/system/KpDirectory.h>
 #include <kplib/system/KpFilename.h>
 #include <kplib/system/KpFilenameCollector.h>
+#include <kplib/system/KpMD5.h>
+#include <kplib/system/KpMD5Coder.h>
+#include <kplib/system/KpMD5List.h>
 #include <kplib/system/KpOSInfo.h>
 #include <kplib/system/KpProcessInfo.h>
 #include <kplib/system/KpSysInfo.h>
 #include <kplib/system/KpTable.h>
 #include <kplib/system/KpTmpDir.h>
+#include <kplib/system/KpUUID.h>
 #include <kplib/system/KpVersion.h>
 #include <kplib/system/KpWatch.h>
 #include <kplib/threads/KpProgressGuiInterface.h>

@@ -10,6 +10,10 @@ template <typename T>
 class KpThreadLocalStorage;
 template <typename Lock>
 class KpScopedLockT;
+template <typename T, T empty>
+class KpID;
+template <typename T>
+class KpID_C;
 
 class KpAllocator;
 class KpException;
@@ -32,6 +36,13 @@ class KpInterfaceOwnerDefaultImpl;
 class KpEditable;
 class KpEditingListener;
 
+struct Kp128;
+class KpFrameID;
+class KpRemotificationID;
+class KpTransferID;
+class KpUniqueID;
+class TmSessionContextID;
+
 class KpLogFile;
 class KpMessageCollector;
 class KpResult;
@@ -42,19 +53,32 @@ class HxParamEditCheck;
 class HxParameter;
 
 class KpAbstractCoordinateSystem;
+class KpBox2f;
+class KpBox3f;
+class KpBox3i;
 class KpCoordinateSystem;
 class KpFrameOfReference;
+class KpOrientationLetters;
 class KpProjector;
 class KpSphereProjector;
 class KpSphereSheetProjector;
 class KpViewVolume;
-class KpOrientationLetters;
-
 class KpCutBoxPlane;
 class KpCutBoxPlaneDouble;
 class KpLine;
+class KpMat3f;
+class KpMat4f;
 class KpPlane;
+class KpRotation;
 class KpSphere;
+class KpVec2f;
+class KpVec2i;
+class KpVec3d;
+class KpVec3f;
+class KpVec3i;
+class KpVec3l;
+class KpVec4f;
+class KpVec4i;
 
 class KpColor;
 class KpRawData;
@@ -70,6 +94,7 @@ class KpWatch;
 
 class KpBuildInfo;
 class KpCPUInfo;
+class KpCoder;
 class KpDataBase;
 class KpDirectory;
 class KpDSO;
@@ -80,4 +105,11 @@ class KpProcessInfo;
 class KpSysInfo;
 class KpTable;
 class KpTmpDir;
+class KpUUID;
 class KpVersion;
+
+namespace KpLib {
+class MD5;
+class MD5Coder;
+class MD5List;
+}  // namespace KpLib

@@ -2,6 +2,7 @@
 
 #include <cmath>
 #include <concepts>
+#include <cstdint>
 #include <iosfwd>
 
 /// What the fixed-size vectors share: `Size` components of type `Component` and nothing else, so that the object is its
@@ -156,3 +157,13 @@ private:
 
     Component v_[Size];
 };
+
+/// A hash of the lowest 5 bits of each component, x in the highest place, as those of KpHash.h.
+template <typename Vector, int Size>
+constexpr unsigned int kp_hash(const KpVecBase<Vector, std::int32_t, Size>& v)
+{
+    unsigned int h = 0;
+    for (const std::int32_t component : v)
+        h = h << 5 | (static_cast<unsigned int>(component) & 31);
+    return h;
+}

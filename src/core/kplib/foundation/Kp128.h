@@ -1,0 +1,14 @@
+#pragma once
+
+#include <compare>
+#include <cstdint>
+
+/// A plain value of 128 bits: two unsigned words, of which the first decides the order.
+struct Kp128 {
+    std::uint64_t first = 0;
+    std::uint64_t second = 0;
+
+    friend constexpr auto operator<=>(const Kp128& a, const Kp128& b) = default;
+};
+
+static_assert(sizeof(Kp128) == 16);

@@ -1,0 +1,87 @@
+#pragma once
+
+#include <array>
+#include <bit>
+#include <compare>
+#include <concepts>
+#include <cstddef>
+#include <cstdint>
+#include <functional>
+#include <iosfwd>
+#include <type_traits>
+
+/// An identifier that is a number of type T on the wire; `empty` is the number that means that there is none.
+///
+/// Each kind of identifier is a type of its own, so that one can't be taken for another. A plain value of the size of
+/// T.
+template <typename T, T empty>
+class KpID {
+public:
+    /// What a derived identifier is an instance of.
+    using IDType = KpID;
+
+    /// No id.
+    constexpr KpID() = default;
+    constexpr explicit KpID(const T& value) : value_(value) {}
+
+    constexpr const T& value() const { return value_; }
+    constexpr void valueSet(const T& value) { value_ = value; }
+
+    constexpr bool isEmpty() const { return value_ == empty; }
+    constexpr bool isNotEmpty() const { return value_ != empty; }
+    constexpr void makeEmpty() { value_ = empty; }
+
+    /// The order of the numbers; an empty id has no place of its own in it.
+    friend constexpr auto operator<=>(const KpID& a, const KpID& b) = default;
+
+    template <typename Traits>
+    friend std::basic_ostream<char, Traits>& operator<<(std::basic_ostream<char, Traits>& out, const KpID& id)
+    {
+        return out << id.value_;
+    }
+
+private:
+    T value_ = empty;
+};
+
+/// An identifier that is a class of two 64-bit words, such as Kp128; zero in both means that it is not valid.
+template <typename T>
+class KpID_C {
+public:
+    /// Not valid.
+    constexpr KpID_C() = default;
+    constexpr explicit KpID_C(const T& value) : value_(value) {}
+
+    constexpr const T& value() const { return value_; }
+    constexpr void valueSet(const T& value) { value_ = value; }
+
+    constexpr bool isValid() const { return words() != Words{}; }
+
+    friend constexpr bool operator==(const KpID_C& a, const KpID_C& b) { return a.words() == b.words(); }
+    /// The first word decides, then the second, both unsigned and in the machine's byte order.
+    friend constexpr std::strong_ordering operator<=>(const KpID_C& a, const KpID_C& b)
+    {
+        return a.words() <=> b.words();
+    }
+
+private:
+    using Words = std::array<std::uint64_t, 2>;
+    friend struct std::hash<KpID_C>;
+
+    static_assert(sizeof(T) == sizeof(Words) && std::is_trivially_copyable_v<T>);
+    constexpr Words words() const { return std::bit_cast<Words>(value_); }
+
+    T value_{};
+};
+
+/// For KpID and all that derives from one.
+template <typename ID>
+requires std::derived_from<ID, typename ID::IDType>
+struct std::hash<ID> {
+    std::size_t operator()(const ID& id) const { return static_cast<std::size_t>(id.value()); }
+};
+
+template <typename T>
+struct std::hash<KpID_C<T>> {
+    std::size_t operator()(const KpID_C<T>& id) const { return id.words()[0] ^ id.words()[1]; }
+};

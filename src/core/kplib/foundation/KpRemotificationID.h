@@ -1,0 +1,27 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpID.h>
+
+/// Names an object that peers call across the connection. Empty: 0.
+///
+/// The values below RS_LAST_SINGLETON_ID belong to the singletons of the server side, so that peers can address them
+/// before they have exchanged any other id.
+class KPLIB_API KpRemotificationID : public KpID<int, 0> {
+public:
+    using KpID::KpID;
+
+    static constexpr int RS_SERVER_PEER = 1;
+    static constexpr int RS_BACKEND_PEER = 2;
+    static constexpr int RS_TRANSFER_MANAGER = 3;
+    static constexpr int RS_LOAD_MANAGER = 4;
+    static constexpr int RS_DATA_MANAGER = 5;
+    static constexpr int RS_VOLUME_INFO_CACHE = 6;
+    static constexpr int RS_ERROR_NOTIFIER = 7;
+    static constexpr int RS_POWERSCRIBE_CTRL = 9;
+    static constexpr int RS_MAX = 9;  ///< the last singleton there is
+    static constexpr int RS_LAST_SINGLETON_ID = 20;
+
+    /// The name of the singleton's class, null for 0 and 8. Not checked: the value has to be from 0 to RS_MAX.
+    const char* singletonClassName() const;
+};

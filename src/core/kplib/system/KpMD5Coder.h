@@ -1,0 +1,57 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpForward.h>
+#include <kplib/system/KpCoder.h>
+#include <kplib/system/KpMD5.h>
+
+#include <concepts>
+#include <string>
+
+namespace KpLib {
+
+/// The types whose memory image MD5Coder takes as it is.
+template <typename T, typename... Types>
+concept OneOf = (std::same_as<T, Types> || ...);
+template <typename T>
+concept MD5Image = OneOf<T, char, unsigned char, short, unsigned short, int, unsigned int, float, long, unsigned long,
+                         long long, unsigned long long, MD5, KpUniqueID, KpVec2i, KpVec2f, KpVec3i, KpVec3f, KpVec3l,
+                         KpVec4f, KpPlane, KpBox3i, KpBox3f, KpMat3f, KpMat4f>;
+
+/// An MD5 over values: `MD5Coder() << dims << origin << name`, then md5().
+///
+/// Values count with their bytes in memory, so the digest is not portable between byte orders. One thread at a time.
+class KPLIB_API MD5Coder {
+public:
+    /// Takes the bytes of the value. Its header is the caller's to include.
+    template <MD5Image T>
+    MD5Coder& operator<<(const T& value)
+    {
+        feed(&value, sizeof value);
+        return *this;
+    }
+    /// The list's hash().
+    MD5Coder& operator<<(const MD5List& list);
+
+    // A text is led by its length in 8 bytes. KpString counts its terminator and feeds it, std::string does not: the
+    // same text has another digest from each, and that is to stay.
+
+    MD5Coder& operator<<(const KpString& text);
+    MD5Coder& operator<<(const std::string& text);
+    /// As the KpString made of it.
+    MD5Coder& operator<<(const char* text);
+
+    /// Takes `n` bytes; for none the 32-bit number 4711, so that an empty block changes the digest too.
+    MD5Coder& append(const void* data, unsigned long n);
+
+    /// The digest of all that was taken. It ends this run; what comes next begins another one.
+    MD5 md5();
+
+private:
+    void feed(const void* data, unsigned long n);
+
+    KpCoder coder_;
+    bool isOpen_ = true;
+};
+
+}  // namespace KpLib
