@@ -2,6 +2,7 @@
 
 #include "DicomTree.h"
 
+#include <kplib/log/KpLogFile.h>
 #include <kplib/param/HxParameter.h>
 #include <kplib/rawdata/KpRawData.h>
 #include <kplib/threads/ProgressScope.h>
@@ -355,6 +356,8 @@ KpResult readSeries(const Series& series, KpProgressInterface& progress, Volume&
         if (read.isBad())
             return read;
         place(slice, stored.data(), volume, static_cast<long>(i));
+        getTheLogInstance().tracef(KpLogInfo, "Series", "slice %zu is image %d, '%s'", i, slice.number,
+                                   slice.path.c_str());
         if (i == 0)
             fillHeader(root, file);
         progress.nextStep();

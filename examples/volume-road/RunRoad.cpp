@@ -1,9 +1,11 @@
 #include "RunRoad.h"
 
 #include "DicomSeries.h"
+#include "JobLog.h"
 #include "Oblique.h"
 #include "Report.h"
 
+#include <kplib/log/KpLogFile.h>
 #include <kplib/rawdata/KpRawData.h>
 #include <kplib/system/KpWatch.h>
 #include <kplib/threads/ProgressScope.h>
@@ -115,7 +117,11 @@ private:
         watch_.start();
         return true;
     }
-    void ends(const char* name) { stages_.push_back({name, watch_.stop2()}); }
+    void ends(const char* name)
+    {
+        stages_.push_back({name, watch_.stop2()});
+        getTheLogInstance().printf("%s: %.3f s", name, stages_.back().seconds);
+    }
 
     KpProgressInterface& progress_;
     KpWatch watch_;
@@ -131,6 +137,7 @@ KpResult runRoad(const char* folder, const std::string& uid, const std::string& 
     if (KpResult opened = out.open(target); opened.isBad())
         return opened;
     const ProgressScope scope(&progress);
+    const JobLog log(out.working());
     progress.startWorking(8, "");
     Road road(progress);
     Series series;
@@ -138,8 +145,10 @@ KpResult runRoad(const char* folder, const std::string& uid, const std::string& 
     Volume volume, mean, maximum, shown;
     Window window;
     road.nested("look for images", [&] { return scanSeries(folder, uid, progress, series); });
-    for (const std::string& warning : series.warnings)
+    for (const std::string& warning : series.warnings) {
         std::fprintf(stderr, "volume-road: warning: %s\n", warning.c_str());
+        getTheLogInstance().warn(nullptr, warning.c_str());
+    }
     road.nested("read images", [&] { return readSeries(series, progress, volume, root); });
     road.nested("reduce by mean", [&] {
         mean = reducedByMean(volume, {2, 2, 2}, progress);
