@@ -205,8 +205,9 @@ TEST(KpTable, agreesWithAMapThroughMovesOfRowsAndCells)
     for (int i = 0; i < 9000; ++i) {
         pair.step();
         ASSERT_TRUE(pair.database.check()) << i;
-        if (i % 1000 == 999)
+        if (i % 1000 == 999) {
             ASSERT_NO_FATAL_FAILURE(pair.expectHolds(pair.database)) << i;
+        }
     }
     ASSERT_GT(pair.models[0].size(), 600U);  // beyond the first block
 }

@@ -1,0 +1,290 @@
+#include <kplib/kplib.h>
+#include <kplib/system/detail/KpCoderKernels.h>
+
+#include <filesystem>
+#include <fstream>
+#include <gtest/gtest.h>
+#include <memory>
+#include <numeric>
+#include <openssl/evp.h>
+#include <random>
+#include <sys/resource.h>
+#include <unordered_set>
+
+using namespace KpLib;
+using namespace kplib::detail;
+
+namespace {
+
+using Bytes = std::vector<unsigned char>;
+
+Bytes noise(long size)
+{
+    static std::mt19937 random(5);
+    Bytes bytes(static_cast<size_t>(size));
+    std::generate(bytes.begin(), bytes.end(), [] { return static_cast<unsigned char>(random()); });
+    return bytes;
+}
+
+std::vector<long> someLengths()
+{
+    std::vector<long> lengths(301);
+    std::iota(lengths.begin(), lengths.end(), 0);
+    lengths.insert(lengths.end(), {511, 1024, 4099, 65536, 1000003});
+    return lengths;
+}
+
+// The definition, bit by bit.
+std::uint32_t crcOfBits(std::uint32_t crc, const unsigned char* data, long n)
+{
+    for (long i = 0; i < 8 * n; ++i) {
+        const bool bit = data[i / 8] >> (7 - i % 8) & 1, top = crc >> 31;
+        crc = crc << 1 ^ (bit != top ? 0x04C11DB7 : 0);
+    }
+    return crc;
+}
+
+TEST(Crc, ofEveryPathEqualsTheDefinition)
+{
+    for (const long n : someLengths()) {
+        const long start = n % 17;
+        const Bytes bytes = noise(start + n);  // of exact size, so that a read past the end shows
+        const auto before = static_cast<std::uint32_t>(n * 0x9E3779B9);
+        const std::uint32_t expected = crcOfBits(before, bytes.data() + start, n);
+        for (const auto& path : crcPaths()) {
+            if (path.usable) {
+                ASSERT_EQ(path.run(before, bytes.data() + start, n), expected) << path.name << ' ' << n;
+            }
+        }
+    }
+}
+
+TEST(Crc, isWhatCksumPrints)
+{
+    namespace fs = std::filesystem;
+    const fs::path folder = fs::path(testing::TempDir()) / "kplib_cksum";
+    fs::create_directories(folder);
+    std::vector<unsigned int> expected;
+    for (const long n : someLengths()) {
+        const Bytes bytes = noise(n);
+        std::ofstream(folder / std::to_string(1000 + expected.size()), std::ios::binary)
+            .write(reinterpret_cast<const char*>(bytes.data()), n);
+        expected.push_back(KpCoder::crc(bytes.data(), static_cast<unsigned int>(n)));
+    }
+    const std::unique_ptr<FILE, int (*)(FILE*)> pipe(popen(("cksum " + folder.string() + "/*").c_str(), "r"), pclose);
+    for (const unsigned int crc : expected) {
+        unsigned int printed = 0;
+        ASSERT_EQ(std::fscanf(pipe.get(), "%u %*[^\n]", &printed), 1);
+        EXPECT_EQ(crc, printed);
+    }
+    fs::remove_all(folder);
+    EXPECT_EQ(KpCoder::crc(reinterpret_cast<const unsigned char*>("123456789"), 9), 0x377A6011U);
+}
+
+MD5 reference(const std::string& bytes)
+{
+    MD5 digest;
+    EVP_Digest(bytes.data(), bytes.size(), digest.data(), nullptr, EVP_md5(), nullptr);
+    return digest;
+}
+
+std::string hex(const MD5& digest)
+{
+    KpString text;
+    digest.toString(text);
+    return text.c_str();
+}
+
+template <typename T>
+std::string image(const T& value)
+{
+    return std::string(reinterpret_cast<const char*>(&value), sizeof value);
+}
+
+TEST(KpCoder, givesTheMD5OfPiecesOfAnySize)
+{
+    EXPECT_EQ(hex(MD5Coder().md5()), "D41D8CD98F00B204E9800998ECF8427E");
+    std::mt19937 random(8);
+    KpCoder coder;
+    MD5 digest;
+    for (const long n : someLengths()) {
+        const Bytes bytes = noise(n);
+        coder.crcMD5Init();
+        for (long done = 0, size = 0; done < n; done += size) {
+            size = std::min<long>(n - done, random() % (random() % 4 ? 70 : 5000));
+            coder.crcMD5Update(bytes.data() + done, static_cast<unsigned int>(size));
+        }
+        coder.crcMD5Final();
+        coder.crcMD5Query(digest.data());
+        ASSERT_EQ(hex(digest), hex(reference(std::string(bytes.begin(), bytes.end())))) << n;
+    }
+}
+
+TEST(MD5Coder, countsBeyond32Bits)
+{
+    const std::string bytes(513L << 20, 'x');
+    MD5Coder coder;
+    for (long i = 0; i < 513; ++i)
+        coder.append(bytes.data() + (i << 20), 1 << 20);
+    EXPECT_EQ(hex(coder.md5()), hex(reference(bytes)));
+}
+
+TEST(Hex, ofEveryPathEqualsPrintfAndReadsBack)
+{
+    for (const long n : {0, 1, 2, 15, 16, 17, 31, 33, 63, 65, 255, 1001}) {
+        const Bytes bytes = noise(n);
+        for (const bool upperCase : {true, false}) {
+            KpString expected, digits, text("before");
+            for (const unsigned char byte : bytes) {
+                digits.printf(upperCase ? "%02X" : "%02x", byte);
+                expected += digits;
+            }
+            for (const auto& path : hexPaths()) {
+                std::string written(2 * n, ' ');
+                if (path.usable)
+                    path.run(bytes.data(), written.data(), n, upperCase ? 'A' : 'a');
+                EXPECT_TRUE(!path.usable || expected == written.c_str()) << path.name << ' ' << n;
+            }
+            KpCoder::dataToHexString(bytes.data(), static_cast<unsigned int>(n), text, upperCase);
+            EXPECT_EQ(text, expected);
+            Bytes back(n);
+            KpCoder::hexStringToData(back.data(), text);
+            EXPECT_EQ(back, bytes);
+        }
+    }
+}
+
+TEST(Hex, takesAnyCharacterUntilTheNul)
+{
+    const std::pair<const char*, Bytes> cases[] = {{"aFA", {0xAF, 7}}, {"G0/1", {0x00, 0xF1}}, {"1g@z", {0x20, 0x23}}};
+    for (const auto& [text, expected] : cases) {
+        Bytes bytes(2, 7);
+        KpCoder::hexStringToData(bytes.data(), text);
+        EXPECT_EQ(bytes, expected) << text;
+    }
+}
+
+TEST(MD5, isNullUnlessItsTextHas32Characters)
+{
+    const char* const text = "0123456789ABCDEFFEDCBA9876543210";
+    MD5 digest;
+    EXPECT_EQ(hex(digest), "");
+    digest.fromString(text);
+    EXPECT_EQ(hex(digest), text);
+    EXPECT_EQ(::kp_hash(digest), 0x67452301U);
+    for (const char* other : {"0123456789ABCDEFFEDCBA987654321", "0123456789ABCDEFFEDCBA98765432100", ""}) {
+        MD5 wrong = digest;
+        wrong.fromString(other);
+        EXPECT_TRUE(wrong.isNull()) << other;
+    }
+}
+
+TEST(MD5List, hashesFromTheBackWhatItHoldsNow)
+{
+    std::vector<MD5> ascending(5);  // each of these bytes counts more than the one before, whatever that is
+    for (int i = 1; i < 5; ++i)
+        ascending[i].data()[std::array{0, 8, 15, 0, 7}[i]] = static_cast<unsigned char>(8 - i);
+    MD5List inOrder(true), asGiven;
+    std::string backwards;
+    for (const int i : {3, 1, 4, 0, 2}) {
+        for (int j = 0; j < 5; ++j)
+            EXPECT_EQ(MD5::compare(ascending[i], ascending[j]), i < j ? -1 : i > j) << i << ' ' << j;
+        inOrder.insert(ascending[i]);
+        asGiven.insert(ascending[i]);
+        backwards.insert(0, image(ascending[i]));
+        EXPECT_EQ(hex(asGiven.hash()), hex(reference(backwards)));
+        EXPECT_EQ(hex(asGiven.hash()), hex(reference(backwards))) << "from the cache";
+    }
+    EXPECT_TRUE(std::equal(ascending.begin(), ascending.end(), inOrder.items().begin()));
+    EXPECT_NE(inOrder.hash(), asGiven.hash());
+}
+
+TEST(MD5Coder, takesTheBytesOfValues)
+{
+    MD5Coder coder;
+    std::string bytes;
+    const auto take = [&](size_t size, const auto&... values) {
+        ((coder << values, bytes += image(values)), ...);
+        EXPECT_EQ(std::max({sizeof values...}), size);
+    };
+    take(1, 'a', static_cast<unsigned char>(200));
+    take(2, short(-2), static_cast<unsigned short>(3));
+    take(4, -1, 2U, 0.5F);
+    take(8, 1L, 2UL, -3LL, 4ULL, KpVec2i(1, 2), KpVec2f(1, 2), KpUniqueID(77));
+    take(12, KpVec3i(1, 2, 3), KpVec3f(1, 2, 3));
+    take(16, KpVec4f(1, 2, 3, 4), KpPlane(KpVec3f(0, 0, 1), 5), reference("x"));
+    take(24, KpVec3l(1, 2, 3), KpBox3i(1, 2, 3, 4, 5, 6), KpBox3f(1, 2, 3, 4, 5, 6));
+    take(36, KpMat3f::identity());
+    take(64, KpMat4f::identity());
+    MD5List list;
+    list.insert(reference("y"));
+    coder << list;
+    EXPECT_EQ(coder.md5(), reference(bytes + image(list.hash())));
+}
+
+TEST(MD5Coder, framesTextsAndTellsEmptyBlocks)
+{
+    const std::string withNul("a\0b", 3);
+    const std::pair<MD5, std::string> cases[] = {
+        {(MD5Coder() << KpString("ab")).md5(), image(3L) + std::string("ab", 3)},
+        {(MD5Coder() << KpString(KpString::NoMemory())).md5(), image(0L)},
+        {(MD5Coder() << static_cast<const char*>(nullptr)).md5(), image(1L) + std::string(1, '\0')},
+        {(MD5Coder() << withNul).md5(), image(3L) + withNul},
+        {(MD5Coder() << std::string()).md5(), image(0L)},
+        {MD5Coder().append("abc", 3).md5(), "abc"},
+        {MD5Coder().append(nullptr, 0).md5(), image(4711)},
+    };
+    for (const auto& [digest, bytes] : cases)
+        EXPECT_EQ(hex(digest), hex(reference(bytes))) << testing::PrintToString(bytes);
+    MD5Coder coder;
+    coder << 1;
+    EXPECT_EQ(coder.md5(), coder.md5());
+    coder << 2;
+    EXPECT_EQ(coder.md5(), reference(image(2))) << "the run after the digest is another one";
+}
+
+TEST(KpUUID, goesThroughItsTexts)
+{
+    KpUUID uuid;
+    EXPECT_EQ(uuid.toString(), std::string(32, '0').c_str());
+    uuid.fromString("0123456789ABCDEFfedcba9876543210");
+    EXPECT_EQ(kp_hash(uuid), 0x10325476U);
+    EXPECT_EQ(qHash(KpID_C<KpUUID>(uuid)), 0x10325476U);
+    const std::string formatted = "{01234567-89AB-CDEF-FEDC-BA9876543210}";
+    EXPECT_EQ(uuid.toFormattedString(), formatted.c_str());
+    KpUUID back;
+    back.fromFormattedString(formatted.c_str());
+    EXPECT_EQ(back, uuid);
+    for (const size_t place : {0, 9, 14, 19, 24, 37, 38}) {
+        std::string wrong = formatted + (place == 38 ? "}" : "");
+        wrong[place] = '0';
+        back.fromFormattedString(wrong.c_str());
+        EXPECT_EQ(back, KpUUID()) << wrong;
+    }
+    uuid.fromString("0123456789ABCDEFfedcba987654321");
+    EXPECT_EQ(uuid, KpUUID());
+}
+
+TEST(KpUUID, isRandomOrZeroWithoutASource)
+{
+    KpUUID any;
+    std::unordered_set<KpUUID> all;
+    for (int i = 0; i < 64; ++i) {
+        const KpUUID uuid = *all.insert(KpUUID::generateUUID()).first;
+        for (int k = 0; k < 16; ++k)
+            any.data()[k] |= uuid.data()[k];
+    }
+    EXPECT_EQ(all.size(), 64U);
+    EXPECT_EQ(any.toString(), std::string(32, 'F').c_str()) << "bits that are never set";
+
+    rlimit before{};
+    getrlimit(RLIMIT_NOFILE, &before);
+    const rlimit none{0, before.rlim_max};
+    setrlimit(RLIMIT_NOFILE, &none);
+    KpID_C<KpUUID> id;
+    id.valueSet(KpUUID::generateUUID());
+    setrlimit(RLIMIT_NOFILE, &before);
+    EXPECT_FALSE(id.isValid());
+}
+
+}  // namespace
