@@ -23,16 +23,15 @@ inline bool isNaN(const KpVec3f& v)
     return std::all_of(v.begin(), v.end(), [](float c) { return std::isnan(c); });
 }
 
-// Components within `range` of 0.
-inline KpVec3f someVector(std::mt19937& random, float range)
-{
-    std::uniform_real_distribution<float> components(-range, range);
-    return {components(random), components(random), components(random)};
-}
-
 inline float someNumber(std::mt19937& random, float low, float high)
 {
     return std::uniform_real_distribution<float>(low, high)(random);
+}
+
+// Components within `range` of 0.
+inline KpVec3f someVector(std::mt19937& random, float range)
+{
+    return {someNumber(random, -range, range), someNumber(random, -range, range), someNumber(random, -range, range)};
 }
 
 // An object of floats from -2 to 2; a `special` one mixes in zeros, infinities, NaN, tiny and huge numbers.
