@@ -20,25 +20,21 @@ KpMat4f rows(const KpVec3f& x, const KpVec3f& y, const KpVec3f& z = KpVec3f(0, 0
 
 TEST(KpOrientationLetters, readsMatrices)
 {
-    const struct {
-        const char* what;
-        KpMat4f matrix;
-        std::string edges;  // right, top, left, bottom
-    } cases[] = {
-        {"axial", KpMat4f::identity(), "L/A/R/P"},
-        {"coronal", rows({1, 0, 0}, {0, 0, -1}), "L/H/R/F"},
-        {"NaN", rows({0, std::nanf("0"), -1}, {1, 0, 0}), "L/A/R/P"},
-        {"tie goes to x, and y can't have it", rows({1, 1, 0}, {-1, 1, 0}), "L/A/R/P"},
-        {"tie of y and z goes to y", rows({0, -2, -2}, {3, 3, 1}), "A/R/P/L"},
-        {"negative zero is positive", rows({-0.0F, -0.0F, -0.0F}, {0, 0, -1}), "L/H/R/F"},
+    const std::pair<KpMat4f, std::string> cases[] = {
+        // right, top, left, bottom
+        {KpMat4f::identity(), "L/A/R/P"},
+        {rows({0, std::nanf("0"), -1}, {1, 0, 0}), "L/A/R/P"},
+        {rows({1, 1, 0}, {-1, 1, 0}), "L/A/R/P"},   // a tie goes to x, and y can't have it
+        {rows({0, -2, -2}, {3, 3, 1}), "A/R/P/L"},  // one of y and z goes to y
+        {rows({-0.0F, -0.0F, -0.0F}, {0, 0, -1}), "L/H/R/F"},
     };
-    for (const auto& c : cases)
-        EXPECT_EQ(Letters(c.matrix).join('/'), c.edges) << c.what;
+    for (const auto& [matrix, edges] : cases)
+        EXPECT_EQ(Letters(matrix).join('/'), edges);
     // inverse(second * third) * first, none of which commute: x goes to -y, y to x. Here y is upward.
     const KpMat4f first = rows({1, 0, 0}, {0, 0, 1}, {0, -1, 0}), second = rows({0, 1, 0}, {-1, 0, 0});
     const KpMat4f third = rows({0, 0, -1}, {0, 1, 0}, {1, 0, 0});
     EXPECT_EQ(Letters(first, second, third).join('/'), "A/L/P/R");
-    EXPECT_EQ(Letters(cases[2].matrix, cases[0].matrix, cases[0].matrix).join('/'), "L/P/R/A");
+    EXPECT_EQ(Letters(cases[1].first, cases[0].first, cases[0].first).join('/'), "L/P/R/A");
 }
 
 TEST(KpOrientationLetters, readsStrings)
@@ -84,6 +80,6 @@ TEST(KpOrientationLetters, givesViewAndUp)
         EXPECT_TRUE(view == c.snappedView && up == c.snappedUp) << letters.join('/') << view << up;
     }
     KpVec3f view(1, 2, 3), up = view;
-    EXPECT_FALSE(Letters("L", "R").getViewDirection(view, up, KpMat4f::identity(), true));
+    EXPECT_FALSE(Letters("L", "R").getViewDirection(view, up, one, true));
     EXPECT_TRUE(view == KpVec3f(1, 2, 3) && up == view);
 }
