@@ -20,4 +20,3 @@ public:
 };
 
 static_assert(sizeof(KpBox3i) == 24);
-
