@@ -47,17 +47,38 @@ bool realsOf(DcmItem& item, const DcmTagKey& tag, double* out, unsigned long n)
     return true;
 }
 
+constexpr double shortest = 1e-4, longest = 1e6;  // mm; what is beyond is no measure of a patient
+
+bool isLength(double mm)
+{
+    return mm >= shortest && mm <= longest;
+}
+
+/// Whether these are a place and two directions at right angles.
+bool isPlace(const Vector& position, const Vector& row, const Vector& column)
+{
+    constexpr double tolerance = 0.01;
+    return dot(position, position) <= longest * longest && std::abs(dot(row, row) - 1) < tolerance &&
+           std::abs(dot(column, column) - 1) < tolerance && std::abs(dot(row, column)) < tolerance;
+}
+
 void readPlace(DcmItem& data, SliceFile& slice)
 {
+    Vector position{}, row{}, column{};
     std::array<double, 6> orientation{};
     std::array<double, 2> spacing{};
-    slice.hasPlace = realsOf(data, DCM_ImagePositionPatient, slice.position.data(), 3) &&
-                     realsOf(data, DCM_ImageOrientationPatient, orientation.data(), 6);
-    if (slice.hasPlace) {
-        std::copy_n(orientation.begin(), 3, slice.rowAxis.begin());
-        std::copy_n(orientation.begin() + 3, 3, slice.columnAxis.begin());
+    if (realsOf(data, DCM_ImagePositionPatient, position.data(), 3) &&
+        realsOf(data, DCM_ImageOrientationPatient, orientation.data(), 6)) {
+        std::copy_n(orientation.begin(), 3, row.begin());
+        std::copy_n(orientation.begin() + 3, 3, column.begin());
+        slice.hasPlace = isPlace(position, row, column);
     }
-    if (realsOf(data, DCM_PixelSpacing, spacing.data(), 2) && spacing[0] > 0 && spacing[1] > 0) {
+    if (slice.hasPlace) {
+        slice.position = position;
+        slice.rowAxis = row;
+        slice.columnAxis = column;
+    }
+    if (realsOf(data, DCM_PixelSpacing, spacing.data(), 2) && isLength(spacing[0]) && isLength(spacing[1])) {
         slice.rowSpacing = spacing[0];
         slice.columnSpacing = spacing[1];
     }
@@ -169,13 +190,15 @@ KpResult checkAgreement(const SliceFile& first, const SliceFile& slice)
 KpResult measureSpacing(Series& series, double& spacing)
 {
     const std::vector<SliceFile>& slices = series.slices;
-    spacing = slices.front().thickness > 0 ? slices.front().thickness : 1;
+    spacing = isLength(slices.front().thickness) ? slices.front().thickness : 1;
+    if (!slices.front().hasPlace)
+        series.warnings.emplace_back("the images don't tell where they lie; they are sorted by their numbers");
     if (slices.size() < 2)
         return KpResult();
     std::vector<double> gaps;
     for (size_t i = 1; i < slices.size(); ++i) {
         gaps.push_back(slices[i].place() - slices[i - 1].place());
-        if (gaps.back() < 1e-4)
+        if (gaps.back() < shortest)
             return badInput("'%s' and '%s' lie at the same place", slices[i - 1].path.c_str(), slices[i].path.c_str());
     }
     std::vector<double> sorted = gaps;
@@ -192,8 +215,6 @@ KpResult measureSpacing(Series& series, double& spacing)
     }
     if (slices.front().hasPlace)
         spacing = median;
-    else
-        series.warnings.emplace_back("the images don't tell where they lie; they are sorted by their numbers");
     return KpResult();
 }
 
@@ -279,6 +300,7 @@ void describeVolume(const Series& series, Volume& volume)
     volume.spacing = {first.columnSpacing, first.rowSpacing, series.spacing};
     volume.origin = first.position;
     volume.axes = {first.rowAxis, first.columnAxis, first.normal()};
+    volume.isPlaced = first.hasPlace;
     volume.type = volumeType(series);
     if (volume.type != KpPrimType::Float) {
         volume.slope = first.slope;

@@ -60,6 +60,8 @@ void drawText(Picture& picture, const std::string& text, double across, double d
 
 void drawLetters(Picture& picture, const KpOrientationLetters& letters)
 {
+    if (std::min(picture.width, picture.height) < 5 * glyphHeight)
+        return;
     drawText(picture, letters.right(), 1, 0.5);
     drawText(picture, letters.top(), 0.5, 0);
     drawText(picture, letters.left(), 0, 0.5);

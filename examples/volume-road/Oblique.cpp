@@ -15,17 +15,17 @@ namespace {
 
 const KpVec3f obliqueNormal(0.3F, -0.45F, 0.84F);  // between the head, the front and the left
 
-/// The box of the voxels' middles: between them there is something to interpolate.
-KpBox3f sampledBox(const Volume& volume)
+/// What the voxels cover, half a voxel around their middles: also a single slice has a thickness.
+KpBox3f coveredBox(const Volume& volume)
 {
-    const auto last = [&](size_t axis) { return static_cast<float>(volume.dims[axis] - 1); };
-    return {0, last(0), 0, last(1), 0, last(2)};
+    const auto end = [&](size_t axis) { return static_cast<float>(volume.dims[axis]) - 0.5F; };
+    return {-0.5F, end(0), -0.5F, end(1), -0.5F, end(2)};
 }
 
 /// The system of the slice: z along the normal, x as near to the patient's left as can be, so that y runs to the back.
 KpHandle<KpCoordinateSystem> sliceSystem(const Volume& volume, const Space& space)
 {
-    const KpBox3f box = sampledBox(volume);
+    const KpBox3f box = coveredBox(volume);
     KpHandle<KpCoordinateSystem> slice = space.patient->createChildSystem();
     slice->setAxes(obliqueNormal, KpVec3f(1, 0, 0));
     slice->setOrigin(space.voxels->asTransformation().multVecMatrix((box.min() + box.max()) / 2.0F));
@@ -37,20 +37,20 @@ KpBox2f extentOf(const Volume& volume, const Space& space, const KpCoordinateSys
 {
     const KpMat4f toVoxels = slice.transformationTo(*space.voxels);
     const KpMat4f toSlice = toVoxels.inverse();
-    const KpPlane inVoxels(toVoxels.multVecMatrix(KpVec3f(0, 0, 0)), toVoxels.multVecMatrix(KpVec3f(1, 0, 0)),
-                           toVoxels.multVecMatrix(KpVec3f(0, 1, 0)));
+    const KpVec3f right = toVoxels.multDirMatrix(KpVec3f(1, 0, 0)), down = toVoxels.multDirMatrix(KpVec3f(0, 1, 0));
+    const KpPlane inVoxels(right.cross(down), toVoxels.multVecMatrix(KpVec3f(0, 0, 0)));
     KpBox2f extent;
-    for (const KpVec3f& corner : KpCutBoxPlane::cutPlane(sampledBox(volume), inVoxels)) {
+    for (const KpVec3f& corner : KpCutBoxPlane::cutPlane(coveredBox(volume), inVoxels)) {
         const KpVec3f inSlice = toSlice.multVecMatrix(corner);
         extent.extendBy(KpVec2f(inSlice.x(), inSlice.y()));
     }
     return extent;
 }
 
-/// The value between the eight voxels around a place within the sampled box.
+/// The value between the eight voxels around a place, at the border of those there are; black outside.
 class Sampler {
 public:
-    explicit Sampler(const Volume& volume) : volume_(volume), box_(sampledBox(volume)) {}
+    explicit Sampler(const Volume& volume) : volume_(volume), box_(coveredBox(volume)) {}
 
     unsigned char at(const KpVec3f& place) const
     {
@@ -59,8 +59,10 @@ public:
         long corner[3];
         float share[3];
         for (int axis = 0; axis < 3; ++axis) {
-            corner[axis] = std::min(static_cast<long>(place[axis]), std::max(0L, volume_.dims[size_t(axis)] - 2));
-            share[axis] = place[axis] - static_cast<float>(corner[axis]);
+            const long last = volume_.dims[size_t(axis)] - 1;
+            const float inside = std::clamp(place[axis], 0.0F, static_cast<float>(last));
+            corner[axis] = std::min(static_cast<long>(inside), std::max(0L, last - 1));
+            share[axis] = inside - static_cast<float>(corner[axis]);
         }
         float sum = 0;
         for (int i = 0; i < 8; ++i) {
@@ -87,9 +89,13 @@ KpResult writeOblique(const Volume& shown, const Space& space, const OutputFolde
 {
     const KpHandle<KpCoordinateSystem> slice = sliceSystem(shown, space);
     const KpBox2f extent = extentOf(shown, space, *slice);
+    if (extent.isEmpty())
+        return badInput("the volume lies too far away for the size of its voxels");
     const KpMat4f toVoxels = slice->transformationTo(*space.voxels);
-    const auto pixel = static_cast<float>(*std::min_element(shown.spacing.begin(), shown.spacing.end()));
-    Picture picture(std::lround(extent.size().x() / pixel) + 1, std::lround(extent.size().y() / pixel) + 1);
+    const double width = extent.size().x(), height = extent.size().y();
+    const double finest = *std::min_element(shown.spacing.begin(), shown.spacing.end());
+    const auto pixel = static_cast<float>(pixelSize(finest, width, height));
+    Picture picture(pixelsFor(width, pixel), pixelsFor(height, pixel));
     const Sampler sampler(shown);
     for (long row = 0; row < picture.height; ++row) {
         for (long column = 0; column < picture.width; ++column) {
@@ -98,6 +104,7 @@ KpResult writeOblique(const Volume& shown, const Space& space, const OutputFolde
             picture.set(column, row, sampler.at(toVoxels.multVecMatrix(inSlice)));
         }
     }
-    drawLetters(picture, lettersOf(slice->axis(KpCoordinateSystem::AxisX), slice->axis(KpCoordinateSystem::AxisY)));
+    drawLetters(picture,
+                lettersOf(shown, slice->axis(KpCoordinateSystem::AxisX), slice->axis(KpCoordinateSystem::AxisY)));
     return writePng(picture, out, "oblique.png");
 }

@@ -6,10 +6,18 @@
 
 #include <png.h>
 
+#include <algorithm>
+
 Picture::Picture(long w, long h) : width(w), height(h)
 {
     pixels.resize(w * h);
     KpRawData::memset({pixels.data(), KpPrimType::Byte}, 0, w * h);
+}
+
+double pixelSize(double finest, double width, double height)
+{
+    constexpr double mostSteps = 4095;  // pixels of a hundredth of a slice distance would fill the memory
+    return std::max({finest, width / mostSteps, height / mostSteps});
 }
 
 KpResult writePng(const Picture& picture, const OutputFolder& out, const char* name)

@@ -4,6 +4,8 @@
 
 #include <kplib/foundation/KpDArray.h>
 
+#include <cmath>
+
 /// A grey picture, black to begin with.
 struct Picture {
     long width, height;
@@ -18,5 +20,14 @@ struct Picture {
             pixels[row * width + column] = grey;
     }
 };
+
+/// The size of square pixels that show `finest` mm, or what makes a picture of so many mm as large as pictures get.
+double pixelSize(double finest, double width, double height);
+
+/// How many pixels reach over `extent` mm, the middles of the first and the last at its ends.
+inline long pixelsFor(double extent, double pixel)
+{
+    return std::lround(extent / pixel) + 1;
+}
 
 KpResult writePng(const Picture& picture, const OutputFolder& out, const char* name);

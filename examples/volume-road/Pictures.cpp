@@ -62,11 +62,9 @@ Between position(const Along& along, long i, double pixel)
 
 Picture cut(Volume& shown, const Along& across, const Along& down, const Along& normal)
 {
-    const double pixel = std::min(across.spacing, down.spacing);
-    const auto extent = [&](const Along& a) {
-        return std::lround(static_cast<double>(a.size - 1) * a.spacing / pixel) + 1;
-    };
-    Picture picture(extent(across), extent(down));
+    const auto extent = [](const Along& a) { return static_cast<double>(a.size - 1) * a.spacing; };
+    const double pixel = pixelSize(std::min(across.spacing, down.spacing), extent(across), extent(down));
+    Picture picture(pixelsFor(extent(across), pixel), pixelsFor(extent(down), pixel));
     const unsigned char* const plane = shown.bytes.data() + normal.size / 2 * normal.stride;
     for (long row = 0; row < picture.height; ++row) {
         const Between y = position(down, row, pixel);
@@ -79,7 +77,7 @@ Picture cut(Volume& shown, const Along& across, const Along& down, const Along& 
                 static_cast<unsigned char>(std::lround(top + y.share * (bottom - top)));
         }
     }
-    drawLetters(picture, lettersOf(across.direction, down.direction));
+    drawLetters(picture, lettersOf(shown, across.direction, down.direction));
     return picture;
 }
 
@@ -116,6 +114,7 @@ void display(Volume& volume, const Window& window, Volume& shown)
     shown.spacing = volume.spacing;
     shown.axes = volume.axes;
     shown.origin = volume.origin;
+    shown.isPlaced = volume.isPlaced;
     shown.type = KpPrimType::Byte;
     shown.allocate();
     const double width = std::max((window.width - 1) / std::abs(volume.slope), 1e-6);
@@ -147,6 +146,6 @@ KpResult writeOverview(Volume& shown, const OutputFolder& out, const char* name)
         for (long y = 0; y < height; ++y, row += width, to += picture.width)
             std::copy_n(row, width, to);
     }
-    drawLetters(picture, lettersOf(toVec(shown.axes[0]), toVec(shown.axes[1])));
+    drawLetters(picture, lettersOf(shown, toVec(shown.axes[0]), toVec(shown.axes[1])));
     return writePng(picture, out, name);
 }

@@ -53,8 +53,9 @@ void addVolume(Volume& volume, KpString& text)
                      volume.origin[2]);
     for (const auto& axis : volume.axes)
         text += KpString(0, "%-20s (%.6f, %.6f, %.6f)\n", "axis", axis[0], axis[1], axis[2]);
-    const KpOrientationLetters letters = lettersOf(toVec(volume.axes[0]), toVec(volume.axes[1]));
-    text += KpString(0, "%-20s %s\n", "right/top/left/bottom", letters.join('/').c_str());
+    const KpOrientationLetters letters = lettersOf(volume, toVec(volume.axes[0]), toVec(volume.axes[1]));
+    text +=
+        KpString(0, "%-20s %s\n", "right/top/left/bottom", letters.isValid() ? letters.join('/').c_str() : "unknown");
     text += KpString(0, "%-20s %.8g to %.8g\n", "values", displayed(low), displayed(high));
 }
 

@@ -22,6 +22,7 @@ Volume shrunk(const Volume& volume, std::array<int, 3>& factors)
     small.type = volume.type;
     small.axes = volume.axes;
     small.origin = volume.origin;
+    small.isPlaced = volume.isPlaced;
     small.slope = volume.slope;
     small.intercept = volume.intercept;
     for (size_t i = 0; i < 3; ++i) {

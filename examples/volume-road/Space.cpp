@@ -12,8 +12,10 @@ Space::Space(const std::string& frameUid, const Volume& volume) : patient(new Kp
     }
 }
 
-KpOrientationLetters lettersOf(const KpVec3f& right, const KpVec3f& down)
+KpOrientationLetters lettersOf(const Volume& volume, const KpVec3f& right, const KpVec3f& down)
 {
+    if (!volume.isPlaced)
+        return {};
     KpMat4f image;
     image.setValue(right, down, right.cross(down), KpVec3f(0, 0, 0));
     return KpOrientationLetters(image);

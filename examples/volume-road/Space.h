@@ -22,5 +22,6 @@ inline KpVec3f toVec(const Vector& v)
     return {static_cast<float>(v[0]), static_cast<float>(v[1]), static_cast<float>(v[2])};
 }
 
-/// The letters of a picture whose columns run to `right` and whose rows run to `down`, in the patient's space.
-KpOrientationLetters lettersOf(const KpVec3f& right, const KpVec3f& down);
+/// The letters of a picture of the volume that shows `right` and `down`, directions in the patient, at these edges.
+/// None if nothing tells how the patient lies: wrong letters are worse.
+KpOrientationLetters lettersOf(const Volume& volume, const KpVec3f& right, const KpVec3f& down);

@@ -17,6 +17,7 @@ struct Volume {
     Vector spacing{1, 1, 1};
     Vector origin{};
     std::array<Vector, 3> axes{Vector{1, 0, 0}, Vector{0, 1, 0}, Vector{0, 0, 1}};
+    bool isPlaced = true;  ///< origin and axes are known, not assumed
     double slope = 1, intercept = 0;
     KpPrimType type = KpPrimType::Short;
     KpDArray<unsigned char> bytes;

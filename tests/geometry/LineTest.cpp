@@ -3,8 +3,6 @@
 #include <kplib/geometry/KpBox3f.h>
 #include <kplib/geometry/KpLine.h>
 
-#include <gtest/gtest.h>
-
 using namespace kplib::test;
 
 namespace {
@@ -20,10 +18,8 @@ TEST(KpLine, withoutLengthIsNaNOrKeepsItsZero)
 {
     KpLine line(x, x);
     EXPECT_TRUE(isNaN(line.position()) && isNaN(line.direction()));
-    EXPECT_EQ(line.setPosDir(x, origin), 0);
-    EXPECT_EQ(line.direction(), origin);
-    EXPECT_EQ(line.setPosDir(x, x * 4), 4);
-    EXPECT_EQ(line, KpLine(x, x * 2));
+    EXPECT_TRUE(line.setPosDir(x, origin) == 0 && line.direction() == origin);
+    EXPECT_TRUE(line.setPosDir(x, x * 4) == 4 && line == KpLine(x, x * 2));
 }
 
 TEST(KpLine, hasClosestPoints)
@@ -53,12 +49,12 @@ TEST(KpLine, goesThroughBoxes)
     for (int i = 0; i < 3000; ++i) {
         const KpLine line(someVector(random, 10), someVector(random, 3));
         const KpVec3f min = someVector(random, 4) - KpVec3f(4, 4, 4), max = someVector(random, 3) + KpVec3f(4, 4, 4);
-        const KpVec3d d(line.direction()), p(line.position()), low = (KpVec3d(min) - p) / d,
-                                                               high = (KpVec3d(max) - p) / d;
+        const KpVec3d d(line.direction()), p(line.position());
         double entry = -1e38, exit = 1e38, slowest = 1;
         for (int axis = 0; axis < 3; ++axis) {
-            entry = std::max(entry, std::min(low[axis], high[axis]));
-            exit = std::min(exit, std::max(low[axis], high[axis]));
+            const auto [in, out] = std::minmax({(min[axis] - p[axis]) / d[axis], (max[axis] - p[axis]) / d[axis]});
+            entry = std::max(entry, in);
+            exit = std::min(exit, out);
             slowest = std::min(slowest, std::abs(d[axis]));
         }
         if (std::abs(exit - entry) * slowest < 1e-3)  // may go either way
@@ -87,7 +83,7 @@ TEST(KpLine, meetsBoxesAtTheirEdges)
         {"in a face", box, y, x, 0, 1, 3},
         {"beside a face, within the tolerance", box, y * 1.25F, x, 0.5F, 1, 3},
         {"beside a face", box, y * 1.25F, x, 0.125F, NaN, NaN},
-        {"thin, before y tells of the miss", box, y * 9, x, 2.5F, untouched.x(), untouched.x()},
+        {"thin, before y tells of a miss", box, y * 9, x, 2.5F, untouched.x(), untouched.x()},
         {"as thick as the tolerance", box, origin, x, 2, 1, 3},
         {"a slope that counts as parallel", box, origin, {1, 9e-7F, 0}, 1e-5F, 1, 3},
         {"empty", {3, 1, -1, 1, -1, 1}, origin, x, 9, NaN, NaN},
@@ -130,8 +126,7 @@ TEST(KpLine, picksWhatIsNearerThanAnAngleOrARadius)
     EXPECT_TRUE(alongX.intersect(0, KpBox3f(2, 3, -1, 1, -1, 1))) << "angle 0, and the line crosses";
     EXPECT_FALSE(alongX.intersect(-9, KpBox3f(3, 2, -1, 1, -1, 1))) << "empty";
     EXPECT_FALSE(alongX.intersect(-9, origin) || alongX.intersect(-9, -x)) << "not in front";
-    EXPECT_FALSE(alongX.intersect(-9, y, y + x, out)) << "parallel";
-    EXPECT_FALSE(alongX.intersect(-9, point, point, out)) << "without length";
+    EXPECT_FALSE(alongX.intersect(-9, y, y + x, out) || alongX.intersect(-9, y, y, out)) << "parallel, no length";
     for (float t = 1; t < 100; ++t)  // on the line, whatever rounding leaves
         EXPECT_TRUE(KpLine(origin, {0.1F, 0.7F, 0.3F}).intersect(1e-3F, KpVec3f(0.1F, 0.7F, 0.3F) * t)) << t;
 }
@@ -154,16 +149,14 @@ TEST(KpLine, goesThroughTriangles)
         const bool isFlat = e.cross(f).length() == 0;
         if (!isFlat && !(std::abs(volume) > 0.1 && std::abs(margin) > 1e-4))  // may go either way
             continue;
-        ASSERT_EQ(line.intersect(a, b, c, hit, weights, front), !isFlat && margin > 0);
-        EXPECT_EQ(front, !isFlat && margin > 0 && volume > 0);
-        if (!isFlat && margin > 0) {
-            ++hits;
-            // 2^-24 times numbers up to 9^2, over 0.1.
-            EXPECT_LE(distance(weights, KpVec3d(volume - ofB - ofC, ofB, ofC) / volume), 1e-4);
-            EXPECT_LE(distance(hit, KpVec3d(a) + (e * ofB + f * ofC) / volume), 1e-4);
-        } else {
-            EXPECT_TRUE(isNaN(hit) && isNaN(weights));
-        }
+        const bool isHit = !isFlat && margin > 0;
+        hits += isHit;
+        ASSERT_EQ(line.intersect(a, b, c, hit, weights, front), isHit);
+        EXPECT_EQ(front, isHit && volume > 0);
+        // 2^-24 times numbers up to 9^2, over 0.1.
+        EXPECT_TRUE(isHit ? distance(weights, KpVec3d(volume - ofB - ofC, ofB, ofC) / volume) < 1e-4 &&
+                                distance(hit, KpVec3d(a) + (e * ofB + f * ofC) / volume) < 1e-4
+                          : isNaN(hit) && isNaN(weights));
     }
     EXPECT_GT(hits, 1000);
     EXPECT_TRUE(KpLine(x, x - z).intersect(origin, x * 2, y * 2, hit, weights, front));

@@ -2,9 +2,7 @@
 
 #include <kplib/geometry/KpViewVolume.h>
 
-#include <cmath>
-
-using kplib::test::expectNear, kplib::test::someNumber, kplib::test::someVector;
+using namespace kplib::test;
 
 namespace {
 
@@ -38,17 +36,6 @@ KpVec3f toWorld(const Volume& volume, const KpVec3f& screen)
     return near + (far - near) * screen.z();
 }
 
-void expectSameShape(const Volume& a, const Volume& b)
-{
-    expectNear(a.projPoint() + a.projDir(), b.projPoint() + b.projDir());
-    expectNear(a.llf(), b.llf());
-    expectNear(a.lrfO(), b.lrfO());
-    expectNear(a.ulfO(), b.ulfO());
-    EXPECT_NEAR(a.nearDist() + 10 * a.nearToFar(), b.nearDist() + 10 * b.nearToFar(), 1e-3);
-    for (const Volume& v : {a, b})
-        expectNear(v.llf() + v.lrf() + v.ulf(), v.projPoint() * 3 + v.llfO() + v.lrfO() + v.ulfO());
-}
-
 }  // namespace
 
 TEST(KpViewVolume, takesTheWorldToTheScreenAndBack)
@@ -56,23 +43,22 @@ TEST(KpViewVolume, takesTheWorldToTheScreenAndBack)
     std::mt19937 random(65);
     for (int round = 0; round < 100; ++round) {
         const Volume v = makeVolume(random, round);
-        expectNear(toScreen(v, v.llf()), KpVec3f(0, 0, 0));
-        expectNear(toScreen(v, v.lrf()), KpVec3f(1, 0, 0));
-        expectNear(toScreen(v, v.ulf()), KpVec3f(0, 1, 0));
+        expectNear(toScreen(v, v.llf()), origin);
+        expectNear(toScreen(v, v.lrf()), x);
+        expectNear(toScreen(v, v.ulf()), y);
         expectNear(v.zVector(), -v.projDir());
-        expectNear(v.getCameraSpaceMatrix().multVecMatrix(v.getSightPoint(3)), KpVec3f(0, 0, -3));
-        const KpVec2f point(someNumber(random, 0, 1), someNumber(random, 0, 1));
-        const KpVec3f far = v.getPlanePoint(v.nearDist() + v.nearToFar(), point);
-        expectNear(toScreen(v, far), KpVec3f(point.x(), point.y(), 1));
-        expectNear(toWorld(v, KpVec3f(point.x(), point.y(), 1)), far);
-
-        const float width = (v.lrf() - v.llf()).length(), height = (v.ulf() - v.llf()).length();
-        expectNear(v.getAlignRotation(false).multVec(KpVec3f(0, height, 0)), v.ulf() - v.llf());
-        expectNear(v.getAlignRotation(false).multVec(KpVec3f(width, 0, 0)), v.lrf() - v.llf(), 1e-2F);
+        expectNear(v.getCameraSpaceMatrix().multVecMatrix(v.getSightPoint(3)), z * -3);
+        const KpVec3f onFar(someNumber(random, 0, 1), someNumber(random, 0, 1), 1);
+        const KpVec3f far = v.getPlanePoint(v.nearDist() + v.nearToFar(), KpVec2f(onFar.x(), onFar.y()));
+        expectNear(toScreen(v, far), onFar);
+        expectNear(toWorld(v, onFar), far);
+        const KpVec3f width = v.lrf() - v.llf(), height = v.ulf() - v.llf();
+        expectNear(v.getAlignRotation(false).multVec(y * height.length()), height);
+        expectNear(v.getAlignRotation(false).multVec(x * width.length()), width, 1e-2F);
     }
     Volume v;
     v.ortho(-1, 1, -1, 1, 1, 3);
-    expectNear(toScreen(v, KpVec3f(0, 0, -2)), KpVec3f(0.5F, 0.5F, 0.5F));
+    expectNear(toScreen(v, z * -2), KpVec3f(0.5F, 0.5F, 0.5F));
     EXPECT_FLOAT_EQ(v.projectBox(KpBox3f(-0.5F, 0.5F, -0.25F, 0, -2, -1)).y(), 0.125F);
     v.frustum(-1, 2, -3, 4, 5, 7);
     EXPECT_TRUE(v.llf() == KpVec3f(-1, -3, 5) && v.nearToFar() == 2 && v.type() == Volume::Perspective);
@@ -80,41 +66,34 @@ TEST(KpViewVolume, takesTheWorldToTheScreenAndBack)
 
 TEST(KpViewVolume, alignsByRightAngles)
 {
-    const KpVec3f x(1, 0, 0), y(0, 1, 0), z(0, 0, 1);
-    const struct {
-        KpVec3f axis;
-        float angle;
-        KpVec3f xTo, yTo;
-    } cases[] = {{y, 0.1F, x, y}, {y, 1.6F, -z, y}, {y, -1.6F, z, y}, {z, 3.1415927F, x, -y}};
-    for (const auto& c : cases) {  // in the last, that the turn of y counts twice keeps x from coming to the right
+    // In the last, that the turn of y counts twice keeps x from coming to the right.
+    const std::pair<KpRotation, KpVec3f> cases[] = {
+        {{y, 0.1F}, x}, {{y, 1.6F}, -z}, {{y, -1.6F}, z}, {{z, 3.1415927F}, x}};
+    for (const auto& [turn, xTo] : cases) {
         Volume v;
         v.perspective(1, 1, 1, 2);
-        v.rotateCamera(KpRotation(c.axis, c.angle));
-        expectNear(v.getAlignRotation(true).multVec(x), c.xTo);
-        expectNear(v.getAlignRotation(true).multVec(y), c.yTo);
+        v.rotateCamera(turn);
+        expectNear(v.getAlignRotation(true).multVec(x), xTo);
+        expectNear(v.getAlignRotation(true).multVec(y), turn * y);
     }
 }
 
 TEST(KpViewVolume, shiftsStereoEyesAgainstEachOther)
 {
-    const struct {
-        int mode;
-        float eyeScale, offsetScale, offset;  // offset 0: not set
-        float shift;
-    } cases[] = {{0, 1, 1, 5, 0}, {1, 1, 1, 0, -0.035F}, {7, 2, 3, 0, 0.21F}, {1, 2, 3, 0.5F, 0.375F}};
-    for (const auto& c : cases) {
+    // mode, offset (0: not set), shift to the right
+    for (const KpVec3f& c : {KpVec3f(0, 5, 0), {1, 0, -0.21F}, {7, 0, 0.21F}, {1, 0.5F, 0.1875F}}) {
         Volume v;
-        v.perspective(1.5707964F, 1, 1, 3);
-        v.setStereoMode(c.mode);
-        v.setStereoEyeScale(c.eyeScale);
-        v.setStereoOffsetScale(c.offsetScale);
-        if (c.offset != 0)
-            v.setCameraOffset(c.offset);
-        EXPECT_NEAR(toScreen(v.narrow(0, 0, 1, 1), KpVec3f(0, 0, -2)).x(), 0.5F + c.shift, 1e-5);
-        Volume slab = v.zNarrow(1, 0);
-        v.transform(KpMat4f::identity());
-        for (const Volume* reset : {&v, &slab})
-            EXPECT_TRUE(reset->stereoMode() == 0 && reset->stereoEyeScale() == 1 && !reset->isCameraOffsetSet());
+        v.perspective(1.5707964F, 1, 2, 6);
+        v.setStereoMode(static_cast<int>(c.x()));
+        v.setStereoEyeScale(2);
+        v.setStereoOffsetScale(3);
+        if (c.y() != 0)
+            v.setCameraOffset(c.y());
+        EXPECT_NEAR(toScreen(v.narrow(0, 0, 1, 1), z * -2).x(), 0.5F + c.z(), 1e-5);
+        Volume transformed = v;
+        transformed.transform(KpMat4f::identity());
+        for (const Volume& reset : {v.zNarrow(1, 0), transformed})
+            EXPECT_TRUE(reset.stereoMode() == 0 && reset.stereoEyeScale() == 1 && !reset.isCameraOffsetSet());
     }
 }
 
@@ -123,30 +102,26 @@ TEST(KpViewVolume, changesShape)
     std::mt19937 random(65);
     for (int round = 0; round < 100; ++round) {
         const Volume v = makeVolume(random, round);
-        const KpVec3f low(0.1F, 0.2F, 0), high(0.6F, 0.9F, 1),
-            place(someNumber(random, 0, 1), someNumber(random, 0, 1), 0.5F);
-        const Volume part = v.narrow(low.x(), low.y(), high.x(), high.y());
-        expectNear(toWorld(part, place), toWorld(v, low + (high - low) * place));
-        const float near = someNumber(random, 0.5F, 0.9F), far = someNumber(random, 0, 0.4F);
-        const Volume slab = v.zNarrow(near, far);
-        EXPECT_TRUE(slab.nearDist() == near && slab.nearToFar() == (near - far) * v.nearToFar());
-        expectNear(slab.llf(), toWorld(v, KpVec3f(0, 0, 1 - near)));
-        expectNear(slab.lrf(), toWorld(v, KpVec3f(1, 0, 1 - near)));
-        expectNear(slab.ulf(), toWorld(v, KpVec3f(0, 1, 1 - near)));
-        expectSameShape(v.narrow(KpBox3f(0.1F, 0.6F, 0.2F, 0.9F, -1, 2)), part.zNarrow(1, 0));
-        Volume half = v, high3 = v;
-        half.scale(-0.5F);
-        expectSameShape(half, v.narrow(0.25F, 0.25F, 0.75F, 0.75F));
-        high3.scaleHeight(3);
-        expectSameShape(high3, v.narrow(0, -1, 1, 2));
+        const KpVec3f place(someNumber(random, 0, 1), someNumber(random, 0, 1), 0.5F);
+        const float near = someNumber(random, 0.5F, 0.9F), far = someNumber(random, 0, 0.4F), depth = 1 - near;
+        const Volume part = v.narrow(KpBox3f(0.1F, 0.6F, 0.2F, 0.9F, far, near));
+        EXPECT_TRUE(part.nearDist() == near && part.nearToFar() == (near - far) * v.nearToFar());
+        expectNear(part.llf(), toWorld(v, KpVec3f(0.1F, 0.2F, depth)));
+        expectNear(part.lrf(), toWorld(v, KpVec3f(0.6F, 0.2F, depth)));
+        expectNear(part.projPoint() + part.ulfO(), toWorld(v, KpVec3f(0.1F, 0.9F, depth)));
+        Volume scaled = v.narrow(0.5F, 0, 1, 1);
+        expectNear(scaled.llf(), toWorld(v, KpVec3f(0.5F, 0, 0)));
+        scaled.scale(-0.5F);
+        scaled.scaleHeight(3);
+        expectNear(scaled.llf(), toWorld(v, KpVec3f(0.625F, -0.25F, 0)));
+        expectNear(scaled.lrf(), toWorld(v, KpVec3f(0.875F, -0.25F, 0)));
+        expectNear(scaled.projPoint() + scaled.ulfO(), toWorld(v, KpVec3f(0.625F, 1.25F, 0)));
 
         // A place on the screen goes with the matrix; a mirror exchanges left and right.
         const bool isMirror = round % 3 == 0;
-        KpMat4f turn, move, scale;
-        turn.setRotate(KpRotation(someVector(random, 2), someNumber(random, -3, 3)));
-        move.setTranslate(someVector(random, 2));
-        scale.setScale(KpVec3f(isMirror ? -2.0F : 2.0F, 2, 2));
-        const KpMat4f matrix = turn * scale * move;
+        KpMat4f matrix;
+        matrix.setTransform(someVector(random, 2), KpRotation(someVector(random, 2), someNumber(random, -3, 3)),
+                            KpVec3f(isMirror ? -2.0F : 2.0F, 2, 2), KpRotation::identity());
         Volume changed = v;
         changed.transform(matrix);
         EXPECT_NEAR(changed.nearDist(), 2 * v.nearDist(), 1e-3);
@@ -162,50 +137,43 @@ TEST(KpViewVolume, changesShape)
 TEST(KpViewVolume, tellsWhatIsInside)
 {
     std::mt19937 random(65);
+    const KpBox3f unit(0, 1, 0, 1, 0, 1);
     for (int round = 0; round < 2000; ++round) {
         const Volume v = makeVolume(random, round);
         const KpVec3f place = someVector(random, 0.9F) + KpVec3f(0.5F, 0.5F, 0.5F), point = toWorld(v, place);
-        KpBox3f box(point, point);
+        KpBox3f dot(point, point), box = dot;
         box.extendBy(point + someVector(random, 2));
-        if (KpBox3f(0, 1, 0, 1, 0, 1).contains(place, -1e-3F)) {
-            EXPECT_TRUE(v.intersect(point)) << place;
-            EXPECT_TRUE(v.intersect(box)) << "a box with a point inside is never culled";
-        } else if (!KpBox3f(0, 1, 0, 1, 0, 1).contains(place, 1e-3F)) {
-            EXPECT_FALSE(v.intersect(point)) << place;
-            EXPECT_FALSE(v.intersect(KpBox3f(point, point))) << place;
-        }
-        EXPECT_FALSE(v.intersect(KpBox3f()));
+        const bool isInside = unit.contains(place, -1e-3F), isOutside = !unit.contains(place, 1e-3F);
+        EXPECT_TRUE(!isInside || (v.intersect(point) && v.intersect(dot) && v.intersect(box))) << place;
+        EXPECT_FALSE(isOutside && (v.intersect(point) || v.intersect(dot))) << place;
     }
     Volume flat;
     flat.ortho(-1, 1, -1, 1, 0, 0);
-    EXPECT_FALSE(flat.intersect(KpVec3f(0, 0, 0)));
+    EXPECT_FALSE(flat.intersect(origin) || flat.intersect(KpBox3f()));
 }
 
-TEST(KpViewVolume, meetsSegmentsNearItsCentralLine)
+TEST(KpViewVolume, meetsSegmentsAndMeasuresHandles)
 {
-    const struct {
-        KpVec3f p0, p1;
-        bool meets;
-    } cases[] = {{{-5, 0.5F, -2}, {5, 0.5F, -2}, true},  {{1, 0, -2}, {5, 0, -2}, false},
-                 {{-5, 1.5F, -2}, {5, 1.5F, -2}, false}, {{-5, 0, -4}, {5, 0, -4}, false},
-                 {{0.5F, 0, -1}, {0.5F, 0, -3}, false},  {{0, 0, -2}, {0, 0, -2}, false}};
-    for (const bool isBox : {true, false}) {
-        Volume v;
-        isBox ? v.ortho(-1, 1, -1, 1, 1, 3) : v.perspective(1, 1, 1, 3);
-        for (const auto& c : cases) {
+    const std::pair<KpLine, bool> segments[] = {// from the position to 4 further
+                                                {{{-2, 0.5F, -2}, {1, 0.5F, -2}}, true},
+                                                {{{1, 0, -2}, {2, 0, -2}}, false},
+                                                {{{-2, 1.5F, -2}, {1, 1.5F, -2}}, false},
+                                                {{{-2, 0, -4}, {1, 0, -4}}, false},
+                                                {{{0.5F, 0, 0}, {0.5F, 0, -1}}, false}};
+    for (const auto& [line, meets] : segments) {
+        for (const bool isBox : {true, false}) {
+            Volume v;
+            isBox ? v.ortho(-1, 1, -1, 1, 1, 3) : v.perspective(1, 1, 1, 3);
             KpVec3f out;
-            EXPECT_EQ(v.intersect(c.p0, c.p1, out), c.meets) << c.p0 << c.p1;
-            EXPECT_TRUE(!c.meets || (out - KpVec3f(0, 0.5F, -2)).length() < 1e-5F);
+            const KpVec3f from = line.position();
+            EXPECT_EQ(v.intersect(from, from + line.direction() * 4, out), meets) << from;
+            EXPECT_TRUE(!meets || (out - KpVec3f(0, 0.5F, -2)).length() < 1e-5F);
         }
     }
-}
-
-TEST(KpViewVolume, measuresHandles)
-{
     Volume box, wide;
     box.ortho(-1, 1, -3, 3, 1, 3);
     wide.perspective(1.5707964F, 2, 1, 9);  // as high as twice the distance
     EXPECT_NEAR(box.getWorldToScreenScale(KpVec3f(0.25F, 0.5F, -2), 0.1F), 0.2F, 1e-4);
     EXPECT_NEAR(box.getWorldToScreenScale(KpVec3f(9, 0, -2), 0.1F), 0.2F, 1e-4);
-    EXPECT_NEAR(wide.getWorldToScreenScale(KpVec3f(0, 0, -4), 0.1F), 0.8F, 1e-4);
+    EXPECT_NEAR(wide.getWorldToScreenScale(KpVec3f(0, 2, -4), 0.1F), std::hypot(2 - 6 / 4.6, 4 - 20 / 4.6), 1e-4);
 }

@@ -3,8 +3,6 @@
 #include <kplib/geometry/KpBox3Base.h>
 #include <kplib/geometry/KpVec3i.h>
 
-#include <algorithm>
-
 /// An axis-aligned box of voxels: three intervals of 32-bit integers, both ends inside.
 class KpBox3i : public KpBox3Base<KpBox3i, KpVec3i> {
 public:
@@ -15,10 +13,9 @@ public:
     {
     }
     /// From any two opposite corners, sorted on each axis: never empty.
-    constexpr KpBox3i(const KpVec3i& a, const KpVec3i& b) :
-        KpBox3Base(std::min(a.x(), b.x()), std::max(a.x(), b.x()), std::min(a.y(), b.y()), std::max(a.y(), b.y()),
-                   std::min(a.z(), b.z()), std::max(a.z(), b.z()))
+    constexpr KpBox3i(const KpVec3i& a, const KpVec3i& b) : KpBox3i(a.x(), a.x(), a.y(), a.y(), a.z(), a.z())
     {
+        extendBy(b);
     }
 };
 

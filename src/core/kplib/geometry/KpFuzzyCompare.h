@@ -16,7 +16,7 @@ KPLIB_API bool kpFuzzyCompare(float a, float b, float eps);
 
 /// Whether a ten-thousandth of the smaller length, or 1e-6 if that is 0, is at or above the distance of the two.
 KPLIB_API bool kpFuzzyCompare(const KpVec3f& a, const KpVec3f& b);
-/// Whether `eps` is at or above the distance of the two.
+/// Whether `eps`, whatever its sign, is at or above the distance of the two.
 KPLIB_API bool kpFuzzyCompare(const KpVec3f& a, const KpVec3f& b, float eps);
 
 /// Whether the normals match as vectors do without a tolerance and the distances from the origin with `eps`; one that

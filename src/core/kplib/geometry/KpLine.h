@@ -26,6 +26,7 @@ public:
     const KpVec3f& position() const { return position_; }
     const KpVec3f& direction() const { return direction_; }
 
+    /// The foot of the perpendicular from `point`.
     KpVec3f getClosestPoint(const KpVec3f& point) const;
     /// The points in which two lines are nearest to each other. False if they are exactly parallel.
     bool getClosestPoints(const KpLine& other, KpVec3f& onThis, KpVec3f& onOther) const;

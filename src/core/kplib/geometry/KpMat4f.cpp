@@ -4,6 +4,7 @@
 #include <kplib/geometry/detail/KpMatrixElements.h>
 
 #include <algorithm>
+#include <cmath>
 
 KpMat4f::KpMat4f(const KpMat3f& matrix)
 {

@@ -94,10 +94,11 @@ public:
     float det4() const;
 
     /// The inverse: affine_inverse() where it applies, else by LUDecomposition(). A singular matrix has no error: what
-    /// comes out is large.
+    /// comes out is large, infinite or NaN.
     KpMat4f inverse() const;
     /// The inverse of an affine matrix, its determinant in double precision. False, and `out` as it was, if the last
-    /// column isn't exactly (0, 0, 0, 1), or if the determinant is below 1e-15 of the sum of its terms' magnitudes.
+    /// column isn't exactly (0, 0, 0, 1), or if the determinant is below 1e-15 of the sum of its terms' magnitudes; if
+    /// all terms are 0, true with infinities and NaN.
     static bool affine_inverse(const KpMat4f& in, KpMat4f& out);
 
     /// In place, by Crout's method with scaled partial pivoting; `index` receives the pivot rows, `sign` 1 or -1 for an

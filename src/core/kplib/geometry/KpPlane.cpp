@@ -71,8 +71,9 @@ void KpPlane::set(const KpVec3f& normal, float distance)
 
 void KpPlane::set(const KpVec3f& normal, const KpVec3f& point)
 {
+    const KpVec3f through = point;  // may be this plane's normal
     if (setUnitNormal(normal) != 0)
-        distance_ = normal_.dot(point);
+        distance_ = normal_.dot(through);
 }
 
 void KpPlane::normalize()

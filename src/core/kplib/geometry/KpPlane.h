@@ -34,6 +34,7 @@ public:
     void set(const KpVec3f& p0, const KpVec3f& p1, const KpVec3f& p2);
     /// `distance` is the one from the origin: it stays as it is, whatever the length of `normal`.
     void set(const KpVec3f& normal, float distance);
+    /// The plane through `point`.
     void set(const KpVec3f& normal, const KpVec3f& point);
 
     const KpVec3f& normal() const { return normal_; }

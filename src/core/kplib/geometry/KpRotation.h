@@ -61,7 +61,9 @@ public:
     void normalize();
     /// The sum of the four squares: no root is taken, and that is meant.
     float norm() const { return q_[0] * q_[0] + q_[1] * q_[1] + q_[2] * q_[2] + q_[3] * q_[3]; }
+    /// Becomes the turn back, also if this isn't normalised: the product of both is the identity.
     void invert();
+    /// What invert() makes of this.
     KpRotation inverse() const
     {
         KpRotation result = *this;

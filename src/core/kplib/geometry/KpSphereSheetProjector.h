@@ -6,7 +6,7 @@
 
 /// The trackball of a viewer: a sphere that turns, at 45 degrees, into a hyperbolic sheet, so that dragging on beyond
 /// the silhouette keeps turning smoothly. Chen, Mountford and Sellen, "A study in interactive 3-D rotation using 2-D
-/// control devices", 1988, as made smooth by G. Bell.
+/// control devices", 1988; Henriksen, Sporring and Hornbæk, "Virtual trackballs revisited", 2004.
 class KPLIB_API KpSphereSheetProjector : public KpSphereProjector {
 public:
     explicit KpSphereSheetProjector(bool orientToEye = true) : KpSphereProjector(orientToEye) {}

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <cmath>
 #include <concepts>
 #include <cstdint>
 #include <iosfwd>
@@ -54,10 +53,13 @@ public:
     /// The square root of squaredLength(); of integers its whole part.
     Component length() const
     {
-        if constexpr (std::floating_point<Component>)
-            return std::sqrt(squaredLength());
+        // The compiler's own roots: <cmath> would take a compiler as long as all the rest.
+        if constexpr (std::same_as<Component, float>)
+            return __builtin_sqrtf(squaredLength());
+        else if constexpr (std::same_as<Component, double>)
+            return __builtin_sqrt(squaredLength());
         else
-            return static_cast<Component>(std::sqrt(static_cast<long double>(squaredLength())));
+            return static_cast<Component>(__builtin_sqrtl(static_cast<long double>(squaredLength())));
     }
 
     // Operators between two vectors work component by component, those with a number on each component.

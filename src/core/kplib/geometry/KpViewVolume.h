@@ -82,7 +82,8 @@ public:
     /// Whether the point is in the volume, its faces included. Not in one whose nearDist() and nearToFar() are 0.
     bool intersect(const KpVec3f& point) const;
     /// Whether the point of the segment that is nearest to the volume's central line is in the volume; it goes to
-    /// `out`. False for a segment that is parallel to that line or doesn't reach its nearest point.
+    /// `out`, on a false result too. False for a segment that is parallel to that line, with NaN, or whose own line is
+    /// nearest beyond its ends.
     bool intersect(const KpVec3f& p0, const KpVec3f& p1, KpVec3f& out) const;
     /// False if the box lies wholly behind one face or is empty; so true also for some boxes near the volume's edges.
     bool intersect(const KpBox3f& box) const;

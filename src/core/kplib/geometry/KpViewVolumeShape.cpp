@@ -6,8 +6,9 @@
 
 void KpViewVolume::translateCamera(const KpVec3f& translation)
 {
+    const KpVec3f step = translation;  // may be one of those that move
     for (KpVec3f* point : {&projPoint_, &llf_, &lrf_, &ulf_})
-        *point += translation;
+        *point += step;
 }
 
 void KpViewVolume::rotateCamera(const KpRotation& rotation)
