@@ -107,3 +107,4 @@
 #include <kplib/threads/KpProgressGuiInterface.h>
 #include <kplib/threads/KpProgressInterface.h>
 #include <kplib/threads/ProgressScope.h>
+#include <kplib/volume/KpBitfield.h>

@@ -85,6 +85,8 @@ class KpRawData;
 class KpTypedElement;
 struct KpTypedPointer;
 
+class KpBitfield;
+
 class KpProgressGuiInterface;
 class KpProgressInterface;
 class ProgressScope;
