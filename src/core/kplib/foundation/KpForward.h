@@ -86,6 +86,8 @@ class KpTypedElement;
 struct KpTypedPointer;
 
 class KpBitfield;
+class KpNeighborIterator33;
+class KpScanConvert;
 
 class KpProgressGuiInterface;
 class KpProgressInterface;

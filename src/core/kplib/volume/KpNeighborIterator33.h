@@ -1,0 +1,59 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+#include <cstdint>
+
+/// The neighbours of a voxel in a 3x3x3 window of a dense volume, x fastest: a table of offsets, directions and weights
+/// that a loop over neighbours walks without arithmetic on coordinates.
+///
+/// It serves volumes of one size. Once weights are set, any number of threads may read it; nothing is allocated.
+class KPLIB_API KpNeighborIterator33 {
+public:
+    static constexpr int maxNeighbors = 26;
+
+    /// Which directions a neighbour lies in. A voxel at the volume's border has those bits set that lead outside; a
+    /// neighbour that shares one of them lies outside.
+    enum Border : unsigned char { XMin = 1, XMax = 2, YMin = 4, YMax = 8, ZMin = 16, ZMax = 32 };
+
+    /// `nNeighbors` is 4 or 8 (in plane), 10 (8 and the faces in z), 6, 18 or 26; any other makes a table that is never
+    /// filled. `dims` are three sizes.
+    KpNeighborIterator33(int nNeighbors, const int* dims);
+
+    /// Takes the weights from a table of 27 for the whole window, that of (dx, dy, dz) at 13 + dx + 3 dy + 9 dz and the
+    /// one in the middle unread; sorts by them unless `sort` is 0. Integers are kept as floats too, and floats as
+    /// integers, cut off toward zero. chars are signed.
+    void setWeights(const char* w, int sort);
+    void setWeights(const short* w, int sort);
+    void setWeights(const int* w, int sort);
+    void setWeights(const float* w, int sort);
+
+    /// Sorts all by ascending weight, as integers or as floats, and gives the index of the first positive one (of
+    /// integers at least 1); 26 if there is none.
+    int sort_iweights();
+    int sort_fweights();
+
+    int nNeighbors() const { return nNeighbors_; }
+    const int* dims() const { return dims_; }
+    // Of neighbour `i`, from 0 to nNeighbors() - 1.
+    int offset(int i) const { return offsets_[i]; }  ///< in elements: dx + dy * dims[0] + dz * dims[0] * dims[1]
+    int iweight(int i) const { return iweights_[i]; }
+    float fweight(int i) const { return fweights_[i]; }
+    const std::int8_t* delta(int i) const { return deltas_[i]; }  ///< dx, dy, dz, each -1, 0 or 1
+    unsigned char border(int i) const { return borders_[i]; }     ///< of Border
+
+private:
+    bool isFilled() const;
+    template <typename Weight>
+    void setIntegers(const Weight* w, int sort);
+    template <typename Weight>
+    int sortBy(const Weight* weights);
+
+    int nNeighbors_;
+    int dims_[3];
+    int offsets_[maxNeighbors];
+    int iweights_[maxNeighbors];
+    float fweights_[maxNeighbors];
+    std::int8_t deltas_[maxNeighbors][3];
+    unsigned char borders_[maxNeighbors];
+};

@@ -1,0 +1,46 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/geometry/KpVec2f.h>
+
+/// Turns polygons into spans of pixels, of any shape, by the even-odd rule: a pixel belongs to the polygon if its
+/// middle, at +0.5 in x and y, does. P. S. Heckbert, "Concave polygon scan conversion", Graphics Gems, 1990.
+///
+/// Rows come in ascending order, and the spans of a row from left to right. Different threads may render at once, and a
+/// callback may render with another object.
+class KPLIB_API KpScanConvert {
+public:
+    using SpanCB = void (*)(void* userData, int xLeft, int xRight, int y);
+    using PixelCB = void (*)(void* userData, int x, int y);
+
+    /// Reports pixels from (x0, y0) to (x1, y1), both included.
+    KpScanConvert(int x0, int y0, int x1, int y1) : window_{x0, y0, x1, y1} {}
+
+    /// What gets each span, its ends included, in place of the pixel callback; and the first argument of both.
+    void setSpanCB(SpanCB callback, void* userData)
+    {
+        spanCB_ = callback;
+        userData_ = userData;
+    }
+    /// What gets each pixel, from left to right, while no span callback is set; and the first argument of both.
+    void setPixelCB(PixelCB callback, void* userData)
+    {
+        pixelCB_ = callback;
+        userData_ = userData;
+    }
+
+    /// Reports the polygon of `n` vertices, which closes itself. Fewer than 3 vertices enclose nothing. O(n log n), and
+    /// a span costs a few comparisons; polygons of a few hundred vertices allocate nothing.
+    void render(int n, const KpVec2f* points);
+
+    /// The span callback at the start: hands the pixels on to the pixel callback of the object that renders.
+    static void defaultSpanCB(void* userData, int xLeft, int xRight, int y);
+
+private:
+    static void concaveCB(int y, int xLeft, int xRight);
+
+    void* userData_ = nullptr;
+    SpanCB spanCB_ = defaultSpanCB;
+    PixelCB pixelCB_ = nullptr;
+    int window_[4];
+};

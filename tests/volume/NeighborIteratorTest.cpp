@@ -1,0 +1,109 @@
+#include <kplib/volume/KpNeighborIterator33.h>
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstdlib>
+#include <random>
+#include <set>
+
+namespace {
+
+constexpr int dims[] = {10, 20, 30};
+
+template <typename Weight>
+std::vector<Weight> randomWeights(unsigned seed, int low, int high)
+{
+    std::mt19937 random(seed);
+    std::vector<Weight> weights(27);
+    for (Weight& weight : weights)
+        weight = static_cast<Weight>(std::uniform_int_distribution(low, high)(random));
+    return weights;
+}
+
+/// Each entry is one of the window, with the offset, border and weight that its direction has.
+template <typename Weight>
+void expectWhole(const KpNeighborIterator33& table, const std::vector<Weight>& weights)
+{
+    std::set<int> offsets;
+    for (int i = 0; i < table.nNeighbors(); ++i) {
+        const std::int8_t* const d = table.delta(i);
+        EXPECT_EQ(table.offset(i), d[0] + 10 * d[1] + 200 * d[2]);
+        const int border =
+            (d[0] < 0) + 2 * (d[0] > 0) + 4 * (d[1] < 0) + 8 * (d[1] > 0) + 16 * (d[2] < 0) + 32 * (d[2] > 0);
+        EXPECT_EQ(table.border(i), border);
+        const Weight weight = weights[static_cast<std::size_t>(13 + d[0] + 3 * d[1] + 9 * d[2])];
+        EXPECT_EQ(table.fweight(i), static_cast<float>(weight));
+        EXPECT_EQ(table.iweight(i), static_cast<int>(weight));
+        offsets.insert(table.offset(i));
+    }
+    EXPECT_EQ(offsets.size(), static_cast<std::size_t>(table.nNeighbors()));
+}
+
+}  // namespace
+
+TEST(KpNeighborIterator33, holdsEachNeighborOnceInItsOrder)
+{
+    const struct {
+        int count, mostInPlane, mostSteps;  // absolute offsets of z, and of all
+        int firstOffset, lastOffset;
+    } cases[] = {{4, 0, 1, -10, 1},  {6, 1, 1, -200, 1},  {8, 0, 2, -11, 1},
+                 {10, 1, 2, -11, 1}, {18, 1, 2, -210, 1}, {26, 1, 3, -211, 1}};
+    for (const auto& c : cases) {
+        KpNeighborIterator33 table(c.count, dims);
+        const auto weights = randomWeights<short>(1, -5, 5);
+        table.setWeights(weights.data(), 0);
+        expectWhole(table, weights);
+        EXPECT_EQ(table.offset(0), c.firstOffset);
+        EXPECT_EQ(table.offset(c.count - 1), c.lastOffset);
+        for (int i = 0; i < c.count; ++i) {
+            const std::int8_t* const d = table.delta(i);
+            EXPECT_LE(std::abs(d[2]), c.mostInPlane);
+            EXPECT_LE(std::abs(d[0]) + std::abs(d[1]) + std::abs(d[2]), c.count == 10 && d[2] != 0 ? 1 : c.mostSteps);
+        }
+    }
+    const KpNeighborIterator33 six(6, dims);
+    const int expected[] = {-200, -10, -1, 200, 10, 1};
+    for (int i = 0; i < 6; ++i)
+        EXPECT_EQ(six.offset(i), expected[i]);
+}
+
+TEST(KpNeighborIterator33, sortsAllByWeightAndTellsTheFirstPositive)
+{
+    for (const int count : {4, 6, 8, 10, 18, 26}) {
+        for (unsigned seed = 0; seed < 20; ++seed) {
+            KpNeighborIterator33 table(count, dims);
+            const auto integers = randomWeights<int>(seed, -3, 3);
+            table.setWeights(integers.data(), 1);
+            expectWhole(table, integers);
+            int firstPositive = 26;
+            for (int i = count - 1; i >= 0; --i) {
+                EXPECT_TRUE(i == 0 || table.iweight(i - 1) <= table.iweight(i));
+                if (table.iweight(i) > 0)
+                    firstPositive = i;
+            }
+            EXPECT_EQ(table.sort_iweights(), firstPositive);
+            EXPECT_EQ(table.sort_fweights(), firstPositive);
+        }
+    }
+    float floats[27];
+    std::fill_n(floats, 27, 2.75F);
+    floats[12] = -1e30F;
+    floats[14] = 0.5F;
+    KpNeighborIterator33 table(6, dims);
+    table.setWeights(floats, 1);
+    EXPECT_EQ(table.offset(0), -1);
+    EXPECT_EQ(table.iweight(0), INT32_MIN);
+    EXPECT_EQ(table.offset(1), 1);
+    EXPECT_EQ(table.iweight(1), 0);
+    EXPECT_EQ(table.iweight(5), 2);
+    EXPECT_EQ(table.sort_fweights(), 1);
+    EXPECT_EQ(table.sort_iweights(), 2);
+    const std::vector<char> negative(27, '\xFF');
+    table.setWeights(negative.data(), 1);
+    EXPECT_EQ(table.fweight(3), -1);
+    EXPECT_EQ(table.sort_iweights(), 26);
+    KpNeighborIterator33 unlisted(7, dims);
+    unlisted.setWeights(floats, 1);
+    EXPECT_EQ(unlisted.sort_fweights(), 26);
+}
