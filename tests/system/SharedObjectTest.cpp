@@ -1,0 +1,200 @@
+#include "support/LogCapture.h"
+
+#include <kplib/system/KpDSO.h>
+#include <kplib/system/KpFilename.h>
+
+#include <dlfcn.h>
+#include <filesystem>
+#include <fstream>
+#include <gtest/gtest.h>
+#include <unistd.h>
+
+namespace fs = std::filesystem;
+using kplib::test::Lines;
+using kplib::test::LogCapture;
+
+namespace {
+
+/// A folder for copies of the sample plug-in, each with a state of its own; the search path is the test's.
+class SharedObject : public testing::Test {
+protected:
+    void SetUp() override { fs::create_directories(folder); }
+    ~SharedObject() override
+    {
+        KpDSO::dsoSearchPath.clear();
+        KpDSO::verbose = 0;
+        fs::remove_all(folder);
+    }
+
+    std::string place(const std::string& name) const
+    {
+        fs::create_directories((folder / name).parent_path());
+        return folder / name;
+    }
+    std::string plugin(const std::string& name) const
+    {
+        fs::copy_file(KPLIB_SAMPLE_PLUGIN, place(name), fs::copy_options::overwrite_existing);
+        return folder / name;
+    }
+    void file(const std::string& name, const char* content) const { std::ofstream(place(name)) << content; }
+    void search(std::initializer_list<const char*> names)
+    {
+        for (const char* name : names)
+            searched.push_back(folder / name);
+        for (std::string& path : searched)
+            KpDSO::dsoSearchPath.append(path.data());
+    }
+
+    /// Where a symbol came from, below the folder; empty for none.
+    std::string origin(const KpDSO& object, const char* symbol = "sampleStarts") const
+    {
+        Dl_info info{};
+        void* const address = object.getSymbol(symbol);
+        return address && dladdr(address, &info) ? fs::path(info.dli_fname).lexically_relative(folder) : "";
+    }
+
+    const fs::path folder = fs::path(testing::TempDir()) / ("kplib_plugins_" + std::to_string(getpid()));
+    LogCapture log;
+
+private:
+    std::vector<std::string> searched;
+};
+
+}  // namespace
+
+TEST_F(SharedObject, makesTheNameOfALibraryOfABareOne)
+{
+    const std::pair<const char*, const char*> cases[] = {
+        {"foo", "libfoo.so"},     {"libfoo", "libfoo.so"},  {"library", "library.so"}, {"/a/foo", "/a/foo.so"},
+        {"a/foo", "liba/foo.so"}, {"libfoo.1", "libfoo.1"}, {"a.so.2", "a.so.2"},      {"./foo", "./foo"},
+    };
+    for (const auto& [name, expected] : cases) {
+        KpFilename fixed(name);
+        KpDSO::fixPath(fixed);
+        EXPECT_STREQ(fixed, expected) << name;
+    }
+}
+
+TEST_F(SharedObject, isLookedForFromTheLastFolderToTheFirst)
+{
+    for (const char* name :
+         {"one/libpick.so", "two/libpick.so", "one/libskip.so", "one/libtext.so", "one/sub/deep.so", "two/libpick.7"})
+        plugin(name);
+    file("two/libskip.so", "neither an object nor a script");
+    file("two/libtext.so", "/* GNU ld script */\nINPUT ( libm.so.6 )\n");
+    search({"one", "two", "gone"});
+    const std::pair<const char*, const char*> cases[] = {
+        {"pick", "two/libpick.so"}, {"libpick", "two/libpick.so"},      {"libpick.7", "two/libpick.7"},
+        {"skip", "one/libskip.so"}, {"sub/deep.so", "one/sub/deep.so"}, {"text", "one/libtext.so"},
+    };
+    for (const auto& [name, expected] : cases) {
+        KpDSO object(nullptr);
+        EXPECT_EQ(object.open(name, true), 0) << name;
+        EXPECT_EQ(origin(object), expected);
+    }
+    EXPECT_EQ(LogCapture::lines(), Lines());
+    KpDSO object(nullptr);
+    for (const char* missing : {"pick.so", "deep", "libskip.7", static_cast<const char*>(nullptr)}) {
+        EXPECT_EQ(object.open("pick", true), 0);
+        EXPECT_EQ(object.open(missing, true), -1);
+        EXPECT_FALSE(object.isOpen()) << "the object before is forgotten";
+    }
+}
+
+TEST_F(SharedObject, isLeftToTheSystemAtLast)
+{
+    for (int i = 0; i < 2; ++i) {
+        KpDSO object("libm.so.6");
+        ASSERT_TRUE(object.isOpen());
+        EXPECT_NE(object.getSymbol("cos"), nullptr);
+        search({"gone"});
+    }
+    EXPECT_EQ(LogCapture::lines(), Lines());
+}
+
+TEST_F(SharedObject, isStartedAtEachOpeningIfItHasAFunctionForThat)
+{
+    const std::tuple<const char*, const char*, int> cases[] = {
+        {"libsample.so", "libsample.so", 1},   {"a/libsample.x.so", "a/libsample.x.so", 0},
+        {"b/libsample.so", "b/libsample", 1},  {"xyzsample.9", "xyzsample.9", 1},
+        {"c/libother.so", "c/libother.so", 0}, {"d/s.", "d/s.", 0},
+    };
+    for (const auto& [name, opened, expected] : cases) {
+        plugin(name);
+        KpDSO object((folder / opened).c_str());
+        ASSERT_TRUE(object.isOpen()) << name;
+        EXPECT_EQ(object.executeInt("sampleStarts"), expected) << name;
+        EXPECT_EQ(object.open((folder / opened).c_str(), false), 0);
+        EXPECT_EQ(object.executeInt("sampleStarts"), 2 * expected) << name;
+    }
+    EXPECT_EQ(LogCapture::lines(), Lines());
+}
+
+TEST_F(SharedObject, isCalledWithUpToFivePointers)
+{
+    const std::string path = plugin("libcalls.so");
+    KpDSO object(path.c_str());
+    int one = 1, two = 2, three = 3, four = 4, five = 5;
+    EXPECT_EQ(object.executeInt("sampleInt0"), 0);
+    EXPECT_EQ(object.executeInt("sampleInt1", &one), 11);
+    EXPECT_EQ(object.executeInt("sampleInt2", &one, &two), 212);
+    EXPECT_EQ(object.executeInt("sampleInt3", &one, &two, &three), 3123);
+    EXPECT_EQ(object.executeInt("sampleInt4", &one, &two, &three, &four), 41234);
+    EXPECT_EQ(object.executeInt("sampleInt5", &one, &two, &three, &four, &five), 512345);
+    object.execute("sampleVoid0");
+    EXPECT_EQ(object.executeInt("sampleTold"), 0);
+    object.execute("sampleVoid5", &five, &four, &three, &two, &one);
+    EXPECT_EQ(object.executeInt("sampleTold"), 554321);
+    EXPECT_NE(object.executePtr("samplePointer0"), nullptr);
+    EXPECT_EQ(object.executePtr("samplePointer5", nullptr, &one, &two, &three, &four), &four);
+
+    const auto told = reinterpret_cast<int (*)()>(object.getSymbol("sampleTold"));
+    object.close();
+    EXPECT_FALSE(object.isOpen());
+    object.execute("sampleVoid0");
+    EXPECT_EQ(object.executeInt("sampleInt1", &one), 0);
+    EXPECT_EQ(object.executePtr("samplePointer0"), nullptr);
+    EXPECT_EQ(object.getSymbol("sampleTold"), nullptr);
+    EXPECT_EQ(told(), 554321) << "the object stays in the process";
+    ASSERT_EQ(object.open(path.c_str(), true), 0);
+    object.execute("sampleNone");
+    EXPECT_EQ(object.executeInt("sampleNone", &one), 0);
+    EXPECT_EQ(object.executePtr("sampleNone"), nullptr);
+    EXPECT_EQ(object.executeInt("sampleTold"), 554321);
+}
+
+TEST_F(SharedObject, tellsInTheLogThatThereWasSomething)
+{
+    const auto linesOf = [](auto work) {
+        LogCapture::lines().clear();
+        work();
+        return LogCapture::lines();
+    };
+    const std::string path = plugin("libother.so"), missing = folder / "libmissing.so";
+    KpDSO object(nullptr);
+    const auto open = [&](const std::string& name, bool quiet) {
+        return linesOf([&] { object.open(name.c_str(), quiet); });
+    };
+    const auto look = [&](const char* symbol) { return linesOf([&] { object.getSymbol(symbol); }); };
+    const std::string line = "  [] DSO", fixed = "  [] Fixed symbol sampleUnderscored by prepending '_'\n";
+    EXPECT_EQ(open(missing, false), Lines{line});
+    EXPECT_EQ(open(missing, true), Lines());
+    EXPECT_EQ(open(path, false), Lines());
+    EXPECT_EQ(look("sampleTold"), Lines());
+    EXPECT_EQ(look("sampleNone"), Lines());
+    EXPECT_EQ(look("sampleUnderscored"), Lines{fixed});
+    EXPECT_EQ(object.executeInt("sampleUnderscored"), 77);
+    KpDSO::verbose = 1;
+    EXPECT_EQ(look("sampleTold"), (Lines{line, line}));
+    EXPECT_EQ(look("sampleNone"), (Lines{line, "E [] DSO"}));
+    EXPECT_EQ(look("sampleUnderscored"), (Lines{line, fixed}));
+    EXPECT_EQ(open(path, true), (Lines{line, "E [] DSO"})) << "the look for the function that starts it";
+    EXPECT_EQ(open(path, false), (Lines{line, line, "E [] DSO"}));
+
+    KpString message;
+    EXPECT_EQ(object.tryOpen(path.c_str(), message), 0);
+    EXPECT_EQ(message, ("Successfully opened " + path + ".\n").c_str());
+    EXPECT_EQ(object.tryOpen(missing.c_str(), message), -1);
+    EXPECT_EQ(std::string(message).find("Couldn't open " + missing + ":\n" + missing), 0U) << message;
+    EXPECT_FALSE(object.isOpen());
+}
