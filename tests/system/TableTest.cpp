@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include <malloc.h>
 #include <map>
 #include <memory>
 #include <random>
@@ -39,6 +40,7 @@ class Pair {
 public:
     Pair()
     {
+        mallopt(M_PERTURB, 0xA5);  // what nobody sets to zero isn't
         for (int t = 0; t < 2; ++t)
             tables[t] = database.table(database.createTable());
         for (int t = 0; t < 2; ++t) {
@@ -48,10 +50,13 @@ public:
         }
     }
 
+    ~Pair() { mallopt(M_PERTURB, 0); }
+
     void step()
     {
         const int t = random() % 2;
         const long key = any(models[t]), other = any(models[1 - t]);
+        const bool isShrinking = steps++ % 1000 >= 900;  // leaves rows and cells that are free
         switch (random() % 16) {
         case 0:
             remove(t, key);
@@ -70,15 +75,24 @@ public:
             unrelate(t, key);
             break;
         case 7:
-            if (random() % 50 == 0)
-                tables[t]->expand(static_cast<int>(tables[t]->rowCount() + 700 + random() % 9), 0);
+            if (random() % 20 == 0)
+                tables[t]->expand(static_cast<int>(tables[t]->rowCount() + random() % 700), 0);
             break;
         case 8:
-            if (random() % 50 == 0)
-                tables[t]->relationReserve(2000, tables[t]->columnOffset(listColumn));
+            if (random() % 20 == 0)
+                tables[t]->relationReserve(reserved += 200, tables[t]->columnOffset(listColumn));
             break;
         default:
-            add(t);
+            isShrinking ? remove(t, key) : add(t);
+        }
+    }
+
+    void clear()
+    {
+        for (int t = 0; t < 2; ++t) {
+            tables[t]->clear();
+            tables[t]->externalRowPointers().clear();
+            models[t].clear();
         }
     }
 
@@ -86,8 +100,10 @@ public:
     {
         tables[t]->columnAdd(lateColumn, KpTable::Plain, 8, nullptr);
         long next = 1;
-        for (auto& [key, model] : models[t])
+        for (auto& [key, model] : models[t]) {
+            EXPECT_EQ(valueOf(*tables[t], *model.row, lateColumn), 0);
             setValue(*tables[t], *model.row, model.late = next++, lateColumn);
+        }
     }
 
     void expectHolds(const KpDataBase& held, bool isClone = false) const
@@ -192,7 +208,8 @@ private:
         ASSERT_EQ(KpTable::relationGetCount(row, offset), static_cast<int>(expected.size()));
     }
 
-    long nextKey = 0;
+    long nextKey = 0, steps = 0;
+    int reserved = 0;
 };
 
 }  // namespace
@@ -205,6 +222,8 @@ TEST(KpTable, agreesWithAMapThroughMovesOfRowsAndCells)
     for (int i = 0; i < 9000; ++i) {
         pair.step();
         ASSERT_TRUE(pair.database.check()) << i;
+        if (i == 2500)
+            pair.clear();
         if (i % 1000 == 999) {
             ASSERT_NO_FATAL_FAILURE(pair.expectHolds(pair.database)) << i;
         }
@@ -215,24 +234,72 @@ TEST(KpTable, agreesWithAMapThroughMovesOfRowsAndCells)
 TEST(KpTable, clonesAreEqualAndIndependent)
 {
     Pair pair;
-    for (int i = 0; i < 3000; ++i)
+    for (int i = 0; i < 2950; ++i)
         pair.step();
     for (int t = 0; t < 2; ++t)
         pair.addLateColumn(t);  // a column for rows that are there; its values tell the rows of the clone
+    pair.tables[1]->setName("second");
     KpDataBase copy;
     pair.database.clone(copy);
     ASSERT_NO_FATAL_FAILURE(pair.expectHolds(pair.database));
     ASSERT_NO_FATAL_FAILURE(pair.expectHolds(copy, true));
+    EXPECT_STREQ(copy.table(401)->name(), "second");
     EXPECT_EQ(copy.createTable(), 402);
     for (int t = 0; t < 2; ++t) {
-        copy.table(400 + t)->expand(5000, 24);
-        while (char* const row = copy.table(401 - t)->rowNext(nullptr)) {
-            KpTable::pointerSet(row, copy.table(401 - t)->columnOffset(pointerColumn), nullptr);
-            copy.table(401 - t)->relationRemoveAll(row, copy.table(401 - t)->columnOffset(listColumn));
-            copy.table(401 - t)->rowDel(row);
+        KpTable& table = *copy.table(400 + t);
+        const int list = table.columnOffset(listColumn);
+        for (long i = table.rowCount(); i > 0; --i) {  // in what was free, and beyond
+            char* const row = table.rowAdd();
+            table.relationAdd(row, list, row);
         }
+        ASSERT_EQ(table.rowCount(), 2 * static_cast<long>(pair.models[t].size()));
+        table.expand(5000, 24);
+        ASSERT_TRUE(copy.check());
     }
     EXPECT_NO_FATAL_FAILURE(pair.expectHolds(pair.database));
+    std::memset(copy.table(400)->rowNext(nullptr) + 4, 0, 4);
+    EXPECT_FALSE(copy.check());
+}
+
+TEST(KpTable, movesOnlyWhenThereIsNoRoomLeft)
+{
+    KpDataBase database;
+    KpTable& table = *database.table(database.createTable());
+    table.columnAdd(1, KpTable::Plain, 4, nullptr);
+    table.columnAdd(2, KpTable::Relation, 0, &table);
+    const int list = table.columnOffset(2);
+    char* row = table.rowAdd();
+    table.externalRowPointers().append(&row);
+    char* const place = row;
+    while (table.rowCount() < 512)
+        table.rowAdd();
+    for (int i = 0; i < 3; ++i)
+        table.rowDel(table.rowNext(row));
+    EXPECT_EQ(table.rowReserve(3), 0);
+    EXPECT_EQ(table.expand(512, 0), 0);
+    EXPECT_EQ(row, place);
+    const long moved = table.rowReserve(4);
+    EXPECT_EQ(row, place + moved);
+    EXPECT_EQ(table.rowReserve(3 + 512), 0);
+    EXPECT_NE(table.rowReserve(3 + 513), 0);
+
+    const auto addCells = [&](int cells) {
+        char** const first = KpTable::relationFirst(row, list);
+        for (int i = 0; i < cells; ++i)
+            table.relationAdd(row, list, row);
+        EXPECT_EQ(KpTable::relationFirst(row, list), first);
+    };
+    table.relationAdd(row, list, row);
+    addCells(511);
+    table.relationDel(row, list, row);
+    table.relationAdd(row, list, row);
+    addCells(0);
+    table.relationReserve(513, list);
+    addCells(513);
+    table.relationRemoveAll(row, list);
+    EXPECT_EQ(KpTable::relationGetCount(row, list), 0);
+    table.relationAdd(row, list, row);
+    addCells(1024);
 }
 
 TEST(KpTable, refusesColumnsThatTheRowFormHasNoPlaceFor)
@@ -259,26 +326,48 @@ TEST(KpTable, checkFindsWhatDoesNotHoldUnlessItIsSkipped)
     table.columnAdd(1, KpTable::Plain, 4, nullptr);
     table.columnAdd(2, KpTable::RowPointer, 0, &table);
     table.columnAdd(3, KpTable::Relation, 0, &table);
+    const int to = table.columnOffset(2), list = table.columnOffset(3);
     char* const row = table.rowAdd();
-    table.relationAdd(row, table.columnOffset(3), row);
+    char* const freed = table.rowAdd();
+    table.relationAdd(row, list, row);
+    char** const cell = KpTable::relationFirst(row, list);
+    table.rowDel(freed);
+    KpTable::pointerSet(row, to, freed);
     ASSERT_TRUE(database.check());
-    for (const int offset : {0, 4, table.columnOffset(2), table.columnOffset(3)}) {
+
+    char outside[8];
+    std::memcpy(outside, row, 8);  // as good as a row, but for its place
+    char* cellOutside[2] = {row, nullptr};
+    const struct {
+        const char* what;
+        void* place;
+        const void* wrong;
+    } cases[] = {
+        {"state", row, "\2\0\0"},
+        {"table", row + 4, "\0\0\0"},
+        {"a free row is no row of this table", freed + 4, "\0\0\0"},
+        {"row outside", row + to, outside},
+        {"cell outside", row + list, cellOutside},
+        {"target between rows", cell, row + 1},
+        {"list without end", cell + 1, cell},
+    };
+    for (const auto& c : cases) {
+        const bool isWord = c.place == row || c.place == row + 4 || c.place == freed + 4;
+        const void* const wrong = isWord ? c.wrong : &c.wrong;
+        const size_t size = isWord ? 4 : 8;
         char saved[8];
-        std::memcpy(saved, row + offset, 8);
-        const char* const wrong = saved;
-        std::memcpy(row + offset, &wrong, 8);
-        EXPECT_FALSE(database.check()) << offset;
-        EXPECT_EQ(table.lockRelation(9999), -1);  // which skips the check instead
+        std::memcpy(saved, c.place, size);
+        std::memcpy(c.place, wrong, size);
+        EXPECT_FALSE(database.check()) << c.what;
+        EXPECT_EQ(table.unlockRelation(9999), -1);  // which skips the check instead
         EXPECT_TRUE(database.check());
         table.unskipCheck();
         database.skipCheck();
-        EXPECT_TRUE(database.check());
+        EXPECT_TRUE(database.check() && table.check());
         database.unskipCheck();
-        std::memcpy(row + offset, saved, 8);
+        std::memcpy(c.place, saved, size);
     }
-    EXPECT_EQ(table.lockRelation(table.columnOffset(3)), 3);
-    table.clear();
-    EXPECT_EQ(table.rowCount(), 0);
+    EXPECT_EQ(table.lockRelation(list), 3);
     EXPECT_EQ(table.rowSize(), 32);
     EXPECT_TRUE(database.check());
 }
