@@ -18,7 +18,6 @@ namespace {
 /// A folder for copies of the sample plug-in, each with a state of its own; the search path is the test's.
 class SharedObject : public testing::Test {
 protected:
-    void SetUp() override { fs::create_directories(folder); }
     ~SharedObject() override
     {
         KpDSO::dsoSearchPath.clear();
@@ -26,38 +25,16 @@ protected:
         fs::remove_all(folder);
     }
 
-    std::string place(const std::string& name) const
-    {
-        fs::create_directories((folder / name).parent_path());
-        return folder / name;
-    }
     std::string plugin(const std::string& name) const
     {
-        fs::copy_file(KPLIB_SAMPLE_PLUGIN, place(name), fs::copy_options::overwrite_existing);
+        fs::create_directories((folder / name).parent_path());
+        fs::copy_file(KPLIB_SAMPLE_PLUGIN, folder / name);
         return folder / name;
     }
-    void file(const std::string& name, const char* content) const { std::ofstream(place(name)) << content; }
-    void search(std::initializer_list<const char*> names)
-    {
-        for (const char* name : names)
-            searched.push_back(folder / name);
-        for (std::string& path : searched)
-            KpDSO::dsoSearchPath.append(path.data());
-    }
 
-    /// Where an object came from, below the folder; empty for none.
-    std::string origin(const KpDSO& object) const
-    {
-        Dl_info info{};
-        void* const address = object.getSymbol("sampleStarts");
-        return address && dladdr(address, &info) ? fs::path(info.dli_fname).lexically_relative(folder) : "";
-    }
-
-    const fs::path folder = fs::path(testing::TempDir()) / ("kplib_plugins_" + std::to_string(getpid()));
+    std::string folderName = testing::TempDir() + "kplib_plugins_XXXXXX";  // what is loaded twice is there but once
+    const fs::path folder = mkdtemp(folderName.data());
     LogCapture log;
-
-private:
-    std::vector<std::string> searched;
 };
 
 }  // namespace
@@ -80,10 +57,12 @@ TEST_F(SharedObject, isLookedForFromTheLastFolderToTheFirst)
     for (const char* name :
          {"one/libpick.so", "two/libpick.so", "one/libskip.so", "one/libtext.so", "one/sub/deep.so", "two/libpick.7"})
         plugin(name);
-    file("two/libskip.so", "neither an object nor a script");
-    file("two/libtext.so", "/* GNU ld script */\nINPUT ( libm.so.6 )\n");
+    std::ofstream(plugin("two/libskip.so")) << "neither an object nor a script";
+    std::ofstream(plugin("two/libtext.so")) << "/* GNU ld script */\nINPUT ( libm.so.6 )\n";
+    std::string searched[] = {folder / "one", folder / "two", folder / "gone"};
     EXPECT_NE(KpDSO("libm.so.6").getSymbol("cos"), nullptr) << "the system's own search";
-    search({"one", "two", "gone"});
+    for (std::string& path : searched)
+        KpDSO::dsoSearchPath.append(path.data());
     EXPECT_NE(KpDSO("libm.so.6").getSymbol("cos"), nullptr) << "when all folders have failed";
     const std::pair<const char*, const char*> cases[] = {
         {"pick", "two/libpick.so"}, {"libpick", "two/libpick.so"},      {"libpick.7", "two/libpick.7"},
@@ -92,7 +71,9 @@ TEST_F(SharedObject, isLookedForFromTheLastFolderToTheFirst)
     for (const auto& [name, expected] : cases) {
         KpDSO object(nullptr);
         EXPECT_EQ(object.open(name, true), 0) << name;
-        EXPECT_EQ(origin(object), expected);
+        Dl_info origin{};
+        EXPECT_TRUE(dladdr(object.getSymbol("sampleStarts"), &origin));
+        EXPECT_EQ(origin.dli_fname, (folder / expected).string());
     }
     EXPECT_EQ(LogCapture::lines(), Lines());
     KpDSO object(nullptr);
