@@ -19,7 +19,7 @@ std::string version(int parts)
 {
     std::string text = std::to_string(numbers[0]);
     for (int i = 1; i < parts; ++i)
-        text += "." + std::to_string(numbers[i]);
+        text.append(".").append(std::to_string(numbers[i]));
     return text;
 }
 
