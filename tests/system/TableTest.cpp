@@ -19,7 +19,6 @@ struct ModelRow {
     long value;
     long partner = -1;       // a key of the other table
     std::vector<long> list;  // keys of the row's own table
-    long late = 0;
 };
 using Model = std::map<long, ModelRow>;
 
@@ -54,6 +53,10 @@ public:
 
     void step()
     {
+        for (int t = 0; t < 2; ++t) {
+            if (models[t].empty())
+                add(t);
+        }
         const int t = random() % 2;
         const long key = any(models[t]), other = any(models[1 - t]);
         const bool isShrinking = steps++ % 1000 >= 900;  // leaves rows and cells that are free
@@ -84,13 +87,13 @@ public:
         }
     }
 
+    /// A copy of the value, behind the columns that are there.
     void addLateColumn(int t)
     {
         tables[t]->columnAdd(lateColumn, KpTable::Plain, 8, nullptr);
-        long next = 1;
-        for (auto& [key, model] : models[t]) {
+        for (const auto& [key, model] : models[t]) {
             EXPECT_EQ(valueOf(*tables[t], *model.row, lateColumn), 0);
-            setValue(*tables[t], *model.row, model.late = next++, lateColumn);
+            setValue(*tables[t], *model.row, model.value, lateColumn);
         }
     }
 
@@ -117,45 +120,40 @@ public:
 private:
     long any(const Model& model)
     {
-        const auto hit =
-            model.lower_bound(model.empty() ? 0 : static_cast<long>(random() % static_cast<unsigned>(nextKey)));
-        return hit == model.end() ? -1 : hit->first;
+        const auto hit = model.lower_bound(static_cast<long>(random() % static_cast<unsigned>(nextKey)));
+        return hit == model.end() ? model.rbegin()->first : hit->first;
     }
     void add(int t)
     {
-        ModelRow model{std::make_unique<char*>(tables[t]->rowAdd()), static_cast<long>(random()), -1, {}, 0};
+        ModelRow model{std::make_unique<char*>(tables[t]->rowAdd()), static_cast<long>(random()), -1, {}};
         setValue(*tables[t], *model.row, model.value);
+        if (tables[t]->columnOffset(lateColumn) >= 0)
+            setValue(*tables[t], *model.row, model.value, lateColumn);
         tables[t]->externalRowPointers().append(model.row.get());
         models[t].emplace(nextKey++, std::move(model));
     }
     void link(int t, long key, long other)
     {
-        if (key < 0 || other < 0)
-            return;
         models[t].at(key).partner = other;
         KpTable::pointerSet(*models[t].at(key).row, tables[t]->columnOffset(pointerColumn),
                             *models[1 - t].at(other).row);
     }
     void relate(int t, long key, long target)
     {
-        if (key < 0 || target < 0)
-            return;
         models[t].at(key).list.push_back(target);
         tables[t]->relationAdd(*models[t].at(key).row, tables[t]->columnOffset(listColumn), *models[t].at(target).row);
     }
     void unrelate(int t, long key)
     {
-        if (key < 0 || models[t].at(key).list.empty())
-            return;
         std::vector<long>& list = models[t].at(key).list;
+        if (list.empty())
+            return;
         const long target = list[random() % list.size()];
         list.erase(std::find(list.begin(), list.end(), target));
         tables[t]->relationDel(*models[t].at(key).row, tables[t]->columnOffset(listColumn), *models[t].at(target).row);
     }
     void remove(int t, long key)
     {
-        if (key < 0)
-            return;
         for (auto& [k, model] : models[1 - t]) {
             if (model.partner == key) {
                 model.partner = -1;
@@ -179,7 +177,7 @@ private:
     {
         const KpTable& other = *held.table(table.tableId() == 400 ? 401 : 400);
         ASSERT_EQ(valueOf(table, row), model.value);
-        ASSERT_EQ(valueOf(table, row, lateColumn), model.late);
+        ASSERT_EQ(valueOf(table, row, lateColumn), model.value);
         const char* const partner = KpTable::pointer(row, table.columnOffset(pointerColumn));
         ASSERT_EQ(partner != nullptr, model.partner >= 0);
         if (partner) {

@@ -37,11 +37,6 @@ void sampleTell(void* a, void* b, void* c, void* d, void* e)
 {
     told = 1000 * sampleTwo(a, b) + 10 * sampleTwo(c, d) + digit(e);
 }
-int sampleFive(void* a, void* b, void* c, void* d, void* e)
-{
-    sampleTell(a, b, c, d, e);
-    return told;
-}
 void* sampleLast(void* /*a*/, void* /*b*/, void* /*c*/, void* /*d*/, void* e)
 {
     return e;
