@@ -1,4 +1,3 @@
-#include <kplib/log/KpCrashDump.h>
 #include <kplib/log/KpDbC.h>
 #include <kplib/log/KpMessageCollector.h>
 #include <kplib/log/KpTerminateProcess.h>
@@ -34,13 +33,6 @@ TEST(KpDbC, keepsSwitchesAndHook)
     kp_DbC_callbackSet(hook);
     EXPECT_EQ(kp_DbC_callback(), hook);
     kp_DbC_callbackSet(nullptr);
-}
-
-TEST(KpCrashDump, answersNothing)
-{
-    EXPECT_EQ(kpCrashDumpConfig(), nullptr);
-    EXPECT_EQ(kpInitCrashDumpWriter("/tmp"), 0);
-    EXPECT_EQ(kpEnableProbeDellBackupAndRecoveryCrash(true), 0);
 }
 
 TEST(KpTerminateProcessDeathTest, endsBySignalOrByStatusWithoutExitHandlers)

@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include <malloc.h>
 #include <map>
 #include <memory>
 #include <random>
@@ -18,7 +19,6 @@ struct ModelRow {
     long value;
     long partner = -1;       // a key of the other table
     std::vector<long> list;  // keys of the row's own table
-    long late = 0;
 };
 using Model = std::map<long, ModelRow>;
 
@@ -39,6 +39,7 @@ class Pair {
 public:
     Pair()
     {
+        mallopt(M_PERTURB, 0xA5);  // what nobody sets to zero isn't
         for (int t = 0; t < 2; ++t)
             tables[t] = database.table(database.createTable());
         for (int t = 0; t < 2; ++t) {
@@ -48,46 +49,52 @@ public:
         }
     }
 
+    ~Pair() { mallopt(M_PERTURB, 0); }
+
     void step()
     {
+        for (int t = 0; t < 2; ++t) {
+            if (models[t].empty())
+                add(t);
+        }
         const int t = random() % 2;
         const long key = any(models[t]), other = any(models[1 - t]);
-        switch (random() % 16) {
-        case 0:
+        const bool isShrinking = steps++ % 1000 >= 900;  // leaves rows and cells that are free
+        const unsigned int what = random() % 16;
+        if (what == 0 || (what > 8 && isShrinking))
             remove(t, key);
-            break;
-        case 1:
+        else if (what == 1)
             link(t, key, other);
-            break;
-        case 2:
-        case 3:
-        case 4:
-        case 5:
+        else if (what < 6)
             for (int i = 0; i < 3; ++i)
                 relate(t, key, any(models[t]));
-            break;
-        case 6:
+        else if (what == 6)
             unrelate(t, key);
-            break;
-        case 7:
-            if (random() % 50 == 0)
-                tables[t]->expand(static_cast<int>(tables[t]->rowCount() + 700 + random() % 9), 0);
-            break;
-        case 8:
-            if (random() % 50 == 0)
-                tables[t]->relationReserve(2000, tables[t]->columnOffset(listColumn));
-            break;
-        default:
+        else if (what == 7 && random() % 20 == 0)
+            tables[t]->expand(static_cast<int>(tables[t]->rowCount() + random() % 700), 0);
+        else if (what == 8 && random() % 20 == 0)
+            tables[t]->relationReserve(reserved += 200, tables[t]->columnOffset(listColumn));
+        else if (what > 8)
             add(t);
+    }
+
+    void clear()
+    {
+        for (int t = 0; t < 2; ++t) {
+            tables[t]->clear();
+            tables[t]->externalRowPointers().clear();
+            models[t].clear();
         }
     }
 
+    /// A copy of the value, behind the columns that are there.
     void addLateColumn(int t)
     {
         tables[t]->columnAdd(lateColumn, KpTable::Plain, 8, nullptr);
-        long next = 1;
-        for (auto& [key, model] : models[t])
-            setValue(*tables[t], *model.row, model.late = next++, lateColumn);
+        for (const auto& [key, model] : models[t]) {
+            EXPECT_EQ(valueOf(*tables[t], *model.row, lateColumn), 0);
+            setValue(*tables[t], *model.row, model.value, lateColumn);
+        }
     }
 
     void expectHolds(const KpDataBase& held, bool isClone = false) const
@@ -113,45 +120,40 @@ public:
 private:
     long any(const Model& model)
     {
-        const auto hit =
-            model.lower_bound(model.empty() ? 0 : static_cast<long>(random() % static_cast<unsigned>(nextKey)));
-        return hit == model.end() ? -1 : hit->first;
+        const auto hit = model.lower_bound(static_cast<long>(random() % static_cast<unsigned>(nextKey)));
+        return hit == model.end() ? model.rbegin()->first : hit->first;
     }
     void add(int t)
     {
-        ModelRow model{std::make_unique<char*>(tables[t]->rowAdd()), static_cast<long>(random()), -1, {}, 0};
+        ModelRow model{std::make_unique<char*>(tables[t]->rowAdd()), static_cast<long>(random()), -1, {}};
         setValue(*tables[t], *model.row, model.value);
+        if (tables[t]->columnOffset(lateColumn) >= 0)
+            setValue(*tables[t], *model.row, model.value, lateColumn);
         tables[t]->externalRowPointers().append(model.row.get());
         models[t].emplace(nextKey++, std::move(model));
     }
     void link(int t, long key, long other)
     {
-        if (key < 0 || other < 0)
-            return;
         models[t].at(key).partner = other;
         KpTable::pointerSet(*models[t].at(key).row, tables[t]->columnOffset(pointerColumn),
                             *models[1 - t].at(other).row);
     }
     void relate(int t, long key, long target)
     {
-        if (key < 0 || target < 0)
-            return;
         models[t].at(key).list.push_back(target);
         tables[t]->relationAdd(*models[t].at(key).row, tables[t]->columnOffset(listColumn), *models[t].at(target).row);
     }
     void unrelate(int t, long key)
     {
-        if (key < 0 || models[t].at(key).list.empty())
-            return;
         std::vector<long>& list = models[t].at(key).list;
+        if (list.empty())
+            return;
         const long target = list[random() % list.size()];
         list.erase(std::find(list.begin(), list.end(), target));
         tables[t]->relationDel(*models[t].at(key).row, tables[t]->columnOffset(listColumn), *models[t].at(target).row);
     }
     void remove(int t, long key)
     {
-        if (key < 0)
-            return;
         for (auto& [k, model] : models[1 - t]) {
             if (model.partner == key) {
                 model.partner = -1;
@@ -175,7 +177,7 @@ private:
     {
         const KpTable& other = *held.table(table.tableId() == 400 ? 401 : 400);
         ASSERT_EQ(valueOf(table, row), model.value);
-        ASSERT_EQ(valueOf(table, row, lateColumn), model.late);
+        ASSERT_EQ(valueOf(table, row, lateColumn), model.value);
         const char* const partner = KpTable::pointer(row, table.columnOffset(pointerColumn));
         ASSERT_EQ(partner != nullptr, model.partner >= 0);
         if (partner) {
@@ -192,7 +194,8 @@ private:
         ASSERT_EQ(KpTable::relationGetCount(row, offset), static_cast<int>(expected.size()));
     }
 
-    long nextKey = 0;
+    long nextKey = 0, steps = 0;
+    int reserved = 0;
 };
 
 }  // namespace
@@ -205,6 +208,8 @@ TEST(KpTable, agreesWithAMapThroughMovesOfRowsAndCells)
     for (int i = 0; i < 9000; ++i) {
         pair.step();
         ASSERT_TRUE(pair.database.check()) << i;
+        if (i == 2970)  // while there are free rows and cells
+            pair.clear();
         if (i % 1000 == 999) {
             ASSERT_NO_FATAL_FAILURE(pair.expectHolds(pair.database)) << i;
         }
@@ -215,24 +220,69 @@ TEST(KpTable, agreesWithAMapThroughMovesOfRowsAndCells)
 TEST(KpTable, clonesAreEqualAndIndependent)
 {
     Pair pair;
-    for (int i = 0; i < 3000; ++i)
+    for (int i = 0; i < 2950; ++i)
         pair.step();
     for (int t = 0; t < 2; ++t)
         pair.addLateColumn(t);  // a column for rows that are there; its values tell the rows of the clone
+    pair.tables[1]->setName("second");
     KpDataBase copy;
     pair.database.clone(copy);
     ASSERT_NO_FATAL_FAILURE(pair.expectHolds(pair.database));
     ASSERT_NO_FATAL_FAILURE(pair.expectHolds(copy, true));
+    EXPECT_STREQ(copy.table(401)->name(), "second");
     EXPECT_EQ(copy.createTable(), 402);
     for (int t = 0; t < 2; ++t) {
-        copy.table(400 + t)->expand(5000, 24);
-        while (char* const row = copy.table(401 - t)->rowNext(nullptr)) {
-            KpTable::pointerSet(row, copy.table(401 - t)->columnOffset(pointerColumn), nullptr);
-            copy.table(401 - t)->relationRemoveAll(row, copy.table(401 - t)->columnOffset(listColumn));
-            copy.table(401 - t)->rowDel(row);
+        KpTable& table = *copy.table(400 + t);
+        const int list = table.columnOffset(listColumn);
+        for (long i = table.rowCount(); i > 0; --i) {  // in what was free, and beyond
+            char* const row = table.rowAdd();
+            table.relationAdd(row, list, row);
         }
+        ASSERT_EQ(table.rowCount(), 2 * static_cast<long>(pair.models[t].size()));
+        table.expand(5000, 24);
+        ASSERT_TRUE(copy.check());
     }
     EXPECT_NO_FATAL_FAILURE(pair.expectHolds(pair.database));
+    std::memset(copy.table(400)->rowNext(nullptr) + 4, 0, 4);
+    EXPECT_FALSE(copy.check());
+}
+
+TEST(KpTable, movesOnlyWhenThereIsNoRoomLeft)
+{
+    KpDataBase database;
+    KpTable& table = *database.table(database.createTable());
+    table.columnAdd(1, KpTable::Plain, 4, nullptr);
+    table.columnAdd(2, KpTable::Relation, 0, &table);
+    const int list = table.columnOffset(2);
+    char* row = table.rowAdd();
+    table.externalRowPointers().append(&row);
+    char* const place = row;
+    while (table.rowCount() < 512)
+        table.rowAdd();
+    for (int i = 0; i < 3; ++i)
+        table.rowDel(table.rowNext(row));
+    EXPECT_EQ(table.rowReserve(3), 0);
+    EXPECT_EQ(table.expand(512, 0), 0);
+    EXPECT_EQ(row, place);
+    const long moved = table.rowReserve(4);
+    EXPECT_EQ(row, place + moved);
+    EXPECT_EQ(table.rowReserve(3 + 512), 0);
+    EXPECT_NE(table.rowReserve(3 + 513), 0);
+
+    const auto addWithoutMove = [&](int cells) {
+        table.relationAdd(row, list, row);
+        char** const first = KpTable::relationFirst(row, list);
+        table.relationReserve(cells, list);
+        for (int i = 0; i < cells; ++i)
+            table.relationAdd(row, list, row);
+        EXPECT_EQ(KpTable::relationFirst(row, list), first) << cells;
+    };
+    addWithoutMove(511);
+    table.relationReserve(513, list);
+    addWithoutMove(512);
+    table.relationRemoveAll(row, list);
+    EXPECT_EQ(KpTable::relationGetCount(row, list), 0);
+    addWithoutMove(1024);
 }
 
 TEST(KpTable, refusesColumnsThatTheRowFormHasNoPlaceFor)
@@ -259,26 +309,41 @@ TEST(KpTable, checkFindsWhatDoesNotHoldUnlessItIsSkipped)
     table.columnAdd(1, KpTable::Plain, 4, nullptr);
     table.columnAdd(2, KpTable::RowPointer, 0, &table);
     table.columnAdd(3, KpTable::Relation, 0, &table);
+    const int to = table.columnOffset(2), list = table.columnOffset(3);
     char* const row = table.rowAdd();
-    table.relationAdd(row, table.columnOffset(3), row);
+    char* const freed = table.rowAdd();
+    table.relationAdd(row, list, row);
+    char** const cell = KpTable::relationFirst(row, list);
+    table.rowDel(freed);
+    KpTable::pointerSet(row, to, freed);
     ASSERT_TRUE(database.check());
-    for (const int offset : {0, 4, table.columnOffset(2), table.columnOffset(3)}) {
-        char saved[8];
-        std::memcpy(saved, row + offset, 8);
-        const char* const wrong = saved;
-        std::memcpy(row + offset, &wrong, 8);
-        EXPECT_FALSE(database.check()) << offset;
-        EXPECT_EQ(table.lockRelation(9999), -1);  // which skips the check instead
+
+    char outside[8];
+    std::memcpy(outside, row, 8);  // as good as a row, but for its place
+    char* cellOutside[2] = {row, nullptr};
+    const auto bytes = [](const void* pointer) { return std::string(reinterpret_cast<char*>(&pointer), 8); };
+    const std::tuple<const char*, void*, std::string> faults[] = {
+        {"state", row, std::string("\2\0\0\0", 4)},
+        {"table", row + 4, std::string(4, '\0')},
+        {"table of a free row that is pointed to", freed + 4, std::string(4, '\0')},
+        {"row outside", row + to, bytes(outside)},
+        {"cell outside", row + list, bytes(cellOutside)},
+        {"target between rows", cell, bytes(row + 1)},
+        {"list without end", cell + 1, bytes(cell)},
+    };
+    for (const auto& [what, place, wrong] : faults) {
+        const std::string saved(static_cast<char*>(place), wrong.size());
+        std::memcpy(place, wrong.data(), wrong.size());
+        EXPECT_FALSE(database.check()) << what;
+        EXPECT_EQ(table.unlockRelation(9999), -1);  // which skips the check instead
         EXPECT_TRUE(database.check());
         table.unskipCheck();
         database.skipCheck();
-        EXPECT_TRUE(database.check());
+        EXPECT_TRUE(database.check() && table.check());
         database.unskipCheck();
-        std::memcpy(row + offset, saved, 8);
+        std::memcpy(place, saved.data(), saved.size());
     }
-    EXPECT_EQ(table.lockRelation(table.columnOffset(3)), 3);
-    table.clear();
-    EXPECT_EQ(table.rowCount(), 0);
+    EXPECT_EQ(table.lockRelation(list), 3);
     EXPECT_EQ(table.rowSize(), 32);
     EXPECT_TRUE(database.check());
 }

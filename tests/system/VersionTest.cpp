@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include <locale>
 #include <regex>
 
 TEST(KpVersion, readsNumbersJoinedByDots)
@@ -10,23 +11,22 @@ TEST(KpVersion, readsNumbersJoinedByDots)
     const struct {
         const char *text, *expected;
     } cases[] = {
-        {"1.2", "1.2.0.0"},
-        {"7", "7.0.0.0"},
-        {"1.2.3.4.5", "1.2.3.4"},
-        {"1.2.3.4x", "1.2.3.4"},
-        {" 1. 2", "1.2.0.0"},
-        {"", "0.0.0.0"},
-        {"1.2.", "0.0.0.0"},
-        {"1.x", "0.0.0.0"},
-        {"1 .2", "0.0.0.0"},
-        {"1.2 ", "0.0.0.0"},
-        {"a", "0.0.0.0"},
-        {"1..2", "0.0.0.0"},
-        {"1.4294967296", "0.0.0.0"},
-        {"4294967295", "4294967295.0.0.0"},
+        {"1.2", "1.2.0.0"},       {"7.100", "7.100.0.0"},      {"7", "7.0.0.0"},
+        {"1.2.3.4.5", "1.2.3.4"}, {"1.2.3.4x", "1.2.3.4"},     {" 1. 2", "1.2.0.0"},
+        {"", "0.0.0.0"},          {"1.2.", "0.0.0.0"},         {"1.x", "0.0.0.0"},
+        {"1 .2", "0.0.0.0"},      {"1.2 ", "0.0.0.0"},         {"a", "0.0.0.0"},
+        {"1..2", "0.0.0.0"},      {"1.4294967296", "0.0.0.0"}, {"4294967295", "4294967295.0.0.0"},
     };
-    for (const auto& c : cases)
-        EXPECT_EQ(KpVersion(c.text).toString(), c.expected) << c.text;
+    struct DotBetweenThousands : std::numpunct<char> {
+        char do_thousands_sep() const override { return '.'; }
+        std::string do_grouping() const override { return "\3"; }
+    };
+    for (const std::locale& locale : {std::locale(), std::locale(std::locale(), new DotBetweenThousands)}) {
+        const std::locale before = std::locale::global(locale);
+        for (const auto& c : cases)
+            EXPECT_EQ(KpVersion(c.text).toString(), c.expected) << c.text;
+        std::locale::global(before);
+    }
 }
 
 TEST(KpVersion, isOrderedPartByPartAsUnsigned)

@@ -3,21 +3,24 @@
 #include <kplib/system/platform/Platform.h>
 
 #include <KpBuildValues.h>
-#include <boost/format.hpp>
+#include <algorithm>
 #include <map>
+#include <string>
 
 namespace {
 
 namespace values = kplib::build;
 
-std::string text(const char* format, int number)
-{
-    return (boost::format(format) % number).str();
-}
+constexpr int numbers[] = {values::major, values::minor, values::patch, values::build};
 
-std::string versionString()
+/// The first `parts` numbers of the version. Not by a stream or format, which group digits as the program's locale
+/// has it.
+std::string version(int parts)
 {
-    return (boost::format("%1%.%2%.%3%.%4%") % values::major % values::minor % values::patch % values::build).str();
+    std::string text = std::to_string(numbers[0]);
+    for (int i = 1; i < parts; ++i)
+        text.append(".").append(std::to_string(numbers[i]));
+    return text;
 }
 
 const std::map<std::string, std::string>& tags()
@@ -27,7 +30,7 @@ const std::map<std::string, std::string>& tags()
         {"VERSION_MINOR", std::to_string(values::minor)},
         {"VERSION_PATCH", std::to_string(values::patch)},
         {"VERSION_BUILD", std::to_string(values::build)},
-        {"VERSION_STRING", versionString()},
+        {"VERSION_STRING", version(4)},
         {"VERSION_SHA1", values::revision},
         {"VERSION_PRODUCT_NAME", values::productName},
         {"VERSION_COMMENTS", values::comments},
@@ -50,7 +53,7 @@ std::string details(int flags)
     if (flags & KpBuildInfo::Platform)
         add("", std::string(kplib::platform::name()) + ", 64-bit");
     if (!(flags & KpBuildInfo::BuildNumber))
-        add(" ", text("Build %1%", values::build));
+        add(" ", "Build " + std::to_string(values::build));
     if (const std::string comments = KpBuildInfo::getBuildTag("VERSION_COMMENTS");
         (flags & KpBuildInfo::Comments) && !comments.empty())
         add(" ", "'" + comments + "'");
@@ -64,10 +67,7 @@ std::string details(int flags)
 
 void KpBuildInfo::getVersion(int* v)
 {
-    v[0] = values::major;
-    v[1] = values::minor;
-    v[2] = values::patch;
-    v[3] = values::build;
+    std::copy_n(numbers, 4, v);
 }
 
 bool KpBuildInfo::isSnapshotBuild()
@@ -83,8 +83,6 @@ std::string KpBuildInfo::getBuildTag(const std::string& key)
 
 std::string KpBuildInfo::getBuildString(int flags)
 {
-    std::string version = (boost::format("%1%.%2%.%3%") % values::major % values::minor % values::patch).str();
-    if (flags & BuildNumber)
-        version += text(".%1%", values::build);
-    return flags == BuildNumber ? version : version + " (" + details(flags) + ")";
+    const std::string text = version(flags & BuildNumber ? 4 : 3);
+    return flags == BuildNumber ? text : text + " (" + details(flags) + ")";
 }

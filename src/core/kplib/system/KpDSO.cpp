@@ -107,10 +107,9 @@ int KpDSO::load(const KpFilename& name, KpString& messages)
 void KpDSO::initPackage(const KpFilename& name) const
 {
     std::string package = name.basename();
-    package.erase(0, std::min<std::size_t>(3, package.size()));
-    package.erase(std::min(package.rfind('.'), package.size()));
-    const KpString init(0, "orlinpackage_%s_init", package.c_str());
-    call<void>(init);
+    package.erase(0, 3);  // "lib", though nobody looks
+    package = package.substr(0, package.rfind('.'));
+    call<void>(KpString(0, "orlinpackage_%s_init", package.c_str()));
 }
 
 void* KpDSO::getSymbol(const char* name) const

@@ -63,8 +63,8 @@ int KpTable::columnAdd(int columnId, ColumnType type, int size, KpTable* target)
 
 bool KpTable::canAdd(int columnId, ColumnType type, int size, const KpTable* target) const
 {
-    if (!isColumnId(columnId) || columnCount_ == maxColumns)
-        return false;
+    if (!isColumnId(columnId))
+        return false;  // there are as many ids as places for columns
     if (columnCount_ == 1 && (type != Plain || size < rowHeadSize - idColumnSize))
         return false;  // it has to hold the table's id
     if (type == Plain)

@@ -36,6 +36,7 @@ public:
     void makeNull() { *this = KpVersion(); }
     bool isNull() const { return *this == KpVersion(); }
 
+    // NOLINTNEXTLINE(modernize-use-nullptr): the check takes the default for a 0
     friend constexpr auto operator<=>(const KpVersion& a, const KpVersion& b) = default;
     friend constexpr bool operator==(const KpVersion& a, const KpVersion& b) = default;
     /// low <= this <= high

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <bit>
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
@@ -31,7 +32,7 @@ inline std::intptr_t distance(const void* from, const void* to)
 template <typename T>
 T* shifted(T* pointer, std::intptr_t bytes)
 {
-    return pointer ? reinterpret_cast<T*>(reinterpret_cast<std::intptr_t>(pointer) + bytes) : nullptr;
+    return pointer ? std::bit_cast<T*>(std::bit_cast<std::intptr_t>(pointer) + bytes) : nullptr;
 }
 
 // The two words at the head of a row.

@@ -11,13 +11,12 @@
 #include <sys/sysinfo.h>
 #include <sys/utsname.h>
 #include <unistd.h>
-#include <utility>
 
 namespace kplib::platform {
 namespace {
 
-/// The number that the file of a processor's topology holds; false for a processor that is offline.
-bool readTopology(long processor, const char* file, int& value)
+/// The word that a file of a processor's topology holds; false for a processor that is offline.
+bool readTopology(long processor, const char* file, std::string& value)
 {
     std::ifstream in("/sys/devices/system/cpu/cpu" + std::to_string(processor) + "/topology/" + file);
     return static_cast<bool>(in >> value);
@@ -60,15 +59,16 @@ Version version()
 
 bool processorCounts(ProcessorCounts& counts)
 {
-    std::set<int> packages;
-    std::set<std::pair<int, int>> cores;
+    std::set<std::string> packages, cores;
     int processors = 0;
-    for (long i = 0; i < sysconf(_SC_NPROCESSORS_CONF); ++i) {
-        int package = 0, core = 0;
-        if (!readTopology(i, "physical_package_id", package) || !readTopology(i, "core_id", core))
+    std::string package, core;
+    const long configured = sysconf(_SC_NPROCESSORS_CONF);
+    for (long i = 0; i < configured; ++i) {
+        // A core is told by the processors on it: its number may occur again in another part of the same package.
+        if (!readTopology(i, "physical_package_id", package) || !readTopology(i, "thread_siblings", core))
             continue;
         packages.insert(package);
-        cores.emplace(package, core);
+        cores.insert(core);
         ++processors;
     }
     if (processors == 0)
