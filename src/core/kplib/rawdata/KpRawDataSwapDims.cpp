@@ -1,5 +1,6 @@
 #include <kplib/rawdata/KpRawData.h>
 
+#include <kplib/foundation/KpMemoryException.h>
 #include <kplib/log/KpLogFile.h>
 #include <kplib/rawdata/detail/KpPrimTypeVisit.h>
 #include <kplib/rawdata/detail/KpTransposeKernels.h>
@@ -96,9 +97,11 @@ private:
     }
 
     /// The in-place transposition of a matrix of rows: each cycle of places is walked once, with the row that was met
-    /// last in one half of the scratch area and the one that it drives out in the other.
+    /// last in one half of the scratch area and the one that it drives out in the other. Rows are asked for some steps
+    /// ahead, since no processor foresees where they are.
     void followCycles(long ny, long nz)
     {
+        const auto placeOf = [&](long index) { return index % ny * nz + index / ny; };
         const long last = ny * nz - 1;
         visited_.unsetAll();
         for (long start = 1; start < last; ++start) {
@@ -106,16 +109,26 @@ private:
                 continue;
             char *held = scratch_, *other = scratch_ + rowSize_;
             std::memcpy(held, row(start), rowSize_);
-            for (long at = start; !visited_.test(static_cast<unsigned long>(at));) {
-                visited_.set(static_cast<unsigned long>(at));
-                const long to = at % ny * nz + at / ny;
-                if (!visited_.test(static_cast<unsigned long>(to)))
-                    std::memcpy(other, row(to), rowSize_);
+            long ahead = start;
+            for (int i = 0; i < 4; ++i)
+                ahead = placeOf(ahead);
+            for (long to = placeOf(start); to != start; to = placeOf(to)) {
+                askForRow(ahead);
+                ahead = placeOf(ahead);
+                visited_.set(static_cast<unsigned long>(to));
+                std::memcpy(other, row(to), rowSize_);
                 std::memcpy(row(to), held, rowSize_);
                 std::swap(held, other);
-                at = to;
             }
+            std::memcpy(row(start), held, rowSize_);
         }
+    }
+
+    void askForRow(long index) const
+    {
+        constexpr std::size_t line = 64, most = 2048;
+        for (std::size_t at = 0; at < std::min(rowSize_, most); at += line)
+            __builtin_prefetch(row(index) + at, 1);
     }
 
     void transposeSlice(char* slice, long nx, long ny)
@@ -173,7 +186,7 @@ bool KpRawData::swapDims(KpTypedPointer data, int* dims, const int* perm, int nD
     KpBitfield visited;
     try {
         visited.resize(static_cast<unsigned long>(big * mid), KpBitfield::INIT_UNSET);
-    } catch (const KpException&) {
+    } catch (const KpMemoryException&) {
         return false;
     }
     if (!canPermute(data.type, voxelSize)) {
