@@ -23,9 +23,9 @@ struct KpLogFilePrivate {
     void flush();
     std::string_view timeText(KpLogFile::DateTimeFormat format);
     bool chunkIsFull() const;
-    bool openFile(const KpFilename& path);
+    bool openFile(KpFilename path);
     void closeFile();
-    void cleanUp() const;
+    void cleanUp(std::string_view kept) const;
 
     KpMutex mutex{true};
     std::string baseFolder;
