@@ -138,6 +138,8 @@ public:
 private:
     friend KpLogFilePrivate& kplib::detail::logRecord(KpLogFile& log);
 
+    void write(const KpString& line);  // under the mutex
+    void callBack(KpLogLevel level, const KpString& line) const;
     void setConsoleFlag(std::atomic<bool>& flag, bool enabled);
 
     KpLogFilePrivate* record_;
