@@ -19,6 +19,7 @@
 #include <sys/mount.h>
 #include <sys/wait.h>
 #include <thread>
+#include <tuple>
 #include <vector>
 
 using kplib::test::contentOf;
@@ -178,35 +179,28 @@ TEST_F(LogFilesTest, appendGoesOnWhereAFileEnds)
 
 TEST_F(LogFilesTest, theOldestFilesGo)
 {
-    struct Case {
-        int old;
-        long limit;
-        bool dated;
-        int stay;
-    };
-    const Case cases[] = {{40, 40, false, 39}, {38, 40, false, 39},     {39, 40, false, 39},
-                          {50, 40, false, 39}, {5, 0, false, 6},        {5, 1, false, 1},
-                          {5, -3, false, 1},   {5, LONG_MIN, false, 1}, {5, 1, true, 5}};
-    const std::set<std::string> others = {".h.log", "0.log", "0.txt"};
-    for (const Case& c : cases) {
+    const std::tuple<int, long, bool, int> cases[] = {{40, 40, false, 39}, {38, 40, false, 39},     {39, 40, false, 39},
+                                                      {50, 40, false, 39}, {5, 0, false, 6},        {5, 1, false, 1},
+                                                      {5, -3, false, 1},   {5, LONG_MIN, false, 1}, {5, 1, true, 5}};
+    for (const auto& [old, limit, dated, stay] : cases) {
         std::filesystem::remove_all(folder);
         temp.folder("logs/0.log");  // a folder counts, and stays
         temp.file("logs/.h.log");
         temp.file("logs/0.txt");
-        std::set<std::string> expected = others;
-        for (int i = 1; i < c.old; ++i) {
+        std::set<std::string> expected = {".h.log", "0.log", "0.txt"};
+        for (int i = 1; i < old; ++i) {
             const std::string name = "0" + std::to_string(1000 + i) + ".log";
             temp.file("logs/" + name);
-            if (c.old - i < c.stay || c.dated)
+            if (old - i < stay || dated)
                 expected.insert(name);
         }
-        log->setMaxNumLogFiles(c.limit);
-        log->setDateFoldersEnabled(c.dated);
+        log->setMaxNumLogFiles(limit);
+        log->setDateFoldersEnabled(dated);
         ASSERT_TRUE(log->open(true));
         log->error(nullptr, "line");
-        expected.insert(c.dated ? path().substr(folder.size() + 1, 4) : path().substr(folder.size() + 1));
-        EXPECT_EQ(namesIn(folder), expected) << c.old << ' ' << c.limit;
-        EXPECT_EQ(std::regex_match(path(), std::regex(folder + "/\\d{4}/\\d\\d/\\d\\d/[-\\d]+\\.log")), c.dated);
+        expected.insert(dated ? path().substr(folder.size() + 1, 4) : path().substr(folder.size() + 1));
+        EXPECT_EQ(namesIn(folder), expected) << old << ' ' << limit;
+        EXPECT_EQ(std::regex_match(path(), std::regex(folder + "/\\d{4}/\\d\\d/\\d\\d/[-\\d]+\\.log")), dated);
     }
     log->setDateFoldersEnabled(false);
     log->setMaxNumLogFiles(1);
@@ -221,16 +215,13 @@ TEST_F(LogFilesTest, theOldestFilesGo)
 
 TEST_F(LogFilesTest, theEnvironmentSetsLimits)
 {
-    struct Case {
-        const char *files, *debug;
-        long limit;
-        KpLogLevel level;
-    };
-    for (const Case& c : {Case{"7", "1", 7, KpLogDebug}, {"x", "0", 0, KpLogInfo}, {nullptr, nullptr, 40, KpLogInfo}}) {
+    const std::tuple<const char*, const char*, long, KpLogLevel> cases[] = {
+        {"7", "1", 7, KpLogDebug}, {"x", "0", 0, KpLogInfo}, {nullptr, nullptr, 40, KpLogInfo}};
+    for (const auto& [files, debug, limit, level] : cases) {
         for (const auto& [name, value] : {std::pair("TAMRIN_MAXNUMLOGFILES", c.files), {"TAMRIN_DEBUG_LOG", c.debug}})
             value ? setenv(name, value, 1) : unsetenv(name);
         const std::unique_ptr<KpLogFile> made(KpLogFile::createInstance());
-        EXPECT_TRUE(made->maxNumLogFiles() == c.limit && made->logLevel() == c.level);
+        EXPECT_TRUE(made->maxNumLogFiles() == limit && made->logLevel() == level);
         EXPECT_TRUE(made->baseFolder() == KpTmpDir::getSystemTmpPath() && made->maxLogFileSizeInBytes() == 50000000);
         made->setBaseFolder("/x");
         made->setBaseFolder("");
@@ -240,45 +231,40 @@ TEST_F(LogFilesTest, theEnvironmentSetsLimits)
 
 TEST_F(LogFilesTest, theConsoleGoesToTheFileAndBack)
 {
-    for (const bool hasTerminal : {false, true}) {
-        for (const bool hasConsole : {false, true}) {
-            const int master = posix_openpt(O_RDWR | O_NOCTTY);
-            ASSERT_TRUE(grantpt(master) == 0 && unlockpt(master) == 0);
-            const int terminal = open(ptsname(master), O_RDWR | O_NOCTTY);
-            EXPECT_TRUE(inOwnSession([&] {
-                EXPECT_TRUE(!hasTerminal || ioctl(terminal, TIOCSCTTY, 0) == 0);
-                for (int i = 1; i < 3; ++i)
-                    close(i);
-                if (hasConsole) {
-                    const int console = open((temp / "console").c_str(), O_CREAT | O_WRONLY | O_TRUNC, 0600);
-                    for (int i = 1; i < 3; ++i)
-                        dup2(console, i);
-                }
-                log->open(false);
-                log->error(nullptr, "before");
-                const std::string first = path();
-                log->setConsoleToLogEnabled(true);
-                const std::string second = path();
-                EXPECT_TRUE(second != first && log->isOpen());
-                say("raw\n");
-                log->error(nullptr, "line");
-                log->writeCharBuffer("text\n");
-                const std::string expected = continues + first + "\nraw\nraw\nE [] line\ntext\n";
-                EXPECT_EQ(contentOf(second), expected);
-                log->setConsoleToLogEnabled(false);
-                log->error(nullptr, "apart");
-                say("after\n");
-                EXPECT_EQ(contentOf(path()), continues + second + "\nE [] apart\n");
-                EXPECT_EQ(contentOf(second), expected + (hasTerminal ? "" : "after\nafter\n"));
-                EXPECT_EQ(contentOf(first), "E [] before\n");
-            }));
-            char text[100] = "";
-            fcntl(master, F_SETFL, O_NONBLOCK);
-            EXPECT_EQ(read(master, text, sizeof text - 1), hasTerminal ? 14 : -1);
-            EXPECT_STREQ(text, hasTerminal ? "after\r\nafter\r\n" : "");
-            close(terminal);
-            close(master);
-        }
+    for (const int i : {0, 1, 2, 3}) {
+        const bool hasTerminal = i % 2, hasConsole = i / 2;
+        const int master = posix_openpt(O_RDWR | O_NOCTTY);
+        ASSERT_TRUE(grantpt(master) == 0 && unlockpt(master) == 0);
+        const int terminal = open(ptsname(master), O_RDWR | O_NOCTTY);
+        EXPECT_TRUE(inOwnSession([&] {
+            EXPECT_TRUE(!hasTerminal || ioctl(terminal, TIOCSCTTY, 0) == 0);
+            const int console = open("/dev/null", O_WRONLY);
+            for (const int standard : {STDOUT_FILENO, STDERR_FILENO})
+                hasConsole ? dup2(console, standard) : close(standard);  // a service may have closed its own
+            log->open(false);
+            log->error(nullptr, "before");
+            const std::string first = path();
+            log->setConsoleToLogEnabled(true);
+            const std::string second = path();
+            EXPECT_TRUE(second != first && log->isOpen());
+            say("raw\n");
+            log->error(nullptr, "line");
+            log->writeCharBuffer("text\n");
+            const std::string expected = continues + first + "\nraw\nraw\nE [] line\ntext\n";
+            EXPECT_EQ(contentOf(second), expected);
+            log->setConsoleToLogEnabled(false);
+            log->error(nullptr, "apart");
+            say("after\n");
+            EXPECT_EQ(contentOf(path()), continues + second + "\nE [] apart\n");
+            EXPECT_EQ(contentOf(second), expected + (hasTerminal ? "" : "after\nafter\n"));
+            EXPECT_EQ(contentOf(first), "E [] before\n");
+        }));
+        char text[100] = "";
+        fcntl(master, F_SETFL, O_NONBLOCK);
+        EXPECT_EQ(read(master, text, sizeof text - 1), hasTerminal ? 14 : -1);
+        EXPECT_STREQ(text, hasTerminal ? "after\r\nafter\r\n" : "");
+        close(terminal);
+        close(master);
     }
 }
 
@@ -330,6 +316,19 @@ TEST_F(LogFilesTest, aFullDiskLosesOnlyWhatItRefuses)
 }
 
 using LogFilesThreads = LogFilesTest;
+TEST_F(LogFilesThreads, theCallbackRunsWithoutTheLock)
+{
+    static KpLogFile* shared;
+    static int calls;
+    shared = log.get();
+    log->setWriteCallback([](KpLogLevel, const KpString&) { std::thread([] { calls += shared->isOpen(); }).join(); },
+                          KpLogError);
+    ASSERT_TRUE(log->open(false));
+    log->error(nullptr, "x");
+    log->writeLine(KpLogError, "x");
+    EXPECT_EQ(calls, 2);
+}
+
 TEST_F(LogFilesThreads, everyLineOfEveryThreadIsThereOnceAndInOrder)
 {
     constexpr int lines = 300;

@@ -19,7 +19,11 @@ public:
     }
     TempFolder(const TempFolder&) = delete;
     TempFolder& operator=(const TempFolder&) = delete;
-    ~TempFolder() { std::filesystem::remove_all(path); }
+    ~TempFolder()
+    {
+        std::error_code ignored;
+        std::filesystem::remove_all(path, ignored);
+    }
 
     std::string operator/(const std::string& name) const { return path + "/" + name; }
     std::string file(const std::string& name, const std::string& content = "x") const

@@ -34,10 +34,7 @@ class KpDirectoryTest : public testing::Test {
 protected:
     KpDirectoryTest()
     {
-        for (const char* const file : {"b", "a b", "new\nline", ".h",
-                                       "Gr\xC3\xB6\xC3\x9F"
-                                       "e",
-                                       "sub/deep/f", "sub/g"}) {
+        for (const char* const file : {"b", "a b", "new\nline", ".h", "\xC3\x9F", "sub/deep/f", "sub/g"}) {
             temp.folder("tree/sub/deep");
             temp.file(std::string("tree/") + file, file);
         }
@@ -56,21 +53,19 @@ protected:
 
 TEST_F(KpDirectoryTest, listsAreSortedByBytes)
 {
-    const std::string files = "Gr\xC3\xB6\xC3\x9F"
-                              "e|a b|b|link|new\nline|",
-                      visible = files + "sub|to nowhere|";
+    const std::string start = "a b|b|link|new\nline|", end = "to nowhere|\xC3\x9F|";  // bytes have no sign here
     KpDArray<KpString> names, again, list, folders;
     EXPECT_EQ(KpDirectory::scanSortedByName(tree.c_str(), names, "*", false), 7);
-    EXPECT_EQ(joined(names), visible);
+    EXPECT_EQ(joined(names), start + "sub|" + end);
     EXPECT_EQ(KpDirectory::scanSortedByName(tree.c_str(), again, nullptr, false), 9);
-    EXPECT_EQ(joined(again), ".h|.hidden|" + visible);
+    EXPECT_EQ(joined(again), ".h|.hidden|" + start + "sub|" + end);
     EXPECT_EQ(KpDirectory::scanSortedByName(tree.c_str(), names, "b", false), 8);  // with those of before
     EXPECT_EQ(std::count(names.begin(), names.end(), KpString("b")), 2);
     names.clear();
     EXPECT_EQ(KpDirectory::scanSortedByName(tree.c_str(), names, nullptr, true), 2);
     EXPECT_EQ(joined(names), ".hidden|sub|");
     EXPECT_TRUE(KpDirectory::scanSortedByName(tree.c_str(), list, folders, "*"));
-    EXPECT_EQ(joined(list) + joined(folders), files + "to nowhere|sub|");
+    EXPECT_EQ(joined(list) + joined(folders), start + end + "sub|");
 }
 
 TEST_F(KpDirectoryTest, thousandsOfNamesAreAllThere)
@@ -187,16 +182,13 @@ TEST_F(KpDirectoryTest, theCollectorGoesDownFromTheLastName)
     temp.file("tree/.hidden/e");
     KpFilenameCollector::collect(found, "*e*", tree.c_str());
     std::string expected;
-    for (const char* const path : {"to nowhere", "new\nline",
-                                   "Gr\xC3\xB6\xC3\x9F"
-                                   "e",
-                                   "sub/deep", "link/kept"})
+    for (const char* const path : {"to nowhere", "new\nline", "sub/deep", "link/kept"})
         expected += tree + "/" + path + "|";
     EXPECT_EQ(joined(found), expected);
     KpFilenameCollector::collect(found, nullptr, tree.c_str());
     KpFilenameCollector::collect(found, "*", nullptr);
     KpFilenameCollector::collect(found, "*", (tree + "/b").c_str());
-    EXPECT_TRUE(found.size() == 5 && LogCapture::lines().empty());
+    EXPECT_TRUE(found.size() == 4 && LogCapture::lines().empty());
 }
 
 TEST_F(KpDirectoryTest, temporaryFoldersAreUniqueAndGo)

@@ -126,7 +126,7 @@ bool KpLogFile::append(KpString path)
 {
     const Lock lock(&record_->mutex);
     record_->file = std::fopen(path, "ae");  // what was open stays so: the caller may have plans with it
-    record_->filePath = record_->file ? path : KpString();
+    record_->filePath = record_->file ? std::move(path) : KpString();
     record_->bytesWritten = record_->file ? record_->filePath.fileSize() : 0;
     return record_->file != nullptr;
 }

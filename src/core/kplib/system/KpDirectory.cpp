@@ -183,7 +183,7 @@ long long KpDirectory::freeSpace(const char* path)
         getTheLogInstance().errorf("Could not determine free disk space\n");
         return -1;
     }
-    return static_cast<long long>(status.f_frsize * status.f_bavail);
+    return static_cast<long long>(status.f_frsize) * static_cast<long long>(status.f_bavail);
 }
 
 int remove_dir(const char* path)
