@@ -218,7 +218,7 @@ TEST_F(LogFilesTest, theEnvironmentSetsLimits)
     const std::tuple<const char*, const char*, long, KpLogLevel> cases[] = {
         {"7", "1", 7, KpLogDebug}, {"x", "0", 0, KpLogInfo}, {nullptr, nullptr, 40, KpLogInfo}};
     for (const auto& [files, debug, limit, level] : cases) {
-        for (const auto& [name, value] : {std::pair("TAMRIN_MAXNUMLOGFILES", c.files), {"TAMRIN_DEBUG_LOG", c.debug}})
+        for (const auto& [name, value] : {std::pair("TAMRIN_MAXNUMLOGFILES", files), {"TAMRIN_DEBUG_LOG", debug}})
             value ? setenv(name, value, 1) : unsetenv(name);
         const std::unique_ptr<KpLogFile> made(KpLogFile::createInstance());
         EXPECT_TRUE(made->maxNumLogFiles() == limit && made->logLevel() == level);
