@@ -3,6 +3,7 @@
 #include <kplib/log/detail/KpLogFilePrivate.h>
 #include <kplib/system/KpTmpDir.h>
 
+#include <support/ExhaustedMemory.h>
 #include <support/TempFolder.h>
 
 #include <gtest/gtest.h>
@@ -161,6 +162,14 @@ TEST_F(LogFilesTest, whatCantBeOpenedLeavesTheLogUsable)
     std::filesystem::remove_all(temp.path);  // and its parent isn't
     log->error(nullptr, "4");
     EXPECT_TRUE(log->isOpen());
+}
+
+TEST_F(LogFilesTest, exhaustedMemoryLeavesAFileOpen)
+{
+    ASSERT_TRUE(log->open(false));
+    clockRuns = 0;  // else each failure leaves a file
+    kplib::test::failAtEachAllocation([&] { log->chunkTryOpenNext(); },
+                                      [&] { EXPECT_TRUE(log->isOpen() && std::filesystem::exists(path())); });
 }
 
 TEST_F(LogFilesTest, appendGoesOnWhereAFileEnds)
