@@ -2,11 +2,14 @@
 
 #include <kplib/log/KpLogFile.h>
 #include <kplib/log/detail/KpLogFilePrivate.h>
+#include <kplib/system/KpTmpDir.h>
 
 #include <fcntl.h>
 #include <unistd.h>
 
 #include <memory>
+#include <thread>
+#include <vector>
 
 // A line of some 60 bytes goes to a file of a memory file system, and is flushed. The baseline is the one system call
 // that this can't do without.
@@ -46,6 +49,7 @@ void logLine(benchmark::State& state, Write writeTo)
     const std::unique_ptr<KpLogFile> log(KpLogFile::createInstance());
     KpLogFilePrivate& record = kplib::detail::logRecord(*log);
     record.file = std::fopen(path, "w");
+    log->setMaxLogFileSizeInBytes(0);
     long lines = 0;
     for (auto _ : state) {
         writeTo(*log);
@@ -69,8 +73,34 @@ void formattedLine(benchmark::State& state)
     });
 }
 
+// The same number of lines into a log with files of 1 MB, by some threads at once.
+void sharedLog(benchmark::State& state, const std::string& baseline, double limit)
+{
+    constexpr int lines = 32000;
+    KpTmpDir folder("/dev/shm/kplib-log-bench", true, true);
+    const std::unique_ptr<KpLogFile> log(KpLogFile::createInstance());
+    log->setBaseFolder(folder.path().c_str());
+    log->setMaxLogFileSizeInBytes(1000000);
+    if (!log->open(false))
+        state.SkipWithError("no file");
+    const auto threads = static_cast<size_t>(state.range(0));
+    for (auto _ : state) {
+        std::vector<std::jthread> writers(threads);
+        for (std::jthread& writer : writers)
+            writer = std::jthread([&log, threads] {
+                for (size_t i = 0; i < lines / threads; ++i)
+                    log->trace(KpLogWarning, "Dicom", text);
+            });
+    }
+    if (!log->isOpen())
+        state.SkipWithError("the file was lost");
+    kplib::bench::report(state, lines, static_cast<double>(lines * line.size()), baseline, limit);
+}
+
 }  // namespace
 
+BENCHMARK_CAPTURE(sharedLog, , "", 0)->Name("threads")->Arg(1)->UseRealTime();
+BENCHMARK_CAPTURE(sharedLog, , "threads/1", 1.3)->Name("KpLogFile/threads")->Arg(8)->UseRealTime();
 BENCHMARK(writeCall)->Name("write");
 BENCHMARK(traceLine)->Name("KpLogFile/trace");
 BENCHMARK(formattedLine)->Name("KpLogFile/tracef");

@@ -54,7 +54,6 @@ void put(std::string_view line, bool addsNewline, FILE* file)
 
 KpString KpLogFilePrivate::formatLine(KpLogLevel level, const char* module, const char* text)
 {
-    const Lock lock(&mutex);
     const std::string_view time = timeText(dateTimeFormat);
     return joined({time, time.empty() ? "" : ": ", levelField(level), " [", module ? module : defaultModule.c_str(),
                    "] ", text ? text : ""});
@@ -119,7 +118,14 @@ KpLogFile* KpLogFile::createInstance()
 
 void KpLogFile::trace(KpLogLevel level, const char* module, const char* text)
 {
-    writeLine(level, record_->formatLine(level, module, text));
+    KpString line{KpString::NoMemory()};
+    {
+        const Lock lock(&record_->mutex);
+        line = record_->formatLine(level, module, text);
+        if (record_->logLevel <= level)
+            write(line);
+    }
+    callBack(level, line);
 }
 
 void KpLogFile::tracef(KpLogLevel level, const char* module, const char* format, ...)
@@ -173,10 +179,20 @@ void KpLogFile::writeLine(KpLogLevel level, const KpString& line)
 {
     if (record_->logLevel <= level) {
         const Lock lock(&record_->mutex);
-        if (record_->chunkIsFull())
-            chunkTryOpenNext();
-        record_->write(line);
+        write(line);
     }
+    callBack(level, line);
+}
+
+void KpLogFile::write(const KpString& line)
+{
+    if (record_->chunkIsFull())
+        chunkTryOpenNext();
+    record_->write(line);
+}
+
+void KpLogFile::callBack(KpLogLevel level, const KpString& line) const
+{
     const WriteCallback callback = record_->writeCallback;
     if (callback && record_->writeCallbackLogLevel <= level)
         callback(level, line);

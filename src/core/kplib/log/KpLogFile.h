@@ -31,7 +31,8 @@ public:
     };
 
     /// Gets each line, with time and header and without an added newline. It runs on the thread that logs, without any
-    /// lock, and may log itself as long as that doesn't come back to it without end.
+    /// lock (only for the line at the head of a new file it is the log's), and may log itself as long as that doesn't
+    /// come back to it without end.
     using WriteCallback = void (*)(KpLogLevel level, const KpString& line);
 
     KpLogFile();
@@ -138,6 +139,8 @@ public:
 private:
     friend KpLogFilePrivate& kplib::detail::logRecord(KpLogFile& log);
 
+    void write(const KpString& line);  // under the mutex
+    void callBack(KpLogLevel level, const KpString& line) const;
     void setConsoleFlag(std::atomic<bool>& flag, bool enabled);
 
     KpLogFilePrivate* record_;

@@ -8,15 +8,27 @@
 #include <cstdlib>
 #include <fcntl.h>
 #include <unistd.h>
+#include <utility>
 
 namespace {
 
 using Lock = KpScopedLockT<KpMutex>;
 
+/// Opens for writing, under a number that is none of the three standard ones: a service may have closed those.
+int openAside(const char* path, int mode)
+{
+    const int first = ::open(path, O_WRONLY | O_CLOEXEC | mode, 0666);
+    if (first < 0 || first > STDERR_FILENO)
+        return first;
+    const int descriptor = fcntl(first, F_DUPFD_CLOEXEC, STDERR_FILENO + 1);
+    ::close(first);
+    return descriptor;
+}
+
 /// Leads standard output and standard error to a file or a device; leaves them as they are where that can't be opened.
 bool leadConsoleTo(const char* path, int mode)
 {
-    const int descriptor = ::open(path, O_WRONLY | O_CLOEXEC | mode, 0666);
+    const int descriptor = openAside(path, mode);
     if (descriptor < 0)
         return false;
     std::fflush(stdout);
@@ -43,13 +55,13 @@ bool KpLogFilePrivate::chunkIsFull() const
 }
 
 /// Opens for appending, always: two files of one second have one name, and no line is lost to that.
-bool KpLogFilePrivate::openFile(const KpFilename& path)
+bool KpLogFilePrivate::openFile(KpFilename path)
 {
     if (consoleToLogEnabled)
         file = leadConsoleTo(path, O_CREAT | O_APPEND) ? stdout : nullptr;
     else
         file = std::fopen(path, "ae");
-    filePath = path;
+    filePath = std::move(path);
     bytesWritten = 0;
     return file != nullptr;
 }
@@ -70,15 +82,18 @@ void KpLogFilePrivate::closeFile()
 }
 
 /// Names sort by time. That one more is removed than would do is meant: it is the place of the file being opened.
-void KpLogFilePrivate::cleanUp() const
+/// `kept` is the name of a file that stays in any case.
+void KpLogFilePrivate::cleanUp(std::string_view kept) const
 {
     if (maxNumLogFiles == 0 || dateFoldersEnabled || !KpDirectory::isDirectory(baseFolder.c_str()))
         return;
     KpDArray<KpString> names;
     KpDirectory::scanSortedByName(baseFolder.c_str(), names, "*.log");
-    const long excess = names.size() - maxNumLogFiles;
-    for (long i = 0; i <= excess && i < names.size(); ++i)
-        KpFilename(KpString(0, "%s/%s", baseFolder.c_str(), names[i].c_str())).unlink();
+    const long excess = names.size() - std::max(maxNumLogFiles, -1L);
+    for (long i = 0; i <= excess && i < names.size(); ++i) {
+        if (names[i] != kept)
+            KpFilename(KpString(0, "%s/%s", baseFolder.c_str(), names[i].c_str())).unlink();
+    }
 }
 
 bool KpLogFile::open(bool force)
@@ -90,16 +105,15 @@ bool KpLogFile::open(bool force)
     KpFilename::generateFilePath(folder, name, record_->baseFolder.c_str(), record_->dateFoldersEnabled, false);
     if (folder.isEmpty())
         return false;
-    const KpFilename path = KpString(0, "%s/%s.log", folder.c_str(), name.c_str());
-    const bool isContinued = path == record_->filePath && path.doesExist();
+    KpFilename path = KpString(0, "%s/%s.log", folder.c_str(), name.c_str());
     FILE* const test = std::fopen(path, "ae");
     if (!test)
         return false;
     std::fclose(test);
+    const bool isContinued = path == record_->filePath;
+    record_->cleanUp(isContinued ? path.basename() : "");  // first, as it may run out of memory
     record_->closeFile();
-    if (!isContinued)
-        record_->cleanUp();
-    return record_->openFile(path);
+    return record_->openFile(std::move(path));
 }
 
 void KpLogFile::close()
@@ -112,7 +126,7 @@ bool KpLogFile::append(KpString path)
 {
     const Lock lock(&record_->mutex);
     record_->file = std::fopen(path, "ae");  // what was open stays so: the caller may have plans with it
-    record_->filePath = record_->file ? path : KpString();
+    record_->filePath = record_->file ? std::move(path) : KpString();
     record_->bytesWritten = record_->file ? record_->filePath.fileSize() : 0;
     return record_->file != nullptr;
 }
@@ -194,7 +208,7 @@ void KpLogFile::chunkTryOpenNext()
 void KpLogFile::cleanUp()
 {
     const Lock lock(&record_->mutex);
-    record_->cleanUp();
+    record_->cleanUp("");
 }
 
 /// Stores a flag of the console; where a file is open that takes a new one.

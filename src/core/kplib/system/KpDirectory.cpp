@@ -10,6 +10,7 @@
 #include <cstring>
 #include <dirent.h>
 #include <memory>
+#include <string_view>
 #include <sys/stat.h>
 #include <sys/statvfs.h>
 #include <unistd.h>
@@ -20,6 +21,11 @@ struct CloseFolder {
     void operator()(DIR* folder) const { closedir(folder); }
 };
 using Folder = std::unique_ptr<DIR, CloseFolder>;
+
+Folder openFolder(const char* path)
+{
+    return Folder(path ? opendir(path) : nullptr);
+}
 
 bool isWanted(const char* name, const char* pattern)
 {
@@ -32,9 +38,9 @@ bool isWanted(const char* name, const char* pattern)
 template <typename Visit>
 bool walk(const char* dir, const char* pattern, Visit visit)
 {
-    const Folder folder(opendir(dir));
+    const Folder folder = openFolder(dir);
     if (!folder) {
-        getTheLogInstance().errorf("Can't open dir %s\n", dir);
+        getTheLogInstance().errorf("Can't open dir %s\n", dir ? dir : "");
         return false;
     }
     while (const dirent* entry = readdir(folder.get())) {
@@ -78,6 +84,15 @@ int copyTree(const char* source, const char* target, const struct stat* newFolde
             copyTree(path, pathOf(target, name), newFolder);
     }
     return 0;
+}
+
+/// Whether the path is a link; slashes behind it, with which the system would follow the link, don't count.
+bool isLink(const char* path)
+{
+    const std::string_view text(path);
+    const KpString bare(text.substr(0, text.find_last_not_of('/') + 1));
+    struct stat status {};
+    return lstat(bare, &status) == 0 && S_ISLNK(status.st_mode);
 }
 
 /// Tells of what can't be deleted, and passes the result on.
@@ -151,7 +166,7 @@ long KpDirectory::scanSortedByCreationTime(const char* dir, KpDArray<KpString>& 
 
 bool KpDirectory::isDirectory(const char* path)
 {
-    return path && *path && Folder(opendir(path));
+    return openFolder(path) != nullptr;
 }
 
 int KpDirectory::copy(const char* source, const char* target)
@@ -168,13 +183,12 @@ long long KpDirectory::freeSpace(const char* path)
         getTheLogInstance().errorf("Could not determine free disk space\n");
         return -1;
     }
-    return static_cast<long long>(status.f_frsize * status.f_bavail);
+    return static_cast<long long>(status.f_frsize) * static_cast<long long>(status.f_bavail);
 }
 
 int remove_dir(const char* path)
 {
-    struct stat status {};
-    if (!KpDirectory::isDirectory(path) || lstat(path, &status) != 0 || S_ISLNK(status.st_mode))
+    if (!KpDirectory::isDirectory(path) || isLink(path))
         return -1;
     KpDArray<KpString> files, folders;
     KpDirectory::scanSortedByName(path, files, folders);

@@ -112,12 +112,12 @@ bool KpFilename::rename(const char* newName)
 
 bool KpFilename::copy(const char* target) const
 {
-    const File from(std::fopen(c_str(), "rb"));
+    const File from(std::fopen(c_str(), "rbe"));
     if (!from)
         return false;
     if (Status(c_str()).isSameFile(Status(target)))
         return true;  // to open it for writing would lose it
-    File to(std::fopen(target, "wb"));
+    File to(std::fopen(target, "wbe"));
     if (!to)
         return false;
     copyContents(from.get(), to.get());

@@ -72,10 +72,7 @@ void KpFilename::fixSlashes()
 
 KpFilename& KpFilename::appendFile(const KpString& name)
 {
-    const KpString added(name);  // may be this object
-    *this += '/';
-    *this += added.c_str();
-    return *this;
+    return *this = *this + '/' + name;
 }
 
 void KpFilename::pack()

@@ -15,17 +15,18 @@
 struct KpLogFilePrivate {
     KpLogFilePrivate();
 
-    /// The line of a message; takes the mutex.
-    KpString formatLine(KpLogLevel level, const char* module, const char* text);
+    // The caller holds the mutex for these.
 
-    /// Puts out the text, with a newline unless it ends in one. The caller holds the mutex for these.
+    /// The line of a message.
+    KpString formatLine(KpLogLevel level, const char* module, const char* text);
+    /// Puts out the text, with a newline unless it ends in one.
     void write(std::string_view line);
     void flush();
     std::string_view timeText(KpLogFile::DateTimeFormat format);
     bool chunkIsFull() const;
-    bool openFile(const KpFilename& path);
+    bool openFile(KpFilename path);
     void closeFile();
-    void cleanUp() const;
+    void cleanUp(std::string_view kept) const;
 
     KpMutex mutex{true};
     std::string baseFolder;

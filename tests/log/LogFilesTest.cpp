@@ -1,0 +1,376 @@
+#include <kplib/log/KpLogFile.h>
+
+#include <kplib/log/detail/KpLogFilePrivate.h>
+#include <kplib/system/KpTmpDir.h>
+
+#include <support/ExhaustedMemory.h>
+#include <support/TempFolder.h>
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <climits>
+#include <fcntl.h>
+#include <map>
+#include <memory>
+#include <random>
+#include <regex>
+#include <sstream>
+#include <sys/ioctl.h>
+#include <sys/mount.h>
+#include <sys/wait.h>
+#include <thread>
+#include <tuple>
+#include <vector>
+
+using kplib::test::contentOf;
+using kplib::test::namesIn;
+using kplib::test::TempFolder;
+
+namespace {
+
+std::atomic<time_t> clockRuns = 0;  // seconds that the clock goes on each time it is read
+std::atomic<time_t> seconds = 1000000000;
+
+}  // namespace
+
+// Names of logs tell the second; here it is one of the test's own.
+extern "C" time_t time(time_t* out) noexcept
+{
+    const time_t now = seconds += clockRuns;
+    if (out)
+        *out = now;
+    return now;
+}
+
+namespace {
+
+const std::string continues = "  [] This file continues ";
+
+/// A log in a folder of its own, without times.
+class LogFilesTest : public testing::Test {
+protected:
+    LogFilesTest()
+    {
+        clockRuns = 1;
+        log->setDateTimeFormat(KpLogFile::NoDateTime);
+        log->setBaseFolder(folder);
+    }
+    ~LogFilesTest() override { log->close(); }
+
+    std::string path() const { return log->filePath().c_str(); }
+
+    /// What a reader gets who goes back through the chain of chunks from the file `last`.
+    static std::string chain(const std::string& last)
+    {
+        std::string text = contentOf(last);
+        for (std::string name = last;;) {
+            const std::string first = text.substr(0, text.find('\n'));
+            if (!first.starts_with(continues) || first == continues + name)
+                break;
+            name = first.substr(continues.size());
+            text = contentOf(name) + text.substr(first.size() + 1);
+        }
+        return std::regex_replace(text, std::regex(" {2}\\[\\] This file continues .*\n"), "");
+    }
+
+    TempFolder temp;
+    const std::string folder = temp / "logs";
+    std::unique_ptr<KpLogFile> log{KpLogFile::createInstance()};
+};
+
+void say(const std::string& text)  // to standard output and standard error, past their buffers
+{
+    EXPECT_EQ(write(STDOUT_FILENO, text.data(), text.size()), static_cast<ssize_t>(text.size()));
+    EXPECT_EQ(write(STDERR_FILENO, text.data(), text.size()), static_cast<ssize_t>(text.size()));
+}
+
+/// Runs `work` in a process of its own session; true if all went well there.
+template <typename Work>
+bool inOwnSession(Work work)
+{
+    const pid_t child = fork();
+    if (child == 0) {
+        setsid();
+        work();
+        _exit(testing::Test::HasFailure());
+    }
+    int status = -1;
+    waitpid(child, &status, 0);
+    return status == 0;
+}
+
+}  // namespace
+
+TEST_F(LogFilesTest, theLineThatCrossesTheLimitStays)
+{
+    const std::string line(100, 'x');
+    log->setMaxLogFileSizeInBytes(101);
+    ASSERT_TRUE(log->open(false));
+    const std::string first = path();
+    EXPECT_TRUE(std::regex_match(first, std::regex(folder + "/\\d{8}-\\d{6}-\\d+\\.log"))) << first;
+    EXPECT_FALSE(log->open(false));
+    log->writeLine(KpLogError, line.c_str());
+    EXPECT_FALSE(log->chunkIsFull());  // at the limit
+    log->writeCharBuffer("y");
+    EXPECT_TRUE(path() == first && log->chunkIsFull());
+    log->writeLine(KpLogError, line.c_str());
+    EXPECT_NE(path(), first);
+    EXPECT_EQ(contentOf(first), line + "\ny");
+    EXPECT_EQ(contentOf(path()), continues + first + "\n" + line + "\n");
+    log->setMaxLogFileSizeInBytes(0);
+    EXPECT_FALSE(log->chunkIsFull());
+    const std::string second = path();
+    EXPECT_TRUE(log->open(true) && path() != second && contentOf(path()).empty());
+    log->close();
+    EXPECT_FALSE(log->isOpen() || log->chunkIsFull());
+    EXPECT_NE(path(), "");
+}
+
+TEST_F(LogFilesTest, noLineIsLostBetweenChunks)
+{
+    std::mt19937 random(1);
+    std::string expected;
+    log->setMaxLogFileSizeInBytes(100);
+    log->setMaxNumLogFiles(0);
+    ASSERT_TRUE(log->open(false));
+    for (int i = 0; i < 1000; ++i) {
+        const std::string line = std::to_string(i) + " " + std::string(random() % 300, 'x');
+        clockRuns = random() % 3 == 0;  // else in the same second, thus in the same file
+        log->error(nullptr, line.c_str());
+        expected += "E [] " + line + "\n";
+    }
+    EXPECT_EQ(chain(path()), expected);
+    EXPECT_GT(namesIn(folder).size(), 100U);
+}
+
+TEST_F(LogFilesTest, whatCantBeOpenedLeavesTheLogUsable)
+{
+    ASSERT_TRUE(log->open(false));
+    const std::string first = path();
+    log->error(nullptr, "1");
+    log->setMaxLogFileSizeInBytes(1);
+    std::filesystem::rename(folder, temp / "moved");
+    temp.file("logs");  // a file in place of the folder
+    EXPECT_FALSE(log->open(true));
+    EXPECT_TRUE(path() == first && log->isOpen());
+    log->error(nullptr, "2");
+    std::filesystem::remove(folder);
+    log->error(nullptr, "3");  // the folder is made again
+    EXPECT_EQ(contentOf(temp / ("moved" + first.substr(folder.size()))), "E [] 1\nE [] 2\n");
+    EXPECT_EQ(contentOf(path()), continues + first + "\nE [] 3\n");
+    std::filesystem::remove_all(temp.path);  // and its parent isn't
+    log->error(nullptr, "4");
+    EXPECT_TRUE(log->isOpen());
+}
+
+TEST_F(LogFilesTest, exhaustedMemoryLeavesAFileOpen)
+{
+    ASSERT_TRUE(log->open(false));
+    clockRuns = 0;  // else each failure leaves a file
+    kplib::test::failAtEachAllocation([&] { log->chunkTryOpenNext(); },
+                                      [&] { EXPECT_TRUE(log->isOpen() && std::filesystem::exists(path())); });
+}
+
+TEST_F(LogFilesTest, appendGoesOnWhereAFileEnds)
+{
+    const std::string file = temp.file("file", std::string(1000, 'x'));
+    log->setMaxLogFileSizeInBytes(1000);
+    EXPECT_TRUE(log->append(file.c_str()) && log->isOpen() && !log->chunkIsFull());
+    log->setMaxLogFileSizeInBytes(999);
+    EXPECT_TRUE(log->chunkIsFull());
+    log->writeCharBuffer("y");
+    EXPECT_EQ(contentOf(file), std::string(1000, 'x') + "y");
+    log->close();
+    EXPECT_FALSE(log->append((temp / "no/file").c_str()) || log->isOpen() || log->chunkIsFull());
+    EXPECT_EQ(path(), "");
+}
+
+TEST_F(LogFilesTest, theOldestFilesGo)
+{
+    const std::tuple<int, long, bool, int> cases[] = {{40, 40, false, 39}, {38, 40, false, 39},     {39, 40, false, 39},
+                                                      {50, 40, false, 39}, {5, 0, false, 6},        {5, 1, false, 1},
+                                                      {5, -3, false, 1},   {5, LONG_MIN, false, 1}, {5, 1, true, 5}};
+    for (const auto& [old, limit, dated, stay] : cases) {
+        std::filesystem::remove_all(folder);
+        temp.folder("logs/0.log");  // a folder counts, and stays
+        temp.file("logs/.h.log");
+        temp.file("logs/0.txt");
+        std::set<std::string> expected = {".h.log", "0.log", "0.txt"};
+        for (int i = 1; i < old; ++i) {
+            const std::string name = "0" + std::to_string(1000 + i) + ".log";
+            temp.file("logs/" + name);
+            if (old - i < stay || dated)
+                expected.insert(name);
+        }
+        log->setMaxNumLogFiles(limit);
+        log->setDateFoldersEnabled(dated);
+        ASSERT_TRUE(log->open(true));
+        log->error(nullptr, "line");
+        expected.insert(dated ? path().substr(folder.size() + 1, 4) : path().substr(folder.size() + 1));
+        EXPECT_EQ(namesIn(folder), expected) << old << ' ' << limit;
+        EXPECT_EQ(std::regex_match(path(), std::regex(folder + "/\\d{4}/\\d\\d/\\d\\d/[-\\d]+\\.log")), dated);
+    }
+    log->setDateFoldersEnabled(false);
+    log->setMaxNumLogFiles(1);
+    ASSERT_TRUE(log->open(true));
+    clockRuns = 0;
+    log->error(nullptr, "kept");
+    temp.file("logs/01.log");
+    ASSERT_TRUE(log->open(true));  // of the same second
+    EXPECT_EQ(contentOf(path()), "E [] kept\n");
+    EXPECT_FALSE(std::filesystem::exists(folder + "/01.log"));
+}
+
+TEST_F(LogFilesTest, theEnvironmentSetsLimits)
+{
+    const std::tuple<const char*, const char*, long, KpLogLevel> cases[] = {
+        {"7", "1", 7, KpLogDebug}, {"x", "0", 0, KpLogInfo}, {nullptr, nullptr, 40, KpLogInfo}};
+    for (const auto& [files, debug, limit, level] : cases) {
+        for (const auto& [name, value] : {std::pair("TAMRIN_MAXNUMLOGFILES", files), {"TAMRIN_DEBUG_LOG", debug}})
+            value ? setenv(name, value, 1) : unsetenv(name);
+        const std::unique_ptr<KpLogFile> made(KpLogFile::createInstance());
+        EXPECT_TRUE(made->maxNumLogFiles() == limit && made->logLevel() == level);
+        EXPECT_TRUE(made->baseFolder() == KpTmpDir::getSystemTmpPath() && made->maxLogFileSizeInBytes() == 50000000);
+        made->setBaseFolder("/x");
+        made->setBaseFolder("");
+        EXPECT_EQ(made->baseFolder(), KpTmpDir::getSystemTmpPath());
+    }
+}
+
+TEST_F(LogFilesTest, theConsoleGoesToTheFileAndBack)
+{
+    for (const int i : {0, 1, 2, 3}) {
+        const bool hasTerminal = i % 2, hasConsole = i / 2;
+        const int master = posix_openpt(O_RDWR | O_NOCTTY);
+        ASSERT_TRUE(grantpt(master) == 0 && unlockpt(master) == 0);
+        const int terminal = open(ptsname(master), O_RDWR | O_NOCTTY);
+        EXPECT_TRUE(inOwnSession([&] {
+            EXPECT_TRUE(!hasTerminal || ioctl(terminal, TIOCSCTTY, 0) == 0);
+            const int console = open("/dev/null", O_WRONLY);
+            for (const int standard : {STDOUT_FILENO, STDERR_FILENO})
+                hasConsole ? dup2(console, standard) : close(standard);  // a service may have closed its own
+            log->open(false);
+            log->error(nullptr, "before");
+            const std::string first = path();
+            log->setConsoleToLogEnabled(true);
+            const std::string second = path();
+            EXPECT_TRUE(second != first && log->isOpen());
+            say("raw\n");
+            log->error(nullptr, "line");
+            log->writeCharBuffer("text\n");
+            const std::string expected = continues + first + "\nraw\nraw\nE [] line\ntext\n";
+            EXPECT_EQ(contentOf(second), expected);
+            log->setConsoleToLogEnabled(false);
+            log->error(nullptr, "apart");
+            say("after\n");
+            EXPECT_EQ(contentOf(path()), continues + second + "\nE [] apart\n");
+            EXPECT_EQ(contentOf(second), expected + (hasTerminal ? "" : "after\nafter\n"));
+            EXPECT_EQ(contentOf(first), "E [] before\n");
+        }));
+        char text[100] = "";
+        fcntl(master, F_SETFL, O_NONBLOCK);
+        EXPECT_EQ(read(master, text, sizeof text - 1), hasTerminal ? 14 : -1);
+        EXPECT_STREQ(text, hasTerminal ? "after\r\nafter\r\n" : "");
+        close(terminal);
+        close(master);
+    }
+}
+
+TEST_F(LogFilesTest, linesGoToTheConsoleToo)
+{
+    testing::internal::CaptureStdout();
+    log->setLogToConsoleEnabled(true);
+    EXPECT_FALSE(log->isOpen());
+    ASSERT_TRUE(log->open(false));
+    const std::string first = path();
+    log->setLogToConsoleEnabled(true);
+    EXPECT_EQ(path(), first);  // nothing changed
+    log->error(nullptr, "both");
+    log->setLogToConsoleEnabled(false);
+    EXPECT_NE(path(), first);
+    log->error(nullptr, "file");
+    EXPECT_EQ(testing::internal::GetCapturedStdout(), "E [] both\n");
+    EXPECT_EQ(chain(path()), "E [] both\nE [] file\n");
+}
+
+TEST_F(LogFilesTest, aFullDiskLosesOnlyWhatItRefuses)
+{
+    ASSERT_TRUE(log->append("/dev/full"));
+    for (int i = 0; i < 100; ++i)
+        log->errorf("%01000d", i);
+    EXPECT_EQ(kplib::detail::logRecord(*log).bytesWritten, 100 * 1006U);
+    temp.folder("logs");
+    if (mount("none", folder.c_str(), "tmpfs", 0, "size=16k") != 0)
+        GTEST_SKIP() << "no right to mount a small file system";
+    log->setMaxLogFileSizeInBytes(3000);
+    ASSERT_TRUE(log->open(true));
+    for (int i = 0; i < 1000; ++i)
+        log->errorf("%0100d", i);
+    std::string text;
+    for (const std::string& name : namesIn(folder)) {
+        text += contentOf(folder + "/" + name);
+        if (folder + "/" + name != path())
+            std::filesystem::remove(folder + "/" + name);
+    }
+    log->error(nullptr, "there is room again");
+    EXPECT_TRUE(contentOf(path()).ends_with("E [] there is room again\n"));
+    int i = 0;
+    for (KpString line(0, "E [] %0100d\n", i); text.find(line) != std::string::npos;
+         line.printf("E [] %0100d\n", ++i)) {
+    }
+    EXPECT_GT(i, 100);
+    log->close();
+    umount2(folder.c_str(), MNT_DETACH);
+}
+
+using LogFilesThreads = LogFilesTest;
+TEST_F(LogFilesThreads, theCallbackRunsWithoutTheLock)
+{
+    static KpLogFile* shared;
+    static int calls;
+    shared = log.get();
+    log->setWriteCallback([](KpLogLevel, const KpString&) { std::thread([] { calls += shared->isOpen(); }).join(); },
+                          KpLogError);
+    ASSERT_TRUE(log->open(false));
+    log->error(nullptr, "x");
+    log->writeLine(KpLogError, "x");
+    EXPECT_EQ(calls, 2);
+}
+
+TEST_F(LogFilesThreads, everyLineOfEveryThreadIsThereOnceAndInOrder)
+{
+    constexpr int lines = 300;
+    static std::atomic<int> received = 0;
+    log->setMaxNumLogFiles(0);
+    log->setMaxLogFileSizeInBytes(2000);
+    log->setWriteCallback([](KpLogLevel, const KpString&) { ++received; }, KpLogError);
+    ASSERT_TRUE(log->open(false));
+    std::vector<std::thread> threads;
+    for (int t = 0; t < 8; ++t)
+        threads.emplace_back([&, t] {
+            for (int i = 0; i < lines; ++i) {
+                log->errorf("%d %d %s", t, i, std::string(static_cast<size_t>(i), 'x').c_str());
+                if (i % 50 == t)
+                    log->open(true);
+                log->chunkIsFull();
+            }
+        });
+    for (std::thread& thread : threads)
+        thread.join();
+    EXPECT_EQ(received, 8 * lines);
+    std::map<int, int> next;
+    for (const std::string& name : namesIn(folder)) {  // sorted by time
+        std::istringstream in(contentOf(folder + "/" + name));
+        for (std::string line; std::getline(in, line);) {
+            std::smatch parts;
+            if (line.starts_with(continues))
+                continue;
+            ASSERT_TRUE(std::regex_match(line, parts, std::regex("E \\[\\] (\\d) (\\d+) (x*)"))) << line;
+            EXPECT_EQ(std::stoi(parts[2]), next[std::stoi(parts[1])]++);
+            EXPECT_EQ(parts[3].length(), std::stoi(parts[2]));
+        }
+    }
+    for (int t = 0; t < 8; ++t)
+        EXPECT_EQ(next[t], lines);
+}
