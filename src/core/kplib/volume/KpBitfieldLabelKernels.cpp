@@ -123,8 +123,8 @@ KPLIB_TARGET_AVX2 void toLabelsAvx2(const BitWord* words, unsigned char* labels,
         if (needsBits<policy> && bits == 0)
             continue;
         const __m256i bytes = _mm256_shuffle_epi8(_mm256_set1_epi32(static_cast<int>(bits)), byteOf);
-        const __m256i ones = _mm256_cmpeq_epi8(_mm256_and_si256(bytes, bitOf), bitOf);
-        merge<policy>(labels + i, reinterpret_cast<const Labels32&>(ones), all);
+        const auto ones = reinterpret_cast<Labels32>(_mm256_cmpeq_epi8(_mm256_and_si256(bytes, bitOf), bitOf));
+        merge<policy>(labels + i, ones, all);
     }
     toLabelsPlain<policy>(words + i / 32, labels + i, n - i, label);
 }
@@ -140,8 +140,7 @@ KPLIB_TARGET_AVX512 void toLabelsAvx512(const BitWord* words, unsigned char* lab
         std::memcpy(&bits, words + i / 32, sizeof bits);
         if (needsBits<policy> && bits == 0)
             continue;
-        const __m512i ones = _mm512_movm_epi8(bits);
-        merge<policy>(labels + i, reinterpret_cast<const Labels64&>(ones), all);
+        merge<policy>(labels + i, reinterpret_cast<Labels64>(_mm512_movm_epi8(bits)), all);
     }
     toLabelsPlain<policy>(words + i / 32, labels + i, n - i, label);
 }
