@@ -2,6 +2,7 @@
 #include <kplib/foundation/KpStdStringTokenizer.h>
 #include <kplib/foundation/KpString.h>
 #include <kplib/foundation/KpStringTokenizer.h>
+#include <kplib/foundation/KpStringTokenizerGeneral.h>
 #include <kplib/foundation/StringUtils.h>
 #include <support/FailingMalloc.h>
 
@@ -14,7 +15,8 @@
 using namespace std::string_view_literals;
 using Tokens = std::vector<std::string>;
 
-static Tokens tokensOf(KpStringTokenizer tokenizer)
+template <typename Tokenizer>
+static Tokens tokensOf(Tokenizer tokenizer)
 {
     Tokens tokens;
     while (tokenizer.hasMoreTokens())
@@ -114,11 +116,39 @@ TEST(KpStringTokenizer, joinsQuotedRunsAndEscapesThatProtectMakes)
     KpStringTokenizer again("a");
     for (const auto& [bytes, tokens] : cases) {
         const KpString text(bytes);
-        EXPECT_TRUE(tokensOf(text) == tokens && tokensOf(again = text) == tokens) << text;
+        EXPECT_TRUE(tokensOf(KpStringTokenizer(text)) == tokens && tokensOf(again = text) == tokens) << text;
     }
     for (const char* text : {"abc", "a\tb", "\"a\\b\"\\", "\\\"", ""})
-        EXPECT_EQ(tokensOf(KpString(text).protect().c_str()), Tokens{text});
+        EXPECT_EQ(tokensOf(KpStringTokenizer(KpString(text).protect().c_str())), Tokens{text});
     EXPECT_TRUE(KpString("abc").protect() == "abc" && KpString("a\"b").protect(true) == "\"a\\\"b\"");
+}
+
+TEST(KpStringTokenizerGeneral, splitsAtTheBytesOfItsSet)
+{
+    struct Case {
+        const char *separators, *text;
+        Tokens tokens;
+    };
+    const Case cases[] = {
+        {",;", ";a,b;c d", {"a", "b", "c d"}},
+        {"", " a \"b,c\" \\,d", {" a b,c ,d"}},
+        {nullptr, "a,b", {"a,b"}},
+        {",", "\"a,b\"c,,d\\,e", {"a,bc", "d,e"}},
+        {"\xE9",
+         "a\xE9"
+         "b,c",
+         {"a", "b,c"}},
+        {"\"\\", "a\"b c\"d\\e", {"a", "b c", "d", "e"}},  // a separator is nothing else
+    };
+    for (const auto& [separators, text, tokens] : cases) {
+        const KpString copy(text);
+        KpStringTokenizerGeneral tokenizer(copy, separators);
+        EXPECT_EQ(tokensOf(tokenizer), tokens) << text;
+        EXPECT_EQ(tokensOf(KpStringTokenizerGeneral(text, separators)), tokens) << text;
+        tokenizer.init(" ");
+        tokenizer = "  x y";
+        EXPECT_EQ(tokensOf(tokenizer), (Tokens{"x", "y"})) << "of the set before nothing is left";
+    }
 }
 
 TEST(KpStdStringTokenizer, splitsAtAnyOfASet)

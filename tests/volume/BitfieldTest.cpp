@@ -1,12 +1,341 @@
+#include <kplib/foundation/KpMemoryException.h>
 #include <kplib/foundation/KpString.h>
+#include <kplib/system/KpCoder.h>
 #include <kplib/volume/KpBitfield.h>
+#include <kplib/volume/detail/KpBitfieldKernels.h>
+#include <support/ExhaustedMemory.h>
 
 #include <gtest/gtest.h>
+
+#include <algorithm>
+#include <filesystem>
+#include <fstream>
+#include <random>
+#include <string>
+#include <vector>
+
+using namespace kplib::detail;
+
+namespace {
+
+using Words = std::vector<BitWord>;
+using Labels = std::vector<unsigned char>;
+
+const std::vector<unsigned long> sizes = [] {
+    std::vector<unsigned long> all = {511, 512, 513, 543, 544, 4095, 4096, 4097, 8200, 12345};
+    for (unsigned long n = 0; n <= 130; ++n)
+        all.push_back(n);
+    return all;
+}();
+
+/// Bits alike, alike but for one, or noise, by the seed; behind the last bit there is noise.
+KpBitfield someField(unsigned long nBits, unsigned seed)
+{
+    std::mt19937 random(seed);
+    KpBitfield field(nBits, KpBitfield::INIT_NONE);
+    std::generate_n(field.data(), field.nWords(), random);
+    const unsigned kind = seed % 6;
+    const unsigned long odd = nBits ? random() % nBits : 0;
+    for (unsigned long i = 0; i < nBits && kind < 4; ++i)
+        (((kind & 2) != 0) != ((kind & 1) != 0 && i == odd)) ? field.set(i) : field.unset(i);
+    return field;
+}
+
+Words wordsOf(const KpBitfield& field)
+{
+    return Words(field.data(), field.data() + field.nWords());
+}
+
+/// Runs of 0 to 3, so that there are fours of one kind and mixed ones.
+Labels someLabels(unsigned long n, unsigned seed)
+{
+    std::mt19937 random(seed);
+    Labels labels(n);
+    for (unsigned long i = 0; i < n; ++i)
+        labels[i] = i > 0 && random() % 4 != 0 ? labels[i - 1] : static_cast<unsigned char>(random() % 4);
+    return labels;
+}
+
+}  // namespace
 
 TEST(KpBitfield, countsOneWordBeyondTheFullOnes)
 {
     for (auto [bits, words] : {std::pair{0UL, 0UL}, {1, 1}, {31, 1}, {32, 2}, {33, 2}, {64, 3}}) {
-        const KpBitfield field(bits, KpBitfield::INIT_UNSET);
-        EXPECT_TRUE(field.nBits() == bits && field.nWords() == words && (field.data() != nullptr) == (bits != 0));
+        KpBitfield field(bits, KpBitfield::INIT_UNSET);
+        EXPECT_TRUE(field.nBits() == bits && wordsOf(field) == Words(words, 0));
+        field.toggleAll();
+        EXPECT_EQ(wordsOf(field), Words(words, ~0U)) << "with the spare word";
+        field.unsetAll();
+        EXPECT_EQ(wordsOf(field), Words(words, 0));
+        field.setAll();
+        EXPECT_EQ(wordsOf(field), Words(words, ~0U));
+        field.resize(0, KpBitfield::INIT_SET);
+        EXPECT_TRUE(field.nBits() == 0 && field.nWords() == 0 && field.data() == nullptr);
     }
+}
+
+TEST(KpBitfield, copiesByItselfAndMovesItsStorage)
+{
+    const KpBitfield field = someField(100, 5);
+    KpBitfield copy(field), other = someField(40, 5);
+    copy.toggleAll();
+    EXPECT_NE(copy, field);
+    other = field;
+    EXPECT_EQ(wordsOf(other = *&other), wordsOf(field));
+    const auto* const storage = other.data();
+    copy = KpBitfield(std::move(other));
+    EXPECT_TRUE(copy.data() == storage && copy == field && other.nBits() == 0);
+    copy = KpBitfield();
+    EXPECT_TRUE(copy == KpBitfield() && copy != field);
+}
+
+TEST(KpBitfield, resizingFillsWhatIsAddedButForASpareWord)
+{
+    constexpr BitWord before = 0xA5A5A5A5;
+    for (unsigned long old : {0, 1, 31, 32, 33, 64, 70, 96})
+        for (unsigned long now : {0, 1, 31, 32, 33, 60, 64, 65, 71, 96, 200})
+            for (auto init : {KpBitfield::INIT_SET, KpBitfield::INIT_UNSET, KpBitfield::INIT_NONE}) {
+                KpBitfield field(old, KpBitfield::INIT_NONE);
+                std::fill_n(field.data(), field.nWords(), before);
+                const unsigned long oldEnd = field.nWords() * 32;
+                field.resize(now, init);
+                const bool fills = init != KpBitfield::INIT_NONE, fillsLast = fills && old % 32 != 0 && now > old;
+                for (unsigned long i = 0; i < (fills ? field.nWords() * 32 : std::min(now, oldEnd)); ++i) {
+                    const bool isAdded = i >= oldEnd || (i >= old && fillsLast);
+                    ASSERT_EQ(field.test(i), isAdded ? init == KpBitfield::INIT_SET : (before >> i % 32) % 2 != 0)
+                        << old << " to " << now << " by " << init << " at " << i;
+                }
+            }
+}
+
+TEST(KpBitfield, setsRangesAndSingleBits)
+{
+    for (unsigned long from = 0; from < 100; ++from)
+        for (unsigned long to : {from, from + 1, from + 31, from + 32, from + 33, from + 90}) {
+            KpBitfield field(200, KpBitfield::INIT_UNSET), one = field;
+            field.setRange(from, to);
+            for (unsigned long i = from; i <= to; ++i)
+                one.set(i);
+            ASSERT_EQ(wordsOf(field), wordsOf(one)) << from << " to " << to;
+            EXPECT_TRUE(one.test(to) && !one.test(to + 1));
+            one.unset(to);
+            EXPECT_TRUE(!one.test(to) && one.nSetBits() == to - from);
+        }
+}
+
+TEST(KpBitfield, logicGoesOverTheWordsOfTheShorter)
+{
+    for (unsigned long n : sizes)
+        for (unsigned long nB : {n, n + 40, n / 2, 0UL}) {
+            const KpBitfield a = someField(n, 4), b = someField(nB, 5);
+            KpBitfield results[] = {a, a, a};
+            results[0] &= b;
+            results[1] |= b;
+            results[2] ^= b;
+            for (unsigned long i = 0; i < a.nWords(); ++i) {
+                const bool isBoth = i < b.nWords();
+                const BitWord x = a.data()[i], y = isBoth ? b.data()[i] : 0;
+                ASSERT_EQ(results[0].data()[i], isBoth ? x & y : x);
+                ASSERT_TRUE(results[1].data()[i] == (x | y) && results[2].data()[i] == (x ^ y));
+            }
+        }
+}
+
+TEST(KpBitfield, answersByItsBitsAndIgnoresWhatLiesBehind)
+{
+    for (unsigned long n : sizes)
+        for (unsigned seed = 0; seed < 6; ++seed) {
+            const KpBitfield field = someField(n, seed);
+            KpString text;
+            field.print(text);
+            const std::string bits(text.c_str());
+            ASSERT_EQ(bits.size(), n);
+            for (unsigned long i = 0; i < n; ++i)
+                ASSERT_EQ(bits[i] == '1', field.test(i));
+            const unsigned long first = std::min(bits.find('1'), n), firstUnset = std::min(bits.find('0'), n);
+            EXPECT_EQ(field.nSetBits(), static_cast<unsigned long>(std::count(bits.begin(), bits.end(), '1')));
+            EXPECT_TRUE(field.firstSetBit() == first && field.isAnyBitSet() == (first < n)) << bits;
+            EXPECT_TRUE(field.firstUnsetBit() == firstUnset && field.isAnyBitUnset() == (firstUnset < n)) << bits;
+            EXPECT_EQ(field.lastSetBit(), std::min(bits.rfind('1'), n)) << bits;
+        }
+}
+
+TEST(KpBitfield, comparesTheBitsThatBothHave)
+{
+    for (unsigned long n : sizes)
+        for (unsigned long nB : {n, n + 1, n / 2})
+            for (unsigned seed = 0; seed < 12; ++seed) {
+                const KpBitfield a = someField(n, seed), b = someField(nB, seed % 7);
+                bool contains = true, meets = false, isContained = true;
+                for (unsigned long i = 0; i < std::min(n, nB); ++i) {
+                    contains = contains && (a.test(i) || !b.test(i));
+                    isContained = isContained && (b.test(i) || !a.test(i));
+                    meets = meets || (a.test(i) && b.test(i));
+                }
+                SCOPED_TRACE(testing::Message() << n << " and " << nB << " bits, seed " << seed);
+                ASSERT_TRUE(a.isSuperset(b) == contains && a.isSubset(b) == isContained);
+                ASSERT_TRUE(a.hasIntersection(b) == meets && (a == b) == (n == nB && contains && isContained));
+            }
+}
+
+TEST(BitfieldKernels, everyRowEqualsThePlainOne)
+{
+    for (unsigned long n : {0, 1, 2, 63, 64, 65, 127, 128, 129, 255, 256, 300, 1000})
+        for (unsigned seed = 0; seed < 6; ++seed) {
+            SCOPED_TRACE(testing::Message() << n << " words, seed " << seed);
+            const Words a = wordsOf(someField(n * 32, seed)), b = wordsOf(someField(n * 32, seed / 2 + 7));
+            const auto expectSame = [](auto paths, auto ask) {
+                for (const auto& path : paths)
+                    if (path.usable) {
+                        EXPECT_EQ(ask(path.run), ask(paths[0].run)) << path.name;
+                    }
+            };
+            const auto any = [&](auto* run) { return run(a.data(), b.data(), n); };
+            const auto combined = [&](auto* run) {
+                Words result = a;
+                run(result.data(), b.data(), n);
+                return result;
+            };
+            expectSame(countPaths(), [&](auto* run) { return run(a.data(), n); });
+            for (BitWord skipped : {0U, ~0U}) {
+                expectSame(findFirstPaths(), [&](auto* run) { return run(a.data(), n, skipped); });
+                expectSame(findLastPaths(), [&](auto* run) { return run(a.data(), n, skipped); });
+            }
+            expectSame(anyPaths<BitAnd>(), any);
+            expectSame(anyPaths<BitsMissing>(), any);
+            expectSame(combinePaths<BitXor>(), combined);
+        }
+}
+
+TEST(KpBitfield, takesTheVoxelsOfALabel)
+{
+    const struct {
+        Labels labels;
+        unsigned char label;
+        Words words;
+    } cases[] = {
+        {{0, 0, 0, 0}, 0, {0}},
+        {{0, 1, 0, 0, 0, 0, 0, 0, 0, 0}, 0, {0b1100001101}},  // the last two by themselves
+        {{7, 7, 7, 7, 0, 7}, 7, {0b101111}},
+    };
+    for (const auto& [labels, label, words] : cases) {
+        KpBitfield field(400, KpBitfield::INIT_SET);
+        field.fromLabels(labels.size(), labels.data(), label);
+        EXPECT_EQ(wordsOf(field), words);
+    }
+    for (unsigned long n : sizes)
+        for (unsigned char label : {0, 1, 3, 255})
+            for (unsigned long start : {0, 1, 3}) {
+                const Labels labels = someLabels(n + start, static_cast<unsigned>(n));
+                Words expected(n / 32 + 1);
+                for (unsigned long i = 0; i < n; ++i) {
+                    const unsigned long four = i / 4 * 4;
+                    const auto* group = labels.data() + start + four;
+                    if (labels[start + i] == label && !(four + 4 <= n && std::count(group, group + 4, 0) == 4))
+                        expected[i / 32] |= 1U << i % 32;
+                }
+                for (const auto& path : fromLabelsPaths()) {
+                    Words words(n / 32 + 1, 0x12345678);
+                    if (path.usable) {
+                        path.run(words.data(), labels.data() + start, n, label);
+                        ASSERT_EQ(words, expected) << path.name << ' ' << n << '+' << start << " label " << int(label);
+                    }
+                }
+            }
+}
+
+TEST(KpBitfield, mergesIntoLabelsByPolicy)
+{
+    for (unsigned long n : sizes)
+        for (int policy = KpBitfield::INSERT_SET; policy <= KpBitfield::INSERT_OWN; ++policy)
+            for (unsigned char label : {0, 2, 200}) {
+                const unsigned long start = n % 4;
+                const KpBitfield field = someField(n, static_cast<unsigned>(n + label) % 6);
+                const Labels labels = someLabels(n + start, 3);
+                Labels expected = labels;
+                for (unsigned long i = 0; i < n; ++i) {
+                    unsigned char& v = expected[start + i];
+                    const bool isSet = field.test(i), isFree = v == 0, isOwn = isFree || v == label;
+                    const bool writes[] = {false, isSet, isSet && isFree, true, isOwn};
+                    v = !writes[policy] ? v : isSet ? label : 0;
+                }
+                for (const auto& path : toLabelsPaths()) {
+                    Labels result = labels;
+                    if (path.usable) {
+                        path.run(KpBitfield::InsertPolicy(policy))(field.data(), result.data() + start, n, label);
+                        ASSERT_EQ(result, expected) << path.name << ' ' << n << ' ' << policy << ' ' << int(label);
+                    }
+                }
+            }
+    KpBitfield field(40, KpBitfield::INIT_SET);
+    Labels labels(41, 7);
+    field.toLabels(41, labels.data(), 3, KpBitfield::INSERT_SET);
+    for (int unknown : {0, 5, -1})
+        field.toLabels(40, labels.data(), 3, KpBitfield::InsertPolicy(unknown));
+    EXPECT_EQ(labels, Labels(41, 7));
+    field.toLabels(39, labels.data(), 3, KpBitfield::INSERT_SET);
+    EXPECT_TRUE(labels[38] == 3 && labels[39] == 7);
+}
+
+TEST(KpBitfield, filesHoldTheBytesOfTheBits)
+{
+    const std::string path = testing::TempDir() + "bitfield";
+    for (unsigned long n : {0, 1, 8, 9, 32, 100}) {
+        const KpBitfield field = someField(n, 4);
+        KpBitfield loaded(300, KpBitfield::INIT_SET);
+        ASSERT_TRUE(field.save(path.c_str()) && loaded.load(path.c_str(), n));
+        EXPECT_TRUE(loaded == field && std::filesystem::file_size(path) == (n + 7) / 8);
+    }
+    KpBitfield field(300, KpBitfield::INIT_SET), expected(150, KpBitfield::INIT_UNSET);
+    std::ofstream(path) << "\xFF\x01";
+    expected.setRange(0, 8);
+    EXPECT_FALSE(field.load(path.c_str(), 150)) << "too short";
+    EXPECT_EQ(wordsOf(field), wordsOf(expected));
+    std::filesystem::remove(path);
+    EXPECT_FALSE(field.load(path.c_str(), 96));
+    EXPECT_EQ(wordsOf(field), Words(4, 0));
+    EXPECT_FALSE(field.save("/no/such/folder/bitfield"));
+    EXPECT_FALSE(KpBitfield(1 << 20, KpBitfield::INIT_SET).save("/dev/full"));
+}
+
+TEST(KpBitfield, digestTakesAQuarterOfTheBitsAndTheLastWord)
+{
+    for (unsigned long n : {0, 1, 31, 32, 33, 64, 1000, 1024}) {
+        const KpBitfield field = someField(n, 4);
+        std::string bytes(reinterpret_cast<const char*>(field.data()), n / 32);
+        if (n > 0) {
+            const BitWord last = field.data()[n / 32] & (n % 32 ? (1U << n % 32) - 1 : ~0U);
+            bytes.append(reinterpret_cast<const char*>(&last), 4);
+        }
+        unsigned char digest[16];
+        field.md5(digest);
+        KpCoder coder;
+        coder.crcMD5Update(reinterpret_cast<const unsigned char*>(bytes.data()), static_cast<unsigned>(bytes.size()));
+        coder.crcMD5Final();
+        unsigned char expected[16];
+        coder.crcMD5Query(expected);
+        EXPECT_TRUE(std::equal(digest, digest + 16, expected)) << n;
+    }
+    KpString text;
+    KpBitfield().md5(text);
+    EXPECT_STREQ(text.c_str(), "D41D8CD98F00B204E9800998ECF8427E") << "RFC 1321: of no bytes";
+}
+
+TEST(KpBitfield, exhaustedMemoryLeavesTheFieldAsItWas)
+{
+    const KpBitfield before = someField(100, 4), large(5000, KpBitfield::INIT_SET);
+    const Labels labels(5000, 1);
+    KpBitfield field = before;
+    for (int kind : {0, 1, 2})
+        kplib::test::failAtEachAllocation(
+            [&] {
+                kind == 0   ? field.resize(5000, KpBitfield::INIT_SET)
+                : kind == 1 ? void(field = large)
+                            : field.fromLabels(5000, labels.data(), 1);
+            },
+            [&] {
+                EXPECT_TRUE(field.nBits() == 5000 || wordsOf(field) == wordsOf(before));
+                field = before;
+            });
+    EXPECT_THROW(field.resize(~0UL, KpBitfield::INIT_SET), KpMemoryException);
 }

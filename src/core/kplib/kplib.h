@@ -27,6 +27,7 @@
 #include <kplib/foundation/KpStdStringTokenizer.h>
 #include <kplib/foundation/KpString.h>
 #include <kplib/foundation/KpStringTokenizer.h>
+#include <kplib/foundation/KpStringTokenizerGeneral.h>
 #include <kplib/foundation/KpThreadLocalStorage.h>
 #include <kplib/foundation/KpTransferID.h>
 #include <kplib/foundation/KpTypeInfo.h>
@@ -82,9 +83,12 @@
 #include <kplib/param/HxParamBundle.h>
 #include <kplib/param/HxParamEditCheck.h>
 #include <kplib/param/HxParameter.h>
+#include <kplib/rawdata/KpPackedIndexing.h>
 #include <kplib/rawdata/KpRawData.h>
+#include <kplib/rawdata/KpSuperPackedIndexing.h>
 #include <kplib/rawdata/KpTypedElement.h>
 #include <kplib/rawdata/KpTypedPointer.h>
+#include <kplib/rawdata/TmSSETools.h>
 #include <kplib/system/KpBuildInfo.h>
 #include <kplib/system/KpCPUInfo.h>
 #include <kplib/system/KpCoder.h>

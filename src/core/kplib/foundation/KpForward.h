@@ -21,6 +21,7 @@ class KpMemoryException;
 class KpPrimType;
 class KpString;
 class KpStringTokenizer;
+class KpStringTokenizerGeneral;
 class KpStdStringTokenizer;
 
 class KpMutex;
@@ -81,9 +82,12 @@ class KpVec4f;
 class KpVec4i;
 
 class KpColor;
+class KpPackedIndexing;
 class KpRawData;
+class KpSuperPackedIndexing;
 class KpTypedElement;
 struct KpTypedPointer;
+class TmSSETools;
 
 class KpBitfield;
 class KpNeighborIterator33;

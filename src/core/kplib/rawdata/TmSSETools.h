@@ -1,0 +1,22 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+/// Work on rows of pixels, as fast as the processor allows; every processor gives the same bits. No alignment is asked
+/// for. Any number of threads, on different rows.
+class KPLIB_API TmSSETools {
+public:
+    TmSSETools() = delete;
+
+    /// dst[i] = src[i] * factor for `n` values; returns dst + n. `dst` may be `src`.
+    static float* multiplyAndStoreUnaligned(float* src, float factor, long long n, float* dst);
+    /// dst[i] += src[i] * factor for `n` values, rounded after each step; returns dst + n.
+    static float* multiplyAndAddUnaligned(float* src, float factor, long long n, float* dst);
+
+    /// Reverses the order of the rows in place; nothing if they have no bytes.
+    static void mirrorY(char* data, long rows, long rowBytes);
+    /// Copies the rows in reverse order, of each what both sides have room for, into memory that doesn't overlap.
+    /// Nothing if any number is below 1.
+    static void memcpyMirrorY(const unsigned char* src, long rows, long srcRowBytes, unsigned char* dst,
+                              long dstRowBytes);
+};
