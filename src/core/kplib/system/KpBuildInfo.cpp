@@ -20,7 +20,7 @@ std::string filled(std::string text, std::initializer_list<int> items)
 {
     int place = 1;
     for (const int item : items) {
-        const std::string mark = "%" + std::to_string(place++) + "%";
+        const std::string mark = std::string("%").append(std::to_string(place++)).append("%");
         text.replace(text.find(mark), mark.size(), std::to_string(item));
     }
     return text;
