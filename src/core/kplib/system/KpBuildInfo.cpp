@@ -4,6 +4,7 @@
 
 #include <KpBuildValues.h>
 #include <algorithm>
+#include <initializer_list>
 #include <map>
 #include <string>
 
@@ -13,14 +14,23 @@ namespace values = kplib::build;
 
 constexpr int numbers[] = {values::major, values::minor, values::patch, values::build};
 
-/// The first `parts` numbers of the version. Not by a stream or format, which group digits as the program's locale
+/// The text with numbers in place of %1%, %2% ... Not by a stream or format, which group digits as the program's locale
 /// has it.
-std::string version(int parts)
+std::string filled(std::string text, std::initializer_list<int> items)
 {
-    std::string text = std::to_string(numbers[0]);
-    for (int i = 1; i < parts; ++i)
-        text.append(".").append(std::to_string(numbers[i]));
+    int place = 1;
+    for (const int item : items) {
+        const std::string mark = std::string("%").append(std::to_string(place++)).append("%");
+        text.replace(text.find(mark), mark.size(), std::to_string(item));
+    }
     return text;
+}
+
+/// Major, minor and patch, with the build number or without.
+std::string version(bool hasBuild)
+{
+    const std::string three = filled("%1%.%2%.%3%", {values::major, values::minor, values::patch});
+    return hasBuild ? three + filled(".%1%", {values::build}) : three;
 }
 
 const std::map<std::string, std::string>& tags()
@@ -30,7 +40,7 @@ const std::map<std::string, std::string>& tags()
         {"VERSION_MINOR", std::to_string(values::minor)},
         {"VERSION_PATCH", std::to_string(values::patch)},
         {"VERSION_BUILD", std::to_string(values::build)},
-        {"VERSION_STRING", version(4)},
+        {"VERSION_STRING", version(true)},
         {"VERSION_SHA1", values::revision},
         {"VERSION_PRODUCT_NAME", values::productName},
         {"VERSION_COMMENTS", values::comments},
@@ -53,7 +63,7 @@ std::string details(int flags)
     if (flags & KpBuildInfo::Platform)
         add("", std::string(kplib::platform::name()) + ", 64-bit");
     if (!(flags & KpBuildInfo::BuildNumber))
-        add(" ", "Build " + std::to_string(values::build));
+        add(" ", filled("Build %1%", {values::build}));
     if (const std::string comments = KpBuildInfo::getBuildTag("VERSION_COMMENTS");
         (flags & KpBuildInfo::Comments) && !comments.empty())
         add(" ", "'" + comments + "'");
@@ -83,6 +93,6 @@ std::string KpBuildInfo::getBuildTag(const std::string& key)
 
 std::string KpBuildInfo::getBuildString(int flags)
 {
-    const std::string text = version(flags & BuildNumber ? 4 : 3);
+    const std::string text = version((flags & BuildNumber) != 0);
     return flags == BuildNumber ? text : text + " (" + details(flags) + ")";
 }

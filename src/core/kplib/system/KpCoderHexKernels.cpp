@@ -3,6 +3,16 @@
 namespace kplib::detail {
 namespace {
 
+// The reference.
+void writeDigitsPlain(const unsigned char* data, char* text, long n, char a)
+{
+    const char* const digits = a == 'A' ? "0123456789ABCDEF" : "0123456789abcdef";
+    for (long i = 0; i < n; ++i) {
+        text[2 * i] = digits[data[i] >> 4];
+        text[2 * i + 1] = digits[data[i] & 15];
+    }
+}
+
 /// Without a table, so that it is done in vectors.
 struct WriteDigits {
     KPLIB_KERNEL_BODY static char digit(unsigned char value, unsigned char toLetter)
@@ -25,7 +35,8 @@ struct WriteDigits {
 std::span<const KernelPath<HexLoop>> hexPaths()
 {
     static const KernelPath<HexLoop> paths[] = {
-        {"plain", true, ForAny::run<WriteDigits>},
+        {"plain", true, writeDigitsPlain},
+        {"vectors", true, ForAny::run<WriteDigits>},
         {"avx2", hasAvx2(), ForAvx2::run<WriteDigits>},
         {"avx512", hasAvx512(), ForAvx512::run<WriteDigits>},
     };
