@@ -79,12 +79,11 @@ TEST(KpBitfield, copiesByItselfAndMovesItsStorage)
     const KpBitfield field = someField(100, 5);
     KpBitfield copy(field), other = someField(40, 5);
     copy.toggleAll();
-    EXPECT_NE(copy, field);
     other = field;
-    EXPECT_EQ(wordsOf(other = *&other), wordsOf(field));
+    EXPECT_TRUE(copy != field && wordsOf(other) == wordsOf(field));
     const auto* const storage = other.data();
     copy = KpBitfield(std::move(other));
-    EXPECT_TRUE(copy.data() == storage && copy == field && other.nBits() == 0);
+    EXPECT_TRUE(copy.data() == storage && copy == field);
     copy = KpBitfield();
     EXPECT_TRUE(copy == KpBitfield() && copy != field);
 }
@@ -110,16 +109,15 @@ TEST(KpBitfield, resizingFillsWhatIsAddedButForASpareWord)
 
 TEST(KpBitfield, setsRangesAndSingleBits)
 {
-    for (unsigned long from = 0; from < 100; ++from)
-        for (unsigned long to : {from, from + 1, from + 31, from + 32, from + 33, from + 90}) {
-            KpBitfield field(200, KpBitfield::INIT_UNSET), one = field;
+    for (unsigned long from = 0; from < 66; ++from)
+        for (unsigned long to : {from, from + 1, from + 31, from + 32, from + 90}) {
+            KpBitfield field(200, KpBitfield::INIT_UNSET);
             field.setRange(from, to);
             for (unsigned long i = from; i <= to; ++i)
-                one.set(i);
-            ASSERT_EQ(wordsOf(field), wordsOf(one)) << from << " to " << to;
-            EXPECT_TRUE(one.test(to) && !one.test(to + 1));
-            one.unset(to);
-            EXPECT_TRUE(!one.test(to) && one.nSetBits() == to - from);
+                field.unset(i);
+            EXPECT_EQ(field.nSetBits(), 0u);
+            field.setRange(from, to);
+            EXPECT_TRUE(field.nSetBits() == to - from + 1 && field.firstSetBit() == from && field.lastSetBit() == to);
         }
 }
 
@@ -191,11 +189,6 @@ TEST(BitfieldKernels, everyRowEqualsThePlainOne)
                     }
             };
             const auto any = [&](auto* run) { return run(a.data(), b.data(), n); };
-            const auto combined = [&](auto* run) {
-                Words result = a;
-                run(result.data(), b.data(), n);
-                return result;
-            };
             expectSame(countPaths(), [&](auto* run) { return run(a.data(), n); });
             for (BitWord skipped : {0U, ~0U}) {
                 expectSame(findFirstPaths(), [&](auto* run) { return run(a.data(), n, skipped); });
@@ -203,45 +196,38 @@ TEST(BitfieldKernels, everyRowEqualsThePlainOne)
             }
             expectSame(anyPaths<BitAnd>(), any);
             expectSame(anyPaths<BitsMissing>(), any);
-            expectSame(combinePaths<BitXor>(), combined);
+            expectSame(combinePaths<BitXor>(), [&](auto* run) {
+                Words result = a;
+                run(result.data(), b.data(), n);
+                return result;
+            });
         }
 }
 
 TEST(KpBitfield, takesTheVoxelsOfALabel)
 {
-    const struct {
-        Labels labels;
-        unsigned char label;
-        Words words;
-    } cases[] = {
-        {{0, 0, 0, 0}, 0, {0}},
-        {{0, 1, 0, 0, 0, 0, 0, 0, 0, 0}, 0, {0b1100001101}},  // the last two by themselves
-        {{7, 7, 7, 7, 0, 7}, 7, {0b101111}},
-    };
-    for (const auto& [labels, label, words] : cases) {
-        KpBitfield field(400, KpBitfield::INIT_SET);
-        field.fromLabels(labels.size(), labels.data(), label);
-        EXPECT_EQ(wordsOf(field), words);
-    }
     for (unsigned long n : sizes)
-        for (unsigned char label : {0, 1, 3, 255})
-            for (unsigned long start : {0, 1, 3}) {
-                const Labels labels = someLabels(n + start, static_cast<unsigned>(n));
-                Words expected(n / 32 + 1);
-                for (unsigned long i = 0; i < n; ++i) {
-                    const unsigned long four = i / 4 * 4;
-                    const auto* group = labels.data() + start + four;
-                    if (labels[start + i] == label && !(four + 4 <= n && std::count(group, group + 4, 0) == 4))
-                        expected[i / 32] |= 1U << i % 32;
-                }
-                for (const auto& path : fromLabelsPaths()) {
-                    Words words(n / 32 + 1, 0x12345678);
-                    if (path.usable) {
-                        path.run(words.data(), labels.data() + start, n, label);
-                        ASSERT_EQ(words, expected) << path.name << ' ' << n << '+' << start << " label " << int(label);
-                    }
+        for (unsigned char label : {0, 1, 3, 255}) {
+            const unsigned long start = n % 4;
+            const Labels labels = someLabels(n + start, static_cast<unsigned>(n));
+            Words expected(n / 32 + 1);
+            for (unsigned long i = 0; i < n; ++i) {
+                const auto* four = labels.data() + start + i / 4 * 4;
+                const bool isSkipped = i / 4 * 4 + 4 <= n && std::count(four, four + 4, 0) == 4;
+                expected[i / 32] |= labels[start + i] == label && !isSkipped ? 1U << i % 32 : 0;
+            }
+            for (const auto& path : fromLabelsPaths()) {
+                Words words(n / 32 + 1, 0x12345678);
+                if (path.usable) {
+                    path.run(words.data(), labels.data() + start, n, label);
+                    ASSERT_EQ(words, expected) << path.name << ' ' << n << '+' << start << " label " << int(label);
                 }
             }
+        }
+    KpBitfield field(400, KpBitfield::INIT_SET);
+    const unsigned char labels[] = {0, 1, 0, 0, 0, 0, 0, 0, 0, 0};
+    field.fromLabels(10, labels, 0);
+    EXPECT_EQ(wordsOf(field), Words{0b1100001101}) << "not the four, but the last two";
 }
 
 TEST(KpBitfield, mergesIntoLabelsByPolicy)
@@ -303,22 +289,18 @@ TEST(KpBitfield, digestTakesAQuarterOfTheBitsAndTheLastWord)
     for (unsigned long n : {0, 1, 31, 32, 33, 64, 1000, 1024}) {
         const KpBitfield field = someField(n, 4);
         std::string bytes(reinterpret_cast<const char*>(field.data()), n / 32);
-        if (n > 0) {
-            const BitWord last = field.data()[n / 32] & (n % 32 ? (1U << n % 32) - 1 : ~0U);
-            bytes.append(reinterpret_cast<const char*>(&last), 4);
-        }
-        unsigned char digest[16];
-        field.md5(digest);
+        const BitWord last = n == 0 ? 0 : field.data()[n / 32] & (n % 32 ? (1U << n % 32) - 1 : ~0U);
+        bytes.append(reinterpret_cast<const char*>(&last), n == 0 ? 0 : 4);
         KpCoder coder;
         coder.crcMD5Update(reinterpret_cast<const unsigned char*>(bytes.data()), static_cast<unsigned>(bytes.size()));
         coder.crcMD5Final();
-        unsigned char expected[16];
-        coder.crcMD5Query(expected);
-        EXPECT_TRUE(std::equal(digest, digest + 16, expected)) << n;
+        unsigned char digest[16];
+        coder.crcMD5Query(digest);
+        KpString expected, text;
+        KpCoder::dataToHexString(digest, 16, expected, true);
+        field.md5(text);
+        EXPECT_STREQ(text.c_str(), expected.c_str()) << n;
     }
-    KpString text;
-    KpBitfield().md5(text);
-    EXPECT_STREQ(text.c_str(), "D41D8CD98F00B204E9800998ECF8427E") << "RFC 1321: of no bytes";
 }
 
 TEST(KpBitfield, exhaustedMemoryLeavesTheFieldAsItWas)

@@ -6,8 +6,8 @@
 /// Dense numbers for a sparse set of flagged positions, as KpPackedIndexing, but from run lengths and growing at its
 /// end: one byte a run, and two bytes and two longs at most for each block of 255 positions.
 ///
-/// Exhausted memory is a KpMemoryException, after which the index is good for destruction only. One thread at a time may
-/// append, or any number read.
+/// Exhausted memory is a KpMemoryException, after which the index is good for destruction only. One thread at a time
+/// may append, or any number read.
 class KPLIB_API KpSuperPackedIndexing {
 public:
     /// Not 256, so that a run, which never crosses the end of a block, fits one byte.
