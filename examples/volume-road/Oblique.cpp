@@ -78,6 +78,18 @@ public:
         return static_cast<unsigned char>(std::lround(sum));
     }
 
+    /// Whether the voxel that the place lies in is set.
+    bool isMarked(const KpVec3f& place, const KpBitfield& mask) const
+    {
+        if (!box_.contains(place))
+            return false;
+        long voxel[3];
+        for (int axis = 0; axis < 3; ++axis)
+            voxel[axis] = std::clamp(std::lround(place[axis]), 0L, volume_.dims[size_t(axis)] - 1);
+        return mask.test(
+            static_cast<unsigned long>((voxel[2] * volume_.dims[1] + voxel[1]) * volume_.dims[0] + voxel[0]));
+    }
+
 private:
     const Volume& volume_;
     KpBox3f box_;
@@ -85,7 +97,7 @@ private:
 
 }  // namespace
 
-KpResult writeOblique(const Volume& shown, const Space& space, const OutputFolder& out)
+KpResult writeOblique(const Volume& shown, const Space& space, const KpBitfield& outline, const OutputFolder& out)
 {
     const KpHandle<KpCoordinateSystem> slice = sliceSystem(shown, space);
     const KpBox2f extent = extentOf(shown, space, *slice);
@@ -101,7 +113,10 @@ KpResult writeOblique(const Volume& shown, const Space& space, const OutputFolde
         for (long column = 0; column < picture.width; ++column) {
             const KpVec3f inSlice(extent.xmin() + static_cast<float>(column) * pixel,
                                   extent.ymin() + static_cast<float>(row) * pixel, 0);
-            picture.set(column, row, sampler.at(toVoxels.multVecMatrix(inSlice)));
+            const KpVec3f place = toVoxels.multVecMatrix(inSlice);
+            picture.set(column, row, sampler.at(place));
+            if (sampler.isMarked(place, outline))
+                picture.mark(column, row);
         }
     }
     drawLetters(picture,

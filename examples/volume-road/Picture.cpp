@@ -11,6 +11,7 @@
 Picture::Picture(long w, long h) : width(w), height(h)
 {
     pixels.resize(w * h);
+    marks.resize(static_cast<unsigned long>(w * h), KpBitfield::INIT_UNSET);
     KpRawData::memset({pixels.data(), KpPrimType::Byte}, 0, w * h);
 }
 
@@ -22,12 +23,20 @@ double pixelSize(double finest, double width, double height)
 
 KpResult writePng(const Picture& picture, const OutputFolder& out, const char* name)
 {
+    constexpr unsigned char markColour[] = {255, 176, 0};
+    KpDArray<unsigned char> colours;
+    colours.resize(picture.pixels.size() * 3);
+    for (long i = 0; i < picture.pixels.size(); ++i) {
+        const bool isMarked = picture.marks.test(static_cast<unsigned long>(i));
+        for (int c = 0; c < 3; ++c)
+            colours[3 * i + c] = isMarked ? markColour[c] : picture.pixels[i];
+    }
     png_image image{};
     image.version = PNG_IMAGE_VERSION;
     image.width = static_cast<png_uint_32>(picture.width);
     image.height = static_cast<png_uint_32>(picture.height);
-    image.format = PNG_FORMAT_GRAY;
-    if (!png_image_write_to_file(&image, out.pathOf(name).c_str(), 0, picture.pixels.data(), 0, nullptr))
+    image.format = PNG_FORMAT_RGB;
+    if (!png_image_write_to_file(&image, out.pathOf(name).c_str(), 0, colours.data(), 0, nullptr))
         return badInput("can't write %s: %s", name, image.message);
     return KpResult();
 }

@@ -3,13 +3,15 @@
 #include "OutputFolder.h"
 
 #include <kplib/foundation/KpDArray.h>
+#include <kplib/volume/KpBitfield.h>
 
 #include <cmath>
 
-/// A grey picture, black to begin with.
+/// A grey picture, black to begin with, and marks on it that are shown in colour.
 struct Picture {
     long width, height;
     KpDArray<unsigned char> pixels;  // top row first
+    KpBitfield marks;                // one bit a pixel
 
     Picture(long w, long h);
 
@@ -19,6 +21,7 @@ struct Picture {
         if (column >= 0 && column < width && row >= 0 && row < height)
             pixels[row * width + column] = grey;
     }
+    void mark(long column, long row) { marks.set(static_cast<unsigned long>(row * width + column)); }
 };
 
 /// The size of square pixels that show `finest` mm, or what makes a picture of so many mm as large as pictures get.

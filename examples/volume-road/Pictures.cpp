@@ -48,6 +48,8 @@ std::array<Along, 3> alongPatientAxes(const Volume& volume)
 struct Between {
     long offset, step;
     double share;
+
+    long nearest() const { return share < 0.5 ? offset : offset + step; }
 };
 
 Between position(const Along& along, long i, double pixel)
@@ -60,12 +62,13 @@ Between position(const Along& along, long i, double pixel)
     return {whole * along.stride, along.size > 1 ? along.stride : 0, v - static_cast<double>(whole)};
 }
 
-Picture cut(Volume& shown, const Along& across, const Along& down, const Along& normal)
+Picture cut(Volume& shown, const KpBitfield& outline, const Along& across, const Along& down, const Along& normal)
 {
     const auto extent = [](const Along& a) { return static_cast<double>(a.size - 1) * a.spacing; };
     const double pixel = pixelSize(std::min(across.spacing, down.spacing), extent(across), extent(down));
     Picture picture(pixelsFor(extent(across), pixel), pixelsFor(extent(down), pixel));
-    const unsigned char* const plane = shown.bytes.data() + normal.size / 2 * normal.stride;
+    const long planeOffset = normal.size / 2 * normal.stride;
+    const unsigned char* const plane = shown.bytes.data() + planeOffset;
     for (long row = 0; row < picture.height; ++row) {
         const Between y = position(down, row, pixel);
         for (long column = 0; column < picture.width; ++column) {
@@ -75,6 +78,8 @@ Picture cut(Volume& shown, const Along& across, const Along& down, const Along& 
             const double bottom = at[y.step] + x.share * (at[y.step + x.step] - at[y.step]);
             picture.pixels[row * picture.width + column] =
                 static_cast<unsigned char>(std::lround(top + y.share * (bottom - top)));
+            if (outline.test(static_cast<unsigned long>(planeOffset + x.nearest() + y.nearest())))
+                picture.mark(column, row);
         }
     }
     drawLetters(picture, lettersOf(shown, across.direction, down.direction));
@@ -124,12 +129,12 @@ void display(Volume& volume, const Window& window, Volume& shown)
     KpRawData::mapLinear(shown.voxels(), volume.voxels(), static_cast<unsigned long>(volume.count()), offset, scale);
 }
 
-KpResult writePlanes(Volume& shown, const OutputFolder& out)
+KpResult writePlanes(Volume& shown, const KpBitfield& outline, const OutputFolder& out)
 {
     const auto [left, back, up] = alongPatientAxes(shown);
-    KpResult result = writePng(cut(shown, left, back, up), out, "axial.png");
-    result << writePng(cut(shown, left, reversed(up), back), out, "coronal.png");
-    result << writePng(cut(shown, back, reversed(up), left), out, "sagittal.png");
+    KpResult result = writePng(cut(shown, outline, left, back, up), out, "axial.png");
+    result << writePng(cut(shown, outline, left, reversed(up), back), out, "coronal.png");
+    result << writePng(cut(shown, outline, back, reversed(up), left), out, "sagittal.png");
     return result;
 }
 

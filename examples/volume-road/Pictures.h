@@ -3,6 +3,8 @@
 #include "OutputFolder.h"
 #include "Volume.h"
 
+#include <kplib/volume/KpBitfield.h>
+
 /// What of the displayed values becomes black and white.
 struct Window {
     double center = 0, width = 1;  ///< displayed values, as in DICOM's window centre and width
@@ -18,8 +20,9 @@ Window windowOf(Volume& volume);
 void display(Volume& volume, const Window& window, Volume& shown);
 
 /// Writes axial.png, coronal.png and sagittal.png through the middle of a volume of bytes, the patient upright and seen
-/// as usual (left on the right side of the picture), with square pixels and the orientation's letters at the edges.
-KpResult writePlanes(Volume& shown, const OutputFolder& out);
+/// as usual (left on the right side of the picture), with square pixels and the orientation's
+/// letters at the edges. Voxels of `outline`, a mask of the volume's size, are marked.
+KpResult writePlanes(Volume& shown, const KpBitfield& outline, const OutputFolder& out);
 
 /// Writes all slices of a volume of bytes side by side, with the letters of a slice at the edges.
 KpResult writeOverview(Volume& shown, const OutputFolder& out, const char* name);

@@ -59,6 +59,21 @@ void addVolume(Volume& volume, KpString& text)
     text += KpString(0, "%-20s %.8g to %.8g\n", "values", displayed(low), displayed(high));
 }
 
+void addRegion(const Region& region, KpString& text)
+{
+    text += KpString(0, "%-20s %.6g (%s)\n", "threshold", region.threshold,
+                     region.isThresholdGiven ? "given" : "by Otsu's method");
+    text += KpString(0, "%-20s %.2f ml, %lu voxels, the largest of %d\n", "region", region.millilitres, region.voxels,
+                     region.components);
+    if (region.voxels == 0)
+        return;
+    const KpVec3f &c = region.center, low = region.box.min(), high = region.box.max();
+    const auto mm = [](float v) { return static_cast<double>(v); };
+    text += KpString(0, "%-20s (%.2f, %.2f, %.2f) mm\n", "region's centre", mm(c.x()), mm(c.y()), mm(c.z()));
+    text += KpString(0, "%-20s (%.2f, %.2f, %.2f) to (%.2f, %.2f, %.2f) mm\n", "region's box", mm(low.x()), mm(low.y()),
+                     mm(low.z()), mm(high.x()), mm(high.y()), mm(high.z()));
+}
+
 }  // namespace
 
 KpResult writeHeader(const HxParamBundle& root, const OutputFolder& out)
@@ -69,13 +84,14 @@ KpResult writeHeader(const HxParamBundle& root, const OutputFolder& out)
 }
 
 KpResult writeReport(const HxParamBundle& root, const Series& series, Volume& volume, const Window& window,
-                     const std::vector<Stage>& stages, const OutputFolder& out)
+                     const Region& region, const std::vector<Stage>& stages, const OutputFolder& out)
 {
     KpString text;
     addSafeTags(root, text);
     text += KpString(0, "%-20s %zu (%d other files skipped)\n", "images", series.slices.size(), series.skippedFiles);
     addVolume(volume, text);
     text += KpString(0, "%-20s center %.6g, width %.6g (%s)\n", "window", window.center, window.width, window.origin);
+    addRegion(region, text);
     for (const std::string& warning : series.warnings)
         text += KpString(0, "%-20s %s\n", "warning", warning.c_str());
     for (const Stage& stage : stages)

@@ -3,6 +3,7 @@
 #include "DicomSeries.h"
 #include "OutputFolder.h"
 #include "Pictures.h"
+#include "Segment.h"
 
 /// One stage of the road and how long it took.
 struct Stage {
@@ -15,4 +16,4 @@ KpResult writeHeader(const HxParamBundle& root, const OutputFolder& out);
 
 /// Writes report.txt: what can be told without telling who the patient is.
 KpResult writeReport(const HxParamBundle& root, const Series& series, Volume& volume, const Window& window,
-                     const std::vector<Stage>& stages, const OutputFolder& out);
+                     const Region& region, const std::vector<Stage>& stages, const OutputFolder& out);

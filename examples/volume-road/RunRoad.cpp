@@ -4,6 +4,7 @@
 #include "JobLog.h"
 #include "Oblique.h"
 #include "Report.h"
+#include "Segment.h"
 
 #include <kplib/log/KpLogFile.h>
 #include <kplib/rawdata/KpRawData.h>
@@ -132,14 +133,15 @@ private:
 
 }  // namespace
 
-KpResult runRoad(const char* folder, const std::string& uid, const std::string& target, KpProgressInterface& progress)
+KpResult runRoad(const char* folder, const std::string& uid, std::optional<double> threshold, const std::string& target,
+                 KpProgressInterface& progress)
 {
     OutputFolder out;
     if (KpResult opened = out.open(target); opened.isBad())
         return opened;
     const ProgressScope scope(&progress);
     const JobLog log(out.working());
-    progress.startWorking(8, "");
+    progress.startWorking(9, "");
     Road road(progress);
     Series series;
     HxParamBundle root("Volume");
@@ -159,12 +161,18 @@ KpResult runRoad(const char* folder, const std::string& uid, const std::string& 
         maximum = reducedByMaximum(volume, {4, 4, 4}, progress);
         return KpResult();
     });
+    std::optional<Space> space;
+    Region region;
+    road.nested("segment", [&] {
+        space.emplace(series.frameUid(), volume);
+        return segment(volume, *space, threshold, progress, region);
+    });
     road.plain("draw planes", [&] {
         window = chooseWindow(root, mean);
         display(volume, window, shown);
-        return writePlanes(shown, out);
+        return writePlanes(shown, region.outline, out);
     });
-    road.plain("cut obliquely", [&] { return writeOblique(shown, Space(series.frameUid(), volume), out); });
+    road.plain("cut obliquely", [&] { return writeOblique(shown, *space, region.outline, out); });
     road.plain("draw overviews", [&] {
         display(mean, window, shown);
         KpResult written = writeOverview(shown, out, "overview-mean.png");
@@ -174,7 +182,7 @@ KpResult runRoad(const char* folder, const std::string& uid, const std::string& 
     });
     road.plain("write texts", [&] {
         KpResult written = writeHeader(root, out);
-        written << writeReport(root, series, volume, window, road.stages(), out);
+        written << writeReport(root, series, volume, window, region, road.stages(), out);
         return written;
     });
     KpResult result = road.result();

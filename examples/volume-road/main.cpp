@@ -16,6 +16,7 @@
 #include <dcmtk/oflog/oflog.h>
 
 #include <cstdio>
+#include <optional>
 #include <string>
 
 namespace {
@@ -66,6 +67,7 @@ int run(int argc, char** argv)
 {
     std::string nifti, series, target, uid, file;
     bool isPhantom = false;
+    std::optional<double> threshold;
     CLI::App app("Takes a volume down the road: DICOM files, header tree, voxels, reduced volumes, pictures.",
                  "volume-road");
     app.require_subcommand(1);
@@ -81,6 +83,8 @@ int run(int argc, char** argv)
     road.add_option("SERIES", series, "folder with the images, in any order")->required();
     road.add_option("OUT", target, "folder to write into")->required();
     road.add_option("--series", uid, "series instance UID, where the folder holds several");
+    road.add_option("--threshold", threshold,
+                    "value from which on voxels belong to the object; by Otsu's method, if not given");
 
     CLI::App& header = *app.add_subcommand("header", "print the header of one DICOM file as a tree");
     header.add_option("FILE", file)->required();
@@ -98,7 +102,8 @@ int run(int argc, char** argv)
     KpProgressInterface progress;
     TerminalProgress terminal;
     progress.setProgressGui(&terminal);
-    return report(make ? makeSeries(nifti, target, progress) : runRoad(series.c_str(), uid, target, progress));
+    return report(make ? makeSeries(nifti, target, progress)
+                       : runRoad(series.c_str(), uid, threshold, target, progress));
 }
 
 }  // namespace
