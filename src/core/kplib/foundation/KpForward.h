@@ -86,6 +86,7 @@ class KpTypedElement;
 struct KpTypedPointer;
 
 class KpBitfield;
+class KpMorphology;
 class KpNeighborIterator33;
 class KpScanConvert;
 

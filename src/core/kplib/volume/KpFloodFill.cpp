@@ -1,0 +1,261 @@
+#include <kplib/log/KpLogFile.h>
+#include <kplib/volume/KpMorphology.h>
+
+#include <algorithm>
+#include <bit>
+#include <cstdint>
+#include <cstring>
+
+namespace {
+
+using Word = std::uint64_t;
+constexpr long step = 56;  // bits that eight bytes from any byte on hold for certain
+
+constexpr Word lowBits(long n)
+{
+    return (Word{1} << n) - 1;
+}
+
+/// Part of a row from where to look for what is to be filled. The size matters: there may be many.
+struct SF3D_Segment {
+    std::int16_t z, y, xLeft, xRight;
+};
+static_assert(sizeof(SF3D_Segment) == 8);
+
+struct Box {
+    int min[3], max[3];
+
+    void extend(const Box& other)
+    {
+        for (int axis = 0; axis < 3; ++axis) {
+            min[axis] = std::min(min[axis], other.min[axis]);
+            max[axis] = std::max(max[axis], other.max[axis]);
+        }
+    }
+};
+
+/// Fields of at least 64 bits, at any position of which `step` bits may be looked at; those behind the end vary.
+class Ground {
+public:
+    Ground(const KpBitfield& src, KpBitfield& dst, bool value) :
+        src_(reinterpret_cast<const char*>(src.data())), dst_(reinterpret_cast<char*>(dst.data())),
+        lastLoad_(static_cast<long>(src.nWords()) * 4 - 8), flip_(value ? 0 : ~Word{0})
+    {
+    }
+
+    /// Ones where the value is.
+    Word ground(long pos) const { return load(src_, pos) ^ flip_; }
+    Word visited(long pos) const { return load(dst_, pos); }
+    bool isGround(long pos) const { return (ground(pos) & 1) != 0; }
+    bool isVisited(long pos) const { return (visited(pos) & 1) != 0; }
+
+    /// Whether some voxel in [pos, end) is still to be filled.
+    bool isOpen(long pos, long end) const
+    {
+        for (; end - pos > step; pos += step) {
+            if ((ground(pos) & ~visited(pos) & lowBits(step)) != 0)
+                return true;
+        }
+        return (ground(pos) & ~visited(pos) & lowBits(end - pos)) != 0;
+    }
+
+    // The first position in [pos, end) of its kind, or `end`.
+
+    long firstGround(long pos, long end) const
+    {
+        return first(pos, end, [this](long at) { return ground(at); });
+    }
+    long firstOff(long pos, long end) const
+    {
+        return first(pos, end, [this](long at) { return ~ground(at); });
+    }
+    long firstUnvisited(long pos, long end) const
+    {
+        return first(pos, end, [this](long at) { return ~visited(at); });
+    }
+
+    /// Where the run begins that `pos` is in, at `row` at the earliest.
+    long runStart(long pos, long row) const
+    {
+        while (pos > row) {
+            const long n = std::min(step, pos - row), ones = std::countl_one(ground(pos - n) << (64 - n));
+            pos -= std::min(ones, n);
+            if (ones < n)
+                break;
+        }
+        return pos;
+    }
+
+    void visit(long pos, long end)
+    {
+        for (; pos < end; pos += step) {
+            const long start = std::min(pos >> 3, lastLoad_);
+            Word word;
+            std::memcpy(&word, dst_ + start, sizeof word);
+            word |= lowBits(std::min(step, end - pos)) << (pos - start * 8);
+            std::memcpy(dst_ + start, &word, sizeof word);
+        }
+    }
+
+private:
+    Word load(const char* field, long pos) const
+    {
+        const long start = std::min(pos >> 3, lastLoad_);
+        Word word;
+        std::memcpy(&word, field + start, sizeof word);
+        return word >> (pos - start * 8);
+    }
+
+    template <typename Bits>
+    static long first(long pos, long end, Bits bits)
+    {
+        for (; pos < end; pos += step) {
+            if (const Word found = bits(pos) & lowBits(step))
+                return std::min(end, pos + std::countr_zero(found));
+        }
+        return end;
+    }
+
+    const char* src_;
+    char* dst_;
+    long lastLoad_;
+    Word flip_;
+};
+
+class FloodFill {
+public:
+    FloodFill(const Ground& ground, const int* dims) : ground_(ground), nx_(dims[0]), ny_(dims[1]), nz_(dims[2]) {}
+
+    unsigned long fill(const KpVec3i& seed)
+    {
+        const int x = seed[0], y = seed[1], z = seed[2];
+        box_ = {{x, y, z}, {x, y, z}};
+        count_ = 0;
+        if (x < 0 || y < 0 || z < 0 || x >= nx_ || y >= ny_ || z >= nz_ || !ground_.isGround(row(y, z) + x))
+            return 0;
+        pushAround(z, y, x, x);
+        push(z, y, x, x);
+        while (!stack_.size() == 0) {
+            const SF3D_Segment segment = stack_[stack_.size() - 1];
+            stack_.resize(stack_.size() - 1);
+            walk(segment);
+        }
+        return count_;
+    }
+    const Box& box() const { return box_; }
+
+private:
+    long row(long y, long z) const { return (z * ny_ + y) * nx_; }
+
+    /// A segment in which nothing is open has no effect, not later either.
+    void push(int z, int y, int xLeft, int xRight)
+    {
+        const long start = row(y, z);
+        if (ground_.isOpen(start + xLeft, start + xRight + 1))
+            stack_.append({static_cast<std::int16_t>(z), static_cast<std::int16_t>(y), static_cast<std::int16_t>(xLeft),
+                           static_cast<std::int16_t>(xRight)});
+    }
+
+    void pushAround(int z, int y, int xLeft, int xRight)
+    {
+        if (z > 0)
+            push(z - 1, y, xLeft, xRight);
+        if (z < nz_ - 1)
+            push(z + 1, y, xLeft, xRight);
+        if (y > 0)
+            push(z, y - 1, xLeft, xRight);
+        if (y < ny_ - 1)
+            push(z, y + 1, xLeft, xRight);
+    }
+
+    /// Fills the runs that begin in the segment, the first one to both sides. Where runs are partly visited already,
+    /// what is filled depends on these very steps: only the first looks to its left, and visited ground at the end of
+    /// the segment ends it.
+    void walk(const SF3D_Segment& segment)
+    {
+        const long start = row(segment.y, segment.z), last = start + segment.xRight;
+        long pos = start + segment.xLeft;
+        for (bool isFirst = true; pos <= last; isFirst = false) {
+            if (ground_.isGround(pos) && ground_.isVisited(pos))
+                pos = ground_.firstUnvisited(pos, last);
+            if (!ground_.isGround(pos)) {
+                ++pos;
+            } else if (ground_.isVisited(pos)) {
+                return;
+            } else {
+                const long from = isFirst ? ground_.runStart(pos, start) : pos;
+                const long end = ground_.firstOff(pos, start + nx_);
+                ground_.visit(from, end);
+                found(segment.z, segment.y, static_cast<int>(from - start), static_cast<int>(end - 1 - start));
+                pos = end + 1;
+            }
+            pos = ground_.firstGround(pos, last + 1);
+        }
+    }
+
+    void found(int z, int y, int xLeft, int xRight)
+    {
+        count_ += static_cast<unsigned long>(xRight - xLeft + 1);
+        box_.extend({{xLeft, y, z}, {xRight, y, z}});
+        pushAround(z, y, xLeft, xRight);
+    }
+
+    Ground ground_;
+    int nx_, ny_, nz_;
+    KpDArray<SF3D_Segment> stack_;
+    unsigned long count_ = 0;  // of one seed
+    Box box_{};
+};
+
+unsigned long fillAll(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpVec3i>& seeds, bool value,
+                      const int* dims, Box& box)
+{
+    FloodFill floodFill(Ground(src, dst, value), dims);
+    unsigned long count = 0;
+    for (const KpVec3i& seed : seeds) {
+        count += floodFill.fill(seed);
+        if (&seed == seeds.begin())
+            box = floodFill.box();
+        else
+            box.extend(floodFill.box());
+    }
+    return count;
+}
+
+/// The fields at a size that the fill can work on.
+unsigned long fillFew(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpVec3i>& seeds, bool value,
+                      const int* dims, Box& box)
+{
+    KpBitfield wideSrc(src), wideDst(dst);
+    wideSrc.resize(64, KpBitfield::INIT_UNSET);
+    wideDst.resize(64, KpBitfield::INIT_UNSET);
+    const unsigned long count = fillAll(wideSrc, wideDst, seeds, value, dims, box);
+    wideDst.resize(dst.nBits(), KpBitfield::INIT_UNSET);
+    dst.swap(wideDst);
+    return count;
+}
+
+}  // namespace
+
+unsigned long KpMorphology::floodfill(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpVec3i>& seeds,
+                                      bool value, const int* dims, int* box)
+{
+    if (src.nBits() != static_cast<unsigned long>(1L * dims[0] * dims[1] * dims[2]))
+        return 0;
+    if (*std::max_element(dims, dims + 3) > INT16_MAX) {
+        getTheLogInstance().errorf("KpMorphology::floodfill(), volume of %d x %d x %d is too large\n", dims[0], dims[1],
+                                   dims[2]);
+        return 0;
+    }
+    if (dst.nBits() != src.nBits())
+        dst.resize(src.nBits(), KpBitfield::INIT_UNSET);
+    if (seeds.size() == 0)
+        return 0;
+    Box all{};
+    const unsigned long count = (src.nWords() == 1 ? fillFew : fillAll)(src, dst, seeds, value, dims, all);
+    for (int axis = 0; box && axis < 3; ++axis) {
+        box[2 * axis] = all.min[axis];
+        box[2 * axis + 1] = all.max[axis];
+    }
+    return count;
+}
