@@ -34,9 +34,9 @@ struct Layout {
     }
     /// The masks of the ends of rows repeat themselves.
     static constexpr long maskPeriod(long nx) { return std::lcm(nx, wordBits * block) / wordBits; }
-    constexpr long size(long passes) const { return pad + (fixedSlices + 2 * passes) * (words + pad) + 2 * maskWords; }
+    constexpr long size(long passes) const { return pad + (fixedSlices + 3 * passes) * (words + pad) + 2 * maskWords; }
     constexpr long slice(long i) const { return pad + i * (words + pad); }
-    constexpr long masks(long passes) const { return slice(fixedSlices + 2 * passes); }
+    constexpr long masks(long passes) const { return slice(fixedSlices + 3 * passes); }
 
     static constexpr long fixedSlices = 3;  // two of input by turns, one between the steps along x and y
 
@@ -81,6 +81,65 @@ KPLIB_KERNEL_BODY Word shiftedDown(Word low, Word high, long by)
     return low >> by | high << 1 << (63 - by);
 }
 
+/// The voxels and their neighbours along y.
+KPLIB_KERNEL_BODY Word alongY(const Word* bits, long words, long by)
+{
+    return shiftedUp(bits[-words - 1], bits[-words], by) | shiftedDown(bits[words], bits[words + 1], by);
+}
+
+// Loops. `n` is a number of whole blocks if it is that of a slice.
+
+KPLIB_KERNEL_BODY void realign(Word* __restrict to, const Loose<Word>* __restrict from, long n, long by, Word flip)
+{
+    for (long i = 0; i < n; ++i)
+        to[i] = shiftedDown(from[i], from[i + 1], by) ^ flip;
+}
+
+KPLIB_KERNEL_BODY void unalign(Loose<Word>* __restrict to, const Word* __restrict from, long n, long by, Word flip)
+{
+    for (long i = 1; i < n; ++i)
+        to[i].value = shiftedUp(from[i - 1], from[i], by) ^ flip;
+}
+
+/// The voxels and their neighbours along x.
+KPLIB_KERNEL_BODY void alongX(Word* __restrict to, const Word* __restrict bits, const Word* __restrict notFirst,
+                              const Word* __restrict notLast, long n)
+{
+    n &= -block;
+    for (long i = 0; i < n; ++i)
+        to[i] = bits[i] | (shiftedUp(bits[i - 1], bits[i], 1) & notFirst[i]) |
+                (shiftedDown(bits[i], bits[i + 1], 1) & notLast[i]);
+}
+
+/// Completes the slice before `in`, and takes up what `in` contributes: `near` and `farBefore` are those of the slice
+/// before, `far` that of the one before it and then that of `in`.
+template <MorphologyReach reach>
+struct Combine {
+    KPLIB_KERNEL_BODY static void run(Word* __restrict out, Word* __restrict near, Word* __restrict far,
+                                      const Word* __restrict farBefore, const Word* __restrict in,
+                                      const Word* __restrict wide, long n, long nx)
+    {
+        const long rowWords = nx / wordBits, by = nx % wordBits;
+        n &= -block;
+        for (long i = 0; i < n; ++i) {
+            if constexpr (reach == MorphologyReach::Corners) {
+                const Word reached = wide[i] | alongY(wide + i, rowWords, by);
+                out[i] = far[i] | farBefore[i] | reached;
+                far[i] = reached;
+            } else if constexpr (reach == MorphologyReach::Edges) {
+                const Word reached = wide[i] | alongY(in + i, rowWords, by);
+                out[i] = far[i] | near[i] | reached;
+                near[i] = wide[i] | alongY(wide + i, rowWords, by);
+                far[i] = reached;
+            } else {
+                out[i] = far[i] | near[i] | in[i];
+                near[i] = wide[i] | alongY(in + i, rowWords, by);
+                far[i] = in[i];
+            }
+        }
+    }
+};
+
 struct Passes {
     const MorphologyJob& job;
     const Layout layout{job};
@@ -90,8 +149,8 @@ struct Passes {
     KPLIB_KERNEL_BODY Word* slice(long i) const { return area + layout.slice(i); }
     KPLIB_KERNEL_BODY Word* input(long stage) const { return slice(stage % 2); }
     KPLIB_KERNEL_BODY Word* between() const { return slice(2); }
-    KPLIB_KERNEL_BODY Word* pending(long stage) const { return slice(3 + 2 * stage); }
-    KPLIB_KERNEL_BODY Word* farBefore(long stage) const { return slice(4 + 2 * stage); }
+    KPLIB_KERNEL_BODY Word* near(long stage) const { return slice(3 + 3 * stage); }
+    KPLIB_KERNEL_BODY Word* far(long stage, long z) const { return slice(4 + 3 * stage + z % 2); }
 
     KPLIB_KERNEL_BODY void clear() const
     {
@@ -117,81 +176,42 @@ struct Passes {
             bits[i] = 0;
     }
 
-    KPLIB_KERNEL_BODY void load(long z, Word* __restrict to) const
+    KPLIB_KERNEL_BODY void load(long z, Word* to) const
     {
         const long from = z * layout.sliceBits, by = from % 32;
-        const auto* words = reinterpret_cast<const Loose<Word>*>(job.src + from / 32);
-        const long used = (layout.sliceBits + wordBits - 1) / wordBits, whole = used - 2;  // those lie in the field
-        for (long i = 0; i < whole; ++i)
-            to[i] = shiftedDown(words[i], words[i + 1], by) ^ flip;
-        for (long i = std::max(whole, 0L); i < used; ++i)
+        const long used = (layout.sliceBits + wordBits - 1) / wordBits;
+        const long whole = std::max(used - 2, 0L);  // whose source lies in the field
+        realign(to, reinterpret_cast<const Loose<Word>*>(job.src + from / 32), whole, by, flip);
+        for (long i = whole; i < used; ++i)
             to[i] = bitsAt(job.src, from + i * wordBits, std::min(layout.sliceBits - i * wordBits, wordBits)) ^ flip;
         clearTail(to);
     }
 
     /// Slices share words with the ones beside them.
-    KPLIB_KERNEL_BODY void store(long z, const Word* __restrict bits) const
+    KPLIB_KERNEL_BODY void store(long z, const Word* bits) const
     {
         const long to = z * layout.sliceBits, by = to % 32, base = to - by, end = layout.sliceBits + by;
         putBits(job.dst, to, std::min(wordBits - by, layout.sliceBits), bits[0] ^ flip);
-        auto* __restrict words = reinterpret_cast<Loose<Word>*>(job.dst + base / 32);
         const long whole = end / wordBits;
-        for (long i = 1; i < whole; ++i)
-            words[i].value = shiftedUp(bits[i - 1], bits[i], by) ^ flip;
+        unalign(reinterpret_cast<Loose<Word>*>(job.dst + base / 32), bits, whole, by, flip);
         if (whole > 0)
             putBits(job.dst, base + whole * wordBits, end % wordBits,
                     shiftedUp(bits[whole - 1], bits[whole], by) ^ flip);
     }
 
-    /// The voxel and its neighbours along x.
-    KPLIB_KERNEL_BODY static Word alongX(const Word* bits, Word notFirst, Word notLast)
-    {
-        return bits[0] | (shiftedUp(bits[-1], bits[0], 1) & notFirst) | (shiftedDown(bits[0], bits[1], 1) & notLast);
-    }
-    /// The neighbours along y.
-    KPLIB_KERNEL_BODY static Word alongY(const Word* bits, long words, long by)
-    {
-        return shiftedUp(bits[-words - 1], bits[-words], by) | shiftedDown(bits[words], bits[words + 1], by);
-    }
-
     /// A slice comes to a stage; the one before it is complete then, and goes out.
     template <MorphologyReach reach>
-    KPLIB_KERNEL_BODY void step(long stage) const
+    KPLIB_KERNEL_BODY void step(long stage, long z) const
     {
-        const long rowWords = job.nx / wordBits, rowBits = job.nx % wordBits, n = layout.words;
-        const Word* __restrict in = input(stage);
-        Word* __restrict out = input(stage + 1);
-        Word* __restrict wide = between();
-        Word* __restrict kept = pending(stage);
-        Word* __restrict before = farBefore(stage);
-        const Word* __restrict notFirst = area + layout.masks(job.passes);
-        const Word* __restrict notLast = notFirst + layout.maskWords;
-        for (long start = 0; start < n; start += layout.maskWords)
-            for (long i = start, k = 0; i < std::min(n, start + layout.maskWords); ++i, ++k)
-                wide[i] = alongX(in + i, notFirst[k], notLast[k]);
-        for (long i = 0; i < n; ++i) {
-            Word near, far;
-            if constexpr (reach == MorphologyReach::Faces) {
-                near = wide[i] | alongY(in + i, rowWords, rowBits);
-                far = in[i];
-            } else {
-                near = wide[i] | alongY(wide + i, rowWords, rowBits);
-                far = near;
-                if constexpr (reach == MorphologyReach::Edges)
-                    far = wide[i] | alongY(in + i, rowWords, rowBits);
-            }
-            out[i] = kept[i] | far;
-            kept[i] = near | before[i];
-            before[i] = far;
-        }
-        clearTail(out);
-    }
-
-    /// Behind the last slice nothing comes.
-    KPLIB_KERNEL_BODY void finish(long stage) const
-    {
+        const Word* const in = input(stage);
         Word* const out = input(stage + 1);
-        std::copy_n(pending(stage), layout.words, out);
+        const Word* const notFirst = area + layout.masks(job.passes);
+        const Word* const notLast = notFirst + layout.maskWords;
+        Word* const wide = between();
+        const long n = layout.words;
+        for (long i = 0; i < n; i += layout.maskWords)
+            alongX(wide + i, in + i, notFirst, notLast, std::min(n - i, layout.maskWords));
+        Combine<reach>::run(out, near(stage), far(stage, z), far(stage, z + 1), in, wide, n, job.nx);
         clearTail(out);
     }
 };
@@ -208,10 +228,9 @@ struct AllPasses {
             if (t < nz)
                 passes.load(t, passes.input(0));
             for (long stage = std::max(0L, t - nz); stage < std::min(stages, t + 1); ++stage) {
-                if (t - stage < nz)
-                    passes.step<reach>(stage);
-                else
-                    passes.finish(stage);
+                if (t - stage == nz)  // behind the last slice
+                    std::fill_n(passes.input(stage), passes.layout.words, 0);
+                passes.step<reach>(stage, t - stage);
             }
             if (t >= stages)
                 passes.store(t - stages, passes.input(stages));
