@@ -16,7 +16,8 @@
 namespace kplib::detail {
 namespace {
 
-using Word = std::uint64_t;
+using Word [[gnu::may_alias]] = std::uint64_t;  // fields are of halves of it
+using LooseWord = Loose<std::uint64_t>;
 constexpr long wordBits = 64, block = 8;  // loops go by blocks, the words of a cache line
 constexpr unsigned long cacheBytes = 768UL << 10;
 
@@ -82,20 +83,17 @@ KPLIB_KERNEL_BODY Word shiftedDown(Word low, Word high, long by)
 }
 
 /// The voxels and their neighbours along y.
+template <bool rowsOfWords>
 KPLIB_KERNEL_BODY Word alongY(const Word* bits, long words, long by)
 {
+    if constexpr (rowsOfWords)
+        return bits[-words] | bits[words];
     return shiftedUp(bits[-words - 1], bits[-words], by) | shiftedDown(bits[words], bits[words + 1], by);
 }
 
 // Loops. `n` is a number of whole blocks if it is that of a slice.
 
-KPLIB_KERNEL_BODY void realign(Word* __restrict to, const Loose<Word>* __restrict from, long n, long by, Word flip)
-{
-    for (long i = 0; i < n; ++i)
-        to[i] = shiftedDown(from[i], from[i + 1], by) ^ flip;
-}
-
-KPLIB_KERNEL_BODY void unalign(Loose<Word>* __restrict to, const Word* __restrict from, long n, long by, Word flip)
+KPLIB_KERNEL_BODY void unalign(LooseWord* __restrict to, const Word* __restrict from, long n, long by, Word flip)
 {
     for (long i = 1; i < n; ++i)
         to[i].value = shiftedUp(from[i - 1], from[i], by) ^ flip;
@@ -111,29 +109,42 @@ KPLIB_KERNEL_BODY void alongX(Word* __restrict to, const Word* __restrict bits, 
                 (shiftedDown(bits[i], bits[i + 1], 1) & notLast[i]);
 }
 
+/// Both at once, for words that begin `by` bits, 1 to 62, above the bottom of those of the field.
+KPLIB_KERNEL_BODY void realignAlongX(Word* __restrict to, Word* __restrict wide, const LooseWord* __restrict from,
+                                     const Word* __restrict notFirst, const Word* __restrict notLast, long n, long by,
+                                     Word flip)
+{
+    n &= -block;
+    for (long i = 0; i < n; ++i) {
+        const Word low = from[i] ^ flip, high = from[i + 1] ^ flip, bits = shiftedDown(low, high, by);
+        to[i] = bits;
+        wide[i] = bits | (shiftedDown(low, high, by - 1) & notFirst[i]) | (shiftedDown(low, high, by + 1) & notLast[i]);
+    }
+}
+
 /// Completes the slice before `in`, and takes up what `in` contributes: `near` and `farBefore` are those of the slice
 /// before, `far` that of the one before it and then that of `in`.
-template <MorphologyReach reach>
+template <MorphologyReach reach, bool rowsOfWords>
 struct Combine {
     KPLIB_KERNEL_BODY static void run(Word* __restrict out, Word* __restrict near, Word* __restrict far,
                                       const Word* __restrict farBefore, const Word* __restrict in,
-                                      const Word* __restrict wide, long n, long nx)
+                                      const Word* __restrict wide, long n, long nx, Word flip)
     {
         const long rowWords = nx / wordBits, by = nx % wordBits;
         n &= -block;
         for (long i = 0; i < n; ++i) {
             if constexpr (reach == MorphologyReach::Corners) {
-                const Word reached = wide[i] | alongY(wide + i, rowWords, by);
-                out[i] = far[i] | farBefore[i] | reached;
+                const Word reached = wide[i] | alongY<rowsOfWords>(wide + i, rowWords, by);
+                out[i] = (far[i] | farBefore[i] | reached) ^ flip;
                 far[i] = reached;
             } else if constexpr (reach == MorphologyReach::Edges) {
-                const Word reached = wide[i] | alongY(in + i, rowWords, by);
-                out[i] = far[i] | near[i] | reached;
-                near[i] = wide[i] | alongY(wide + i, rowWords, by);
+                const Word reached = wide[i] | alongY<rowsOfWords>(in + i, rowWords, by);
+                out[i] = (far[i] | near[i] | reached) ^ flip;
+                near[i] = wide[i] | alongY<rowsOfWords>(wide + i, rowWords, by);
                 far[i] = reached;
             } else {
-                out[i] = far[i] | near[i] | in[i];
-                near[i] = wide[i] | alongY(in + i, rowWords, by);
+                out[i] = (far[i] | near[i] | in[i]) ^ flip;
+                near[i] = wide[i] | alongY<rowsOfWords>(in + i, rowWords, by);
                 far[i] = in[i];
             }
         }
@@ -152,17 +163,18 @@ struct Passes {
     KPLIB_KERNEL_BODY Word* near(long stage) const { return slice(3 + 3 * stage); }
     KPLIB_KERNEL_BODY Word* far(long stage, long z) const { return slice(4 + 3 * stage + z % 2); }
 
+    KPLIB_KERNEL_BODY Word* notFirst() const { return area + layout.masks(job.passes); }
+    KPLIB_KERNEL_BODY Word* notLast() const { return notFirst() + layout.maskWords; }
+
     KPLIB_KERNEL_BODY void clear() const
     {
         std::memset(area, 0, static_cast<std::size_t>(layout.masks(job.passes)) * sizeof(Word));
-        Word* const notFirst = area + layout.masks(job.passes);
-        Word* const notLast = notFirst + layout.maskWords;
-        std::fill_n(notFirst, 2 * layout.maskWords, ~Word{0});
+        std::fill_n(notFirst(), 2 * layout.maskWords, ~Word{0});
         for (long first = 0; first < layout.maskWords * wordBits; first += job.nx) {
-            notFirst[first / wordBits] &= ~(Word{1} << first % wordBits);
+            notFirst()[first / wordBits] &= ~(Word{1} << first % wordBits);
             const long last = first + job.nx - 1;
             if (last < layout.maskWords * wordBits)
-                notLast[last / wordBits] &= ~(Word{1} << last % wordBits);
+                notLast()[last / wordBits] &= ~(Word{1} << last % wordBits);
         }
     }
 
@@ -176,24 +188,47 @@ struct Passes {
             bits[i] = 0;
     }
 
+    /// Slice z, and what it reaches along x.
     KPLIB_KERNEL_BODY void load(long z, Word* to) const
     {
-        const long from = z * layout.sliceBits, by = from % 32;
-        const long used = (layout.sliceBits + wordBits - 1) / wordBits;
-        const long whole = std::max(used - 2, 0L);  // whose source lies in the field
-        realign(to, reinterpret_cast<const Loose<Word>*>(job.src + from / 32), whole, by, flip);
+        const long from = z * layout.sliceBits, used = (layout.sliceBits + wordBits - 1) / wordBits;
+        long whole = std::max(used - 2, 0L) & -block;  // whose source lies in the field
+        if (from == 0)
+            whole = 0;
+        const long base = from % 32 == 0 ? from - 32 : from / 32 * 32;
+        const auto* const words = reinterpret_cast<const LooseWord*>(job.src + base / 32);
+        for (long i = 0; i < whole; i += layout.maskWords)
+            realignAlongX(to + i, between() + i, words + i, notFirst(), notLast(),
+                          std::min(whole - i, layout.maskWords), from - base, flip);
         for (long i = whole; i < used; ++i)
             to[i] = bitsAt(job.src, from + i * wordBits, std::min(layout.sliceBits - i * wordBits, wordBits)) ^ flip;
         clearTail(to);
+        widen(to, whole);
     }
 
+    /// What a slice reaches along x, from a word on.
+    KPLIB_KERNEL_BODY void widen(const Word* bits, long start) const
+    {
+        while (start < layout.words) {
+            const long k = start % layout.maskWords, n = std::min(layout.words - start, layout.maskWords - k);
+            alongX(between() + start, bits + start, notFirst() + k, notLast() + k, n);
+            start += n;
+        }
+    }
+
+    /// Whether slices can be written in place.
+    KPLIB_KERNEL_BODY bool isInBlocks() const { return layout.sliceBits == layout.words * wordBits; }
+    KPLIB_KERNEL_BODY Word* target(long z) const
+    {
+        return reinterpret_cast<Word*>(job.dst + z * layout.sliceBits / 32);
+    }
     /// Slices share words with the ones beside them.
     KPLIB_KERNEL_BODY void store(long z, const Word* bits) const
     {
         const long to = z * layout.sliceBits, by = to % 32, base = to - by, end = layout.sliceBits + by;
         putBits(job.dst, to, std::min(wordBits - by, layout.sliceBits), bits[0] ^ flip);
         const long whole = end / wordBits;
-        unalign(reinterpret_cast<Loose<Word>*>(job.dst + base / 32), bits, whole, by, flip);
+        unalign(reinterpret_cast<LooseWord*>(job.dst + base / 32), bits, whole, by, flip);
         if (whole > 0)
             putBits(job.dst, base + whole * wordBits, end % wordBits,
                     shiftedUp(bits[whole - 1], bits[whole], by) ^ flip);
@@ -201,18 +236,14 @@ struct Passes {
 
     /// A slice comes to a stage; the one before it is complete then, and goes out.
     template <MorphologyReach reach>
-    KPLIB_KERNEL_BODY void step(long stage, long z) const
+    KPLIB_KERNEL_BODY void step(long stage, long z, Word* out, Word flipOut) const
     {
-        const Word* const in = input(stage);
-        Word* const out = input(stage + 1);
-        const Word* const notFirst = area + layout.masks(job.passes);
-        const Word* const notLast = notFirst + layout.maskWords;
-        Word* const wide = between();
-        const long n = layout.words;
-        for (long i = 0; i < n; i += layout.maskWords)
-            alongX(wide + i, in + i, notFirst, notLast, std::min(n - i, layout.maskWords));
-        Combine<reach>::run(out, near(stage), far(stage, z), far(stage, z + 1), in, wide, n, job.nx);
-        clearTail(out);
+        if (job.nx % wordBits == 0)
+            Combine<reach, true>::run(out, near(stage), far(stage, z), far(stage, z + 1), input(stage), between(),
+                                      layout.words, job.nx, flipOut);
+        else
+            Combine<reach, false>::run(out, near(stage), far(stage, z), far(stage, z + 1), input(stage), between(),
+                                       layout.words, job.nx, flipOut);
     }
 };
 
@@ -222,19 +253,32 @@ struct AllPasses {
     KPLIB_KERNEL_BODY static void run(const MorphologyJob* job, Word* area)
     {
         const Passes passes{.job = *job, .area = area};
-        const long stages = job->passes, nz = job->nz;
+        const long nz = job->nz;
         passes.clear();
-        for (long t = 0; t < nz + stages; ++t) {
+        for (long t = 0; t < nz + job->passes; ++t) {
             if (t < nz)
                 passes.load(t, passes.input(0));
-            for (long stage = std::max(0L, t - nz); stage < std::min(stages, t + 1); ++stage) {
-                if (t - stage == nz)  // behind the last slice
-                    std::fill_n(passes.input(stage), passes.layout.words, 0);
-                passes.step<reach>(stage, t - stage);
-            }
-            if (t >= stages)
-                passes.store(t - stages, passes.input(stages));
+            for (long stage = std::max(0L, t - nz); stage < std::min(job->passes, t + 1); ++stage)
+                toStage(passes, stage, t - stage);
         }
+    }
+
+    KPLIB_KERNEL_BODY static void toStage(const Passes& passes, long stage, long z)
+    {
+        const bool isLast = stage == passes.job.passes - 1;
+        if (z == passes.job.nz)  // behind the last slice
+            std::fill_n(passes.input(stage), passes.layout.words, 0);
+        if (stage > 0 || z == passes.job.nz)
+            passes.widen(passes.input(stage), 0);
+        if (isLast && z > 0 && passes.isInBlocks()) {
+            passes.template step<reach>(stage, z, passes.target(z - 1), passes.flip);
+            return;
+        }
+        Word* const out = passes.input(stage + 1);
+        passes.template step<reach>(stage, z, out, 0);
+        passes.clearTail(out);
+        if (isLast && z > 0)
+            passes.store(z - 1, out);
     }
 };
 
