@@ -61,15 +61,15 @@ void operation(benchmark::State& state, const KpVec3i& dims, Operation* run, dou
     report(state, bytes(dims) * 8, bytes(dims), "packed/" + nameOf(dims), limit);
 }
 
-void path(benchmark::State& state, const KernelPath<MorphologyLoops>& path, const MorphologyReach reach)
+void path(benchmark::State& state, const KernelPath<MorphologyLoop>& path, const MorphologyReach reach)
 {
     const KpVec3i dims = sizes[1];
     const KpBitfield src = noise(dims);
     KpBitfield dst(src);
-    const MorphologyJob job{src.data(), dst.data(), dims[0], dims[1], dims[2], 1, false};
+    const MorphologyJob job{src.data(), dst.data(), dims[0], dims[1], dims[2], 1, reach, false};
     std::vector<char> area(morphologyAreaBytes(job));
     for (auto _ : state)
-        path.run(reach)(job, area.data());
+        path.run(job, area.data());
     report(state, bytes(dims) * 8, bytes(dims), "packed/" + nameOf(dims));
 }
 

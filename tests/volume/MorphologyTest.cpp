@@ -118,9 +118,10 @@ TEST(Morphology, everyPathEqualsTheReferenceAndStaysInItsField)
                         Field once(src), twice(src), result(src.nBits(), Field::INIT_UNSET);
                         morphologyByVoxel(src, once, dims, MorphologyReach{reach}, erodes);
                         morphologyByVoxel(once, twice, dims, MorphologyReach{reach}, erodes);
-                        const MorphologyJob job{src.data(), result.data(), dims[0], dims[1], dims[2], 2, erodes};
+                        const MorphologyJob job{src.data(), result.data(),          dims[0], dims[1], dims[2],
+                                                2,          MorphologyReach{reach}, erodes};
                         std::vector<char> area(morphologyAreaBytes(job));
-                        path.run(MorphologyReach{reach})(job, area.data());
+                        path.run(job, area.data());
                         EXPECT_TRUE(result == twice) << path.name << ' ' << dims[0] << ' ' << reach << erodes;
                         const unsigned long spare = src.nBits() % 32;
                         EXPECT_EQ(result.data()[src.nBits() / 32] >> spare, 0U) << "bits behind the last voxel";
@@ -132,7 +133,7 @@ TEST(Morphology, onceMoreThroughMemoryWhenThePassesAreMany)
     std::mt19937 random(54);
     Volume volume = noise({700, 200, 2}, 0.0001, random);
     const Field src = volume.field();
-    MorphologyJob job{nullptr, nullptr, 700, 200, 2, 50, false};
+    MorphologyJob job{nullptr, nullptr, 700, 200, 2, 50, MorphologyReach::Faces, false};
     ASSERT_LT(morphologyPassesAtOnce(job), 50) << "not a case of this test";
     Field expected(src), next;
     for (int i = 0; i < 50; ++i) {

@@ -43,15 +43,15 @@ void byVoxel(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long p
 /// False, and nothing is done, if there is no memory for the work area.
 bool byWords(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long passes, const Operation& operation)
 {
-    MorphologyJob job{src.data(), dst.data(), dims[0], dims[1], dims[2], passes, operation.erodes};
+    MorphologyJob job{src.data(), dst.data(), dims[0], dims[1], dims[2], passes, operation.reach, operation.erodes};
     job.passes = morphologyPassesAtOnce(job);
     const std::unique_ptr<void, Free> area(std::malloc(morphologyAreaBytes(job)));
     if (!area)
         return false;
-    static MorphologyLoops* const loops = best(morphologyPaths());
+    static MorphologyLoop* const run = best(morphologyPaths());
     for (long left = passes; left > 0; left -= job.passes, job.src = job.dst) {
         job.passes = std::min(job.passes, left);
-        loops(operation.reach)(job, area.get());
+        run(job, area.get());
     }
     return true;
 }
@@ -65,8 +65,8 @@ bool prepare(KpBitfield& dst, unsigned long nBits)
 }
 
 /// `alignedNeedsArea`: also for rows that begin at words.
-void run(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long passes, const Operation& operation,
-         bool alignedNeedsArea)
+void morph(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long passes, const Operation& operation,
+           bool alignedNeedsArea)
 {
     // After so many passes one voxel has reached all others.
     passes = std::min(passes, 1L * dims[0] + dims[1] + dims[2]);
@@ -86,14 +86,14 @@ void in3D(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long pass
     if (passes < 1)
         dst = src;
     else
-        run(src, dst, dims, passes, operation, operation.reach != MorphologyReach::Faces);
+        morph(src, dst, dims, passes, operation, operation.reach != MorphologyReach::Faces);
 }
 
 void in2D(const KpBitfield& src, KpBitfield& dst, const KpVec2i& dims, const Operation& operation)
 {
     const KpVec3i slice(dims[0], dims[1], 1);
     if (prepare(dst, voxels(slice)))
-        run(src, dst, slice, 1, operation, false);
+        morph(src, dst, slice, 1, operation, false);
 }
 
 }  // namespace

@@ -20,31 +20,59 @@ using Word [[gnu::may_alias]] = std::uint64_t;  // fields are of halves of it
 using LooseWord = Loose<std::uint64_t>;
 constexpr long wordBits = 64, block = 8;  // loops go by blocks, the words of a cache line
 constexpr unsigned long cacheBytes = 768UL << 10;
+constexpr long maxStages = 32, maxStep = 8;
 
 constexpr long roundedUp(long n, long to)
 {
     return (n + to - 1) / to * to;
 }
 
-/// Where things lie in the work area, in words. Each slice has zeros before and behind, for shifts by a row.
+/// Does `step` passes at once: slices that step before and behind, too, contribute.
+struct Stage {
+    long step;
+    long delay;   // slices that have come to the first stage before one comes to this
+    long slices;  // where its own begin, counted in slices: that for what is near, then 2 * step for what is far
+    long masks;   // the first of its two
+};
+
+/// The stages, and where things lie in the work area, in words. Each slice has zeros before and behind, for shifts by
+/// rows. Several passes with all 26 neighbours are a box: from a box of radius r one step of r + 1 makes that of 2r +
+/// 1, and where the volume cuts it off nothing is missing, as the ways to each voxel lead through the ones between.
 struct Layout {
     explicit constexpr Layout(const MorphologyJob& job) :
         sliceBits(job.nx * job.ny), words(roundedUp(sliceBits, wordBits * block) / wordBits),
-        pad(roundedUp(job.nx / wordBits + 2, block)), maskWords(std::min(words, roundedUp(64, maskPeriod(job.nx))))
+        maskWords(std::min(words, roundedUp(64, maskPeriod(job.nx))))
     {
+        const bool isBox = job.reach == MorphologyReach::Corners;
+        long done = 0, slices = fixedSlices;
+        for (; count < maxStages && done < job.passes; ++count) {
+            const long step = isBox ? std::min({done + 1, job.passes - done, maxStep}) : 1;
+            stages[count] = {step, done, slices, 2 * count * maskWords};
+            slices += 1 + 2 * step;
+            done += step;
+            pad = std::max(pad, roundedUp(step * job.nx / wordBits + 2, block));
+        }
+        passes = done;
+        masks = pad + slices * (words + pad);
     }
     /// The masks of the ends of rows repeat themselves.
     static constexpr long maskPeriod(long nx) { return std::lcm(nx, wordBits * block) / wordBits; }
-    constexpr long size(long passes) const { return pad + (fixedSlices + 3 * passes) * (words + pad) + 2 * maskWords; }
     constexpr long slice(long i) const { return pad + i * (words + pad); }
-    constexpr long masks(long passes) const { return slice(fixedSlices + 3 * passes); }
+    constexpr unsigned long bytes() const
+    {
+        return static_cast<unsigned long>(masks + 2 * count * maskWords + block) * sizeof(Word);
+    }
 
     static constexpr long fixedSlices = 3;  // two of input by turns, one between the steps along x and y
 
     long sliceBits;
     long words;
-    long pad;
     long maskWords;
+    long pad = 0;
+    Stage stages[maxStages]{};
+    long count = 0;
+    long passes = 0;  // in all
+    long masks = 0;
 };
 
 // What follows is compiled for each kind of processor.
@@ -82,7 +110,7 @@ KPLIB_KERNEL_BODY Word shiftedDown(Word low, Word high, long by)
     return low >> by | high << 1 << (63 - by);
 }
 
-/// The voxels and their neighbours along y.
+/// The voxels so many rows of bits before and behind along y.
 template <bool rowsOfWords>
 KPLIB_KERNEL_BODY Word alongY(const Word* bits, long words, long by)
 {
@@ -99,14 +127,14 @@ KPLIB_KERNEL_BODY void unalign(LooseWord* __restrict to, const Word* __restrict 
         to[i].value = shiftedUp(from[i - 1], from[i], by) ^ flip;
 }
 
-/// The voxels and their neighbours along x.
+/// The voxels and those `step` beside them along x.
 KPLIB_KERNEL_BODY void alongX(Word* __restrict to, const Word* __restrict bits, const Word* __restrict notFirst,
-                              const Word* __restrict notLast, long n)
+                              const Word* __restrict notLast, long n, long step)
 {
     n &= -block;
     for (long i = 0; i < n; ++i)
-        to[i] = bits[i] | (shiftedUp(bits[i - 1], bits[i], 1) & notFirst[i]) |
-                (shiftedDown(bits[i], bits[i + 1], 1) & notLast[i]);
+        to[i] = bits[i] | (shiftedUp(bits[i - 1], bits[i], step) & notFirst[i]) |
+                (shiftedDown(bits[i], bits[i + 1], step) & notLast[i]);
 }
 
 /// Both at once, for words that begin `by` bits, 1 to 62, above the bottom of those of the field.
@@ -128,9 +156,9 @@ template <MorphologyReach reach, bool rowsOfWords>
 struct Combine {
     KPLIB_KERNEL_BODY static void run(Word* __restrict out, Word* __restrict near, Word* __restrict far,
                                       const Word* __restrict farBefore, const Word* __restrict in,
-                                      const Word* __restrict wide, long n, long nx, Word flip)
+                                      const Word* __restrict wide, long n, long rowBits, Word flip)
     {
-        const long rowWords = nx / wordBits, by = nx % wordBits;
+        const long rowWords = rowBits / wordBits, by = rowBits % wordBits;
         n &= -block;
         for (long i = 0; i < n; ++i) {
             if constexpr (reach == MorphologyReach::Corners) {
@@ -160,22 +188,35 @@ struct Passes {
     KPLIB_KERNEL_BODY Word* slice(long i) const { return area + layout.slice(i); }
     KPLIB_KERNEL_BODY Word* input(long stage) const { return slice(stage % 2); }
     KPLIB_KERNEL_BODY Word* between() const { return slice(2); }
-    KPLIB_KERNEL_BODY Word* near(long stage) const { return slice(3 + 3 * stage); }
-    KPLIB_KERNEL_BODY Word* far(long stage, long z) const { return slice(4 + 3 * stage + z % 2); }
-
-    KPLIB_KERNEL_BODY Word* notFirst() const { return area + layout.masks(job.passes); }
-    KPLIB_KERNEL_BODY Word* notLast() const { return notFirst() + layout.maskWords; }
+    KPLIB_KERNEL_BODY Word* near(const Stage& stage) const { return slice(stage.slices); }
+    KPLIB_KERNEL_BODY Word* far(const Stage& stage, long z) const
+    {
+        return slice(stage.slices + 1 + z % (2 * stage.step));
+    }
+    KPLIB_KERNEL_BODY Word* notFirst(const Stage& stage) const { return area + layout.masks + stage.masks; }
+    KPLIB_KERNEL_BODY Word* notLast(const Stage& stage) const { return notFirst(stage) + layout.maskWords; }
 
     KPLIB_KERNEL_BODY void clear() const
     {
-        std::memset(area, 0, static_cast<std::size_t>(layout.masks(job.passes)) * sizeof(Word));
-        std::fill_n(notFirst(), 2 * layout.maskWords, ~Word{0});
-        for (long first = 0; first < layout.maskWords * wordBits; first += job.nx) {
-            notFirst()[first / wordBits] &= ~(Word{1} << first % wordBits);
-            const long last = first + job.nx - 1;
-            if (last < layout.maskWords * wordBits)
-                notLast()[last / wordBits] &= ~(Word{1} << last % wordBits);
-        }
+        std::memset(area, 0, static_cast<std::size_t>(layout.masks) * sizeof(Word));
+        for (long i = 0; i < layout.count; ++i)
+            makeMasks(layout.stages[i]);
+    }
+    /// Of the voxels with one `step` before, or behind, them in their row.
+    KPLIB_KERNEL_BODY void makeMasks(const Stage& stage) const
+    {
+        const long bits = layout.maskWords * wordBits;
+        std::fill_n(notFirst(stage), 2 * layout.maskWords, ~Word{0});
+        for (long first = 0; first < bits; first += job.nx)
+            for (long i = 0; i < std::min(stage.step, job.nx); ++i) {
+                unset(notFirst(stage), first + i, bits);
+                unset(notLast(stage), first + job.nx - 1 - i, bits);
+            }
+    }
+    KPLIB_KERNEL_BODY static void unset(Word* mask, long i, long bits)
+    {
+        if (i < bits)
+            mask[i / wordBits] &= ~(Word{1} << i % wordBits);
     }
 
     /// Zeros behind the last voxel.
@@ -198,20 +239,20 @@ struct Passes {
         const long base = from % 32 == 0 ? from - 32 : from / 32 * 32;
         const auto* const words = reinterpret_cast<const LooseWord*>(job.src + base / 32);
         for (long i = 0; i < whole; i += layout.maskWords)
-            realignAlongX(to + i, between() + i, words + i, notFirst(), notLast(),
+            realignAlongX(to + i, between() + i, words + i, notFirst(layout.stages[0]), notLast(layout.stages[0]),
                           std::min(whole - i, layout.maskWords), from - base, flip);
         for (long i = whole; i < used; ++i)
             to[i] = bitsAt(job.src, from + i * wordBits, std::min(layout.sliceBits - i * wordBits, wordBits)) ^ flip;
         clearTail(to);
-        widen(to, whole);
+        widen(layout.stages[0], to, whole);
     }
 
     /// What a slice reaches along x, from a word on.
-    KPLIB_KERNEL_BODY void widen(const Word* bits, long start) const
+    KPLIB_KERNEL_BODY void widen(const Stage& stage, const Word* bits, long start) const
     {
         while (start < layout.words) {
             const long k = start % layout.maskWords, n = std::min(layout.words - start, layout.maskWords - k);
-            alongX(between() + start, bits + start, notFirst() + k, notLast() + k, n);
+            alongX(between() + start, bits + start, notFirst(stage) + k, notLast(stage) + k, n, stage.step);
             start += n;
         }
     }
@@ -234,98 +275,96 @@ struct Passes {
                     shiftedUp(bits[whole - 1], bits[whole], by) ^ flip);
     }
 
-    /// A slice comes to a stage; the one before it is complete then, and goes out.
+    /// Slice z comes to a stage; the one `step` before it is complete then, and goes out.
     template <MorphologyReach reach>
-    KPLIB_KERNEL_BODY void step(long stage, long z, Word* out, Word flipOut) const
+    KPLIB_KERNEL_BODY void step(const Stage& stage, const Word* in, long z, Word* out, Word flipOut) const
     {
-        if (job.nx % wordBits == 0)
-            Combine<reach, true>::run(out, near(stage), far(stage, z), far(stage, z + 1), input(stage), between(),
-                                      layout.words, job.nx, flipOut);
+        const long rowBits = stage.step * job.nx;
+        Word *const oldest = far(stage, z), *const middle = far(stage, z + stage.step);
+        if (rowBits % wordBits == 0)
+            Combine<reach, true>::run(out, near(stage), oldest, middle, in, between(), layout.words, rowBits, flipOut);
         else
-            Combine<reach, false>::run(out, near(stage), far(stage, z), far(stage, z + 1), input(stage), between(),
-                                       layout.words, job.nx, flipOut);
+            Combine<reach, false>::run(out, near(stage), oldest, middle, in, between(), layout.words, rowBits, flipOut);
     }
 };
 
-/// Slice t - s comes to stage s at time t; as it is read before one so far ahead is written, dst may be src.
+/// A slice is read before any that is written at the time, so dst may be src.
 template <MorphologyReach reach>
 struct AllPasses {
     KPLIB_KERNEL_BODY static void run(const MorphologyJob* job, Word* area)
     {
         const Passes passes{.job = *job, .area = area};
-        const long nz = job->nz;
         passes.clear();
-        for (long t = 0; t < nz + job->passes; ++t) {
-            if (t < nz)
+        for (long t = 0; t < job->nz + passes.layout.passes; ++t) {
+            if (t < job->nz)
                 passes.load(t, passes.input(0));
-            for (long stage = std::max(0L, t - nz); stage < std::min(job->passes, t + 1); ++stage)
-                toStage(passes, stage, t - stage);
+            for (long i = 0; i < passes.layout.count; ++i)
+                toStage(passes, i, t - passes.layout.stages[i].delay);
         }
     }
 
-    KPLIB_KERNEL_BODY static void toStage(const Passes& passes, long stage, long z)
+    KPLIB_KERNEL_BODY static void toStage(const Passes& passes, long i, long z)
     {
-        const bool isLast = stage == passes.job.passes - 1;
-        if (z == passes.job.nz)  // behind the last slice
-            std::fill_n(passes.input(stage), passes.layout.words, 0);
-        if (stage > 0 || z == passes.job.nz)
-            passes.widen(passes.input(stage), 0);
-        if (isLast && z > 0 && passes.isInBlocks()) {
-            passes.template step<reach>(stage, z, passes.target(z - 1), passes.flip);
+        const Stage& stage = passes.layout.stages[i];
+        const long nz = passes.job.nz, done = z - stage.step;
+        if (z < 0 || done >= nz)
+            return;
+        Word* const in = passes.input(i);
+        if (z >= nz)
+            std::fill_n(in, passes.layout.words, 0);
+        if (i > 0 || z >= nz)
+            passes.widen(stage, in, 0);
+        const bool isResult = i == passes.layout.count - 1 && done >= 0;
+        if (isResult && passes.isInBlocks()) {
+            passes.template step<reach>(stage, in, z, passes.target(done), passes.flip);
             return;
         }
-        Word* const out = passes.input(stage + 1);
-        passes.template step<reach>(stage, z, out, 0);
+        Word* const out = passes.input(i + 1);
+        passes.template step<reach>(stage, in, z, out, 0);
         passes.clearTail(out);
-        if (isLast && z > 0)
-            passes.store(z - 1, out);
+        if (isResult)
+            passes.store(done, out);
     }
 };
 
-template <typename Path, MorphologyReach reach>
-void runAligned(const MorphologyJob& job, void* area)
-{
-    void* aligned = area;
-    std::size_t space = morphologyAreaBytes(job);
-    std::align(block * sizeof(Word), space - block * sizeof(Word), aligned, space);
-    Path::template run<AllPasses<reach>>(&job, static_cast<Word*>(aligned));
-}
-
 template <typename Path>
-MorphologyLoop* morphologyLoop(MorphologyReach reach)
+void runPasses(const MorphologyJob& job, void* area)
 {
-    switch (reach) {
-    case MorphologyReach::Faces:
-        return runAligned<Path, MorphologyReach::Faces>;
-    case MorphologyReach::Edges:
-        return runAligned<Path, MorphologyReach::Edges>;
-    default:
-        return runAligned<Path, MorphologyReach::Corners>;
-    }
+    using Run = void(const MorphologyJob*, Word*);
+    static constexpr Run* runs[] = {Path::template run<AllPasses<MorphologyReach::Faces>>,
+                                    Path::template run<AllPasses<MorphologyReach::Edges>>,
+                                    Path::template run<AllPasses<MorphologyReach::Corners>>};
+    constexpr std::size_t alignment = block * sizeof(Word);
+    std::size_t space = morphologyAreaBytes(job);
+    runs[static_cast<int>(job.reach) - 1](&job,
+                                          static_cast<Word*>(std::align(alignment, space - alignment, area, space)));
 }
 
 }  // namespace
 
 unsigned long morphologyAreaBytes(const MorphologyJob& job)
 {
-    return static_cast<unsigned long>(Layout(job).size(job.passes) + block) * sizeof(Word);
+    return Layout(job).bytes();
 }
 
 long morphologyPassesAtOnce(const MorphologyJob& job)
 {
     MorphologyJob some = job;
-    for (some.passes = 1; some.passes < job.passes; ++some.passes) {
-        if (morphologyAreaBytes(some) > cacheBytes)
+    long fitting = 1;
+    for (some.passes = 2; some.passes <= job.passes; ++some.passes) {
+        const Layout layout(some);
+        if (layout.passes < some.passes || layout.bytes() > cacheBytes)
             break;
+        fitting = some.passes;
     }
-    return some.passes;
+    return fitting;
 }
 
-std::span<const KernelPath<MorphologyLoops>> morphologyPaths()
+std::span<const KernelPath<MorphologyLoop>> morphologyPaths()
 {
-    static const KernelPath<MorphologyLoops> paths[] = {{"plain", true, morphologyLoop<ForAny>},
-                                                        {"avx2", hasAvx2(), morphologyLoop<ForAvx2>},
-                                                        {"avx512", hasAvx512(), morphologyLoop<ForAvx512>}};
+    static const KernelPath<MorphologyLoop> paths[] = {{"plain", true, runPasses<ForAny>},
+                                                       {"avx2", hasAvx2(), runPasses<ForAvx2>},
+                                                       {"avx512", hasAvx512(), runPasses<ForAvx512>}};
     return paths;
 }
 

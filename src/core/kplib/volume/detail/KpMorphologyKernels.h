@@ -16,13 +16,13 @@ struct MorphologyJob {
     std::uint32_t* dst;  // may be src
     long nx, ny, nz;
     long passes;
+    MorphologyReach reach;
     bool erodes;
 };
 
 /// `job.passes` passes in one go through memory; `area` is of morphologyAreaBytes(job).
 using MorphologyLoop = void(const MorphologyJob& job, void* area);
-using MorphologyLoops = MorphologyLoop*(MorphologyReach reach);
-std::span<const KernelPath<MorphologyLoops>> morphologyPaths();
+std::span<const KernelPath<MorphologyLoop>> morphologyPaths();
 unsigned long morphologyAreaBytes(const MorphologyJob& job);
 
 /// How many passes, of those that the job asks for, to do at once so that their work area stays in the cache.
