@@ -14,6 +14,7 @@ namespace {
 
 constexpr int dims[] = {181, 217, 181};
 
+/// Folds about 20 voxels apart and 4 wide, up to a third of the radius deep.
 KpBitfield brain()
 {
     KpBitfield field(181UL * 217 * 181, KpBitfield::INIT_UNSET);
@@ -23,10 +24,10 @@ KpBitfield brain()
             for (int x = 0; x < dims[0]; ++x, ++i) {
                 const double u = x / 90.0 - 1, v = y / 108.0 - 1, w = z / 90.0 - 1;
                 const double depth = 0.8 - std::sqrt(u * u + v * v + w * w);
-                const double fold = std::sin(0.45 * x + 2 * std::sin(0.13 * z)) *
-                                    std::sin(0.41 * y + std::sin(0.2 * x)) *
-                                    std::sin(0.43 * z + 2 * std::sin(0.17 * y));
-                if (depth > 0 && std::abs(fold) > 0.12 - 0.4 * depth)
+                const double fold = std::sin(0.15 * x + 2 * std::sin(0.04 * z)) +
+                                    std::sin(0.14 * y + std::sin(0.06 * x)) +
+                                    std::sin(0.15 * z + 2 * std::sin(0.05 * y));
+                if (depth > 0 && std::abs(fold) > 0.3 - depth)
                     field.set(i);
             }
     return field;

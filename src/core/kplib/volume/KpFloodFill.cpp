@@ -46,6 +46,7 @@ public:
     /// Ones where the value is.
     Word ground(long pos) const { return load(src_, pos) ^ flip_; }
     Word visited(long pos) const { return load(dst_, pos); }
+    Word open(long pos) const { return ground(pos) & ~visited(pos); }
     bool isGround(long pos) const { return (ground(pos) & 1) != 0; }
     bool isVisited(long pos) const { return (visited(pos) & 1) != 0; }
 
@@ -53,10 +54,10 @@ public:
     bool isOpen(long pos, long end) const
     {
         for (; end - pos > step; pos += step) {
-            if ((ground(pos) & ~visited(pos) & lowBits(step)) != 0)
+            if ((open(pos) & lowBits(step)) != 0)
                 return true;
         }
-        return (ground(pos) & ~visited(pos) & lowBits(end - pos)) != 0;
+        return (open(pos) & lowBits(end - pos)) != 0;
     }
 
     // The first position in [pos, end) of its kind, or `end`.
@@ -86,7 +87,7 @@ public:
         return pos;
     }
 
-    void visit(long pos, long end)
+    void visit(long pos, long end) const
     {
         for (; pos < end; pos += step) {
             const long start = std::min(pos >> 3, lastLoad_);
@@ -131,15 +132,15 @@ public:
         const int x = seed[0], y = seed[1], z = seed[2];
         box_ = {{x, y, z}, {x, y, z}};
         count_ = 0;
-        if (x < 0 || y < 0 || z < 0 || x >= nx_ || y >= ny_ || z >= nz_ || !ground_.isGround(row(y, z) + x))
+        const bool isInside = x >= 0 && y >= 0 && z >= 0 && x < nx_ && y < ny_ && z < nz_;
+        if (!isInside || !ground_.isGround(row(y, z) + x))
             return 0;
-        pushAround(z, y, x, x);
-        push(z, y, x, x);
-        while (!stack_.size() == 0) {
-            const SF3D_Segment segment = stack_[stack_.size() - 1];
-            stack_.resize(stack_.size() - 1);
-            walk(segment);
-        }
+        const auto column = static_cast<std::int16_t>(x);
+        const SF3D_Segment segment{static_cast<std::int16_t>(z), static_cast<std::int16_t>(y), column, column};
+        pushAround(ground_, segment);
+        push(ground_, segment, 0, 0);
+        while (depth_ > 0)
+            walk(ground_, stack_.data()[--depth_]);
         return count_;
     }
     const Box& box() const { return box_; }
@@ -147,62 +148,73 @@ public:
 private:
     long row(long y, long z) const { return (z * ny_ + y) * nx_; }
 
-    /// A segment in which nothing is open has no effect, not later either.
-    void push(int z, int y, int xLeft, int xRight)
+    // The ground goes by value: as a field it would be loaded anew after each write of bits.
+
+    /// The segment so many rows and slices on, unless nothing is open in it, as then it has no effect, not later
+    /// either.
+    void push(Ground ground, const SF3D_Segment& segment, int dy, int dz)
     {
-        const long start = row(y, z);
-        if (ground_.isOpen(start + xLeft, start + xRight + 1))
-            stack_.append({static_cast<std::int16_t>(z), static_cast<std::int16_t>(y), static_cast<std::int16_t>(xLeft),
-                           static_cast<std::int16_t>(xRight)});
+        const SF3D_Segment moved{static_cast<std::int16_t>(segment.z + dz), static_cast<std::int16_t>(segment.y + dy),
+                                 segment.xLeft, segment.xRight};
+        const long start = row(moved.y, moved.z);
+        if (!ground.isOpen(start + moved.xLeft, start + moved.xRight + 1))
+            return;
+        if (depth_ == stack_.size())
+            stack_.resize(std::max(1024L, 2 * depth_));
+        stack_.data()[depth_++] = moved;
     }
 
-    void pushAround(int z, int y, int xLeft, int xRight)
+    void pushAround(Ground ground, const SF3D_Segment& segment)
     {
-        if (z > 0)
-            push(z - 1, y, xLeft, xRight);
-        if (z < nz_ - 1)
-            push(z + 1, y, xLeft, xRight);
-        if (y > 0)
-            push(z, y - 1, xLeft, xRight);
-        if (y < ny_ - 1)
-            push(z, y + 1, xLeft, xRight);
+        if (segment.z > 0)
+            push(ground, segment, 0, -1);
+        if (segment.z < nz_ - 1)
+            push(ground, segment, 0, 1);
+        if (segment.y > 0)
+            push(ground, segment, -1, 0);
+        if (segment.y < ny_ - 1)
+            push(ground, segment, 1, 0);
     }
 
     /// Fills the runs that begin in the segment, the first one to both sides. Where runs are partly visited already,
     /// what is filled depends on these very steps: only the first looks to its left, and visited ground at the end of
     /// the segment ends it.
-    void walk(const SF3D_Segment& segment)
+    void walk(Ground ground, const SF3D_Segment segment)
     {
         const long start = row(segment.y, segment.z), last = start + segment.xRight;
         long pos = start + segment.xLeft;
+        if (!ground.isOpen(pos, last + 1))
+            return;
         for (bool isFirst = true; pos <= last; isFirst = false) {
-            if (ground_.isGround(pos) && ground_.isVisited(pos))
-                pos = ground_.firstUnvisited(pos, last);
-            if (!ground_.isGround(pos)) {
+            if (ground.isGround(pos) && ground.isVisited(pos))
+                pos = ground.firstUnvisited(pos, last);
+            if (!ground.isGround(pos)) {
                 ++pos;
-            } else if (ground_.isVisited(pos)) {
+            } else if (ground.isVisited(pos)) {
                 return;
             } else {
-                const long from = isFirst ? ground_.runStart(pos, start) : pos;
-                const long end = ground_.firstOff(pos, start + nx_);
-                ground_.visit(from, end);
-                found(segment.z, segment.y, static_cast<int>(from - start), static_cast<int>(end - 1 - start));
+                const long from = isFirst ? ground.runStart(pos, start) : pos;
+                const long end = ground.firstOff(pos, start + nx_);
+                ground.visit(from, end);
+                found(ground, {segment.z, segment.y, static_cast<std::int16_t>(from - start),
+                               static_cast<std::int16_t>(end - 1 - start)});
                 pos = end + 1;
             }
-            pos = ground_.firstGround(pos, last + 1);
+            pos = ground.firstGround(pos, last + 1);
         }
     }
 
-    void found(int z, int y, int xLeft, int xRight)
+    void found(Ground ground, const SF3D_Segment& run)
     {
-        count_ += static_cast<unsigned long>(xRight - xLeft + 1);
-        box_.extend({{xLeft, y, z}, {xRight, y, z}});
-        pushAround(z, y, xLeft, xRight);
+        count_ += static_cast<unsigned long>(run.xRight - run.xLeft + 1);
+        box_.extend({{run.xLeft, run.y, run.z}, {run.xRight, run.y, run.z}});
+        pushAround(ground, run);
     }
 
     Ground ground_;
-    int nx_, ny_, nz_;
+    long nx_, ny_, nz_;
     KpDArray<SF3D_Segment> stack_;
+    long depth_ = 0;           // of the stack
     unsigned long count_ = 0;  // of one seed
     Box box_{};
 };
