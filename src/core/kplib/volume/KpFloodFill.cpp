@@ -22,17 +22,23 @@ struct SF3D_Segment {
 };
 static_assert(sizeof(SF3D_Segment) == 8);
 
-struct Box {
-    int min[3], max[3];
+struct Range {
+    int min, max;
 
-    void extend(const Box& other)
+    void extend(int low, int high)
     {
-        for (int axis = 0; axis < 3; ++axis) {
-            min[axis] = std::min(min[axis], other.min[axis]);
-            max[axis] = std::max(max[axis], other.max[axis]);
-        }
+        // Seldom, so this is cheaper than to write what is there.
+        if (low < min)
+            min = low;
+        if (high > max)
+            max = high;
     }
 };
+
+struct Box {
+    Range x, y, z;
+};
+static_assert(sizeof(Box) == 6 * sizeof(int), "as callers get it");
 
 /// Fields of at least 64 bits, at any position of which `step` bits may be looked at; those behind the end vary.
 class Ground {
@@ -46,18 +52,22 @@ public:
     /// Ones where the value is.
     Word ground(long pos) const { return load(src_, pos) ^ flip_; }
     Word visited(long pos) const { return load(dst_, pos); }
-    Word open(long pos) const { return ground(pos) & ~visited(pos); }
+    Word open(long pos) const
+    {
+        const long start = std::min(pos >> 3, lastLoad_);
+        return ((at(src_, start) ^ flip_) & ~at(dst_, start)) >> (pos - start * 8);
+    }
     bool isGround(long pos) const { return (ground(pos) & 1) != 0; }
     bool isVisited(long pos) const { return (visited(pos) & 1) != 0; }
 
-    /// Whether some voxel in [pos, end) is still to be filled.
-    bool isOpen(long pos, long end) const
+    /// Whether some of n > 0 voxels is still to be filled.
+    bool isOpen(long pos, long n) const
     {
-        for (; end - pos > step; pos += step) {
+        for (; n > step; pos += step, n -= step) {
             if ((open(pos) & lowBits(step)) != 0)
                 return true;
         }
-        return (open(pos) & lowBits(end - pos)) != 0;
+        return (open(pos) & lowBits(n)) != 0;
     }
 
     // The first position in [pos, end) of its kind, or `end`.
@@ -91,20 +101,22 @@ public:
     {
         for (; pos < end; pos += step) {
             const long start = std::min(pos >> 3, lastLoad_);
-            Word word;
-            std::memcpy(&word, dst_ + start, sizeof word);
-            word |= lowBits(std::min(step, end - pos)) << (pos - start * 8);
+            const Word word = at(dst_, start) | lowBits(std::min(step, end - pos)) << (pos - start * 8);
             std::memcpy(dst_ + start, &word, sizeof word);
         }
     }
 
 private:
+    static Word at(const char* field, long start)
+    {
+        Word word;
+        std::memcpy(&word, field + start, sizeof word);
+        return word;
+    }
     Word load(const char* field, long pos) const
     {
         const long start = std::min(pos >> 3, lastLoad_);
-        Word word;
-        std::memcpy(&word, field + start, sizeof word);
-        return word >> (pos - start * 8);
+        return at(field, start) >> (pos - start * 8);
     }
 
     template <typename Bits>
@@ -130,15 +142,14 @@ public:
     unsigned long fill(const KpVec3i& seed)
     {
         const int x = seed[0], y = seed[1], z = seed[2];
-        box_ = {{x, y, z}, {x, y, z}};
+        box_ = {{x, x}, {y, y}, {z, z}};
         count_ = 0;
         const bool isInside = x >= 0 && y >= 0 && z >= 0 && x < nx_ && y < ny_ && z < nz_;
-        if (!isInside || !ground_.isGround(row(y, z) + x))
+        const long pos = isInside ? row(y, z) + x : 0;
+        if (!isInside || !ground_.isGround(pos))
             return 0;
-        const auto column = static_cast<std::int16_t>(x);
-        const SF3D_Segment segment{static_cast<std::int16_t>(z), static_cast<std::int16_t>(y), column, column};
-        pushAround(ground_, segment);
-        push(ground_, segment, 0, 0);
+        pushAround(ground_, z, y, x, x, pos);
+        push(ground_, z, y, x, x, pos);
         while (depth_ > 0)
             walk(ground_, stack_.data()[--depth_]);
         return count_;
@@ -148,32 +159,30 @@ public:
 private:
     long row(long y, long z) const { return (z * ny_ + y) * nx_; }
 
-    // The ground goes by value: as a field it would be loaded anew after each write of bits.
+    // The ground goes by value and into inlined functions: as a field it would be loaded anew after each write of bits,
+    // as an argument copied by way of memory.
 
-    /// The segment so many rows and slices on, unless nothing is open in it, as then it has no effect, not later
-    /// either.
-    void push(Ground ground, const SF3D_Segment& segment, int dy, int dz)
+    /// A segment in which nothing is open has no effect, not later either. `pos` is the voxel at its left.
+    [[gnu::always_inline]] void push(Ground ground, int z, int y, int xLeft, int xRight, long pos)
     {
-        const SF3D_Segment moved{static_cast<std::int16_t>(segment.z + dz), static_cast<std::int16_t>(segment.y + dy),
-                                 segment.xLeft, segment.xRight};
-        const long start = row(moved.y, moved.z);
-        if (!ground.isOpen(start + moved.xLeft, start + moved.xRight + 1))
+        if (!ground.isOpen(pos, xRight - xLeft + 1))
             return;
         if (depth_ == stack_.size())
             stack_.resize(std::max(1024L, 2 * depth_));
-        stack_.data()[depth_++] = moved;
+        stack_.data()[depth_++] = {static_cast<std::int16_t>(z), static_cast<std::int16_t>(y),
+                                   static_cast<std::int16_t>(xLeft), static_cast<std::int16_t>(xRight)};
     }
 
-    void pushAround(Ground ground, const SF3D_Segment& segment)
+    [[gnu::always_inline]] void pushAround(Ground ground, int z, int y, int xLeft, int xRight, long pos)
     {
-        if (segment.z > 0)
-            push(ground, segment, 0, -1);
-        if (segment.z < nz_ - 1)
-            push(ground, segment, 0, 1);
-        if (segment.y > 0)
-            push(ground, segment, -1, 0);
-        if (segment.y < ny_ - 1)
-            push(ground, segment, 1, 0);
+        if (z > 0)
+            push(ground, z - 1, y, xLeft, xRight, pos - nx_ * ny_);
+        if (z < nz_ - 1)
+            push(ground, z + 1, y, xLeft, xRight, pos + nx_ * ny_);
+        if (y > 0)
+            push(ground, z, y - 1, xLeft, xRight, pos - nx_);
+        if (y < ny_ - 1)
+            push(ground, z, y + 1, xLeft, xRight, pos + nx_);
     }
 
     /// Fills the runs that begin in the segment, the first one to both sides. Where runs are partly visited already,
@@ -183,10 +192,10 @@ private:
     {
         const long start = row(segment.y, segment.z), last = start + segment.xRight;
         long pos = start + segment.xLeft;
-        if (!ground.isOpen(pos, last + 1))
+        if (!ground.isOpen(pos, last + 1 - pos))
             return;
         for (bool isFirst = true; pos <= last; isFirst = false) {
-            if (ground.isGround(pos) && ground.isVisited(pos))
+            if ((ground.open(pos) & 1) == 0 && ground.isGround(pos))
                 pos = ground.firstUnvisited(pos, last);
             if (!ground.isGround(pos)) {
                 ++pos;
@@ -196,19 +205,24 @@ private:
                 const long from = isFirst ? ground.runStart(pos, start) : pos;
                 const long end = ground.firstOff(pos, start + nx_);
                 ground.visit(from, end);
-                found(ground, {segment.z, segment.y, static_cast<std::int16_t>(from - start),
-                               static_cast<std::int16_t>(end - 1 - start)});
+                found(ground, segment, start, from, end);
                 pos = end + 1;
             }
+            if (pos > last)
+                return;
             pos = ground.firstGround(pos, last + 1);
         }
     }
 
-    void found(Ground ground, const SF3D_Segment& run)
+    [[gnu::always_inline]] void found(Ground ground, const SF3D_Segment& segment, long start, long from, long end)
     {
-        count_ += static_cast<unsigned long>(run.xRight - run.xLeft + 1);
-        box_.extend({{run.xLeft, run.y, run.z}, {run.xRight, run.y, run.z}});
-        pushAround(ground, run);
+        const int z = segment.z, y = segment.y;
+        const int xLeft = static_cast<int>(from - start), xRight = static_cast<int>(end - 1 - start);
+        count_ += static_cast<unsigned long>(end - from);
+        box_.x.extend(xLeft, xRight);
+        box_.y.extend(y, y);
+        box_.z.extend(z, z);
+        pushAround(ground, z, y, xLeft, xRight, from);
     }
 
     Ground ground_;
@@ -226,10 +240,12 @@ unsigned long fillAll(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpV
     unsigned long count = 0;
     for (const KpVec3i& seed : seeds) {
         count += floodFill.fill(seed);
+        const Box& one = floodFill.box();
         if (&seed == seeds.begin())
-            box = floodFill.box();
-        else
-            box.extend(floodFill.box());
+            box = one;
+        box.x.extend(one.x.min, one.x.max);
+        box.y.extend(one.y.min, one.y.max);
+        box.z.extend(one.z.min, one.z.max);
     }
     return count;
 }
@@ -265,9 +281,7 @@ unsigned long KpMorphology::floodfill(const KpBitfield& src, KpBitfield& dst, co
         return 0;
     Box all{};
     const unsigned long count = (src.nWords() == 1 ? fillFew : fillAll)(src, dst, seeds, value, dims, all);
-    for (int axis = 0; box && axis < 3; ++axis) {
-        box[2 * axis] = all.min[axis];
-        box[2 * axis + 1] = all.max[axis];
-    }
+    if (box)
+        std::memcpy(box, &all, sizeof all);
     return count;
 }
