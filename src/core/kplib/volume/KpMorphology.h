@@ -1,0 +1,59 @@
+#pragma once
+
+#include <kplib/foundation/KpDArray.h>
+#include <kplib/foundation/KpExport.h>
+#include <kplib/geometry/KpVec2i.h>
+#include <kplib/geometry/KpVec3i.h>
+#include <kplib/volume/KpBitfield.h>
+
+/// Dilation, erosion and flood fill of masks.
+///
+/// A mask is a field of dims[0] * dims[1] * dims[2] bits, x fastest, rows and slices without gaps; `src` has that many.
+/// Neighbours are the voxels at most one step away along each axis: 6 (in the plane 4) along one axis, 18 along two, 26
+/// (8) along all three. Voxels have no size here; wider effects come from repetition.
+///
+/// One pass of dilation sets a voxel if it or a neighbour is set in `src`; one of erosion keeps a set voxel if all its
+/// neighbours are set. Outside the volume dilation sees background and erosion foreground, so neither acts from there.
+/// `dst`, another object than `src`, is brought to the size of the volume; bits beyond are of no meaning. Volumes of
+/// size 0 or less have no voxels.
+///
+/// `fast` works on words, many voxels at a time, otherwise each voxel looks at its neighbours; the results are the
+/// same. Work areas are a few slices. Where one that is needed can't be had, all bits of `dst` are set and nothing is
+/// told: rows of a multiple of 32 voxels do without for 6, 4 and 8 neighbours, rows of less than 32 for any. Other
+/// exhausted memory is a KpMemoryException. Any number of threads may work at once on fields of their own.
+class KPLIB_API KpMorphology {
+public:
+    /// `iterations` passes; none copies.
+    static void dilation3D(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, unsigned int iterations,
+                           bool fast);
+    static void dilation3D_18(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, unsigned int iterations,
+                              bool fast);
+    static void dilation3D_26(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, unsigned int iterations,
+                              bool fast);
+
+    /// `iterations` passes, at least one; less copies.
+    static void erosion3D(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, int iterations, bool fast);
+    static void erosion3D_18(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, int iterations, bool fast);
+    static void erosion3D_26(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, int iterations, bool fast);
+
+    // One fast pass over a plane.
+
+    static void dilation2D_4(const KpBitfield& src, KpBitfield& dst, const KpVec2i& dims);
+    static void erosion2D_4(const KpBitfield& src, KpBitfield& dst, const KpVec2i& dims);
+    static void dilation2D_8(const KpBitfield& src, KpBitfield& dst, const KpVec2i& dims);
+    static void erosion2D_8(const KpBitfield& src, KpBitfield& dst, const KpVec2i& dims);
+
+    /// Sets in `dst` what is connected with a seed by faces through voxels whose bit in `src` is `value`; gives the
+    /// number of voxels filled. `dims` are three sizes.
+    ///
+    /// What `dst` holds, resized first if it is of another size, counts as visited and stops the fill. Filling goes by
+    /// runs along x, as a rule set and counted from end to end when entered where `dst` is clear. `box`, if not null,
+    /// becomes xmin, xmax, ymin, ymax, zmin, zmax of what was filled and of all seeds, also those outside or on a
+    /// wrong value. It stays without seeds, and where `src` isn't of the size `dims` tells or a size is above 32767
+    /// (one error in the log): then 0 is the result and nothing changes. Time grows with the number of runs.
+    static unsigned long floodfill(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpVec3i>& seeds, bool value,
+                                   const int* dims, int* box);
+
+    /// Whether the operations on planes equal what each pixel's neighbours ask for, on a set of patterns.
+    static bool unitTest2D();
+};

@@ -1,0 +1,371 @@
+#include <kplib/rawdata/detail/KpLoose.h>
+#include <kplib/volume/detail/KpMorphologyKernels.h>
+
+#include <algorithm>
+#include <cstring>
+#include <memory>
+#include <numeric>
+
+// Slices pass, one after the other, through a row of stages, one a pass of the operation. A slice is one string of
+// bits that starts at a word: steps along y are shifts of the string, steps along x are shifts by one with the ends of
+// the rows masked. So rows need no alignment, and all loops are long. Erosion is the dilation of what is not set.
+//
+// Any of the neighbourhoods is made of two figures in the plane: what a voxel reaches in its own slice (near), and what
+// it reaches in the slices before and behind (far). A stage keeps what the slices that have come so far contribute.
+
+namespace kplib::detail {
+namespace {
+
+using Word [[gnu::may_alias]] = std::uint64_t;  // fields are of halves of it
+using LooseWord = Loose<std::uint64_t>;
+constexpr long wordBits = 64, block = 8;  // loops go by blocks, the words of a cache line
+constexpr unsigned long cacheBytes = 768UL << 10;
+constexpr long maxStages = 32, maxStep = 8;
+
+constexpr long roundedUp(long n, long to)
+{
+    return (n + to - 1) / to * to;
+}
+
+/// Does `step` passes at once: slices that step before and behind, too, contribute.
+struct Stage {
+    long step;
+    long delay;   // slices that have come to the first stage before one comes to this
+    long slices;  // where its own begin, counted in slices: that for what is near, then 2 * step for what is far
+    long masks;   // the first of its two
+};
+
+/// The stages, and where things lie in the work area, in words. Each slice has zeros before and behind, for shifts by
+/// rows. Several passes with all 26 neighbours are a box: from a box of radius r one step of r + 1 makes that of 2r +
+/// 1, and where the volume cuts it off nothing is missing, as the ways to each voxel lead through the ones between.
+struct Layout {
+    explicit constexpr Layout(const MorphologyJob& job) :
+        sliceBits(job.nx * job.ny), words(roundedUp(sliceBits, wordBits * block) / wordBits),
+        maskWords(std::min(words, roundedUp(64, maskPeriod(job.nx))))
+    {
+        const bool isBox = job.reach == MorphologyReach::Corners;
+        long done = 0, slices = fixedSlices;
+        for (; count < maxStages && done < job.passes; ++count) {
+            const long step = isBox ? std::min({done + 1, job.passes - done, maxStep}) : 1;
+            stages[count] = {step, done, slices, 2 * count * maskWords};
+            slices += 1 + 2 * step;
+            done += step;
+            pad = std::max(pad, roundedUp(step * job.nx / wordBits + 2, block));
+        }
+        passes = done;
+        masks = pad + slices * (words + pad);
+    }
+    /// The masks of the ends of rows repeat themselves.
+    static constexpr long maskPeriod(long nx) { return std::lcm(nx, wordBits * block) / wordBits; }
+    constexpr long slice(long i) const { return pad + i * (words + pad); }
+    constexpr unsigned long bytes() const
+    {
+        return static_cast<unsigned long>(masks + 2 * count * maskWords + block) * sizeof(Word);
+    }
+
+    static constexpr long fixedSlices = 3;  // two of input by turns, one between the steps along x and y
+
+    long sliceBits;
+    long words;
+    long maskWords;
+    long pad = 0;
+    Stage stages[maxStages]{};
+    long count = 0;
+    long passes = 0;  // in all
+    long masks = 0;
+};
+
+// What follows is compiled for each kind of processor.
+
+/// `count` bits from bit `pos`, without looking at words beyond; the bits above are of no meaning.
+KPLIB_KERNEL_BODY Word bitsAt(const std::uint32_t* field, long pos, long count)
+{
+    const std::uint32_t* word = field + pos / 32;
+    Word bits = *word >> pos % 32;
+    for (long have = 32 - pos % 32; have < count; have += 32)
+        bits |= Word{*++word} << have;
+    return bits;
+}
+
+KPLIB_KERNEL_BODY void putBits(std::uint32_t* field, long pos, long count, Word bits)
+{
+    while (count > 0) {
+        const long at = pos % 32, taken = std::min(32 - at, count);
+        const std::uint32_t mask = ~0U >> (32 - taken) << at;
+        std::uint32_t& word = field[pos / 32];
+        word = (word & ~mask) | (static_cast<std::uint32_t>(bits << at) & mask);
+        bits >>= taken;
+        pos += taken;
+        count -= taken;
+    }
+}
+
+/// The 64 bits that end `by` bits, 0 to 63, below the top of `high`, or start `by` above the bottom of `low`.
+KPLIB_KERNEL_BODY Word shiftedUp(Word low, Word high, long by)
+{
+    return high << by | low >> 1 >> (63 - by);
+}
+KPLIB_KERNEL_BODY Word shiftedDown(Word low, Word high, long by)
+{
+    return low >> by | high << 1 << (63 - by);
+}
+
+/// The voxels so many rows of bits before and behind along y.
+template <bool rowsOfWords>
+KPLIB_KERNEL_BODY Word alongY(const Word* bits, long words, long by)
+{
+    if constexpr (rowsOfWords)
+        return bits[-words] | bits[words];
+    return shiftedUp(bits[-words - 1], bits[-words], by) | shiftedDown(bits[words], bits[words + 1], by);
+}
+
+// Loops. `n` is a number of whole blocks if it is that of a slice.
+
+KPLIB_KERNEL_BODY void unalign(LooseWord* __restrict to, const Word* __restrict from, long n, long by, Word flip)
+{
+    for (long i = 1; i < n; ++i)
+        to[i].value = shiftedUp(from[i - 1], from[i], by) ^ flip;
+}
+
+/// The voxels and those `step` beside them along x.
+KPLIB_KERNEL_BODY void alongX(Word* __restrict to, const Word* __restrict bits, const Word* __restrict notFirst,
+                              const Word* __restrict notLast, long n, long step)
+{
+    n &= -block;
+    for (long i = 0; i < n; ++i)
+        to[i] = bits[i] | (shiftedUp(bits[i - 1], bits[i], step) & notFirst[i]) |
+                (shiftedDown(bits[i], bits[i + 1], step) & notLast[i]);
+}
+
+/// Both at once, for words that begin `by` bits, 1 to 62, above the bottom of those of the field.
+KPLIB_KERNEL_BODY void realignAlongX(Word* __restrict to, Word* __restrict wide, const LooseWord* __restrict from,
+                                     const Word* __restrict notFirst, const Word* __restrict notLast, long n, long by,
+                                     Word flip)
+{
+    n &= -block;
+    for (long i = 0; i < n; ++i) {
+        const Word low = from[i] ^ flip, high = from[i + 1] ^ flip, bits = shiftedDown(low, high, by);
+        to[i] = bits;
+        wide[i] = bits | (shiftedDown(low, high, by - 1) & notFirst[i]) | (shiftedDown(low, high, by + 1) & notLast[i]);
+    }
+}
+
+/// Completes the slice before `in`, and takes up what `in` contributes: `near` and `farBefore` are those of the slice
+/// before, `far` that of the one before it and then that of `in`.
+template <MorphologyReach reach, bool rowsOfWords>
+struct Combine {
+    KPLIB_KERNEL_BODY static void run(Word* __restrict out, Word* __restrict near, Word* __restrict far,
+                                      const Word* __restrict farBefore, const Word* __restrict in,
+                                      const Word* __restrict wide, long n, long rowBits, Word flip)
+    {
+        const long rowWords = rowBits / wordBits, by = rowBits % wordBits;
+        n &= -block;
+        for (long i = 0; i < n; ++i) {
+            if constexpr (reach == MorphologyReach::Corners) {
+                const Word reached = wide[i] | alongY<rowsOfWords>(wide + i, rowWords, by);
+                out[i] = (far[i] | farBefore[i] | reached) ^ flip;
+                far[i] = reached;
+            } else if constexpr (reach == MorphologyReach::Edges) {
+                const Word reached = wide[i] | alongY<rowsOfWords>(in + i, rowWords, by);
+                out[i] = (far[i] | near[i] | reached) ^ flip;
+                near[i] = wide[i] | alongY<rowsOfWords>(wide + i, rowWords, by);
+                far[i] = reached;
+            } else {
+                out[i] = (far[i] | near[i] | in[i]) ^ flip;
+                near[i] = wide[i] | alongY<rowsOfWords>(in + i, rowWords, by);
+                far[i] = in[i];
+            }
+        }
+    }
+};
+
+struct Passes {
+    const MorphologyJob& job;
+    const Layout layout{job};
+    Word* const area;
+    const Word flip = job.erodes ? ~Word{0} : 0;
+
+    KPLIB_KERNEL_BODY Word* slice(long i) const { return area + layout.slice(i); }
+    KPLIB_KERNEL_BODY Word* input(long stage) const { return slice(stage % 2); }
+    KPLIB_KERNEL_BODY Word* between() const { return slice(2); }
+    KPLIB_KERNEL_BODY Word* near(const Stage& stage) const { return slice(stage.slices); }
+    KPLIB_KERNEL_BODY Word* far(const Stage& stage, long z) const
+    {
+        return slice(stage.slices + 1 + z % (2 * stage.step));
+    }
+    KPLIB_KERNEL_BODY Word* notFirst(const Stage& stage) const { return area + layout.masks + stage.masks; }
+    KPLIB_KERNEL_BODY Word* notLast(const Stage& stage) const { return notFirst(stage) + layout.maskWords; }
+
+    KPLIB_KERNEL_BODY void clear() const
+    {
+        std::memset(area, 0, static_cast<std::size_t>(layout.masks) * sizeof(Word));
+        for (long i = 0; i < layout.count; ++i)
+            makeMasks(layout.stages[i]);
+    }
+    /// Of the voxels with one `step` before, or behind, them in their row.
+    KPLIB_KERNEL_BODY void makeMasks(const Stage& stage) const
+    {
+        const long bits = layout.maskWords * wordBits;
+        std::fill_n(notFirst(stage), 2 * layout.maskWords, ~Word{0});
+        for (long first = 0; first < bits; first += job.nx)
+            for (long i = 0; i < std::min(stage.step, job.nx); ++i) {
+                unset(notFirst(stage), first + i, bits);
+                unset(notLast(stage), first + job.nx - 1 - i, bits);
+            }
+    }
+    KPLIB_KERNEL_BODY static void unset(Word* mask, long i, long bits)
+    {
+        if (i < bits)
+            mask[i / wordBits] &= ~(Word{1} << i % wordBits);
+    }
+
+    /// Zeros behind the last voxel.
+    KPLIB_KERNEL_BODY void clearTail(Word* bits) const
+    {
+        const long last = layout.sliceBits / wordBits;
+        if (last < layout.words)
+            bits[last] &= (Word{1} << layout.sliceBits % wordBits) - 1;
+        for (long i = last + 1; i < layout.words; ++i)
+            bits[i] = 0;
+    }
+
+    /// Slice z, and what it reaches along x.
+    KPLIB_KERNEL_BODY void load(long z, Word* to) const
+    {
+        const long from = z * layout.sliceBits, used = (layout.sliceBits + wordBits - 1) / wordBits;
+        long whole = std::max(used - 2, 0L) & -block;  // whose source lies in the field
+        if (from == 0)
+            whole = 0;
+        const long base = from % 32 == 0 ? from - 32 : from / 32 * 32;
+        const auto* const words = reinterpret_cast<const LooseWord*>(job.src + base / 32);
+        for (long i = 0; i < whole; i += layout.maskWords)
+            realignAlongX(to + i, between() + i, words + i, notFirst(layout.stages[0]), notLast(layout.stages[0]),
+                          std::min(whole - i, layout.maskWords), from - base, flip);
+        for (long i = whole; i < used; ++i)
+            to[i] = bitsAt(job.src, from + i * wordBits, std::min(layout.sliceBits - i * wordBits, wordBits)) ^ flip;
+        clearTail(to);
+        widen(layout.stages[0], to, whole);
+    }
+
+    /// What a slice reaches along x, from a word on.
+    KPLIB_KERNEL_BODY void widen(const Stage& stage, const Word* bits, long start) const
+    {
+        while (start < layout.words) {
+            const long k = start % layout.maskWords, n = std::min(layout.words - start, layout.maskWords - k);
+            alongX(between() + start, bits + start, notFirst(stage) + k, notLast(stage) + k, n, stage.step);
+            start += n;
+        }
+    }
+
+    /// Whether slices can be written in place.
+    KPLIB_KERNEL_BODY bool isInBlocks() const { return layout.sliceBits == layout.words * wordBits; }
+    KPLIB_KERNEL_BODY Word* target(long z) const
+    {
+        return reinterpret_cast<Word*>(job.dst + z * layout.sliceBits / 32);
+    }
+    /// Slices share words with the ones beside them.
+    KPLIB_KERNEL_BODY void store(long z, const Word* bits) const
+    {
+        const long to = z * layout.sliceBits, by = to % 32, base = to - by, end = layout.sliceBits + by;
+        putBits(job.dst, to, std::min(wordBits - by, layout.sliceBits), bits[0] ^ flip);
+        const long whole = end / wordBits;
+        unalign(reinterpret_cast<LooseWord*>(job.dst + base / 32), bits, whole, by, flip);
+        if (whole > 0)
+            putBits(job.dst, base + whole * wordBits, end % wordBits,
+                    shiftedUp(bits[whole - 1], bits[whole], by) ^ flip);
+    }
+
+    /// Slice z comes to a stage; the one `step` before it is complete then, and goes out.
+    template <MorphologyReach reach>
+    KPLIB_KERNEL_BODY void step(const Stage& stage, const Word* in, long z, Word* out, Word flipOut) const
+    {
+        const long rowBits = stage.step * job.nx;
+        Word *const oldest = far(stage, z), *const middle = far(stage, z + stage.step);
+        if (rowBits % wordBits == 0)
+            Combine<reach, true>::run(out, near(stage), oldest, middle, in, between(), layout.words, rowBits, flipOut);
+        else
+            Combine<reach, false>::run(out, near(stage), oldest, middle, in, between(), layout.words, rowBits, flipOut);
+    }
+};
+
+/// A slice is read before any that is written at the time, so dst may be src.
+template <MorphologyReach reach>
+struct AllPasses {
+    KPLIB_KERNEL_BODY static void run(const MorphologyJob* job, Word* area)
+    {
+        const Passes passes{.job = *job, .area = area};
+        passes.clear();
+        for (long t = 0; t < job->nz + passes.layout.passes; ++t) {
+            if (t < job->nz)
+                passes.load(t, passes.input(0));
+            for (long i = 0; i < passes.layout.count; ++i)
+                toStage(passes, i, t - passes.layout.stages[i].delay);
+        }
+    }
+
+    KPLIB_KERNEL_BODY static void toStage(const Passes& passes, long i, long z)
+    {
+        const Stage& stage = passes.layout.stages[i];
+        const long nz = passes.job.nz, done = z - stage.step;
+        if (z < 0 || done >= nz)
+            return;
+        Word* const in = passes.input(i);
+        if (z >= nz)
+            std::fill_n(in, passes.layout.words, 0);
+        if (i > 0 || z >= nz)
+            passes.widen(stage, in, 0);
+        const bool isResult = i == passes.layout.count - 1 && done >= 0;
+        if (isResult && passes.isInBlocks()) {
+            passes.template step<reach>(stage, in, z, passes.target(done), passes.flip);
+            return;
+        }
+        Word* const out = passes.input(i + 1);
+        passes.template step<reach>(stage, in, z, out, 0);
+        passes.clearTail(out);
+        if (isResult)
+            passes.store(done, out);
+    }
+};
+
+template <typename Path>
+void runPasses(const MorphologyJob& job, void* area)
+{
+    using Run = void(const MorphologyJob*, Word*);
+    static constexpr Run* runs[] = {Path::template run<AllPasses<MorphologyReach::Faces>>,
+                                    Path::template run<AllPasses<MorphologyReach::Edges>>,
+                                    Path::template run<AllPasses<MorphologyReach::Corners>>};
+    constexpr std::size_t alignment = block * sizeof(Word);
+    std::size_t space = morphologyAreaBytes(job);
+    runs[static_cast<int>(job.reach) - 1](&job,
+                                          static_cast<Word*>(std::align(alignment, space - alignment, area, space)));
+}
+
+}  // namespace
+
+unsigned long morphologyAreaBytes(const MorphologyJob& job)
+{
+    return Layout(job).bytes();
+}
+
+long morphologyPassesAtOnce(const MorphologyJob& job)
+{
+    MorphologyJob some = job;
+    long fitting = 1;
+    for (some.passes = 2; some.passes <= job.passes; ++some.passes) {
+        const Layout layout(some);
+        if (layout.passes < some.passes || layout.bytes() > cacheBytes)
+            break;
+        fitting = some.passes;
+    }
+    return fitting;
+}
+
+std::span<const KernelPath<MorphologyLoop>> morphologyPaths()
+{
+    static const KernelPath<MorphologyLoop> paths[] = {{"plain", true, runPasses<ForAny>},
+                                                       {"avx2", hasAvx2(), runPasses<ForAvx2>},
+                                                       {"avx512", hasAvx512(), runPasses<ForAvx512>}};
+    return paths;
+}
+
+}  // namespace kplib::detail
