@@ -1,10 +1,13 @@
 #include <kplib/foundation/KpMemory.h>
 #include <kplib/volume/KpConnectedComponents.h>
+#include <kplib/volume/detail/KpFloatSums.h>
 #include <kplib/volume/detail/KpLabelPlainly.h>
 #include <support/LogCapture.h>
 
 #include <gtest/gtest.h>
 
+#include <cmath>
+#include <cstring>
 #include <functional>
 #include <limits>
 #include <random>
@@ -162,12 +165,29 @@ TEST(KpConnectedComponents, isAsDefinedOnShapes)
                 }
 }
 
-// One addition after the other, sums stop being exact at 2^24, and each power of two above doubles the step.
 TEST(KpConnectedComponents, roundsLargeSumsAsDefined)
 {
     for (Dims dims : {Dims{{700, 300, 5}}, Dims{{5000, 60, 1}}, Dims{{100000, 2, 1}}})
         for (int density : {100, 97})
             expectAsDefined<unsigned char>(noise<unsigned char>(dims, density / 100.0, 50, 1), dims, 1, 2, 8, 0);
+}
+
+TEST(FloatSums, equalOneAdditionAfterTheOther)
+{
+    std::mt19937 random(4);
+    const auto upTo = [&](int bits) { return static_cast<long>(random() >> (32 - 1 - random() % unsigned(bits))); };
+    for (int i = 0; i < 100000; ++i) {
+        const float start = std::ldexp(static_cast<float>(random() >> 8), static_cast<int>(random() % 20));
+        const long x = upTo(14), y = upTo(14), z = upTo(25), n = upTo(9);
+        float sum[3] = {start, start, start}, expected[3] = {start, start, start};
+        addRowTo(sum, x, y, z, n);
+        for (long k = 0; k < n; ++k) {
+            const long position[3] = {x + k, y, z};
+            for (int axis = 0; axis < 3; ++axis)
+                expected[axis] += static_cast<float>(position[axis]);
+        }
+        ASSERT_EQ(std::memcmp(sum, expected, sizeof sum), 0) << start << ": " << x << ' ' << y << ' ' << z << ' ' << n;
+    }
 }
 
 TEST(KpConnectedComponents, cleansUpAtTheLimitAndFailsWithoutRoom)
