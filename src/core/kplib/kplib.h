@@ -112,6 +112,7 @@
 #include <kplib/threads/KpProgressInterface.h>
 #include <kplib/threads/ProgressScope.h>
 #include <kplib/volume/KpBitfield.h>
+#include <kplib/volume/KpConnectedComponents.h>
 #include <kplib/volume/KpMorphology.h>
 #include <kplib/volume/KpNeighborIterator33.h>
 #include <kplib/volume/KpScanConvert.h>

@@ -90,6 +90,7 @@ struct KpTypedPointer;
 class TmSSETools;
 
 class KpBitfield;
+class KpConnectedComponents;
 class KpMorphology;
 class KpNeighborIterator33;
 class KpScanConvert;

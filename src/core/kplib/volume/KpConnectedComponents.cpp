@@ -1,0 +1,210 @@
+#include <kplib/volume/KpConnectedComponents.h>
+
+#include <kplib/foundation/KpMemory.h>
+#include <kplib/log/KpLogFile.h>
+#include <kplib/rawdata/detail/KpElementConvert.h>
+#include <kplib/rawdata/detail/KpPrimTypeVisit.h>
+#include <kplib/volume/detail/KpComponentTable.h>
+
+#include <cmath>
+#include <cstring>
+
+using kplib::detail::ComponentTable;
+
+std::atomic<int> KpConnectedComponents::dbg_add;
+std::atomic<int> KpConnectedComponents::dbg_merge;
+std::atomic<int> KpConnectedComponents::dbg_clean;
+
+namespace {
+
+// The order of merging decides which counts get lost and how sums are rounded; do not sort these tables. Those of fewer
+// neighbours are the ends of longer ones.
+constexpr int neighbours26[13][3] = {{-1, -1, -1}, {1, -1, -1}, {-1, 1, -1}, {1, 1, -1},  {0, -1, -1},
+                                     {-1, 0, -1},  {1, 0, -1},  {0, 1, -1},  {-1, -1, 0}, {1, -1, 0},
+                                     {0, 0, -1},   {0, -1, 0},  {-1, 0, 0}};
+constexpr int neighbours8[4][3] = {{-1, -1, 0}, {1, -1, 0}, {0, -1, 0}, {-1, 0, 0}};
+
+struct Neighbours {
+    const int (*first)[3];
+    int n;
+};
+
+Neighbours previousNeighbours(int neighbours)
+{
+    switch (neighbours) {
+    case 4:
+        return {neighbours26 + 11, 2};
+    case 6:
+        return {neighbours26 + 10, 3};
+    case 8:
+        return {neighbours8, 4};
+    case 10:
+        return {neighbours26 + 8, 5};
+    case 18:
+        return {neighbours26 + 4, 9};
+    case 26:
+        return {neighbours26, 13};
+    default:
+        return {neighbours26, 0};
+    }
+}
+
+/// Diagnostics are not worth the bus lock of an exact count.
+void countUp(std::atomic<int>& counter)
+{
+    counter.store(counter.load(std::memory_order_relaxed) + 1, std::memory_order_relaxed);
+}
+
+/// Rounded half up, cut to 32 bits as the processor does (all that doesn't fit is the smallest int), then to the type.
+template <typename T>
+T threshold(double value)
+{
+    if constexpr (std::is_floating_point_v<T>) {
+        return static_cast<T>(value);
+    } else {
+        const double rounded = std::floor(value + 0.5);
+        return static_cast<T>(kplib::detail::truncatedToInt(rounded >= -2147483648.0 ? rounded : -2147483648.0));
+    }
+}
+
+bool isTooSmall(unsigned count, int minimum)
+{
+    return minimum > 0 && count < static_cast<unsigned>(minimum);
+}
+
+}  // namespace
+
+void KpConnectedComponents::Component::addAlias(Component& other, int labelMode)
+{
+    nVoxels += other.nVoxels;
+    if (labelMode == 0)
+        nSeeds += other.nSeeds;
+    for (int axis = 0; axis < 3; ++axis)
+        sum[axis] += other.sum[axis];
+    other = Component{id, 0, 0, {0, 0, 0}};
+}
+
+int KpConnectedComponents::compareComponents(const Component& a, const Component& b)
+{
+    return a.nVoxels < b.nVoxels ? -1 : a.nVoxels > b.nVoxels ? 1 : 0;
+}
+
+void KpConnectedComponents::mknbtableprev(int neighbours, const int* dims, int& n, int* offsets, int (*deltas)[3])
+{
+    const Neighbours table = previousNeighbours(neighbours);
+    n = table.n;
+    for (int i = 0; i < n; ++i) {
+        std::memcpy(deltas[i], table.first[i], sizeof deltas[i]);
+        const auto& [dx, dy, dz] = deltas[i];
+        offsets[i] = static_cast<int>(dx + static_cast<long>(dims[0]) * (dy + static_cast<long>(dims[1]) * dz));
+    }
+}
+
+namespace kplib::detail {
+
+void startComponents(ComponentTable& components)
+{
+    for (auto* counter :
+         {&KpConnectedComponents::dbg_add, &KpConnectedComponents::dbg_merge, &KpConnectedComponents::dbg_clean})
+        counter->store(0, std::memory_order_relaxed);
+    components.resize(1);
+    components[0] = Component{};
+}
+
+template <typename L>
+int addComponent(ComponentTable& components, L* labels, long nLabelled)
+{
+    constexpr int limit = KpConnectedComponents::maxComponents<L>;
+    countUp(KpConnectedComponents::dbg_add);
+    if (components.size() >= limit)
+        cleanUpComponents(components, labels, nLabelled, -1, -1);
+    if (components.size() >= limit) {
+        getTheLogInstance().errorf("ERROR: too many components");
+        return -1;
+    }
+    const int index = static_cast<int>(components.size());
+    components.append(Component{index, 0, 0, {0, 0, 0}});
+    return index;
+}
+
+template <typename L>
+int cleanUpComponents(ComponentTable& components, L* labels, long nLabelled, int minVoxels, int minSeeds)
+{
+    countUp(KpConnectedComponents::dbg_clean);
+    const int oldSize = static_cast<int>(components.size());
+    KpDArray<int> numbers;
+    numbers.resize(oldSize);
+    int newSize = 0;
+    for (int i = 0; i < oldSize; ++i) {
+        const Component component = components[i];
+        if (i > 0 && component.id != i) {
+            numbers[i] = numbers[component.id];  // always a lower index
+        } else if (i > 0 && (isTooSmall(component.nVoxels, minVoxels) || isTooSmall(component.nSeeds, minSeeds))) {
+            numbers[i] = 0;
+        } else {
+            components[newSize] = component;
+            components[newSize].id = newSize;
+            numbers[i] = newSize++;
+        }
+    }
+    if (newSize == oldSize)
+        return oldSize;
+    components.resize(newSize);
+    for (long i = 0; i < nLabelled; ++i)
+        labels[i] = static_cast<L>(numbers[labels[i]]);
+    return newSize;
+}
+
+template int cleanUpComponents(ComponentTable&, unsigned short*, long, int, int);
+template int cleanUpComponents(ComponentTable&, int*, long, int, int);
+template int addComponent(ComponentTable&, unsigned short*, long);
+template int addComponent(ComponentTable&, int*, long);
+
+}  // namespace kplib::detail
+
+template <typename L>
+int KpConnectedComponents::addNewComponent(KpDArray<Component>& components, L* labels, int nLabelled)
+{
+    return kplib::detail::addComponent(components, labels, nLabelled);
+}
+
+template <typename L>
+int KpConnectedComponents::cleanup_components(KpDArray<Component>& components, L* labels, int nLabelled, int minVoxels,
+                                              int minSeeds)
+{
+    return kplib::detail::cleanUpComponents(components, labels, nLabelled, minVoxels, minSeeds);
+}
+
+template int KpConnectedComponents::addNewComponent(ComponentTable&, unsigned short*, int);
+template int KpConnectedComponents::addNewComponent(ComponentTable&, int*, int);
+template int KpConnectedComponents::cleanup_components(ComponentTable&, unsigned short*, int, int, int);
+template int KpConnectedComponents::cleanup_components(ComponentTable&, int*, int, int, int);
+
+int KpConnectedComponents::labelCC(KpTypedPointer data, const int* dims, int neighbours, unsigned short*& labels, int,
+                                   double low, double high, int, int, KpDArray<Component>* components)
+{
+    if (labels == nullptr)
+        labels = static_cast<unsigned short*>(
+            kpmalloc(static_cast<unsigned long>(kplib::detail::nVoxelsOf(dims)) * sizeof(unsigned short)));
+    ComponentTable local;
+    ComponentTable& table = components != nullptr ? *components : local;
+    int result = -1;
+    const bool isNumber = kplib::detail::visitNumbers(data, [&]<typename T>(T* voxels) {
+        result = do_label(voxels, labels, table, threshold<T>(low), threshold<T>(high), dims, neighbours, 0);
+    });
+    if (!isNumber)
+        getTheLogInstance().errorf("Unsupported data type %s in KpRawData()\n", data.type.name());
+    return result;
+}
+
+int KpConnectedComponents::labelLabels(unsigned char* data, const int* dims, int neighbours, unsigned short* labels,
+                                       int, int, KpDArray<Component>& components)
+{
+    return do_label<unsigned char>(data, labels, components, 0, 0, dims, neighbours, 1);
+}
+
+int KpConnectedComponents::labelLabelsHuge(unsigned char* data, const int* dims, int neighbours, int* labels, int, int,
+                                           KpDArray<Component>& components)
+{
+    return do_label<unsigned char>(data, labels, components, 0, 0, dims, neighbours, 1);
+}

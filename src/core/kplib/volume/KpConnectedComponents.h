@@ -1,0 +1,79 @@
+#pragma once
+
+#include <kplib/foundation/KpDArray.h>
+#include <kplib/foundation/KpExport.h>
+#include <kplib/rawdata/KpTypedPointer.h>
+
+#include <atomic>
+
+/// Labels the connected regions of a 2D or 3D image in one raster pass, and counts what they hold.
+///
+/// Images are dense, x fastest, `dims` their three sizes. Neighbours are 4 or 8 (in plane), 6, 18, 26, or 10 (8 and the
+/// faces in z); with any other number each voxel is a component of its own. The result is an image of labels and a
+/// table: entry 0 is the background, all zero, entry i component i, numbered in raster order of the first voxels. Where
+/// regions meet, one becomes an alias of the other. Only one step of an alias is followed while labelling, so in an
+/// intricate region a component may come out in parts, or its counts short of some voxels; peers expect these very
+/// numbers.
+///
+/// Everything runs on the calling thread; threads may label different images at once. The table grows as the regions
+/// do, and there is scratch of half a bit for each voxel of a slice; exhausted memory is a KpMemoryException.
+class KPLIB_API KpConnectedComponents {
+public:
+    struct KPLIB_API Component {
+        int id;  ///< its own index, or that of the entry it is an alias of
+        unsigned nVoxels;
+        unsigned nSeeds;  ///< voxels at or above the upper threshold; of labels, the value of the region
+        float sum[3];     ///< of the voxels' x, y and z, one added after the other; over nVoxels: the centre
+
+        /// Absorbs the statistics of `other` (its seeds only if `labelMode` is 0), zeroes them there and gives `other`
+        /// the id of this one, which need not be the index of this one.
+        void addAlias(Component& other, int labelMode);
+    };
+
+    /// Largest size of a table, the background included.
+    template <typename L>
+    static constexpr int maxComponents = sizeof(L) == 2 ? 64999 : 9999999;
+
+    /// Regions of voxels at or above `low` (NaN counts as that), with the count of those at or above `high` as seeds.
+    /// For integers both are rounded, and cut to the element type. If `labels` is null, it gets an image of kpmalloc,
+    /// which the caller then owns. `components` may be null. Returns the number of components; -1 with an error in the
+    /// log, if the elements aren't numbers or there are too many components (the labels are half done then).
+    static int labelCC(KpTypedPointer data, const int* dims, int neighbours, unsigned short*& labels, int, double low,
+                       double high, int, int, KpDArray<Component>* components);
+
+    /// Regions of equal value in an image of labels, those of value 0 among them. Returns as labelCC().
+    static int labelLabels(unsigned char* data, const int* dims, int neighbours, unsigned short* labels, int, int,
+                           KpDArray<Component>& components);
+    static int labelLabelsHuge(unsigned char* data, const int* dims, int neighbours, int* labels, int, int,
+                               KpDArray<Component>& components);
+
+    /// By the number of voxels, ascending: -1, 0 or 1.
+    static int compareComponents(const Component& a, const Component& b);
+
+    /// The neighbours that come before a voxel in raster order, in the order of merging: `n` steps (dx, dy, dz) and
+    /// their offsets in elements. The arrays hold 13 at least.
+    static void mknbtableprev(int neighbours, const int* dims, int& n, int* offsets, int (*deltas)[3]);
+
+    /// Adds a zeroed entry and returns its index. At the limit, aliases are cleaned out first, in the first `nLabelled`
+    /// labels too; if that makes no room, -1 with an error in the log. L is unsigned short or int.
+    template <typename L>
+    static int addNewComponent(KpDArray<Component>& components, L* labels, int nLabelled);
+
+    /// Drops aliases, and components of fewer than `minVoxels` voxels or `minSeeds` seeds (where those are above 0),
+    /// and renumbers the others in order, in the first `nLabelled` labels too. Returns the new size of the table.
+    template <typename L>
+    static int cleanup_components(KpDArray<Component>& components, L* labels, int nLabelled, int minVoxels,
+                                  int minSeeds);
+
+    /// The pass behind all: regions of voxels not below `low`, or, with `labelMode`, of equal value among them. T is
+    /// unsigned char, short, unsigned short, int, float or double with L unsigned short, or unsigned char with int.
+    /// Time is linear in the voxels; far less than a nanosecond is spent on one in the background.
+    template <typename T, typename L>
+    static int do_label(T* data, L* labels, KpDArray<Component>& components, T low, T high, const int* dims,
+                        int neighbours, int labelMode);
+
+    // Diagnostics of all labellings, set to 0 when one starts.
+    static std::atomic<int> dbg_add;    ///< new components
+    static std::atomic<int> dbg_merge;  ///< always 0
+    static std::atomic<int> dbg_clean;  ///< clean-ups
+};
