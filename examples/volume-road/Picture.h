@@ -15,11 +15,13 @@ struct Picture {
 
     Picture(long w, long h);
 
-    /// Sets a pixel; one that lies outside is left out.
+    /// Sets a pixel, unmarked; one that lies outside is left out.
     void set(long column, long row, unsigned char grey)
     {
-        if (column >= 0 && column < width && row >= 0 && row < height)
-            pixels[row * width + column] = grey;
+        if (column < 0 || column >= width || row < 0 || row >= height)
+            return;
+        pixels[row * width + column] = grey;
+        marks.unset(static_cast<unsigned long>(row * width + column));
     }
     void mark(long column, long row) { marks.set(static_cast<unsigned long>(row * width + column)); }
 };

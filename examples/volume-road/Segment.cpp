@@ -13,41 +13,35 @@
 
 namespace {
 
-constexpr int levels = 256;
 using Bytes = KpDArray<unsigned char>;
 
-/// The volume in 256 grey levels from its lowest to its highest stored value.
-struct Levels {
-    Bytes bytes;
-    double low = 0, step = 1;  ///< of the stored values
-
-    explicit Levels(Volume& volume)
-    {
-        float lowest = 0, highest = 0;
-        const auto count = static_cast<unsigned long>(volume.count());
-        KpRawData::getRange(volume.voxels(), count, lowest, highest);
-        low = lowest;
-        step = std::max(static_cast<double>(highest) - low, 1e-6) / (levels - 1);
-        bytes.resize(volume.count());
-        KpRawData::mapLinear({bytes.data(), KpPrimType::Byte}, volume.voxels(), count, -low + step / 2, 1 / step);
-    }
-    double displayed(int level, const Volume& volume) const
-    {
-        return (low + (level - 0.5) * step) * volume.slope + volume.intercept;
-    }
-    int levelOf(double displayed, const Volume& volume) const
-    {
-        const double stored = (displayed - volume.intercept) / volume.slope;
-        return static_cast<int>(std::clamp(std::ceil((stored - low) / step), 0.0, static_cast<double>(levels)));
-    }
-};
-
-/// The level from which on values belong to the brighter of two classes whose means differ most.
-int otsu(const Bytes& bytes)
+/// The displayed values of all voxels.
+KpDArray<float> displayedValues(Volume& volume)
 {
+    KpDArray<float> values;
+    values.resize(volume.count());
+    const double slope = volume.slope == 0 ? 1 : volume.slope;
+    KpRawData::mapLinear({values.data(), KpPrimType::Float}, volume.voxels(),
+                         static_cast<unsigned long>(volume.count()), volume.intercept / slope, slope);
+    return values;
+}
+
+/// The value from which on others belong to the brighter of two classes whose means differ most, on a scale of 256
+/// levels.
+double otsu(KpDArray<float>& values)
+{
+    constexpr int levels = 256;
+    const KpTypedPointer floats{values.data(), KpPrimType::Float};
+    const auto size = static_cast<unsigned long>(values.size());
+    float low = 0, high = 0;
+    KpRawData::getRange(floats, size, low, high);
+    const double step = std::max(static_cast<double>(high) - static_cast<double>(low), 1e-6) / levels;
+    Bytes level;
+    level.resize(values.size());
+    KpRawData::mapLinear({level.data(), KpPrimType::Byte}, floats, size, -static_cast<double>(low), 1 / step);
     double counts[levels] = {};
-    for (const unsigned char level : bytes)
-        ++counts[level];
+    for (const unsigned char i : level)
+        ++counts[i];
     double total = 0, sum = 0;
     for (int i = 0; i < levels; ++i) {
         total += counts[i];
@@ -67,7 +61,7 @@ int otsu(const Bytes& bytes)
             threshold = i + 1;
         }
     }
-    return threshold;
+    return static_cast<double>(low) + threshold * step;
 }
 
 /// Labels the mask's regions and keeps the largest of them; false if there are too many to number.
@@ -139,24 +133,25 @@ KpResult segment(Volume& volume, const Space& space, std::optional<double> thres
 {
     const ProgressScope scope(&progress);
     progress.startWorking(4, "");
-    Levels grey(volume);
-    const int level = threshold ? grey.levelOf(*threshold, volume) : otsu(grey.bytes);
+    KpDArray<float> values = displayedValues(volume);
     region.isThresholdGiven = threshold.has_value();
-    region.threshold = threshold ? *threshold : grey.displayed(level, volume);
-    for (unsigned char& byte : grey.bytes)
-        byte = byte >= level;
+    region.threshold = threshold ? *threshold : otsu(values);
+    Bytes isAbove;
+    isAbove.resize(values.size());
+    std::transform(values.begin(), values.end(), isAbove.begin(),
+                   [&](float value) { return static_cast<double>(value) >= region.threshold; });
     progress.nextStep();
 
     const int dims[] = {static_cast<int>(volume.dims[0]), static_cast<int>(volume.dims[1]),
                         static_cast<int>(volume.dims[2])};
     const KpVec3i size(dims[0], dims[1], dims[2]);
     KpBitfield mask, eroded;
-    mask.fromLabels(static_cast<unsigned long>(grey.bytes.size()), grey.bytes.data(), 1);
+    mask.fromLabels(static_cast<unsigned long>(isAbove.size()), isAbove.data(), 1);
     KpMorphology::erosion3D(mask, eroded, size, 1, true);
     KpMorphology::dilation3D(eroded, mask, size, 1, true);
     progress.nextStep();
 
-    if (!keepLargest(mask, dims, grey.bytes, region))
+    if (!keepLargest(mask, dims, isAbove, region))
         return badInput("there are too many regions at or above %.6g; choose another value with --threshold",
                         region.threshold);
     progress.nextStep();
