@@ -63,8 +63,9 @@ struct PlainFill {
     void walk(int z, int y, int x, int right)
     {
         for (bool isFirst = true; x <= right; isFirst = false) {
-            while (isOn(x, y, z) && isSet(x, y, z) && x < right && skipSet(x, y, z, right)) {
-            }
+            if (isOn(x, y, z))
+                while (x < right && isSet(x, y, z))
+                    ++x;
             if (!isOn(x, y, z)) {
                 ++x;
             } else if (isSet(x, y, z)) {
@@ -84,12 +85,6 @@ struct PlainFill {
             while (x <= right && !isOn(x, y, z))
                 ++x;
         }
-    }
-    bool skipSet(int& x, int y, int z, int right) const
-    {
-        while (x < right && isSet(x, y, z))
-            ++x;
-        return false;
     }
 };
 

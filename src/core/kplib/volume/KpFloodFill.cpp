@@ -195,7 +195,7 @@ private:
         if (!ground.isOpen(pos, last + 1 - pos))
             return;
         for (bool isFirst = true; pos <= last; isFirst = false) {
-            if ((ground.open(pos) & 1) == 0 && ground.isGround(pos))
+            if (ground.isGround(pos) && ground.isVisited(pos))
                 pos = ground.firstUnvisited(pos, last);
             if (!ground.isGround(pos)) {
                 ++pos;

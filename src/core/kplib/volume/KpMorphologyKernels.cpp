@@ -1,10 +1,10 @@
 #include <kplib/rawdata/detail/KpLoose.h>
 #include <kplib/volume/detail/KpMorphologyKernels.h>
+#include <kplib/volume/detail/KpMorphologyLayout.h>
 
 #include <algorithm>
 #include <cstring>
 #include <memory>
-#include <numeric>
 
 // Slices pass, one after the other, through a row of stages, one a pass of the operation. A slice is one string of
 // bits that starts at a word: steps along y are shifts of the string, steps along x are shifts by one with the ends of
@@ -16,64 +16,12 @@
 namespace kplib::detail {
 namespace {
 
-using Word [[gnu::may_alias]] = std::uint64_t;  // fields are of halves of it
+using Word = MorphologyWord;
+using Stage = MorphologyStage;
+using Layout = MorphologyLayout;
 using LooseWord = Loose<std::uint64_t>;
-constexpr long wordBits = 64, block = 8;  // loops go by blocks, the words of a cache line
-constexpr unsigned long cacheBytes = 768UL << 10;
-constexpr long maxStages = 32, maxStep = 8;
-
-constexpr long roundedUp(long n, long to)
-{
-    return (n + to - 1) / to * to;
-}
-
-/// Does `step` passes at once: slices that step before and behind, too, contribute.
-struct Stage {
-    long step;
-    long delay;   // slices that have come to the first stage before one comes to this
-    long slices;  // where its own begin, counted in slices: that for what is near, then 2 * step for what is far
-    long masks;   // the first of its two
-};
-
-/// The stages, and where things lie in the work area, in words. Each slice has zeros before and behind, for shifts by
-/// rows. Several passes with all 26 neighbours are a box: from a box of radius r one step of r + 1 makes that of 2r +
-/// 1, and where the volume cuts it off nothing is missing, as the ways to each voxel lead through the ones between.
-struct Layout {
-    explicit constexpr Layout(const MorphologyJob& job) :
-        sliceBits(job.nx * job.ny), words(roundedUp(sliceBits, wordBits * block) / wordBits),
-        maskWords(std::min(words, roundedUp(64, maskPeriod(job.nx))))
-    {
-        const bool isBox = job.reach == MorphologyReach::Corners;
-        long done = 0, slices = fixedSlices;
-        for (; count < maxStages && done < job.passes; ++count) {
-            const long step = isBox ? std::min({done + 1, job.passes - done, maxStep}) : 1;
-            stages[count] = {step, done, slices, 2 * count * maskWords};
-            slices += 1 + 2 * step;
-            done += step;
-            pad = std::max(pad, roundedUp(step * job.nx / wordBits + 2, block));
-        }
-        passes = done;
-        masks = pad + slices * (words + pad);
-    }
-    /// The masks of the ends of rows repeat themselves.
-    static constexpr long maskPeriod(long nx) { return std::lcm(nx, wordBits * block) / wordBits; }
-    constexpr long slice(long i) const { return pad + i * (words + pad); }
-    constexpr unsigned long bytes() const
-    {
-        return static_cast<unsigned long>(masks + 2 * count * maskWords + block) * sizeof(Word);
-    }
-
-    static constexpr long fixedSlices = 3;  // two of input by turns, one between the steps along x and y
-
-    long sliceBits;
-    long words;
-    long maskWords;
-    long pad = 0;
-    Stage stages[maxStages]{};
-    long count = 0;
-    long passes = 0;  // in all
-    long masks = 0;
-};
+constexpr long wordBits = Layout::wordBits, block = Layout::block;
+constexpr unsigned long cacheBytes = 768UL << 10;  // most of the second cache
 
 // What follows is compiled for each kind of processor.
 
@@ -205,18 +153,19 @@ struct Passes {
     /// Of the voxels with one `step` before, or behind, them in their row.
     KPLIB_KERNEL_BODY void makeMasks(const Stage& stage) const
     {
-        const long bits = layout.maskWords * wordBits;
+        const auto bits = static_cast<unsigned long>(layout.maskWords * wordBits);
         std::fill_n(notFirst(stage), 2 * layout.maskWords, ~Word{0});
-        for (long first = 0; first < bits; first += job.nx)
-            for (long i = 0; i < std::min(stage.step, job.nx); ++i) {
+        const auto nx = static_cast<unsigned long>(job.nx), ends = std::min(static_cast<unsigned long>(stage.step), nx);
+        for (unsigned long first = 0; first < bits; first += nx)
+            for (unsigned long i = 0; i < ends; ++i) {
                 unset(notFirst(stage), first + i, bits);
-                unset(notLast(stage), first + job.nx - 1 - i, bits);
+                unset(notLast(stage), first + nx - 1 - i, bits);
             }
     }
-    KPLIB_KERNEL_BODY static void unset(Word* mask, long i, long bits)
+    KPLIB_KERNEL_BODY static void unset(Word* mask, unsigned long i, unsigned long bits)
     {
         if (i < bits)
-            mask[i / wordBits] &= ~(Word{1} << i % wordBits);
+            mask[i / 64] &= ~(Word{1} << i % 64);
     }
 
     /// Zeros behind the last voxel.
