@@ -6,6 +6,7 @@
 #include <kplib/rawdata/detail/KpPrimTypeVisit.h>
 #include <kplib/volume/detail/KpComponentTable.h>
 
+#include <algorithm>
 #include <cmath>
 #include <cstring>
 
@@ -65,6 +66,28 @@ T threshold(double value)
         const double rounded = std::floor(value + 0.5);
         return static_cast<T>(kplib::detail::truncatedToInt(rounded >= -2147483648.0 ? rounded : -2147483648.0));
     }
+}
+
+/// Gives each label its new number. Labels come in runs, and most keep theirs: blocks of one label are not looked up
+/// one by one, and not written if nothing changes.
+template <typename L>
+void renumber(L* labels, long n, const int* numbers)
+{
+    constexpr long block = 64 / sizeof(L);
+    long i = 0;
+    for (; i + block <= n; i += block) {
+        L* const at = labels + i;
+        L differences = 0;
+        for (long k = 0; k < block; ++k)
+            differences |= static_cast<L>(at[k] ^ at[0]);
+        if (differences == 0 && numbers[at[0]] == at[0])
+            continue;
+        if (differences == 0)
+            std::fill_n(at, block, static_cast<L>(numbers[at[0]]));
+        else
+            std::transform(at, at + block, at, [=](L label) { return static_cast<L>(numbers[label]); });
+    }
+    std::transform(labels + i, labels + n, labels + i, [=](L label) { return static_cast<L>(numbers[label]); });
 }
 
 bool isTooSmall(unsigned count, int minimum)
@@ -150,8 +173,7 @@ int cleanUpComponents(ComponentTable& components, L* labels, long nLabelled, int
     if (newSize == oldSize)
         return oldSize;
     components.resize(newSize);
-    for (long i = 0; i < nLabelled; ++i)
-        labels[i] = static_cast<L>(numbers[labels[i]]);
+    renumber(labels, nLabelled, numbers.data());
     return newSize;
 }
 

@@ -83,9 +83,13 @@ private:
         return true;
     }
 
-    /// The neighbours in this row's reach, for voxels at either end of the row and between.
+    /// The neighbours in reach of the rows along this border, for voxels at either end of the row and between.
     void findNeighbours()
     {
+        const int border = (y_ == 0 ? 1 : 0) + (y_ + 1 == dims_[1] ? 2 : 0) + (z_ == 0 ? 4 : 0);
+        if (border == border_)
+            return;
+        border_ = border;
         nRows_ = 0;
         for (Steps& steps : steps_)
             steps.n = 0;
@@ -118,7 +122,7 @@ private:
     {
         const T* row = data_ + start_;
         if (isLabelMode_)
-            fillBits(valueChanges(), dims_[0], [=](long i) { return i == 0 || row[i] != row[i - 1]; });
+            fillBits(valueChanges(), dims_[0], [=](long i) { return row[i] != row[std::max(i, 1L) - 1]; });
         else
             fillBits(seeds(), dims_[0], [=, high = high_](long i) { return row[i] >= high; });
         for (long i = 0; i < nWords_ - 1; ++i)
@@ -249,6 +253,7 @@ private:
 
     // Of the row at hand.
     long y_ = 0, z_ = 0, start_ = 0;
+    int border_ = -1;
     Steps steps_[4];
     RowBefore rows_[4];
     int nRows_ = 0;
