@@ -39,7 +39,8 @@ public:
     {
         int offsets[13];
         KpConnectedComponents::mknbtableprev(neighbours, dims, nSteps_, offsets, deltas_);
-        // For a row: foreground, seeds or changes of value, ends of stretches; for two slices: changes of label.
+        // For a row: foreground, seeds (of labels: changes of value), ends of stretches; for two slices: changes of
+        // label.
         bits_.resize(nWords_ * (3 + 2 * dims_[1]));
         std::fill(bits_.begin(), bits_.end(), RowBits{0});
     }
@@ -58,7 +59,6 @@ public:
 private:
     RowBits* foreground() { return bits_.data(); }
     RowBits* seeds() { return bits_.data() + nWords_; }
-    RowBits* valueChanges() { return seeds(); }
     RowBits* ends() { return bits_.data() + 2 * nWords_; }
     RowBits* labelChanges(long y, long z) { return bits_.data() + (3 + (z % 2) * dims_[1] + y) * nWords_; }
 
@@ -121,12 +121,14 @@ private:
     void findEnds()
     {
         const T* row = data_ + start_;
-        if (isLabelMode_)
-            fillBits(valueChanges(), dims_[0], [=](long i) { return row[i] != row[std::max(i, 1L) - 1]; });
-        else
+        if (isLabelMode_) {
+            fillBits(seeds(), dims_[0] - 1, [=](long i) { return row[i + 1] != row[i]; });
+            for (long i = 0; i < nWords_ - 1; ++i)
+                ends()[i] = seeds()[i] << 1 | (i > 0 ? seeds()[i - 1] >> 63 : 0);
+        } else {
             fillBits(seeds(), dims_[0], [=, high = high_](long i) { return row[i] >= high; });
-        for (long i = 0; i < nWords_ - 1; ++i)
-            ends()[i] = isLabelMode_ ? valueChanges()[i] : 0;
+            std::fill_n(ends(), nWords_ - 1, RowBits{0});
+        }
         for (int r = 0; r < nRows_; ++r) {
             const RowBits* before = labelChanges(y_ + rows_[r].dy, z_ - rows_[r].dz);
             for (long i = 0; i < nWords_ - 1; ++i)
