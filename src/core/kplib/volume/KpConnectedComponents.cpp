@@ -8,7 +8,10 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstdint>
 #include <cstring>
+#include <limits>
+#include <type_traits>
 
 using kplib::detail::ComponentTable;
 
@@ -68,26 +71,42 @@ T threshold(double value)
     }
 }
 
+/// Labels in 64 bytes.
+template <typename L>
+constexpr long blockOf = 64 / sizeof(L);
+
+template <typename L>
+bool isOneLabel(const L* block)
+{
+    using Bits = std::make_unsigned_t<L>;
+    const std::uint64_t first = ~std::uint64_t{0} / std::numeric_limits<Bits>::max() * static_cast<Bits>(block[0]);
+    std::uint64_t words[8], differences = 0;
+    std::memcpy(words, block, sizeof words);
+    for (std::uint64_t word : words)
+        differences |= word ^ first;
+    return differences == 0;
+}
+
+template <typename L>
+void renumberEach(L* labels, long n, const int* numbers)
+{
+    std::transform(labels, labels + n, labels, [=](L label) { return static_cast<L>(numbers[label]); });
+}
+
 /// Gives each label its new number. Labels come in runs, and most keep theirs: blocks of one label are not looked up
 /// one by one, and not written if nothing changes.
 template <typename L>
 void renumber(L* labels, long n, const int* numbers)
 {
-    constexpr long block = 64 / sizeof(L);
     long i = 0;
-    for (; i + block <= n; i += block) {
-        L* const at = labels + i;
-        L differences = 0;
-        for (long k = 0; k < block; ++k)
-            differences |= static_cast<L>(at[k] ^ at[0]);
-        if (differences == 0 && numbers[at[0]] == at[0])
-            continue;
-        if (differences == 0)
-            std::fill_n(at, block, static_cast<L>(numbers[at[0]]));
-        else
-            std::transform(at, at + block, at, [=](L label) { return static_cast<L>(numbers[label]); });
+    for (; i + blockOf<L> <= n; i += blockOf<L>) {
+        L* const block = labels + i;
+        if (!isOneLabel(block))
+            renumberEach(block, blockOf<L>, numbers);
+        else if (numbers[block[0]] != block[0])
+            std::fill_n(block, blockOf<L>, static_cast<L>(numbers[block[0]]));
     }
-    std::transform(labels + i, labels + n, labels + i, [=](L label) { return static_cast<L>(numbers[label]); });
+    renumberEach(labels + i, n - i, numbers);
 }
 
 bool isTooSmall(unsigned count, int minimum)

@@ -121,18 +121,22 @@ private:
     void findEnds()
     {
         const T* row = data_ + start_;
+        RowBits* const ends = this->ends();
+        const long n = nWords_ - 1;
         if (isLabelMode_) {
+            const RowBits* changes = seeds();
             fillBits(seeds(), dims_[0] - 1, [=](long i) { return row[i + 1] != row[i]; });
-            for (long i = 0; i < nWords_ - 1; ++i)
-                ends()[i] = seeds()[i] << 1 | (i > 0 ? seeds()[i - 1] >> 63 : 0);
+            for (long i = 0; i < n; ++i)
+                ends[i] = changes[i] << 1 | (i > 0 ? changes[i - 1] >> 63 : 0);
         } else {
             fillBits(seeds(), dims_[0], [=, high = high_](long i) { return row[i] >= high; });
-            std::fill_n(ends(), nWords_ - 1, RowBits{0});
+            std::fill_n(ends, n, RowBits{0});
         }
         for (int r = 0; r < nRows_; ++r) {
             const RowBits* before = labelChanges(y_ + rows_[r].dy, z_ - rows_[r].dz);
-            for (long i = 0; i < nWords_ - 1; ++i)
-                ends()[i] |= rows_[r].isWide ? before[i] >> 1 | before[i + 1] << 63 : before[i];
+            const bool isWide = rows_[r].isWide;
+            for (long i = 0; i < n; ++i)
+                ends[i] |= isWide ? before[i] >> 1 | before[i + 1] << 63 : before[i];
         }
     }
 
