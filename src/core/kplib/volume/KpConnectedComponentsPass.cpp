@@ -269,6 +269,8 @@ private:
 }  // namespace
 }  // namespace kplib::detail
 
+using kplib::detail::ComponentTable;
+
 template <typename T, typename L>
 int KpConnectedComponents::do_label(T* data, L* labels, KpDArray<Component>& components, T low, T high, const int* dims,
                                     int neighbours, int labelMode)
@@ -282,13 +284,16 @@ int KpConnectedComponents::do_label(T* data, L* labels, KpDArray<Component>& com
     return static_cast<int>(components.size()) - 1;
 }
 
-#define KPLIB_DO_LABEL(T, L)                                                                                           \
-    template int KpConnectedComponents::do_label(T*, L*, KpDArray<Component>&, T, T, const int*, int, int);
-KPLIB_DO_LABEL(unsigned char, unsigned short)
-KPLIB_DO_LABEL(unsigned char, int)
-KPLIB_DO_LABEL(short, unsigned short)
-KPLIB_DO_LABEL(unsigned short, unsigned short)
-KPLIB_DO_LABEL(int, unsigned short)
-KPLIB_DO_LABEL(float, unsigned short)
-KPLIB_DO_LABEL(double, unsigned short)
-#undef KPLIB_DO_LABEL
+template int KpConnectedComponents::do_label(unsigned char*, unsigned short*, ComponentTable&, unsigned char,
+                                             unsigned char, const int*, int, int);
+template int KpConnectedComponents::do_label(unsigned char*, int*, ComponentTable&, unsigned char, unsigned char,
+                                             const int*, int, int);
+template int KpConnectedComponents::do_label(short*, unsigned short*, ComponentTable&, short, short, const int*, int,
+                                             int);
+template int KpConnectedComponents::do_label(unsigned short*, unsigned short*, ComponentTable&, unsigned short,
+                                             unsigned short, const int*, int, int);
+template int KpConnectedComponents::do_label(int*, unsigned short*, ComponentTable&, int, int, const int*, int, int);
+template int KpConnectedComponents::do_label(float*, unsigned short*, ComponentTable&, float, float, const int*, int,
+                                             int);
+template int KpConnectedComponents::do_label(double*, unsigned short*, ComponentTable&, double, double, const int*, int,
+                                             int);
