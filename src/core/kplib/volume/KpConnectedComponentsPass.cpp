@@ -194,7 +194,7 @@ private:
         if (m < 0)
             return -1;
         labels_[at] = static_cast<L>(m);
-        if (x == 0 || labels_[at - 1] != labels_[at])
+        if (x > 0 && labels_[at - 1] != labels_[at])
             changes_[x / 64] |= RowBits{1} << x % 64;
         Component& component = components_[m];
         ++component.nVoxels;
