@@ -71,16 +71,16 @@ T threshold(double value)
     }
 }
 
-/// Labels in 64 bytes.
+/// Labels in 32 bytes.
 template <typename L>
-constexpr long blockOf = 64 / sizeof(L);
+constexpr long blockOf = 32 / sizeof(L);
 
 template <typename L>
 bool isOneLabel(const L* block)
 {
     using Bits = std::make_unsigned_t<L>;
     const std::uint64_t first = ~std::uint64_t{0} / std::numeric_limits<Bits>::max() * static_cast<Bits>(block[0]);
-    std::uint64_t words[8], differences = 0;
+    std::uint64_t words[4], differences = 0;
     std::memcpy(words, block, sizeof words);
     for (std::uint64_t word : words)
         differences |= word ^ first;
