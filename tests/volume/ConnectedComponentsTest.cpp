@@ -108,7 +108,6 @@ const struct {
     const char* name;
     Shape shape;
 } shapes[] = {
-    {"full", [](int, int, int) { return 1; }},
     {"stripes along x", [](int, int y, int z) { return y % 2 * (z % 2); }},
     {"stripes along y", [](int x, int, int) { return x % 2; }},
     {"comb", [](int x, int y, int) { return x % 3 == 0 || y == 40; }},
@@ -154,7 +153,7 @@ TEST(KpConnectedComponents, isAsDefinedOnNoise)
 TEST(KpConnectedComponents, isAsDefinedOnShapes)
 {
     for (const auto& [name, shape] : shapes)
-        for (Dims dims : {Dims{{41, 41, 1}}, Dims{{150, 43, 5}}, Dims{{41, 6, 5}}})
+        for (Dims dims : {Dims{{41, 41, 1}}, Dims{{310, 43, 5}}, Dims{{41, 6, 5}}})
             for (int neighbours : allNeighbours)
                 for (int labelMode : {0, 1}) {
                     SCOPED_TRACE(testing::Message()
@@ -163,13 +162,6 @@ TEST(KpConnectedComponents, isAsDefinedOnShapes)
                     expectAsDefined<unsigned char>(data, dims, 1, 2, neighbours, labelMode);
                     expectAsDefined<unsigned char, int>(data, dims, 1, 2, neighbours, labelMode);
                 }
-}
-
-TEST(KpConnectedComponents, roundsLargeSumsAsDefined)
-{
-    for (Dims dims : {Dims{{700, 300, 5}}, Dims{{5000, 60, 1}}, Dims{{100000, 2, 1}}})
-        for (int density : {100, 97})
-            expectAsDefined<unsigned char>(noise<unsigned char>(dims, density / 100.0, 50, 1), dims, 1, 2, 8, 0);
 }
 
 TEST(FloatSums, equalOneAdditionAfterTheOther)

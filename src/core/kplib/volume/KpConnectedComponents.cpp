@@ -6,8 +6,12 @@
 #include <kplib/rawdata/detail/KpPrimTypeVisit.h>
 #include <kplib/volume/detail/KpComponentTable.h>
 
+#include <algorithm>
 #include <cmath>
+#include <cstdint>
 #include <cstring>
+#include <limits>
+#include <type_traits>
 
 using kplib::detail::ComponentTable;
 
@@ -65,6 +69,44 @@ T threshold(double value)
         const double rounded = std::floor(value + 0.5);
         return static_cast<T>(kplib::detail::truncatedToInt(rounded >= -2147483648.0 ? rounded : -2147483648.0));
     }
+}
+
+/// Labels in 32 bytes.
+template <typename L>
+constexpr long blockOf = 32 / sizeof(L);
+
+template <typename L>
+bool isOneLabel(const L* block)
+{
+    using Bits = std::make_unsigned_t<L>;
+    const std::uint64_t first = ~std::uint64_t{0} / std::numeric_limits<Bits>::max() * static_cast<Bits>(block[0]);
+    std::uint64_t words[4], differences = 0;
+    std::memcpy(words, block, sizeof words);
+    for (std::uint64_t word : words)
+        differences |= word ^ first;
+    return differences == 0;
+}
+
+template <typename L>
+void renumberEach(L* labels, long n, const int* numbers)
+{
+    std::transform(labels, labels + n, labels, [=](L label) { return static_cast<L>(numbers[label]); });
+}
+
+/// Gives each label its new number. Labels come in runs, and most keep theirs: blocks of one label are not looked up
+/// one by one, and not written if nothing changes.
+template <typename L>
+void renumber(L* labels, long n, const int* numbers)
+{
+    long i = 0;
+    for (; i + blockOf<L> <= n; i += blockOf<L>) {
+        L* const block = labels + i;
+        if (!isOneLabel(block))
+            renumberEach(block, blockOf<L>, numbers);
+        else if (numbers[block[0]] != block[0])
+            std::fill_n(block, blockOf<L>, static_cast<L>(numbers[block[0]]));
+    }
+    renumberEach(labels + i, n - i, numbers);
 }
 
 bool isTooSmall(unsigned count, int minimum)
@@ -150,8 +192,7 @@ int cleanUpComponents(ComponentTable& components, L* labels, long nLabelled, int
     if (newSize == oldSize)
         return oldSize;
     components.resize(newSize);
-    for (long i = 0; i < nLabelled; ++i)
-        labels[i] = static_cast<L>(numbers[labels[i]]);
+    renumber(labels, nLabelled, numbers.data());
     return newSize;
 }
 

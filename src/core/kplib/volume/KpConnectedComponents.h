@@ -16,7 +16,7 @@
 /// numbers.
 ///
 /// Everything runs on the calling thread; threads may label different images at once. The table grows as the regions
-/// do, and there is scratch of half a bit for each voxel of a slice; exhausted memory is a KpMemoryException.
+/// do, and there is scratch of two bits for each voxel of a slice; exhausted memory is a KpMemoryException.
 class KPLIB_API KpConnectedComponents {
 public:
     struct KPLIB_API Component {

@@ -39,7 +39,8 @@ public:
     {
         int offsets[13];
         KpConnectedComponents::mknbtableprev(neighbours, dims, nSteps_, offsets, deltas_);
-        // For a row: foreground, seeds or changes of value, ends of stretches; for two slices: changes of label.
+        // For a row: foreground, seeds (of labels: changes of value), ends of stretches; for two slices: changes of
+        // label.
         bits_.resize(nWords_ * (3 + 2 * dims_[1]));
         std::fill(bits_.begin(), bits_.end(), RowBits{0});
     }
@@ -58,7 +59,6 @@ public:
 private:
     RowBits* foreground() { return bits_.data(); }
     RowBits* seeds() { return bits_.data() + nWords_; }
-    RowBits* valueChanges() { return seeds(); }
     RowBits* ends() { return bits_.data() + 2 * nWords_; }
     RowBits* labelChanges(long y, long z) { return bits_.data() + (3 + (z % 2) * dims_[1] + y) * nWords_; }
 
@@ -83,9 +83,13 @@ private:
         return true;
     }
 
-    /// The neighbours in this row's reach, for voxels at either end of the row and between.
+    /// The neighbours in reach of the rows along this border, for voxels at either end of the row and between.
     void findNeighbours()
     {
+        const int border = (y_ == 0 ? 1 : 0) + (y_ + 1 == dims_[1] ? 2 : 0) + (z_ == 0 ? 4 : 0);
+        if (border == border_)
+            return;
+        border_ = border;
         nRows_ = 0;
         for (Steps& steps : steps_)
             steps.n = 0;
@@ -117,16 +121,22 @@ private:
     void findEnds()
     {
         const T* row = data_ + start_;
-        if (isLabelMode_)
-            fillBits(valueChanges(), dims_[0], [=](long i) { return i == 0 || row[i] != row[i - 1]; });
-        else
+        RowBits* const ends = this->ends();
+        const long n = nWords_ - 1;
+        if (isLabelMode_) {
+            const RowBits* changes = seeds();
+            fillBits(seeds(), dims_[0] - 1, [=](long i) { return row[i + 1] != row[i]; });
+            for (long i = 0; i < n; ++i)
+                ends[i] = changes[i] << 1 | (i > 0 ? changes[i - 1] >> 63 : 0);
+        } else {
             fillBits(seeds(), dims_[0], [=, high = high_](long i) { return row[i] >= high; });
-        for (long i = 0; i < nWords_ - 1; ++i)
-            ends()[i] = isLabelMode_ ? valueChanges()[i] : 0;
+            std::fill_n(ends, n, RowBits{0});
+        }
         for (int r = 0; r < nRows_; ++r) {
             const RowBits* before = labelChanges(y_ + rows_[r].dy, z_ - rows_[r].dz);
-            for (long i = 0; i < nWords_ - 1; ++i)
-                ends()[i] |= rows_[r].isWide ? before[i] >> 1 | before[i + 1] << 63 : before[i];
+            const bool isWide = rows_[r].isWide;
+            for (long i = 0; i < n; ++i)
+                ends[i] |= isWide ? before[i] >> 1 | before[i + 1] << 63 : before[i];
         }
     }
 
@@ -184,7 +194,7 @@ private:
         if (m < 0)
             return -1;
         labels_[at] = static_cast<L>(m);
-        if (x == 0 || labels_[at - 1] != labels_[at])
+        if (x > 0 && labels_[at - 1] != labels_[at])
             changes_[x / 64] |= RowBits{1} << x % 64;
         Component& component = components_[m];
         ++component.nVoxels;
@@ -249,6 +259,7 @@ private:
 
     // Of the row at hand.
     long y_ = 0, z_ = 0, start_ = 0;
+    int border_ = -1;
     Steps steps_[4];
     RowBefore rows_[4];
     int nRows_ = 0;
@@ -257,6 +268,8 @@ private:
 
 }  // namespace
 }  // namespace kplib::detail
+
+using kplib::detail::ComponentTable;
 
 template <typename T, typename L>
 int KpConnectedComponents::do_label(T* data, L* labels, KpDArray<Component>& components, T low, T high, const int* dims,
@@ -271,13 +284,16 @@ int KpConnectedComponents::do_label(T* data, L* labels, KpDArray<Component>& com
     return static_cast<int>(components.size()) - 1;
 }
 
-#define KPLIB_DO_LABEL(T, L)                                                                                           \
-    template int KpConnectedComponents::do_label(T*, L*, KpDArray<Component>&, T, T, const int*, int, int);
-KPLIB_DO_LABEL(unsigned char, unsigned short)
-KPLIB_DO_LABEL(unsigned char, int)
-KPLIB_DO_LABEL(short, unsigned short)
-KPLIB_DO_LABEL(unsigned short, unsigned short)
-KPLIB_DO_LABEL(int, unsigned short)
-KPLIB_DO_LABEL(float, unsigned short)
-KPLIB_DO_LABEL(double, unsigned short)
-#undef KPLIB_DO_LABEL
+template int KpConnectedComponents::do_label(unsigned char*, unsigned short*, ComponentTable&, unsigned char,
+                                             unsigned char, const int*, int, int);
+template int KpConnectedComponents::do_label(unsigned char*, int*, ComponentTable&, unsigned char, unsigned char,
+                                             const int*, int, int);
+template int KpConnectedComponents::do_label(short*, unsigned short*, ComponentTable&, short, short, const int*, int,
+                                             int);
+template int KpConnectedComponents::do_label(unsigned short*, unsigned short*, ComponentTable&, unsigned short,
+                                             unsigned short, const int*, int, int);
+template int KpConnectedComponents::do_label(int*, unsigned short*, ComponentTable&, int, int, const int*, int, int);
+template int KpConnectedComponents::do_label(float*, unsigned short*, ComponentTable&, float, float, const int*, int,
+                                             int);
+template int KpConnectedComponents::do_label(double*, unsigned short*, ComponentTable&, double, double, const int*, int,
+                                             int);

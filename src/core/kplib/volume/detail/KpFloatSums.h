@@ -68,8 +68,9 @@ inline float plusRamp(float sum, long first, long n)
     constexpr long few = 16;
     while (n > 0) {
         const FloatGrid grid(sum);
-        if (grid.unit == 1 && static_cast<long>(sum) + n * first + n * (n - 1) / 2 <= grid.top)
-            return sum + static_cast<float>(n * first + n * (n - 1) / 2);
+        const long total = n * first + n * (n - 1) / 2;
+        if (grid.unit == 1 && static_cast<long>(sum) + total <= grid.top)
+            return sum + static_cast<float>(total);
         if (grid.unit > 2 && n > few && static_cast<long>(sum) + n * (first + n + grid.unit) <= grid.top)
             return plusRampWithin(grid, sum, first, n);
         for (long i = std::min(n, few); i > 0; --i, --n)
