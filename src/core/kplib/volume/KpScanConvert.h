@@ -35,10 +35,10 @@ public:
 
     /// The span callback at the start: hands the pixels on to the pixel callback of the object that renders.
     static void defaultSpanCB(void* userData, int xLeft, int xRight, int y);
-
-private:
+    /// Hands a span on to the span callback of the object that renders. Both do nothing if none does on this thread.
     static void concaveCB(int y, int xLeft, int xRight);
 
+private:
     void* userData_ = nullptr;
     SpanCB spanCB_ = defaultSpanCB;
     PixelCB pixelCB_ = nullptr;
