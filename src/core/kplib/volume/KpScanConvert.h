@@ -30,7 +30,8 @@ public:
     }
 
     /// Reports the polygon of `n` vertices, which closes itself. Fewer than 3 vertices enclose nothing. O(n log n), and
-    /// a span costs a few comparisons; polygons of a few hundred vertices allocate nothing.
+    /// a span costs a few comparisons. Polygons of a few hundred vertices allocate nothing; larger ones may end in a
+    /// std::bad_alloc.
     void render(int n, const KpVec2f* points);
 
     /// The span callback at the start: hands the pixels on to the pixel callback of the object that renders.
