@@ -8,30 +8,27 @@ using namespace kplib::detail;
 
 TEST(RowTools, scaledRowsAreRoundedAfterEachStep)
 {
-    for (long n : {0, 1, 3, 4, 5, 15, 16, 17, 100, 1003})
-        for (long start : {0, 1, 3})
-            for (float factor : {0.1f, -3e30f}) {
-                SCOPED_TRACE(testing::Message() << n << '+' << start << " by " << factor);
+    for (long n : {0, 1, 3, 4, 5, 15, 16, 17, 102, 1003})
+        for (float factor : {0.1f, -3e30f})
+            for (bool adds : {false, true}) {
+                SCOPED_TRACE(testing::Message() << n << " by " << factor << (adds ? " added" : " stored"));
+                const long start = n % 4;
                 auto src = someValues<float>(n + start, 1);
                 const auto dst = someValues<float>(n + start, 2);
-                std::vector<float> stored = dst, added = dst;
+                std::vector<float> expected = dst, result = dst;
                 for (long i = start; i < n + start; ++i) {
                     volatile float product = src[i] * factor;
-                    stored[i] = product;
-                    added[i] = dst[i] + product;
+                    expected[i] = adds ? dst[i] + product : product;
                 }
-                const auto expectRows = [&](auto paths, const auto& expected) {
-                    for (const auto& path : paths)
-                        if (path.usable) {
-                            std::vector<float> result = dst;
-                            path.run(src.data() + start, factor, n, result.data() + start);
-                            EXPECT_TRUE(areSame(result, expected)) << path.name;
-                        }
-                };
-                expectRows(multiplyAndStorePaths(), stored);
-                expectRows(multiplyAndAddPaths(), added);
-                EXPECT_EQ(TmSSETools::multiplyAndAddUnaligned(src.data(), factor, n, stored.data()), stored.data() + n);
-                EXPECT_EQ(TmSSETools::multiplyAndStoreUnaligned(src.data(), factor, n, src.data()), src.data() + n);
+                auto* const run = adds ? TmSSETools::multiplyAndAddUnaligned : TmSSETools::multiplyAndStoreUnaligned;
+                EXPECT_EQ(run(src.data() + start, factor, n, result.data() + start), result.data() + n + start);
+                EXPECT_TRUE(areSame(result, expected));
+                for (const auto& path : adds ? multiplyAndAddPaths() : multiplyAndStorePaths())
+                    if (path.usable) {
+                        result = dst;
+                        path.run(src.data() + start, factor, n, result.data() + start);
+                        EXPECT_TRUE(areSame(result, expected)) << path.name;
+                    }
             }
 }
 
@@ -43,23 +40,21 @@ TEST(RowTools, mirrorsRowsInPlaceAndInCopies)
                 SCOPED_TRACE(testing::Message() << rows << " rows of " << width << " to " << room);
                 const long n = std::max(rows, 0L);
                 const auto bytes = someValues<std::uint8_t>(n * width, 5);
-                std::vector<std::uint8_t> mirrored = bytes, expected = bytes, copy(n * room, 7), expectedCopy = copy;
+                std::vector<std::uint8_t> copy(n * room, 7), expected = copy, mirrored = bytes;
                 for (long y = 0; y < n; ++y)
-                    for (long x = 0; x < width; ++x) {
-                        expected[(n - 1 - y) * width + x] = bytes[y * width + x];
-                        if (x < room)
-                            expectedCopy[(n - 1 - y) * room + x] = bytes[y * width + x];
-                    }
-                TmSSETools::mirrorY(reinterpret_cast<char*>(mirrored.data()), rows, width);
-                EXPECT_EQ(mirrored, expected);
+                    std::copy_n(bytes.data() + y * width, std::min(width, room), expected.data() + (n - 1 - y) * room);
                 TmSSETools::memcpyMirrorY(bytes.data(), rows, width, copy.data(), room);
-                EXPECT_EQ(copy, expectedCopy);
+                EXPECT_EQ(copy, expected);
+                if (room != width)
+                    continue;
+                auto* const data = reinterpret_cast<char*>(mirrored.data());
+                TmSSETools::mirrorY(data, rows, width);
+                EXPECT_EQ(mirrored, expected);
                 for (const auto& path : swapRowsPaths())
                     if (path.usable && n == 2) {
-                        mirrored = bytes;
-                        auto* const row = reinterpret_cast<char*>(mirrored.data());
-                        path.run(row, row + width, width);
-                        EXPECT_EQ(mirrored, expected) << path.name;
+                        path.run(data, data + width, width);
+                        EXPECT_EQ(mirrored, bytes) << path.name;
+                        mirrored = expected;
                     }
             }
 }

@@ -1,15 +1,14 @@
 #include <kplib/foundation/KpMemoryException.h>
 #include <kplib/foundation/KpString.h>
-#include <kplib/system/KpCoder.h>
 #include <kplib/volume/KpBitfield.h>
 #include <kplib/volume/detail/KpBitfieldKernels.h>
-#include <support/ExhaustedMemory.h>
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
+#include <functional>
 #include <random>
 #include <string>
 #include <vector>
@@ -21,12 +20,9 @@ namespace {
 using Words = std::vector<BitWord>;
 using Labels = std::vector<unsigned char>;
 
-const std::vector<unsigned long> sizes = [] {
-    std::vector<unsigned long> all = {511, 512, 513, 543, 544, 4095, 4096, 4097, 8200, 12345};
-    for (unsigned long n = 0; n <= 130; ++n)
-        all.push_back(n);
-    return all;
-}();
+constexpr unsigned long sizes[] = {0,   1,   2,   3,   4,   5,   7,   27,  30,  31,   32,   33,   34,   36,   61,
+                                   63,  64,  65,  67,  95,  96,  97,  98,  99,  125,  127,  128,  129,  130,  191,
+                                   192, 193, 255, 256, 511, 512, 513, 543, 544, 4095, 4096, 4097, 8200, 12345};
 
 /// Bits alike, alike but for one, or noise, by the seed; behind the last bit there is noise.
 KpBitfield someField(unsigned long nBits, unsigned seed)
@@ -58,22 +54,6 @@ Labels someLabels(unsigned long n, unsigned seed)
 
 }  // namespace
 
-TEST(KpBitfield, countsOneWordBeyondTheFullOnes)
-{
-    for (auto [bits, words] : {std::pair{0UL, 0UL}, {1, 1}, {31, 1}, {32, 2}, {33, 2}, {64, 3}}) {
-        KpBitfield field(bits, KpBitfield::INIT_UNSET);
-        EXPECT_TRUE(field.nBits() == bits && wordsOf(field) == Words(words, 0));
-        field.toggleAll();
-        EXPECT_EQ(wordsOf(field), Words(words, ~0U)) << "with the spare word";
-        field.unsetAll();
-        EXPECT_EQ(wordsOf(field), Words(words, 0));
-        field.setAll();
-        EXPECT_EQ(wordsOf(field), Words(words, ~0U));
-        field.resize(0, KpBitfield::INIT_SET);
-        EXPECT_TRUE(field.nBits() == 0 && field.nWords() == 0 && field.data() == nullptr);
-    }
-}
-
 TEST(KpBitfield, copiesByItselfAndMovesItsStorage)
 {
     const KpBitfield field = someField(100, 5);
@@ -84,8 +64,7 @@ TEST(KpBitfield, copiesByItselfAndMovesItsStorage)
     const auto* const storage = other.data();
     copy = KpBitfield(std::move(other));
     EXPECT_TRUE(copy.data() == storage && copy == field);
-    copy = KpBitfield();
-    EXPECT_TRUE(copy == KpBitfield() && copy != field);
+    EXPECT_TRUE(KpBitfield() == KpBitfield() && KpBitfield() != field);
 }
 
 TEST(KpBitfield, resizingFillsWhatIsAddedButForASpareWord)
@@ -96,46 +75,31 @@ TEST(KpBitfield, resizingFillsWhatIsAddedButForASpareWord)
             for (auto init : {KpBitfield::INIT_SET, KpBitfield::INIT_UNSET, KpBitfield::INIT_NONE}) {
                 KpBitfield field(old, KpBitfield::INIT_NONE);
                 std::fill_n(field.data(), field.nWords(), before);
-                const unsigned long oldEnd = field.nWords() * 32;
+                const unsigned long oldEnd = field.nWords() * 32, words = now == 0 ? 0 : now / 32 + 1;
                 field.resize(now, init);
+                ASSERT_TRUE(field.nBits() == now && field.nWords() == words && (now != 0 || !field.data()));
                 const bool fills = init != KpBitfield::INIT_NONE, fillsLast = fills && old % 32 != 0 && now > old;
-                for (unsigned long i = 0; i < (fills ? field.nWords() * 32 : std::min(now, oldEnd)); ++i) {
+                for (unsigned long i = 0; i < (fills ? words * 32 : std::min(now, oldEnd)); ++i) {
                     const bool isAdded = i >= oldEnd || (i >= old && fillsLast);
                     ASSERT_EQ(field.test(i), isAdded ? init == KpBitfield::INIT_SET : (before >> i % 32) % 2 != 0)
                         << old << " to " << now << " by " << init << " at " << i;
                 }
+                field.setAll();
+                ASSERT_EQ(wordsOf(field), Words(words, ~0U)) << "with the spare word";
+                field.toggleAll();
+                ASSERT_EQ(wordsOf(field), Words(words, 0));
             }
 }
 
-TEST(KpBitfield, setsRangesAndSingleBits)
+TEST(KpBitfield, setsRanges)
 {
     for (unsigned long from = 0; from < 66; ++from)
         for (unsigned long to : {from, from + 1, from + 31, from + 32, from + 90}) {
-            KpBitfield field(200, KpBitfield::INIT_UNSET);
+            KpBitfield field(200, KpBitfield::INIT_UNSET), expected = field;
             field.setRange(from, to);
             for (unsigned long i = from; i <= to; ++i)
-                field.unset(i);
-            EXPECT_EQ(field.nSetBits(), 0u);
-            field.setRange(from, to);
-            EXPECT_TRUE(field.nSetBits() == to - from + 1 && field.firstSetBit() == from && field.lastSetBit() == to);
-        }
-}
-
-TEST(KpBitfield, logicGoesOverTheWordsOfTheShorter)
-{
-    for (unsigned long n : sizes)
-        for (unsigned long nB : {n, n + 40, n / 2, 0UL}) {
-            const KpBitfield a = someField(n, 4), b = someField(nB, 5);
-            KpBitfield results[] = {a, a, a};
-            results[0] &= b;
-            results[1] |= b;
-            results[2] ^= b;
-            for (unsigned long i = 0; i < a.nWords(); ++i) {
-                const bool isBoth = i < b.nWords();
-                const BitWord x = a.data()[i], y = isBoth ? b.data()[i] : 0;
-                ASSERT_EQ(results[0].data()[i], isBoth ? x & y : x);
-                ASSERT_TRUE(results[1].data()[i] == (x | y) && results[2].data()[i] == (x ^ y));
-            }
+                expected.set(i);
+            EXPECT_EQ(wordsOf(field), wordsOf(expected)) << from << " to " << to;
         }
 }
 
@@ -158,11 +122,12 @@ TEST(KpBitfield, answersByItsBitsAndIgnoresWhatLiesBehind)
         }
 }
 
-TEST(KpBitfield, comparesTheBitsThatBothHave)
+TEST(KpBitfield, joinsTheWordsAndComparesTheBitsThatBothHave)
 {
     for (unsigned long n : sizes)
-        for (unsigned long nB : {n, n + 1, n / 2})
+        for (unsigned long nB : {n, n + 1, n + 40, n / 2})
             for (unsigned seed = 0; seed < 12; ++seed) {
+                SCOPED_TRACE(testing::Message() << n << " and " << nB << " bits, seed " << seed);
                 const KpBitfield a = someField(n, seed), b = someField(nB, seed % 7);
                 bool contains = true, meets = false, isContained = true;
                 for (unsigned long i = 0; i < std::min(n, nB); ++i) {
@@ -170,37 +135,42 @@ TEST(KpBitfield, comparesTheBitsThatBothHave)
                     isContained = isContained && (b.test(i) || !a.test(i));
                     meets = meets || (a.test(i) && b.test(i));
                 }
-                SCOPED_TRACE(testing::Message() << n << " and " << nB << " bits, seed " << seed);
                 ASSERT_TRUE(a.isSuperset(b) == contains && a.isSubset(b) == isContained);
                 ASSERT_TRUE(a.hasIntersection(b) == meets && (a == b) == (n == nB && contains && isContained));
+                KpBitfield both = a, either = a, one = a;
+                both &= b, either |= b, one ^= b;
+                for (unsigned long i = 0; i < a.nWords(); ++i) {
+                    const BitWord x = a.data()[i], y = i < b.nWords() ? b.data()[i] : 0;
+                    ASSERT_EQ(both.data()[i], i < b.nWords() ? x & y : x);
+                    ASSERT_TRUE(either.data()[i] == (x | y) && one.data()[i] == (x ^ y));
+                }
             }
 }
 
 TEST(BitfieldKernels, everyRowEqualsThePlainOne)
 {
-    for (unsigned long n : {0, 1, 2, 63, 64, 65, 127, 128, 129, 255, 256, 300, 1000})
+    for (unsigned long n : {0, 1, 63, 64, 65, 127, 128, 129, 256, 300, 1000})
         for (unsigned seed = 0; seed < 6; ++seed) {
-            SCOPED_TRACE(testing::Message() << n << " words, seed " << seed);
             const Words a = wordsOf(someField(n * 32, seed)), b = wordsOf(someField(n * 32, seed / 2 + 7));
-            const auto expectSame = [](auto paths, auto ask) {
+            const auto expectSame = [=](auto paths, auto... arguments) {
                 for (const auto& path : paths)
                     if (path.usable) {
-                        EXPECT_EQ(ask(path.run), ask(paths[0].run)) << path.name;
+                        EXPECT_EQ(path.run(arguments...), paths[0].run(arguments...)) << path.name << n << ' ' << seed;
                     }
             };
-            const auto any = [&](auto* run) { return run(a.data(), b.data(), n); };
-            expectSame(countPaths(), [&](auto* run) { return run(a.data(), n); });
+            expectSame(countPaths(), a.data(), n);
             for (BitWord skipped : {0U, ~0U}) {
-                expectSame(findFirstPaths(), [&](auto* run) { return run(a.data(), n, skipped); });
-                expectSame(findLastPaths(), [&](auto* run) { return run(a.data(), n, skipped); });
+                expectSame(findFirstPaths(), a.data(), n, skipped);
+                expectSame(findLastPaths(), a.data(), n, skipped);
             }
-            expectSame(anyPaths<BitAnd>(), any);
-            expectSame(anyPaths<BitsMissing>(), any);
-            expectSame(combinePaths<BitXor>(), [&](auto* run) {
-                Words result = a;
-                run(result.data(), b.data(), n);
-                return result;
-            });
+            expectSame(anyPaths<BitAnd>(), a.data(), b.data(), n);
+            expectSame(anyPaths<BitsMissing>(), a.data(), b.data(), n);
+            for (const auto& path : combinePaths<BitXor>())
+                if (Words result = a, expected = a; path.usable) {
+                    path.run(result.data(), b.data(), n);
+                    std::transform(a.data(), a.data() + n, b.data(), expected.data(), std::bit_xor());
+                    EXPECT_EQ(result, expected) << path.name << n;
+                }
         }
 }
 
@@ -216,13 +186,12 @@ TEST(KpBitfield, takesTheVoxelsOfALabel)
                 const bool isSkipped = i / 4 * 4 + 4 <= n && std::count(four, four + 4, 0) == 4;
                 expected[i / 32] |= labels[start + i] == label && !isSkipped ? 1U << i % 32 : 0;
             }
-            for (const auto& path : fromLabelsPaths()) {
-                Words words(n / 32 + 1, 0x12345678);
+            for (const auto& path : fromLabelsPaths())
                 if (path.usable) {
+                    Words words(n / 32 + 1, 0x12345678);
                     path.run(words.data(), labels.data() + start, n, label);
                     ASSERT_EQ(words, expected) << path.name << ' ' << n << '+' << start << " label " << int(label);
                 }
-            }
         }
     KpBitfield field(400, KpBitfield::INIT_SET);
     const unsigned char labels[] = {0, 1, 0, 0, 0, 0, 0, 0, 0, 0};
@@ -245,13 +214,12 @@ TEST(KpBitfield, mergesIntoLabelsByPolicy)
                     const bool writes[] = {false, isSet, isSet && isFree, true, isOwn};
                     v = !writes[policy] ? v : isSet ? label : 0;
                 }
-                for (const auto& path : toLabelsPaths()) {
-                    Labels result = labels;
+                for (const auto& path : toLabelsPaths())
                     if (path.usable) {
+                        Labels result = labels;
                         path.run(KpBitfield::InsertPolicy(policy))(field.data(), result.data() + start, n, label);
                         ASSERT_EQ(result, expected) << path.name << ' ' << n << ' ' << policy << ' ' << int(label);
                     }
-                }
             }
     KpBitfield field(40, KpBitfield::INIT_SET);
     Labels labels(41, 7);
@@ -278,46 +246,35 @@ TEST(KpBitfield, filesHoldTheBytesOfTheBits)
     EXPECT_FALSE(field.load(path.c_str(), 150)) << "too short";
     EXPECT_EQ(wordsOf(field), wordsOf(expected));
     std::filesystem::remove(path);
-    EXPECT_FALSE(field.load(path.c_str(), 96));
-    EXPECT_EQ(wordsOf(field), Words(4, 0));
+    EXPECT_TRUE(!field.load(path.c_str(), 96) && wordsOf(field) == Words(4, 0));
     EXPECT_FALSE(field.save("/no/such/folder/bitfield"));
     EXPECT_FALSE(KpBitfield(1 << 20, KpBitfield::INIT_SET).save("/dev/full"));
 }
 
 TEST(KpBitfield, digestTakesAQuarterOfTheBitsAndTheLastWord)
 {
-    for (unsigned long n : {0, 1, 31, 32, 33, 64, 1000, 1024}) {
-        const KpBitfield field = someField(n, 4);
-        std::string bytes(reinterpret_cast<const char*>(field.data()), n / 32);
-        const BitWord last = n == 0 ? 0 : field.data()[n / 32] & (n % 32 ? (1U << n % 32) - 1 : ~0U);
-        bytes.append(reinterpret_cast<const char*>(&last), n == 0 ? 0 : 4);
-        KpCoder coder;
-        coder.crcMD5Update(reinterpret_cast<const unsigned char*>(bytes.data()), static_cast<unsigned>(bytes.size()));
-        coder.crcMD5Final();
-        unsigned char digest[16];
-        coder.crcMD5Query(digest);
-        KpString expected, text;
-        KpCoder::dataToHexString(digest, 16, expected, true);
+    const struct {
+        unsigned long nBits;
+        Words words;
+        const char* digest;
+    } cases[] = {
+        {0, {}, "D41D8CD98F00B204E9800998ECF8427E"},                                     // nothing
+        {64, {0xFFFF6261, 0x12345678, 0x66656463}, "E80B5017098950FC58AAD83C8C14978E"},  // abcdef
+        {104, {0xFF636261, 1, 2, 0xFFFFFF64}, "181C9F04920A0CAED5C51A8FF26DD8D1"},       // abcd and three zeros
+    };
+    for (const auto& c : cases) {
+        KpBitfield field(c.nBits, KpBitfield::INIT_NONE);
+        std::copy(c.words.begin(), c.words.end(), field.data());
+        KpString text;
         field.md5(text);
-        EXPECT_STREQ(text.c_str(), expected.c_str()) << n;
+        EXPECT_STREQ(text.c_str(), c.digest);
     }
 }
 
 TEST(KpBitfield, exhaustedMemoryLeavesTheFieldAsItWas)
 {
-    const KpBitfield before = someField(100, 4), large(5000, KpBitfield::INIT_SET);
-    const Labels labels(5000, 1);
+    const KpBitfield before = someField(100, 4);
     KpBitfield field = before;
-    for (int kind : {0, 1, 2})
-        kplib::test::failAtEachAllocation(
-            [&] {
-                kind == 0   ? field.resize(5000, KpBitfield::INIT_SET)
-                : kind == 1 ? void(field = large)
-                            : field.fromLabels(5000, labels.data(), 1);
-            },
-            [&] {
-                EXPECT_TRUE(field.nBits() == 5000 || wordsOf(field) == wordsOf(before));
-                field = before;
-            });
     EXPECT_THROW(field.resize(~0UL, KpBitfield::INIT_SET), KpMemoryException);
+    EXPECT_TRUE(field == before && wordsOf(field) == wordsOf(before));
 }

@@ -112,10 +112,11 @@ public:
     static bool crop(void*& data, int bytesPerVoxel, int* dims, const int* min, const int* max, const void* fillValue);
 
     /// Changes the order of the axes in place: axis i becomes what axis perm[i] was, and `dims` tells the new sizes. A
-    /// voxel has `nDataVar` elements, which stay together. Takes one slice of the two largest sizes and a bit a row of
-    /// memory meanwhile. False, and nothing changes, if `perm` is no permutation of 0, 1, 2, if there is no memory, or,
-    /// with a line in the log, for elements that are no numbers (but for voxels of four bytes). F. Gustavson, L.
-    /// Karlsson and B. Kagstrom, "Parallel and cache-efficient in-place matrix storage format conversion", 2012.
+    /// voxel has `nDataVar` elements, which stay together; if isConstant() holds for all of them, only the sizes
+    /// change. Takes one slice of the two largest sizes and a bit a row of memory meanwhile. False, and nothing
+    /// changes, if `perm` is no permutation of 0, 1, 2, if there is no memory, or, with a line in the log, for elements
+    /// that are no numbers (but for voxels of four bytes). F. Gustavson, L. Karlsson and B. Kagstrom, "Parallel and
+    /// cache-efficient in-place matrix storage format conversion", 2012.
     static bool swapDims(KpTypedPointer data, int* dims, const int* perm, int nDataVar);
     /// @}
 

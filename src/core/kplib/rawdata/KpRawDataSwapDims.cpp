@@ -1,6 +1,5 @@
 #include <kplib/rawdata/KpRawData.h>
 
-#include <kplib/foundation/KpException.h>
 #include <kplib/foundation/KpMemoryException.h>
 #include <kplib/log/KpLogFile.h>
 #include <kplib/rawdata/detail/KpPrimTypeVisit.h>

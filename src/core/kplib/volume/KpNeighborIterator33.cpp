@@ -126,6 +126,7 @@ void KpNeighborIterator33::setIntegers(const Weight* w, int sort)
     if (!isFilled())
         return;
     for (int i = 0; i < nNeighbors_; ++i)
+        // NOLINTNEXTLINE(bugprone-signed-char-misuse): small weights below 0 are meant
         iweights_[i] = w[13 + deltas_[i][0] + 3 * deltas_[i][1] + 9 * deltas_[i][2]];
     if (sort != 0)
         sort_iweights();

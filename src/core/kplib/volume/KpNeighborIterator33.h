@@ -7,7 +7,8 @@
 /// The neighbours of a voxel in a 3x3x3 window of a dense volume, x fastest: a table of offsets, directions and weights
 /// that a loop over neighbours walks without arithmetic on coordinates.
 ///
-/// It serves volumes of one size. Once weights are set, any number of threads may read it; nothing is allocated.
+/// It serves volumes of one size, with slices of fewer than 2^31 voxels. Once weights are set, any number of threads
+/// may read it.
 class KPLIB_API KpNeighborIterator33 {
 public:
     static constexpr int maxNeighbors = 26;
@@ -28,8 +29,8 @@ public:
     void setWeights(const int* w, int sort);
     void setWeights(const float* w, int sort);
 
-    /// Sorts all by ascending weight, as integers or as floats, and gives the index of the first positive one (of
-    /// integers at least 1); 26 if there is none.
+    /// Sorts all by ascending weight, by the integers rounded to float or by the floats, and gives the index of the
+    /// first positive one; 26 if there is none.
     int sort_iweights();
     int sort_fweights();
 

@@ -146,7 +146,8 @@ void KpScanConvert::render(int n, const KpVec2f* points)
 
 void KpScanConvert::concaveCB(int y, int xLeft, int xRight)
 {
-    current->spanCB_(current->userData_, xLeft, xRight, y);
+    if (current)
+        current->spanCB_(current->userData_, xLeft, xRight, y);
 }
 
 void KpScanConvert::defaultSpanCB(void* userData, int xLeft, int xRight, int y)

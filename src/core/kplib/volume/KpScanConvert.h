@@ -30,15 +30,16 @@ public:
     }
 
     /// Reports the polygon of `n` vertices, which closes itself. Fewer than 3 vertices enclose nothing. O(n log n), and
-    /// a span costs a few comparisons; polygons of a few hundred vertices allocate nothing.
+    /// a span costs a few comparisons. Polygons of a few hundred vertices allocate nothing; larger ones may end in a
+    /// std::bad_alloc.
     void render(int n, const KpVec2f* points);
 
     /// The span callback at the start: hands the pixels on to the pixel callback of the object that renders.
     static void defaultSpanCB(void* userData, int xLeft, int xRight, int y);
-
-private:
+    /// Hands a span on to the span callback of the object that renders. Both do nothing if none does on this thread.
     static void concaveCB(int y, int xLeft, int xRight);
 
+private:
     void* userData_ = nullptr;
     SpanCB spanCB_ = defaultSpanCB;
     PixelCB pixelCB_ = nullptr;
