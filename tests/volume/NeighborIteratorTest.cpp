@@ -27,15 +27,15 @@ void expectWhole(const KpNeighborIterator33& table, const std::vector<Weight>& w
 {
     std::set<int> offsets;
     for (int i = 0; i < table.nNeighbors(); ++i) {
-        const std::int8_t* const d = table.delta(i);
-        EXPECT_EQ(table.offset(i), d[0] + 10 * d[1] + 200 * d[2]);
+        const std::int8_t* const d = table.deltas()[i];
+        EXPECT_EQ(table.offsets()[i], d[0] + 10 * d[1] + 200 * d[2]);
         const int border =
             (d[0] < 0) + 2 * (d[0] > 0) + 4 * (d[1] < 0) + 8 * (d[1] > 0) + 16 * (d[2] < 0) + 32 * (d[2] > 0);
-        EXPECT_EQ(table.border(i), border);
+        EXPECT_EQ(table.borders()[i], border);
         const Weight weight = weights[static_cast<std::size_t>(13 + d[0] + 3 * d[1] + 9 * d[2])];
-        EXPECT_EQ(table.fweight(i), static_cast<float>(weight));
-        EXPECT_EQ(table.iweight(i), static_cast<int>(weight));
-        offsets.insert(table.offset(i));
+        EXPECT_EQ(table.fweights()[i], static_cast<float>(weight));
+        EXPECT_EQ(table.iweights()[i], static_cast<int>(weight));
+        offsets.insert(table.offsets()[i]);
     }
     EXPECT_EQ(offsets.size(), static_cast<std::size_t>(table.nNeighbors()));
 }
@@ -54,10 +54,10 @@ TEST(KpNeighborIterator33, holdsEachNeighborOnceInItsOrder)
         const auto weights = randomWeights<short>(1, -5, 5);
         table.setWeights(weights.data(), 0);
         expectWhole(table, weights);
-        EXPECT_EQ(table.offset(0), c.firstOffset);
-        EXPECT_EQ(table.offset(c.count - 1), c.lastOffset);
+        EXPECT_EQ(table.offsets()[0], c.firstOffset);
+        EXPECT_EQ(table.offsets()[c.count - 1], c.lastOffset);
         for (int i = 0; i < c.count; ++i) {
-            const std::int8_t* const d = table.delta(i);
+            const std::int8_t* const d = table.deltas()[i];
             EXPECT_LE(std::abs(d[2]), c.mostInPlane);
             EXPECT_LE(std::abs(d[0]) + std::abs(d[1]) + std::abs(d[2]), c.count == 10 && d[2] != 0 ? 1 : c.mostSteps);
         }
@@ -65,7 +65,7 @@ TEST(KpNeighborIterator33, holdsEachNeighborOnceInItsOrder)
     const KpNeighborIterator33 six(6, dims);
     const int expected[] = {-200, -10, -1, 200, 10, 1};
     for (int i = 0; i < 6; ++i)
-        EXPECT_EQ(six.offset(i), expected[i]);
+        EXPECT_EQ(six.offsets()[i], expected[i]);
 }
 
 TEST(KpNeighborIterator33, sortsAllByWeightAndTellsTheFirstPositive)
@@ -78,8 +78,8 @@ TEST(KpNeighborIterator33, sortsAllByWeightAndTellsTheFirstPositive)
             expectWhole(table, integers);
             int firstPositive = 26;
             for (int i = count - 1; i >= 0; --i) {
-                EXPECT_TRUE(i == 0 || table.iweight(i - 1) <= table.iweight(i));
-                if (table.iweight(i) > 0)
+                EXPECT_TRUE(i == 0 || table.iweights()[i - 1] <= table.iweights()[i]);
+                if (table.iweights()[i] > 0)
                     firstPositive = i;
             }
             EXPECT_EQ(table.sort_iweights(), firstPositive);
@@ -92,16 +92,16 @@ TEST(KpNeighborIterator33, sortsAllByWeightAndTellsTheFirstPositive)
     floats[14] = 0.5F;
     KpNeighborIterator33 table(6, dims);
     table.setWeights(floats, 1);
-    EXPECT_EQ(table.offset(0), -1);
-    EXPECT_EQ(table.iweight(0), INT32_MIN);
-    EXPECT_EQ(table.offset(1), 1);
-    EXPECT_EQ(table.iweight(1), 0);
-    EXPECT_EQ(table.iweight(5), 2);
+    EXPECT_EQ(table.offsets()[0], -1);
+    EXPECT_EQ(table.iweights()[0], INT32_MIN);
+    EXPECT_EQ(table.offsets()[1], 1);
+    EXPECT_EQ(table.iweights()[1], 0);
+    EXPECT_EQ(table.iweights()[5], 2);
     EXPECT_EQ(table.sort_fweights(), 1);
     EXPECT_EQ(table.sort_iweights(), 2);
     const std::vector<char> negative(27, '\xFF');
     table.setWeights(negative.data(), 1);
-    EXPECT_EQ(table.fweight(3), -1);
+    EXPECT_EQ(table.fweights()[3], -1);
     EXPECT_EQ(table.sort_iweights(), 26);
     KpNeighborIterator33 unlisted(7, dims);
     unlisted.setWeights(floats, 1);

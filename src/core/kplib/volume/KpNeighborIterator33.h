@@ -36,12 +36,12 @@ public:
 
     int nNeighbors() const { return nNeighbors_; }
     const int* dims() const { return dims_; }
-    // Of neighbour `i`, from 0 to nNeighbors() - 1.
-    int offset(int i) const { return offsets_[i]; }  ///< in elements: dx + dy * dims[0] + dz * dims[0] * dims[1]
-    int iweight(int i) const { return iweights_[i]; }
-    float fweight(int i) const { return fweights_[i]; }
-    const std::int8_t* delta(int i) const { return deltas_[i]; }  ///< dx, dy, dz, each -1, 0 or 1
-    unsigned char border(int i) const { return borders_[i]; }     ///< of Border
+    // One a neighbour, nNeighbors() of them.
+    const int* offsets() const { return offsets_; }  ///< in elements: dx + dy * dims[0] + dz * dims[0] * dims[1]
+    const int* iweights() const { return iweights_; }
+    const float* fweights() const { return fweights_; }
+    const std::int8_t (*deltas() const)[3] { return deltas_; }  ///< dx, dy, dz, each -1, 0 or 1
+    const unsigned char* borders() const { return borders_; }   ///< of Border
 
 private:
     bool isFilled() const;
