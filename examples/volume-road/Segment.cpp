@@ -108,8 +108,8 @@ void measure(const KpBitfield& mask, const Volume& volume, const Space& space, R
     KpBox3f box;
     const auto width = static_cast<unsigned long>(volume.dims[0]), height = static_cast<unsigned long>(volume.dims[1]);
     forEachSetBit(mask, [&](unsigned long bit) {
-        const KpVec3f at(static_cast<float>(bit % width), static_cast<float>(bit / width % height),
-                         static_cast<float>(bit / width / height));
+        const unsigned long row = bit / width, slice = row / height;
+        const KpVec3f at(static_cast<float>(bit % width), static_cast<float>(row % height), static_cast<float>(slice));
         sum += KpVec3d(at);
         box.extendBy(at);
     });

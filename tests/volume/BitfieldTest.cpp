@@ -86,8 +86,10 @@ TEST(KpBitfield, resizingFillsWhatIsAddedButForASpareWord)
                 }
                 field.setAll();
                 ASSERT_EQ(wordsOf(field), Words(words, ~0U)) << "with the spare word";
-                field.toggleAll();
+                field.unsetAll();
                 ASSERT_EQ(wordsOf(field), Words(words, 0));
+                field.toggleAll();
+                ASSERT_EQ(wordsOf(field), Words(words, ~0U));
             }
 }
 
