@@ -5,6 +5,7 @@
 #include <gtest/gtest.h>
 
 #include <array>
+#include <limits>
 #include <random>
 #include <vector>
 
@@ -151,7 +152,9 @@ TEST(FloodFill, refusesWhatItCannotWorkOn)
     const Field src(32768, Field::INIT_SET);
     Field dst;
     int box[6] = {1, 2, 3, 4, 5, 6};
-    for (const auto& dims : {std::array{32768, 1, 1}, {1, 32768, 1}, {1, 1, 32768}, {32767, 1, 1}, {0, 1, 1}})
+    const int most = std::numeric_limits<int>::max();
+    for (const auto& dims :
+         {std::array{32768, 1, 1}, {1, 32768, 1}, {1, 1, 32768}, {32767, 1, 1}, {0, 1, 1}, {most, most, most}})
         EXPECT_EQ(KpMorphology::floodfill(src, dst, {{0, 0, 0}}, true, dims.data(), box), 0UL);
     EXPECT_EQ(log.lines().size(), 3U) << "the others are of another size, which isn't told";
     EXPECT_EQ(dst.nBits(), 0UL);

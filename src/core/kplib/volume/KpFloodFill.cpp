@@ -1,20 +1,14 @@
 #include <kplib/log/KpLogFile.h>
 #include <kplib/volume/KpMorphology.h>
+#include <kplib/volume/detail/KpFloodGround.h>
 
 #include <algorithm>
-#include <bit>
 #include <cstdint>
 #include <cstring>
 
+using Ground = kplib::detail::FloodGround;
+
 namespace {
-
-using Word = std::uint64_t;
-constexpr long step = 56;  // bits that eight bytes from any byte on hold for certain
-
-constexpr Word lowBits(long n)
-{
-    return (Word{1} << n) - 1;
-}
 
 /// Part of a row from where to look for what is to be filled. The size matters: there may be many.
 struct SF3D_Segment {
@@ -39,101 +33,6 @@ struct Box {
     Range x, y, z;
 };
 static_assert(sizeof(Box) == 6 * sizeof(int), "as callers get it");
-
-/// Fields of at least 64 bits, at any position of which `step` bits may be looked at; those behind the end vary.
-class Ground {
-public:
-    Ground(const KpBitfield& src, KpBitfield& dst, bool value) :
-        src_(reinterpret_cast<const char*>(src.data())), dst_(reinterpret_cast<char*>(dst.data())),
-        lastLoad_(static_cast<long>(src.nWords()) * 4 - 8), flip_(value ? 0 : ~Word{0})
-    {
-    }
-
-    /// Ones where the value is.
-    Word ground(long pos) const { return load(src_, pos) ^ flip_; }
-    Word visited(long pos) const { return load(dst_, pos); }
-    Word open(long pos) const
-    {
-        const long start = std::min(pos >> 3, lastLoad_);
-        return ((at(src_, start) ^ flip_) & ~at(dst_, start)) >> (pos - start * 8);
-    }
-    bool isGround(long pos) const { return (ground(pos) & 1) != 0; }
-    bool isVisited(long pos) const { return (visited(pos) & 1) != 0; }
-
-    /// Whether some of n > 0 voxels is still to be filled.
-    bool isOpen(long pos, long n) const
-    {
-        for (; n > step; pos += step, n -= step) {
-            if ((open(pos) & lowBits(step)) != 0)
-                return true;
-        }
-        return (open(pos) & lowBits(n)) != 0;
-    }
-
-    // The first position in [pos, end) of its kind, or `end`.
-
-    long firstGround(long pos, long end) const
-    {
-        return first(pos, end, [this](long at) { return ground(at); });
-    }
-    long firstOff(long pos, long end) const
-    {
-        return first(pos, end, [this](long at) { return ~ground(at); });
-    }
-    long firstUnvisited(long pos, long end) const
-    {
-        return first(pos, end, [this](long at) { return ~visited(at); });
-    }
-
-    /// Where the run begins that `pos` is in, at `row` at the earliest.
-    long runStart(long pos, long row) const
-    {
-        while (pos > row) {
-            const long n = std::min(step, pos - row), ones = std::countl_one(ground(pos - n) << (64 - n));
-            pos -= std::min(ones, n);
-            if (ones < n)
-                break;
-        }
-        return pos;
-    }
-
-    void visit(long pos, long end) const
-    {
-        for (; pos < end; pos += step) {
-            const long start = std::min(pos >> 3, lastLoad_);
-            const Word word = at(dst_, start) | lowBits(std::min(step, end - pos)) << (pos - start * 8);
-            std::memcpy(dst_ + start, &word, sizeof word);
-        }
-    }
-
-private:
-    static Word at(const char* field, long start)
-    {
-        Word word;
-        std::memcpy(&word, field + start, sizeof word);
-        return word;
-    }
-    Word load(const char* field, long pos) const
-    {
-        const long start = std::min(pos >> 3, lastLoad_);
-        return at(field, start) >> (pos - start * 8);
-    }
-
-    template <typename Bits>
-    static long first(long pos, long end, Bits bits)
-    {
-        for (; pos < end; pos += step) {
-            if (const Word found = bits(pos) & lowBits(step))
-                return std::min(end, pos + std::countr_zero(found));
-        }
-        return end;
-    }
-
-    const char* src_;
-    char* dst_;
-    long lastLoad_;
-    Word flip_;
-};
 
 class FloodFill {
 public:
@@ -268,7 +167,8 @@ unsigned long fillFew(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpV
 unsigned long KpMorphology::floodfill(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpVec3i>& seeds,
                                       bool value, const int* dims, int* box)
 {
-    if (src.nBits() != static_cast<unsigned long>(1L * dims[0] * dims[1] * dims[2]))
+    const auto size = [dims](int axis) { return static_cast<unsigned long>(dims[axis]); };  // unsigned: may overflow
+    if (src.nBits() != size(0) * size(1) * size(2))
         return 0;
     if (*std::max_element(dims, dims + 3) > INT16_MAX) {
         getTheLogInstance().errorf("KpMorphology::floodfill(), volume of %d x %d x %d is too large\n", dims[0], dims[1],

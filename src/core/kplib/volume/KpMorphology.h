@@ -46,11 +46,11 @@ public:
     /// Sets in `dst` what is connected with a seed by faces through voxels whose bit in `src` is `value`; gives the
     /// number of voxels filled. `dims` are three sizes.
     ///
-    /// What `dst` holds, resized first if it is of another size, counts as visited and stops the fill. Filling goes by
-    /// runs along x, as a rule set and counted from end to end when entered where `dst` is clear. `box`, if not null,
-    /// becomes xmin, xmax, ymin, ymax, zmin, zmax of what was filled and of all seeds, also those outside or on a
-    /// wrong value. It stays without seeds, and where `src` isn't of the size `dims` tells or a size is above 32767
-    /// (one error in the log): then 0 is the result and nothing changes. Time grows with the number of runs.
+    /// What `dst` holds, resized first if it is of another size, counts as visited and stops the fill. A run along x
+    /// that is entered where `dst` is clear is filled as a rule from end to end, and visited voxels in it count again.
+    /// `box`, if not null, becomes xmin, xmax, ymin, ymax, zmin, zmax of what was filled and of all seeds, also those
+    /// outside or on a wrong value; without seeds it stays. If `src` isn't of the size that `dims` tell, or a size is
+    /// above 32767 (one error in the log), the result is 0 and nothing changes. Time grows with the number of runs.
     static unsigned long floodfill(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpVec3i>& seeds, bool value,
                                    const int* dims, int* box);
 
