@@ -7,6 +7,7 @@
 #include <kplib/volume/detail/KpComponentTable.h>
 
 #include <algorithm>
+#include <atomic>
 #include <cmath>
 #include <cstdint>
 #include <cstring>
@@ -15,9 +16,9 @@
 
 using kplib::detail::ComponentTable;
 
-std::atomic<int> KpConnectedComponents::dbg_add;
-std::atomic<int> KpConnectedComponents::dbg_merge;
-std::atomic<int> KpConnectedComponents::dbg_clean;
+int KpConnectedComponents::dbg_add;
+int KpConnectedComponents::dbg_merge;
+int KpConnectedComponents::dbg_clean;
 
 namespace {
 
@@ -53,10 +54,12 @@ Neighbours previousNeighbours(int neighbours)
     }
 }
 
-/// Diagnostics are not worth the bus lock of an exact count.
-void countUp(std::atomic<int>& counter)
+/// Threads that label at once share the counters: no access may be a data race, but diagnostics are not worth the bus
+/// lock of an exact count.
+void countUp(int& counter)
 {
-    counter.store(counter.load(std::memory_order_relaxed) + 1, std::memory_order_relaxed);
+    const std::atomic_ref<int> shared(counter);
+    shared.store(shared.load(std::memory_order_relaxed) + 1, std::memory_order_relaxed);
 }
 
 /// Rounded half up, cut to 32 bits as the processor does (all that doesn't fit is the smallest int), then to the type.
@@ -148,7 +151,7 @@ void startComponents(ComponentTable& components)
 {
     for (auto* counter :
          {&KpConnectedComponents::dbg_add, &KpConnectedComponents::dbg_merge, &KpConnectedComponents::dbg_clean})
-        counter->store(0, std::memory_order_relaxed);
+        std::atomic_ref<int>(*counter).store(0, std::memory_order_relaxed);
     components.resize(1);
     components[0] = Component{};
 }

@@ -4,8 +4,6 @@
 #include <kplib/foundation/KpExport.h>
 #include <kplib/rawdata/KpTypedPointer.h>
 
-#include <atomic>
-
 /// Labels the connected regions of a 2D or 3D image in one raster pass, and counts what they hold.
 ///
 /// Images are dense, x fastest, `dims` their three sizes. Neighbours are 4 or 8 (in plane), 6, 18, 26, or 10 (8 and the
@@ -36,8 +34,9 @@ public:
 
     /// Regions of voxels at or above `low` (NaN counts as that), with the count of those at or above `high` as seeds.
     /// For integers both are rounded, and cut to the element type. If `labels` is null, it gets an image of kpmalloc,
-    /// which the caller then owns. `components` may be null. Returns the number of components; -1 with an error in the
-    /// log, if the elements aren't numbers or there are too many components (the labels are half done then).
+    /// which the caller then owns, whatever the result; labels may take the place of unsigned shorts of `data`.
+    /// `components` may be null. Returns the number of components; -1 with an error in the log, if the elements aren't
+    /// numbers or there are too many components (the labels are half done then).
     static int labelCC(KpTypedPointer data, const int* dims, int neighbours, unsigned short*& labels, int, double low,
                        double high, int, int, KpDArray<Component>* components);
 
@@ -72,8 +71,8 @@ public:
     static int do_label(T* data, L* labels, KpDArray<Component>& components, T low, T high, const int* dims,
                         int neighbours, int labelMode);
 
-    // Diagnostics of all labellings, set to 0 when one starts.
-    static std::atomic<int> dbg_add;    ///< new components
-    static std::atomic<int> dbg_merge;  ///< always 0
-    static std::atomic<int> dbg_clean;  ///< clean-ups
+    // Diagnostics, shared by all threads and set to 0 when a labelling starts: with several at once, counts mix.
+    static int dbg_add;    ///< new components
+    static int dbg_merge;  ///< always 0
+    static int dbg_clean;  ///< clean-ups
 };

@@ -193,9 +193,6 @@ private:
         const int m = isLabelMode_ ? gather<true>(steps, at, ids) : gather<false>(steps, at, ids);
         if (m < 0)
             return -1;
-        labels_[at] = static_cast<L>(m);
-        if (x > 0 && labels_[at - 1] != labels_[at])
-            changes_[x / 64] |= RowBits{1} << x % 64;
         Component& component = components_[m];
         ++component.nVoxels;
         if (!isLabelMode_ && data_[at] >= high_)
@@ -203,6 +200,9 @@ private:
         const float position[3] = {static_cast<float>(x), static_cast<float>(y_), static_cast<float>(z_)};
         for (int axis = 0; axis < 3; ++axis)
             component.sum[axis] += position[axis];
+        labels_[at] = static_cast<L>(m);  // last: the label may take the place of the value
+        if (x > 0 && labels_[at - 1] != labels_[at])
+            changes_[x / 64] |= RowBits{1} << x % 64;
         return m;
     }
 

@@ -78,7 +78,6 @@ private:
 
     void count(int m, int x, int y, int z, long i)
     {
-        labels_[i] = static_cast<L>(m);
         Component& component = components_[m];
         ++component.nVoxels;
         component.sum[0] += static_cast<float>(x);
@@ -86,6 +85,7 @@ private:
         component.sum[2] += static_cast<float>(z);
         if (labelMode_ == 0 && data_[i] >= high_)
             ++component.nSeeds;
+        labels_[i] = static_cast<L>(m);
     }
 
     bool isInside(int at, int axis) const { return at > 0 && at < dims_[axis] - 1; }
