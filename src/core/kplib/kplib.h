@@ -79,6 +79,7 @@
 #include <kplib/log/KpMessageCollector.h>
 #include <kplib/log/KpResult.h>
 #include <kplib/log/KpTerminateProcess.h>
+#include <kplib/net/TmMsg.h>
 #include <kplib/param/HxParamBase.h>
 #include <kplib/param/HxParamBundle.h>
 #include <kplib/param/HxParamEditCheck.h>

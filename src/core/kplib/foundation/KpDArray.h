@@ -115,6 +115,13 @@ public:
 protected:
     /// For derived arrays that fill raw storage themselves.
     void setSize(long size) noexcept { size_ = size; }
+    /// For derived arrays over storage that isn't theirs: overwrites what the array holds, freeing nothing.
+    void setStorage(T* data, long size, long capacity) noexcept
+    {
+        data_ = data;
+        size_ = size;
+        capacity_ = capacity;
+    }
 
 private:
     using Traits = KpElementTraits<T>;

@@ -84,9 +84,14 @@ class KpVec4i;
 class KpColor;
 class KpPackedIndexing;
 class KpRawData;
+class KpRawData2D;
+class KpRawData3D;
 class KpSuperPackedIndexing;
+class KpTypedData2D;
+class KpTypedData3D;
 class KpTypedElement;
 struct KpTypedPointer;
+class TmDataAccess;
 class TmSSETools;
 
 class KpBitfield;
@@ -95,6 +100,14 @@ class KpMorphology;
 class KpNeighborIterator33;
 class KpScanConvert;
 
+class KpHttpGet;
+class KpSocket;
+class KpSocketTools;
+class TmMsg;
+
+class KpCallable;
+class KpThread;
+class KpWorkerThread;
 class KpProgressGuiInterface;
 class KpProgressInterface;
 class ProgressScope;

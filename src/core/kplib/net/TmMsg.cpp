@@ -1,0 +1,108 @@
+#include <kplib/net/TmMsg.h>
+
+#include <kplib/log/KpLogFile.h>
+
+TmMsg::TmMsg(const TmMsg& other) : readOffset_(other.readOffset_), buffer_(other.buffer_), marks_(other.marks_) {}
+
+TmMsg::~TmMsg()
+{
+    disown();
+}
+
+TmMsg& TmMsg::operator=(const TmMsg& other)
+{
+    if (this == &other)
+        return *this;
+    disown();
+    buffer_.resize(other.buffer_.size());
+    if (other.buffer_.size() > 0)
+        std::memcpy(buffer_.data(), other.buffer_.data(), other.size());
+    return *this;
+}
+
+void TmMsg::take(TmMsg& other)
+{
+    buffer_.swap(other.buffer_);
+    // Whose storage it is goes with the storage.
+    const unsigned char external = externalData_;
+    externalData_ = other.externalData_;
+    other.externalData_ = external;
+}
+
+void TmMsg::setRawData(unsigned long size, unsigned char* data)
+{
+    buffer_.setStorage(data, static_cast<long>(size), static_cast<long>(size));
+    externalData_ = 1;
+    readOffset_ = 0;
+}
+
+bool TmMsg::operator==(const TmMsg& other) const
+{
+    return readOffset_ == other.readOffset_ && size() == other.size() &&
+           (size() == 0 || std::memcmp(dataPtr(), other.dataPtr(), size()) == 0);
+}
+
+void TmMsg::resize(long size)
+{
+    if (size > buffer_.capacity())
+        own();
+    buffer_.resize(size);
+}
+
+void TmMsg::reset(long size)
+{
+    readOffset_ = 0;
+    resize(size);
+}
+
+void TmMsg::reset(long size, long capacity)
+{
+    readOffset_ = 0;
+    own();
+    buffer_.remax(capacity, size);
+}
+
+/// The message is as it was if there is no memory.
+void TmMsg::writeGrowing(unsigned long count, const void* data)
+{
+    own();
+    const auto* const from = static_cast<const unsigned char*>(data);
+    const bool isOwn = from >= buffer_.begin() && from < buffer_.end();
+    const long index = isOwn ? from - buffer_.begin() : 0;
+    const long size = buffer_.size();
+    buffer_.resize(count > static_cast<unsigned long>(LONG_MAX - size) ? LONG_MAX : size + static_cast<long>(count));
+    std::memcpy(buffer_.data() + size, isOwn ? buffer_.data() + index : from, count);
+}
+
+/// Storage of somebody else is never reallocated: it is copied before it has to grow.
+void TmMsg::own()
+{
+    if (!externalData_)
+        return;
+    Buffer copy(buffer_);
+    disown();
+    buffer_.swap(copy);
+}
+
+/// Lets go of storage of somebody else.
+void TmMsg::disown()
+{
+    if (externalData_)
+        buffer_.forget();
+    externalData_ = 0;
+}
+
+void TmMsg::setMarked(int mark, bool on)
+{
+    const int others = marks_ & ~(1 << mark);
+    marks_ = static_cast<unsigned char>((others | (on ? 1 << mark : 0)) & 3);
+}
+
+void TmMsg::print(const char* title) const
+{
+    KpLogFile& log = getTheLogInstance();
+    if (title)
+        log.printf("TmMsg");
+    log.printf("TmMsg");
+    log.printf("TmMsg");
+}

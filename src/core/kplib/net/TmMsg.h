@@ -1,0 +1,232 @@
+#pragma once
+
+#include <kplib/foundation/KpDArray.h>
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpForward.h>
+
+#include <cstring>
+#include <memory>
+#include <string>
+#include <type_traits>
+
+class TmMsg;
+
+namespace kplib::detail {
+
+template <typename T, typename... List>
+inline constexpr bool isOneOf = (std::is_same_v<T, List> || ...);
+
+/// The values of fixed size that a message takes: as many bytes as the value has in memory.
+template <typename T>
+concept WireValue = isOneOf<T, unsigned char, bool, unsigned short, int, unsigned int, float, double, long, long long,
+                            unsigned long long, KpVec2i, KpVec2f, KpVec3i, KpVec3f, KpVec3l, KpVec4i, KpVec4f, KpColor,
+                            KpRotation, KpPlane, KpLine, KpBox2f, KpBox3f, KpBox3i, KpMat4f, KpPrimType, KpLib::MD5,
+                            KpUniqueID, KpTransferID, KpFrameID, KpRemotificationID, TmSessionContextID>;
+
+/// The elements of the arrays that a message takes as one block.
+template <typename T>
+concept WireElement = isOneOf<T, unsigned char, bool, int, float, double, long, long long, KpVec2f, KpVec3i, KpVec3f,
+                              KpVec4f, KpPlane, KpLine, KpMat4f>;
+
+/// Takes `bytes` bytes of array elements at the read offset, or logs that the message doesn't hold them.
+KPLIB_API bool readElements(TmMsg& msg, void* elements, unsigned long bytes);
+
+/// Any byte but 0 is true: no bool of another value comes out of a message.
+KPLIB_API void makeBools(unsigned char* bytes, long count);
+
+}  // namespace kplib::detail
+
+/// The byte buffer of the client/server protocol: written by appending with `<<`, read by moving an offset with `>>`.
+///
+/// A message is a plain memory image: packed, in the host's byte order (little-endian), without tags, version or
+/// length. Who reads must do what the writer did, in its order. The two ends are independent: reading may follow
+/// writing. Counts on the wire have 32 bits; larger ones lose their upper bits. Peers are trusted: nothing tells that a
+/// message ended too early, but no read leaves the message. Past its end values are of zero bytes, text is null or
+/// empty, fields and views are empty. To read from a stranger, ask bytesAvailable() first. Exhausted memory is a
+/// KpMemoryException. One thread at a time.
+class KPLIB_API TmMsg {
+public:
+    /// Empty; takes no memory.
+    TmMsg() = default;
+    /// For reading `size` bytes that stay the caller's and must outlive the message.
+    TmMsg(unsigned long size, unsigned char* data) { setRawData(size, data); }
+    /// Owns a copy of the bytes; reads on where `other` stands.
+    TmMsg(const TmMsg& other);
+    ~TmMsg();
+
+    /// Copies the bytes alone: the read offset stays.
+    TmMsg& operator=(const TmMsg& other);
+
+    /// Exchanges the storage of two messages, without copying; the read offsets stay.
+    void take(TmMsg& other);
+
+    /// Makes this a message over bytes of the caller, as the constructor does. Bytes that the message owned are not
+    /// freed: they are the caller's, who has their address from dataPtr(). That is meant.
+    void setRawData(unsigned long size, unsigned char* data);
+
+    /// Equal bytes, and read up to the same offset.
+    bool operator==(const TmMsg& other) const;
+
+    unsigned char* dataPtr() { return buffer_.data(); }
+    const unsigned char* dataPtr() const { return buffer_.data(); }
+    unsigned long size() const { return static_cast<unsigned long>(buffer_.size()); }
+    /// The next byte to read; after a failed array it may lie past the end.
+    unsigned long readOffset() const { return readOffset_; }
+    /// size() less readOffset(); so a very large number once the offset lies past the end.
+    unsigned long bytesAvailable() const { return size() - readOffset_; }
+
+    /// Sets the size; bytes that are added are not initialised.
+    void resize(long size);
+    /// Starts anew with a message of `size` bytes; the storage stays. 0 makes it empty.
+    void reset(long size);
+    /// The same, with storage for `capacity` bytes.
+    void reset(long size, long capacity);
+
+    /// Appends `count` bytes.
+    void writeRawBytes(unsigned long count, const void* data)
+    {
+        const auto size = buffer_.size();
+        if (static_cast<unsigned long>(buffer_.capacity() - size) < count) [[unlikely]] {
+            writeGrowing(count, data);
+            return;
+        }
+        if (count > 0)
+            std::memcpy(buffer_.data() + size, data, count);
+        buffer_.setSize(size + static_cast<long>(count));
+    }
+
+    /// Makes `data` the address of the next `count` bytes in the message itself, valid until it is written to, and
+    /// moves on by `count`. Null if the message doesn't hold them.
+    void readRawBytes(unsigned long count, void*& data)
+    {
+        data = holds(count) ? buffer_.data() + readOffset_ : nullptr;
+        readOffset_ += count;
+    }
+
+    /// Whether `count` more bytes can be read.
+    bool holds(unsigned long count) const { return readOffset_ <= size() && count <= size() - readOffset_; }
+
+    /// Two marks, 0 and 1, for the protocol that uses the messages: unset at first, copied by the copy constructor
+    /// alone, and without meaning here.
+    bool isMarked(int mark) const { return (marks_ >> mark & 1) != 0; }
+    void setMarked(int mark, bool on);
+
+    /// Writes "TmMsg" to the log: once if there is a title, and twice more. Neither the title nor the bytes show, and
+    /// that is meant.
+    void print(const char* title) const;
+
+private:
+    /// An array whose storage may be somebody else's.
+    struct Buffer : KpDArray<unsigned char> {
+        using KpDArray::setSize;
+        using KpDArray::setStorage;
+        void forget() { setStorage(nullptr, 0, 0); }
+    };
+
+    void writeGrowing(unsigned long count, const void* data);
+    void own();
+    void disown();
+
+    unsigned long readOffset_ = 0;
+    Buffer buffer_;
+    unsigned char marks_ : 2 = 0;
+    unsigned char externalData_ : 1 = 0;  // the storage is somebody else's
+};
+
+static_assert(sizeof(TmMsg) == 40);
+
+// Each operator appends or reads one value and returns the message. What isn't listed doesn't compile.
+
+/// The bytes of the value.
+template <kplib::detail::WireValue T>
+TmMsg& operator<<(TmMsg& msg, const T& value)
+{
+    msg.writeRawBytes(sizeof(T), std::addressof(value));
+    return msg;
+}
+
+template <kplib::detail::WireValue T>
+TmMsg& operator>>(TmMsg& msg, T& value)
+{
+    void* bytes = nullptr;
+    msg.readRawBytes(sizeof(T), bytes);
+    if constexpr (std::is_same_v<T, bool>)
+        value = bytes && *static_cast<const unsigned char*>(bytes) != 0;
+    else if (bytes)
+        std::memcpy(static_cast<void*>(std::addressof(value)), bytes, sizeof(T));
+    else
+        std::memset(static_cast<void*>(std::addressof(value)), 0, sizeof(T));
+    return msg;
+}
+
+/// The count in 32 bits, and the elements as one block.
+template <kplib::detail::WireElement T>
+TmMsg& operator<<(TmMsg& msg, const KpDArray<T>& array)
+{
+    msg << static_cast<unsigned int>(array.size());
+    msg.writeRawBytes(static_cast<unsigned long>(array.size()) * sizeof(T), array.data());
+    return msg;
+}
+
+/// Sets the size of the array to the count that was sent. If the message doesn't hold that many elements, that is one
+/// error line in the log: their values stay what they are, and the offset moves by all of them.
+template <kplib::detail::WireElement T>
+TmMsg& operator>>(TmMsg& msg, KpDArray<T>& array)
+{
+    unsigned int count = 0;
+    msg >> count;
+    array.resize(count);
+    const bool isRead = kplib::detail::readElements(msg, array.data(), count * sizeof(T));
+    if constexpr (std::is_same_v<T, bool>) {
+        if (isRead)
+            kplib::detail::makeBools(reinterpret_cast<unsigned char*>(array.data()), array.size());
+    }
+    return msg;
+}
+
+/// Numbers of other types have no form: convert them to one that has.
+template <typename T>
+requires(std::is_arithmetic_v<T> && !kplib::detail::WireValue<T>) TmMsg& operator<<(TmMsg& msg,
+                                                                                    const T& value) = delete;
+
+/// The length with the NUL in 32 bits (0 for null), and the bytes with the NUL. Reads as an address in the message
+/// itself, or null; valid until the message is written to.
+KPLIB_API TmMsg& operator<<(TmMsg& msg, const char* text);
+KPLIB_API TmMsg& operator>>(TmMsg& msg, char*& text);
+
+/// The length in 32 bits, and as many bytes, without a NUL.
+KPLIB_API TmMsg& operator<<(TmMsg& msg, const std::string& text);
+KPLIB_API TmMsg& operator>>(TmMsg& msg, std::string& text);
+
+/// The bytes up to the first NUL, which goes with them; no length.
+KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpString& text);
+KPLIB_API TmMsg& operator>>(TmMsg& msg, KpString& text);
+
+/// As KpString.
+KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpFilename& name);
+KPLIB_API TmMsg& operator>>(TmMsg& msg, KpFilename& name);
+
+/// The count in 32 bits, and each text in the form of `const char*`. The array that is read owns none of its texts; a
+/// negative count is no texts.
+KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpDArray<char*>& texts);
+KPLIB_API TmMsg& operator>>(TmMsg& msg, KpDArray<char*>& texts);
+
+/// The code, and for a failure text and data in the form of `const char*`; file and line stay here. Reading a failure
+/// makes a new one, with its line in the log; empty data becomes the text of the code.
+KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpResult& result);
+KPLIB_API TmMsg& operator>>(TmMsg& msg, KpResult& result);
+
+/// The number of bits in 32 bits, and all words, the spare one too.
+KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpBitfield& field);
+KPLIB_API TmMsg& operator>>(TmMsg& msg, KpBitfield& field);
+
+/// Components, type, width and height in 32 bits each, and the pixels without gaps between the rows; the pixels of a
+/// row are taken to be dense. Without data width and height are sent as 0. The view that is read owns its pixels; its
+/// data is null if none came.
+KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpTypedData2D& image);
+KPLIB_API TmMsg& operator>>(TmMsg& msg, KpTypedData2D& image);
+
+/// Sixteen bytes that aren't looked at when they are read, and all bytes of `inner` as an array. How far `inner` was
+/// read doesn't travel: reading starts at its first byte.
+KPLIB_API TmMsg& operator<<(TmMsg& msg, const TmMsg& inner);
+KPLIB_API TmMsg& operator>>(TmMsg& msg, TmMsg& inner);

@@ -1,0 +1,104 @@
+#include <kplib/net/TmMsg.h>
+
+#include <kplib/system/KpFilename.h>
+
+namespace {
+
+/// The text at the read offset: up to the first NUL or, without one, to the end of the message. Moves past the NUL.
+std::string_view readToNul(TmMsg& msg)
+{
+    const unsigned long left = msg.holds(0) ? msg.bytesAvailable() : 0;
+    void* bytes = nullptr;
+    msg.readRawBytes(0, bytes);
+    const auto* const text = static_cast<const char*>(bytes);
+    const unsigned long length = left > 0 ? strnlen(text, left) : 0;
+    msg.readRawBytes(length + 1, bytes);
+    return {text, length};
+}
+
+}  // namespace
+
+TmMsg& operator<<(TmMsg& msg, const char* text)
+{
+    if (!text)
+        return msg << 0U;
+    const unsigned long length = std::strlen(text) + 1;
+    msg << static_cast<unsigned int>(length);
+    msg.writeRawBytes(length, text);
+    return msg;
+}
+
+TmMsg& operator>>(TmMsg& msg, char*& text)
+{
+    unsigned int length = 0;
+    msg >> length;
+    void* bytes = nullptr;
+    if (length > 0)
+        msg.readRawBytes(length, bytes);
+    text = static_cast<char*>(bytes);
+    if (text && text[length - 1] != '\0')
+        text = nullptr;  // not a text that a writer left here: it would be read on beyond its bytes
+    return msg;
+}
+
+TmMsg& operator<<(TmMsg& msg, const std::string& text)
+{
+    msg << static_cast<int>(text.size());
+    msg.writeRawBytes(text.size(), text.data());
+    return msg;
+}
+
+TmMsg& operator>>(TmMsg& msg, std::string& text)
+{
+    unsigned int length = 0;
+    msg >> length;
+    void* bytes = nullptr;
+    msg.readRawBytes(length, bytes);
+    text.clear();
+    if (bytes)
+        text.assign(static_cast<const char*>(bytes), length);
+    return msg;
+}
+
+TmMsg& operator<<(TmMsg& msg, const KpString& text)
+{
+    msg.writeRawBytes(std::strlen(text.c_str()) + 1, text.c_str());
+    return msg;
+}
+
+TmMsg& operator>>(TmMsg& msg, KpString& text)
+{
+    text = KpString(readToNul(msg));
+    return msg;
+}
+
+TmMsg& operator<<(TmMsg& msg, const KpFilename& name)
+{
+    return msg << static_cast<const KpString&>(name);
+}
+
+TmMsg& operator>>(TmMsg& msg, KpFilename& name)
+{
+    return msg >> static_cast<KpString&>(name);
+}
+
+TmMsg& operator<<(TmMsg& msg, const KpDArray<char*>& texts)
+{
+    msg << static_cast<int>(texts.size());
+    for (const char* text : texts)
+        msg << text;
+    return msg;
+}
+
+TmMsg& operator>>(TmMsg& msg, KpDArray<char*>& texts)
+{
+    int count = 0;
+    msg >> count;
+    texts.resize(0);
+    for (int i = 0; i < count && msg.holds(sizeof(unsigned int)); ++i) {
+        char* text = nullptr;
+        msg >> text;
+        texts.append(text);
+    }
+    return msg;
+}
