@@ -95,8 +95,11 @@ class KpMorphology;
 class KpNeighborIterator33;
 class KpScanConvert;
 
+class KpCallable;
 class KpProgressGuiInterface;
 class KpProgressInterface;
+class KpThread;
+class KpWorkerThread;
 class ProgressScope;
 
 class KpScopedWatch;
