@@ -113,8 +113,11 @@
 #include <kplib/system/KpUUID.h>
 #include <kplib/system/KpVersion.h>
 #include <kplib/system/KpWatch.h>
+#include <kplib/threads/KpCallable.h>
 #include <kplib/threads/KpProgressGuiInterface.h>
 #include <kplib/threads/KpProgressInterface.h>
+#include <kplib/threads/KpThread.h>
+#include <kplib/threads/KpWorkerThread.h>
 #include <kplib/threads/ProgressScope.h>
 #include <kplib/volume/KpBitfield.h>
 #include <kplib/volume/KpConnectedComponents.h>
