@@ -93,6 +93,7 @@
 #include <kplib/rawdata/KpTypedData3D.h>
 #include <kplib/rawdata/KpTypedElement.h>
 #include <kplib/rawdata/KpTypedPointer.h>
+#include <kplib/rawdata/TmDataAccess.h>
 #include <kplib/rawdata/TmSSETools.h>
 #include <kplib/system/KpBuildInfo.h>
 #include <kplib/system/KpCPUInfo.h>
