@@ -110,10 +110,10 @@ TEST(Volume, worksOutStrides)
     void* const slices[] = {&block[0], &block[1], &block[2]};
     const KpVec3l none(0L, 0L, 0L);
     const auto without = [&](KpVec3l dims, KpVec3l strides) {
-        return new TmDataAccess(dims, strides, nullptr, KpPrimType::Short, 3, KpAllocator::AllocatorNone);
+        return Handle(new TmDataAccess(dims, strides, nullptr, KpPrimType::Short, 3, KpAllocator::AllocatorNone));
     };
     const auto sliced = [&](KpVec3l dims, KpVec3l strides) {
-        return new TmDataAccess(dims, strides, slices, KpPrimType::Short, 3, KpAllocator::AllocatorNone);
+        return Handle(new TmDataAccess(dims, strides, slices, KpPrimType::Short, 3, KpAllocator::AllocatorNone));
     };
     // clang-format off
     const struct { const char* what; Handle volume; KpVec3l strides; bool valid, linear, contiguous, data; } cases[] = {
