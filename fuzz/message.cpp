@@ -83,7 +83,7 @@ void readVolume(TmMsg& msg)
     msg >> volume;
     const KpHandle<TmDataAccess> handle(volume);
     if (volume && volume->hasData())
-        sink = static_cast<unsigned char>(volume->hash().words()[0]);
+        sink = static_cast<unsigned char>(volume->hash().first);
 }
 
 void readInner(TmMsg& msg)

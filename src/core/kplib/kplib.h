@@ -93,6 +93,7 @@
 #include <kplib/rawdata/KpTypedData3D.h>
 #include <kplib/rawdata/KpTypedElement.h>
 #include <kplib/rawdata/KpTypedPointer.h>
+#include <kplib/rawdata/TmDataAccess.h>
 #include <kplib/rawdata/TmSSETools.h>
 #include <kplib/system/KpBuildInfo.h>
 #include <kplib/system/KpCPUInfo.h>
@@ -113,8 +114,11 @@
 #include <kplib/system/KpUUID.h>
 #include <kplib/system/KpVersion.h>
 #include <kplib/system/KpWatch.h>
+#include <kplib/threads/KpCallable.h>
 #include <kplib/threads/KpProgressGuiInterface.h>
 #include <kplib/threads/KpProgressInterface.h>
+#include <kplib/threads/KpThread.h>
+#include <kplib/threads/KpWorkerThread.h>
 #include <kplib/threads/ProgressScope.h>
 #include <kplib/volume/KpBitfield.h>
 #include <kplib/volume/KpConnectedComponents.h>
