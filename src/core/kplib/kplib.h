@@ -79,6 +79,9 @@
 #include <kplib/log/KpMessageCollector.h>
 #include <kplib/log/KpResult.h>
 #include <kplib/log/KpTerminateProcess.h>
+#include <kplib/net/KpHttpGet.h>
+#include <kplib/net/KpSocket.h>
+#include <kplib/net/KpSocketTools.h>
 #include <kplib/net/TmMsg.h>
 #include <kplib/param/HxParamBase.h>
 #include <kplib/param/HxParamBundle.h>
