@@ -131,10 +131,6 @@ class KpTmpDir;
 class KpUUID;
 class KpVersion;
 
-class KpHttpGet;
-class KpSocket;
-class KpSocketTools;
-
 namespace KpLib {
 class MD5;
 class MD5Coder;
