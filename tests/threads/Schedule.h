@@ -1,23 +1,13 @@
 #pragma once
 
+#include <atomic>
+
 namespace kplib::test {
 
-/// While one lives, threads of the process linger now and then before they take a mutex, wait or signal. One at a time.
-class RandomSchedule {
-public:
-    explicit RandomSchedule(unsigned seed);
-    RandomSchedule(const RandomSchedule&) = delete;
-    RandomSchedule& operator=(const RandomSchedule&) = delete;
-    ~RandomSchedule();
-};
+/// Unless 0: where the random delays start that threads then make before they take a mutex, wait or signal.
+extern std::atomic<unsigned> scheduleSeed;
 
-/// While one lives, the platform has no thread to give.
-class NoNewThreads {
-public:
-    NoNewThreads();
-    NoNewThreads(const NoNewThreads&) = delete;
-    NoNewThreads& operator=(const NoNewThreads&) = delete;
-    ~NoNewThreads();
-};
+/// While set, the platform has no thread to give.
+extern std::atomic<bool> noNewThreads;
 
 }  // namespace kplib::test

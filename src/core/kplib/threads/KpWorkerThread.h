@@ -35,8 +35,7 @@ public:
     explicit KpWorkerThread(const char* name);
     KpWorkerThread(const KpWorkerThread&) = delete;
     KpWorkerThread& operator=(const KpWorkerThread&) = delete;
-    /// Terminates. A subclass calls terminate() in its own destructor, so that no pass meets an object that is half
-    /// gone.
+    /// Terminates. A subclass calls terminate() in its own destructor: here compute() is gone already.
     virtual ~KpWorkerThread();
 
     /// Runs on the worker thread before its first pass, to set up what belongs to the thread.
@@ -50,8 +49,8 @@ public:
     /// returns when the pass has ended, or has called wakeCaller(). False, and nothing is done, if a pass is under way.
     bool start(bool waitForCaller);
 
-    /// Waits until the pass has ended or sleeps in suspended(). False at once if there was none. `timedOut` tells that
-    /// the result is true for another reason: `milliseconds` have passed; each wake-up begins them anew.
+    /// Waits until the pass has ended or sleeps in suspended(). False at once if there was none. With `timedOut` it is
+    /// still under way after `milliseconds`, which each wake-up counts anew, and the result is true.
     bool wait(bool& timedOut, unsigned long milliseconds = ULONG_MAX);
     /// Without a time limit.
     bool wait();
@@ -73,7 +72,7 @@ public:
 
     /// For compute(): whether to end early.
     bool canceled();
-    /// For compute(): sleeps here if that was asked for. True if it has slept.
+    /// For compute(): sleeps here until resume() or cancel(), if suspend() asked for it. True if it did.
     bool suspended();
     /// For compute(): lets start(true) return before the pass has ended.
     void wakeCaller();
