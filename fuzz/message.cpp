@@ -95,10 +95,14 @@ void readInner(TmMsg& msg)
 }
 
 constexpr std::array readers = {
-    readValue<bool>,  readValue<unsigned short>, readValue<double>,   readValue<KpMat4f>, readValue<KpPlane>,
-    readValue<KpResult>, readArray<bool>,        readArray<int>,      readArray<long>,    readArray<KpPlane>,
-    readArray<KpMat4f>,  readTexts,              readImage,           readField,          readVolume,
-    readInner,
+    readValue<bool>,    readValue<unsigned short>,
+    readValue<double>,  readValue<KpMat4f>,
+    readValue<KpPlane>, readValue<KpResult>,
+    readArray<bool>,    readArray<int>,
+    readArray<long>,    readArray<KpPlane>,
+    readArray<KpMat4f>, readTexts,
+    readImage,          readField,
+    readVolume,         readInner,
 };
 
 }  // namespace

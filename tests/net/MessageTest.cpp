@@ -67,14 +67,21 @@ const std::string one = "0000803f", two = "00000040", three = "00004040", four =
 TEST(Message, valuesAreTheirBytesInMemory)
 {
     EXPECT_EQ(wire(static_cast<unsigned char>(0xfe), true, false, static_cast<unsigned short>(0x1234)), "fe01003412");
-    EXPECT_EQ(wire(-2, 0x01020304U, 1.0F), "feffffff" "04030201" + one);
-    EXPECT_EQ(wire(-2L, -3LL, 0x0102030405060708ULL, 1.0),
-              "feffffffffffffff" "fdffffffffffffff" "0807060504030201" "000000000000f03f");
-    EXPECT_EQ(wire(KpVec2i(1, 2), KpVec3i(3, 4, 5), KpVec4i(6, 7, 8, 9)),
-              "0100000002000000" "030000000400000005000000" "06000000070000000800000009000000");
+    EXPECT_EQ(wire(-2, 0x01020304U, 1.0F), "feffffff"
+                                           "04030201" +
+                                               one);
+    EXPECT_EQ(wire(-2L, -3LL, 0x0102030405060708ULL, 1.0), "feffffffffffffff"
+                                                           "fdffffffffffffff"
+                                                           "0807060504030201"
+                                                           "000000000000f03f");
+    EXPECT_EQ(wire(KpVec2i(1, 2), KpVec3i(3, 4, 5), KpVec4i(6, 7, 8, 9)), "0100000002000000"
+                                                                          "030000000400000005000000"
+                                                                          "06000000070000000800000009000000");
     EXPECT_EQ(wire(KpVec2f(1, 2), KpVec3f(1, 2, 3), KpVec4f(1, 2, 3, 4), KpVec3l(1, -1, 2)),
               one + two + one + two + three + one + two + three + four +
-                  "0100000000000000" "ffffffffffffffff" "0200000000000000");
+                  "0100000000000000"
+                  "ffffffffffffffff"
+                  "0200000000000000");
     EXPECT_EQ(wire(KpColor(1, 2, 3)), one + two + three);
     KpPlane plane;
     plane.setNormal(KpVec3f(1, 2, 3));
@@ -99,13 +106,18 @@ TEST(Message, valuesAreTheirBytesInMemory)
 
 TEST(Message, theFourTextFormsDiffer)
 {
-    EXPECT_EQ(wire("ab", ""), "03000000616200" "0100000000");
+    EXPECT_EQ(wire("ab", ""), "03000000616200"
+                              "0100000000");
     EXPECT_EQ(wire(static_cast<const char*>(nullptr)), "00000000");
-    EXPECT_EQ(wire(std::string("a\0b", 3), std::string()), "03000000610062" "00000000");
-    EXPECT_EQ(wire(KpString(std::string_view("a\0b", 3)), KpString(KpString::NoMemory{}), KpFilename("/c")),
-              "6100" "00" "2f6300");
+    EXPECT_EQ(wire(std::string("a\0b", 3), std::string()), "03000000610062"
+                                                           "00000000");
+    EXPECT_EQ(wire(KpString(std::string_view("a\0b", 3)), KpString(KpString::NoMemory{}), KpFilename("/c")), "6100"
+                                                                                                             "00"
+                                                                                                             "2f6300");
     char ab[] = "ab";
-    EXPECT_EQ(wire(arrayOf<char*>({ab, nullptr})), "02000000" "03000000616200" "00000000");
+    EXPECT_EQ(wire(arrayOf<char*>({ab, nullptr})), "02000000"
+                                                   "03000000616200"
+                                                   "00000000");
 
     TmMsg msg;
     msg << "ab" << static_cast<const char*>(nullptr) << std::string("a\0b", 3) << KpString("k") << KpFilename("/f")
@@ -133,9 +145,11 @@ TEST(Message, theFourTextFormsDiffer)
 
 TEST(Message, arraysAreACountAndOneBlock)
 {
-    EXPECT_EQ(wire(arrayOf<unsigned char>({1, 2}), arrayOf<bool>({true, false})), "020000000102" "020000000100");
-    EXPECT_EQ(wire(arrayOf<int>({1}), arrayOf<long>({-1}), arrayOf<float>({})),
-              "0100000001000000" "01000000ffffffffffffffff" "00000000");
+    EXPECT_EQ(wire(arrayOf<unsigned char>({1, 2}), arrayOf<bool>({true, false})), "020000000102"
+                                                                                  "020000000100");
+    EXPECT_EQ(wire(arrayOf<int>({1}), arrayOf<long>({-1}), arrayOf<float>({})), "0100000001000000"
+                                                                                "01000000ffffffffffffffff"
+                                                                                "00000000");
     EXPECT_EQ(wire(arrayOf<KpVec3f>({{1, 2, 3}})), "01000000" + one + two + three);
 }
 
@@ -185,9 +199,13 @@ TEST(Message, compositesHaveTheirForms)
     const LogCapture quiet;
     EXPECT_EQ(wire(KpResult()), "00000000");
     const KpResult failure(KpResult::InternalError, "a", "");
-    EXPECT_EQ(wire(failure), "02000000" "020000006100" "0f000000" "696e7465726e616c206572726f7200");
+    EXPECT_EQ(wire(failure), "02000000"
+                             "020000006100"
+                             "0f000000"
+                             "696e7465726e616c206572726f7200");
     TmMsg byHand;
-    byHand << 2 << "a" << "";
+    byHand << 2 << "a"
+           << "";
     KpResult read;
     byHand >> read;
     EXPECT_STREQ(read.data(), "internal error");
@@ -213,7 +231,11 @@ TEST(Message, compositesHaveTheirForms)
     int skipped = 0;
     inner >> skipped;
     outer << inner << 6;
-    EXPECT_EQ(hex(outer).substr(0, 40), "77660000" "77660000" "77660000" "77660000" "04000000");
+    EXPECT_EQ(hex(outer).substr(0, 40), "77660000"
+                                        "77660000"
+                                        "77660000"
+                                        "77660000"
+                                        "04000000");
     int after = 0, content = 0;
     outer >> back >> after;
     back >> content;
@@ -224,7 +246,11 @@ TEST(Message, imagesLoseTheirGaps)
 {
     unsigned char pixels[] = {1, 2, 99, 3, 4, 99};
     const KpTypedData2D image(2, 2, 1, 3, KpTypedPointer(pixels), 1);
-    EXPECT_EQ(wire(image), "01000000" "00000000" "02000000" "02000000" "01020304");
+    EXPECT_EQ(wire(image), "01000000"
+                           "00000000"
+                           "02000000"
+                           "02000000"
+                           "01020304");
     TmMsg msg;
     msg << image << KpTypedData2D();
     KpTypedData2D copy, none(2, 2, KpPrimType::Byte, 1);
@@ -247,28 +273,25 @@ TEST(Message, anArrayThatIsNotThereIsOneErrorLine)
     EXPECT_EQ(array[0], 42);
     EXPECT_EQ(msg.readOffset(), 404U);
     ASSERT_EQ(LogCapture::lines().size(), 1U);
-    EXPECT_NE(LogCapture::lines()[0].find(
-                  "Buffer overrun in TmMsg::readKpDArray(), offset=4, numBytes=400, size=8"),
+    EXPECT_NE(LogCapture::lines()[0].find("Buffer overrun in TmMsg::readKpDArray(), offset=4, numBytes=400, size=8"),
               std::string::npos);
 }
 
 TEST(Message, nothingIsReadBeyondTheEnd)
 {
     const LogCapture quiet;
-    const auto cut = [](unsigned count) {
-        TmMsg msg;
-        msg << count << static_cast<unsigned char>('x');
-        return msg;
-    };
     for (const unsigned count : {2U, 0x7fffffffU, 0x80000000U, 0xffffffffU}) {
+        TmMsg cut;
+        cut << count << static_cast<unsigned char>('x');
+        TmMsg forText(cut), forBytes(cut), forTexts(cut), forField(cut);
         char* text = nullptr;
         std::string bytes = "old";
         KpDArray<char*> texts;
         KpBitfield field(3, KpBitfield::INIT_SET);
-        cut(count) >> text;
-        cut(count) >> bytes;
-        cut(count) >> texts;
-        cut(count) >> field;
+        forText >> text;
+        forBytes >> bytes;
+        forTexts >> texts;
+        forField >> field;
         EXPECT_EQ(text, nullptr);
         EXPECT_EQ(bytes, "");
         EXPECT_EQ(texts.size(), 0);
@@ -288,10 +311,10 @@ TEST(Message, nothingIsReadBeyondTheEnd)
     msg >> text >> number;
     EXPECT_TRUE(text == "x");
     EXPECT_EQ(number, 0);
-    TmMsg two;
-    two << arrayOf<unsigned char>({2, 0});
+    TmMsg odd;
+    odd << arrayOf<unsigned char>({2, 0});
     KpDArray<bool> bools;
-    two >> bools;  // a byte of 2 is a true like others
+    odd >> bools;  // a byte of 2 is a true like others
     EXPECT_TRUE(bools[0] == true && bools[1] == false);
 }
 
