@@ -115,9 +115,8 @@ void plainRows(const TmDataAccess& volume, int axis, float* line)
     eachLine(axis, [&](long, long, long, long i) {
         if (axis == 0)
             return plainConvert(line, voxels + 512 * i, 512);
-        for (long z = 0; z < 64; ++z)
+        for (long z = 0; z < volume.dims()[2]; ++z)
             line[z] = voxels[i + z * 512 * 512];
-        benchmark::ClobberMemory();
     });
 }
 
@@ -127,7 +126,7 @@ void plainPutRows(const TmDataAccess& volume, int axis, float* line)
     eachLine(axis, [&](long, long, long, long i) {
         if (axis == 0)
             return plainConvert(voxels + 512 * i, line, 512);
-        for (long z = 0; z < 64; ++z)
+        for (long z = 0; z < volume.dims()[2]; ++z)
             voxels[i + z * 512 * 512] = static_cast<std::int16_t>(std::clamp(line[z], -32768.0F, 32767.0F));
     });
 }

@@ -24,10 +24,11 @@ long bytesOf(const PlaneShape& shape)
     return byteCount({shape.width, shape.height, shape.bytesPerPixel});
 }
 
-/// A block for the pixels without gaps; null if there is no memory.
+/// A block for the pixels without gaps, one also for none; null if there is no memory.
 void* allocated(const PlaneShape& shape)
 {
-    return std::malloc(static_cast<size_t>(bytesOf(shape)));
+    const long bytes = bytesOf(shape);
+    return std::malloc(bytes == 0 ? 1 : static_cast<size_t>(bytes));
 }
 
 }  // namespace

@@ -129,6 +129,7 @@ public:
 
 private:
     void fixStrides();
+    bool hasVoxels() const;
 
     // A line along `axis` that begins `offset` bytes behind the first voxel.
     template <typename T>

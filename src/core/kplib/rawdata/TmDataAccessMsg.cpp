@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <climits>
+#include <cstdint>
 #include <cstring>
 #include <memory>
 
@@ -39,7 +40,7 @@ void writeVoxels(TmMsg& msg, const TmDataAccess& object)
 /// The bytes of so many voxels; -1 if there can be no such volume.
 long voxelBytes(const KpVec3l& dims, int nDataVar, KpPrimType type)
 {
-    const bool isNegative = nDataVar < 0 || std::min({dims[0], dims[1], dims[2]}) < 0;
+    const bool isNegative = std::min({dims[0], dims[1], dims[2], std::int64_t{nDataVar}}) < 0;
     return isNegative ? -1 : byteCount({dims[0], dims[1], dims[2], nDataVar, type.size()});
 }
 
@@ -63,14 +64,14 @@ TmMsg& operator>>(TmMsg& msg, TmDataAccess*& object)
     KpVec3l dims;
     int nDataVar = 0;
     KpPrimType type;
-    if (isNull || !msg.holds(sizeof dims + sizeof nDataVar + sizeof type))
+    if (isNull)
         return msg;
     msg >> dims >> nDataVar >> type;
     const long bytes = voxelBytes(dims, nDataVar, type);
     void* voxels = nullptr;
     if (bytes >= 0)
         msg.readRawBytes(static_cast<unsigned long>(bytes), voxels);
-    if (!voxels)
+    if (!voxels)  // nor has a message that ended in the sizes
         return msg;
     auto result = std::make_unique<TmDataAccess>(dims, type, nDataVar, KpAllocator::AllocatorMalloc);
     if (result->hasData() && bytes > 0)

@@ -44,10 +44,16 @@ void eachElement(void* first, long step, long n, Each each)
 
 }  // namespace
 
+/// A message may announce a volume without a voxel that is long on one axis; there is nothing behind its lines.
+bool TmDataAccess::hasVoxels() const
+{
+    return hasData() && nDataVar_ > 0 && dims_[0] > 0 && dims_[1] > 0 && dims_[2] > 0;
+}
+
 KpResult TmDataAccess::row(long x, long y, long z, float* out) const
 {
     const Line line = lineAt(x, y, z, strides_);
-    if (hasData() && size() > 0) {
+    if (hasVoxels()) {
         visitNumberType(primType_, [&]<typename T>(ElementTag<T>) { rowImpl<T>(line.offset, line.axis, out); });
     }
     return {};
@@ -56,7 +62,7 @@ KpResult TmDataAccess::row(long x, long y, long z, float* out) const
 KpResult TmDataAccess::putRow(long x, long y, long z, const float* in) const
 {
     const Line line = lineAt(x, y, z, strides_);
-    if (hasData() && size() > 0) {
+    if (hasVoxels()) {
         visitNumberType(primType_, [&]<typename T>(ElementTag<T>) {
             if constexpr (std::is_integral_v<T>)
                 putRowImpl<T>(line.offset, line.axis, in, RealBounds<T, float>::low, RealBounds<T, float>::high);
