@@ -34,8 +34,9 @@ struct Pair {
 struct SteadySignal {
     SteadySignal()
     {
-        signal(SIGALRM, [](int) {});
-        siginterrupt(SIGALRM, 1);
+        struct sigaction action {};
+        action.sa_handler = [](int) {};
+        sigaction(SIGALRM, &action, nullptr);
         ualarm(1000, 1000);
     }
     ~SteadySignal() { ualarm(0, 0); }
