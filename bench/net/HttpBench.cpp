@@ -121,12 +121,13 @@ void curl(benchmark::State& state)
 
 }  // namespace
 
-BENCHMARK_CAPTURE(raw, raw, 0x40000)->Name("raw")->Arg(64 << 10)->Arg(1 << 20)->UseRealTime();
+BENCHMARK_CAPTURE(raw, raw, 0x40000)->Name("raw")->Arg(64 << 10)->Arg(1 << 20)->UseRealTime()->MinTime(0.2);
 BENCHMARK_CAPTURE(raw, system, 0)
     ->Name("raw, buffers of the system's size")
     ->Arg(64 << 10)
     ->Arg(1 << 20)
-    ->UseRealTime();
-BENCHMARK_CAPTURE(httpGet, small, 1.2)->Name("KpHttpGet/read")->Arg(64 << 10)->UseRealTime();
-BENCHMARK_CAPTURE(httpGet, large, 1.1)->Name("KpHttpGet/read")->Arg(1 << 20)->UseRealTime();
-BENCHMARK(curl)->Name("libcurl")->Arg(64 << 10)->Arg(1 << 20)->UseRealTime();
+    ->UseRealTime()
+    ->MinTime(0.2);
+BENCHMARK_CAPTURE(httpGet, small, 1.2)->Name("KpHttpGet/read")->Arg(64 << 10)->UseRealTime()->MinTime(0.2);
+BENCHMARK_CAPTURE(httpGet, large, 1.1)->Name("KpHttpGet/read")->Arg(1 << 20)->UseRealTime()->MinTime(0.2);
+BENCHMARK(curl)->Name("libcurl")->Arg(64 << 10)->Arg(1 << 20)->UseRealTime()->MinTime(0.2);

@@ -68,7 +68,13 @@ void exchange(benchmark::State& state, Mine mine, Theirs theirs, const char* bas
 
 }  // namespace
 
-BENCHMARK_CAPTURE(exchange, send, bareSend, bareReceive, "", 0)->Name("send")->UseRealTime();
-BENCHMARK_CAPTURE(exchange, safeSend, safeSend, bareReceive, "send", 1.05)->Name("KpSocket/safeSend")->UseRealTime();
-BENCHMARK_CAPTURE(exchange, recv, bareReceive, bareSend, "", 0)->Name("recv")->UseRealTime();
-BENCHMARK_CAPTURE(exchange, receive, receive, bareSend, "recv", 1.05)->Name("KpSocket/receive")->UseRealTime();
+BENCHMARK_CAPTURE(exchange, send, bareSend, bareReceive, "", 0)->Name("send")->UseRealTime()->MinTime(0.3);
+BENCHMARK_CAPTURE(exchange, safeSend, safeSend, bareReceive, "send", 1.05)
+    ->Name("KpSocket/safeSend")
+    ->UseRealTime()
+    ->MinTime(0.3);
+BENCHMARK_CAPTURE(exchange, recv, bareReceive, bareSend, "", 0)->Name("recv")->UseRealTime()->MinTime(0.3);
+BENCHMARK_CAPTURE(exchange, receive, receive, bareSend, "recv", 1.05)
+    ->Name("KpSocket/receive")
+    ->UseRealTime()
+    ->MinTime(0.3);
