@@ -2,10 +2,11 @@
 
 #include <support/TempFolder.h>
 
+#include <kplib/net/KpSocket.h>
+
 #include <arpa/inet.h>
 #include <atomic>
 #include <csignal>
-#include <fcntl.h>
 #include <functional>
 #include <netinet/tcp.h>
 #include <string>
@@ -103,33 +104,34 @@ public:
 
     Nginx()
     {
-        const int file = open((folder_ / "volume").c_str(), O_CREAT | O_WRONLY, 0644);
-        bool made = ftruncate(file, size) == 0;
+        const std::string volume = folder_.file("volume", "");
+        std::filesystem::resize_file(volume, size);
+        std::fstream file(volume);
         for (long spot : spots)
-            made = made && pwrite(file, &spot, sizeof(spot), spot) == sizeof(spot);
-        close(file);
-        std::string temporary;
+            file.seekp(spot).write(reinterpret_cast<const char*>(&spot), sizeof(spot));
+        file.close();
+        std::string conf = geteuid() == 0 ? "user root;" : "";  // the folder is this user's alone
+        conf += "daemon off; worker_processes 1; pid pid; events {} http { access_log off; sendfile on; "
+                "keepalive_requests 100000000; server { root .; listen 127.0.0.1:" +
+                std::to_string(port) + "; }";
         for (const char* kind : {"client_body", "proxy", "fastcgi", "uwsgi", "scgi"})
-            temporary += std::string(kind) + "_temp_path " + folder_.path + "/" + kind + ";";
-        folder_.file("conf", std::string(geteuid() == 0 ? "user root;" : "") + "pid " + folder_.path +
-                                 "/pid; daemon off; worker_processes 1; events {} http { access_log off; " + temporary +
-                                 "keepalive_requests 100000000; sendfile on; server { listen 127.0.0.1:" +
-                                 std::to_string(port) + "; root " + folder_.path + "; } }");
-        process_ = made ? fork() : -1;
+            conf += std::string(kind) + "_temp_path temporary;";
+        conf = folder_.file("conf", conf + "}");
+        process_ = fork();
         if (process_ == 0) {
             prctl(PR_SET_PDEATHSIG, SIGTERM);
-            const std::string conf = folder_ / "conf", log = folder_ / "log";
-            execl(program, "nginx", "-p", folder_.path.c_str(), "-c", conf.c_str(), "-e", log.c_str(), nullptr);
+            execl(program, "nginx", "-p", folder_.path.c_str(), "-c", conf.c_str(), "-e", "log", nullptr);
             _exit(1);
         }
-        isRunning = process_ > 0 && answers();
+        for (int attempt = 0; attempt < 1000 && !isRunning && waitpid(process_, nullptr, WNOHANG) == 0; ++attempt) {
+            usleep(10000);
+            isRunning = KpSocket::close(KpSocket::connect("127.0.0.1", port, 0, 0, 0)) == 0;
+        }
     }
     ~Nginx()
     {
-        if (process_ > 0) {
-            kill(process_, SIGTERM);
+        if (isRunning && kill(process_, SIGTERM) == 0)
             waitpid(process_, nullptr, 0);
-        }
     }
     std::string url(const std::string& name = "volume") const
     {
@@ -141,22 +143,6 @@ public:
 
 private:
     static constexpr const char* program = "/usr/sbin/nginx";
-
-    bool answers() const
-    {
-        sockaddr_in address{};
-        address.sin_family = AF_INET;
-        address.sin_port = htons(static_cast<uint16_t>(port));
-        address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
-        for (int attempt = 0; attempt < 1000; ++attempt, usleep(10000)) {
-            const int probe = socket(AF_INET, SOCK_STREAM, 0);
-            const bool connected = connect(probe, reinterpret_cast<sockaddr*>(&address), sizeof(address)) == 0;
-            close(probe);
-            if (connected || waitpid(process_, nullptr, WNOHANG) != 0)
-                return connected;
-        }
-        return false;
-    }
 
     TempFolder folder_;
     pid_t process_ = -1;

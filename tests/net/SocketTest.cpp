@@ -4,11 +4,10 @@
 #include <kplib/net/KpSocket.h>
 #include <kplib/net/KpSocketTools.h>
 
-#include <array>
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <gtest/gtest.h>
-#include <sys/time.h>
 #include <vector>
 
 using namespace kplib::test;
@@ -17,39 +16,31 @@ namespace {
 
 std::vector<int> refusedOptions;  // of SOL_SOCKET
 
-/// Two connected sockets; first() is the tested one.
+/// Two connected sockets: mine, and that of a peer which may hang up.
 struct Pair {
-    Pair() { EXPECT_EQ(socketpair(AF_UNIX, SOCK_STREAM, 0, ends), 0); }
-    ~Pair()
+    Pair()
     {
-        close(ends[0]);
-        hangUp();
+        int ends[2] = {-1, -1};
+        EXPECT_EQ(socketpair(AF_UNIX, SOCK_STREAM, 0, ends), 0);
+        mine = ends[0];
+        peer = ends[1];
     }
-    void hangUp()
-    {
-        if (ends[1] >= 0)
-            KpSocket::close(ends[1]);
-        ends[1] = -1;
-    }
-    int ends[2];
+    ~Pair() { close(mine); }
+    void hangUp() const { close(peer); }
+    int mine, peer;
 };
 
-/// SIGALRM to this thread every millisecond, with a handler that lets calls be interrupted.
-class SteadySignal {
-public:
+/// While one lives, a signal a millisecond that interrupts the calls of this thread.
+struct SteadySignal {
     SteadySignal()
     {
         struct sigaction action {};
-        action.sa_handler = [](int) { count = count + 1; };
+        action.sa_handler = [](int) {};
         sigaction(SIGALRM, &action, nullptr);
-        set(1000);
+        ualarm(1000, 1000);
     }
-    ~SteadySignal()
-    {
-        set(0);
-        EXPECT_GT(count, 10);
-    }
-    /// To be called by other threads, first of all.
+    ~SteadySignal() { ualarm(0, 0); }
+    /// To be called by other threads, before they begin.
     static void block()
     {
         sigset_t set;
@@ -57,16 +48,7 @@ public:
         sigaddset(&set, SIGALRM);
         pthread_sigmask(SIG_BLOCK, &set, nullptr);
     }
-
-private:
-    static void set(int microseconds)
-    {
-        const itimerval interval{{0, microseconds}, {0, microseconds}};
-        setitimer(ITIMER_REAL, &interval, nullptr);
-    }
-    static volatile sig_atomic_t count;
 };
-volatile sig_atomic_t SteadySignal::count = 0;
 
 template <typename T = int>
 T option(int socket, int level, int name)
@@ -85,9 +67,10 @@ int __wrap_setsockopt(int socket, int level, int name, const void* value, sockle
 
 int __wrap_setsockopt(int socket, int level, int name, const void* value, socklen_t length)
 {
+    if (level != SOL_SOCKET || std::count(refusedOptions.begin(), refusedOptions.end(), name) == 0)
+        return __real_setsockopt(socket, level, name, value, length);
     errno = ENOBUFS;
-    const bool refused = std::count(refusedOptions.begin(), refusedOptions.end(), name) > 0 && level == SOL_SOCKET;
-    return refused ? -1 : __real_setsockopt(socket, level, name, value, length);
+    return -1;
 }
 }
 
@@ -141,25 +124,25 @@ TEST(KpSocket, readsLinesAndNothingBehindThem)
     const std::string longLine(5000, 'x'), text = "a\r\n\n" + longLine + "\nab" + std::string("\0c\nrest", 7);
     for (size_t step : {text.size(), size_t{1}, size_t{513}}) {
         Pair pair;
-        KpSocket::nonBlocking(pair.ends[0]);
+        KpSocket::nonBlocking(pair.mine);
         std::thread writer([&] {
             usleep(10000);  // so that a socket that isn't blocking would show
-            put(pair.ends[1], text, step);
+            put(pair.peer, text, step);
             pair.hangUp();
         });
         KpString line("old");
-        EXPECT_EQ(KpSocket::readLine(pair.ends[0], line), 3);
+        EXPECT_EQ(KpSocket::readLine(pair.mine, line), 3);
         EXPECT_EQ(line, "a\r\n");
-        EXPECT_FALSE(KpSocket::isNonBlocking(pair.ends[0]));
-        EXPECT_EQ(KpSocket::readLine(pair.ends[0], line), 1);
-        EXPECT_EQ(KpSocket::readLine(pair.ends[0], line), 5001);
+        EXPECT_FALSE(KpSocket::isNonBlocking(pair.mine));
+        EXPECT_EQ(KpSocket::readLine(pair.mine, line), 1);
+        EXPECT_EQ(KpSocket::readLine(pair.mine, line), 5001);
         EXPECT_EQ(line, (longLine + "\n").c_str());
         char byte = 0;
-        EXPECT_EQ(KpSocket::receive(pair.ends[0], &byte, 1, 0), 1);
+        EXPECT_EQ(KpSocket::receive(pair.mine, &byte, 1, 0), 1);
         EXPECT_EQ(byte, 'a');
-        EXPECT_EQ(KpSocket::readLine(pair.ends[0], line), 4);
+        EXPECT_EQ(KpSocket::readLine(pair.mine, line), 4);
         EXPECT_EQ(std::memcmp(line.c_str(), "b\0c\n", 5), 0);
-        EXPECT_EQ(KpSocket::readLine(pair.ends[0], line), 0);
+        EXPECT_EQ(KpSocket::readLine(pair.mine, line), 0);
         EXPECT_EQ(line, "rest");
         writer.join();
     }
@@ -188,14 +171,14 @@ TEST(KpSocket, receivesAsManyBytesAsAskedForOrALine)
         for (size_t step : {1, 6}) {
             SCOPED_TRACE(c.what);
             Pair pair;
-            put(pair.ends[1], "abc\nde", step);
+            put(pair.peer, "abc\nde", step);
             pair.hangUp();
             std::string buffer(8, '.');
-            EXPECT_EQ(KpSocket::receive(pair.ends[0], buffer.data(), c.size, c.lineMode), c.result);
+            EXPECT_EQ(KpSocket::receive(pair.mine, buffer.data(), c.size, c.lineMode), c.result);
             std::replace(buffer.begin(), buffer.end(), '\0', '0');
             EXPECT_EQ(buffer, c.buffer);
             char left[8] = "";
-            EXPECT_EQ(recv(pair.ends[0], left, sizeof(left), 0), static_cast<long>(std::strlen(c.left)));
+            EXPECT_EQ(recv(pair.mine, left, sizeof(left), 0), static_cast<long>(std::strlen(c.left)));
             EXPECT_STREQ(left, c.left);
         }
     }
@@ -210,18 +193,20 @@ TEST(KpSocket, goesOnThroughSignalsAndStillTimesOut)
     std::thread peer([&] {
         SteadySignal::block();
         for (size_t i = 0; i < text.size(); ++i, usleep(2000))
-            put(pair.ends[1], "x");
-        close(accept(busy.socket, nullptr, nullptr));
+            put(pair.peer, "x");
+        usleep(50000);  // the second connection waits by then
+        pair.hangUp();
+        close(accept(busy.socket, nullptr, nullptr));  // the first
     });
     const SteadySignal signal;
     std::string received(text.size(), ' ');
-    EXPECT_EQ(KpSocket::receive(pair.ends[0], received.data(), 100, 0), 100);
+    EXPECT_EQ(KpSocket::receive(pair.mine, received.data(), 100, 0), 100);
     EXPECT_EQ(received, text);
     const int second = KpSocket::connect("127.0.0.1", busy.port, 0, 0, 0);
     EXPECT_GE(second, 0) << KpSocket::strerror();
     peer.join();
-    KpSocket::setTimeout(pair.ends[0], 50);
-    EXPECT_EQ(KpSocket::receive(pair.ends[0], received.data(), 1, 0), -1);
+    KpSocket::setTimeout(second, 50);
+    EXPECT_EQ(KpSocket::receive(second, received.data(), 1, 0), -1);
     EXPECT_EQ(KpSocket::lastErrorCode(), EAGAIN);
     KpSocket::close(first);
     KpSocket::close(second);
