@@ -98,6 +98,17 @@
 #include <kplib/rawdata/KpTypedPointer.h>
 #include <kplib/rawdata/TmDataAccess.h>
 #include <kplib/rawdata/TmSSETools.h>
+#include <kplib/shapes/AbstractEllipse2D.h>
+#include <kplib/shapes/AbstractShape2D.h>
+#include <kplib/shapes/Angle2D.h>
+#include <kplib/shapes/Circle2D.h>
+#include <kplib/shapes/CurvedShape2D.h>
+#include <kplib/shapes/Ellipse2D.h>
+#include <kplib/shapes/KpLine2D.h>
+#include <kplib/shapes/Polygon2D.h>
+#include <kplib/shapes/Polyline2D.h>
+#include <kplib/shapes/Rectangle2D.h>
+#include <kplib/shapes/Shape2D.h>
 #include <kplib/system/KpBuildInfo.h>
 #include <kplib/system/KpCPUInfo.h>
 #include <kplib/system/KpCoder.h>

@@ -100,6 +100,18 @@ class KpMorphology;
 class KpNeighborIterator33;
 class KpScanConvert;
 
+class AbstractEllipse2D;
+class AbstractShape2D;
+class Angle2D;
+class Circle2D;
+class CurvedShape2D;
+class Ellipse2D;
+class KpLine2D;
+class Polygon2D;
+class Polyline2D;
+class Rectangle2D;
+class Shape2D;
+
 class KpHttpGet;
 class KpSocket;
 class KpSocketTools;
