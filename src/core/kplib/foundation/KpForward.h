@@ -105,6 +105,8 @@ class KpSocket;
 class KpSocketTools;
 class TmMsg;
 
+class KpRandom;
+
 class KpCallable;
 class KpProgressGuiInterface;
 class KpProgressInterface;
