@@ -117,6 +117,8 @@ class KpSocket;
 class KpSocketTools;
 class TmMsg;
 
+class KpRandom;
+
 class KpCallable;
 class KpProgressGuiInterface;
 class KpProgressInterface;
