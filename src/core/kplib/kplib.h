@@ -83,7 +83,11 @@
 #include <kplib/net/KpSocket.h>
 #include <kplib/net/KpSocketTools.h>
 #include <kplib/net/TmMsg.h>
+#include <kplib/numerics/KpPls.h>
 #include <kplib/numerics/KpRandom.h>
+#include <kplib/numerics/KpSimAnnState.h>
+#include <kplib/numerics/KpSimulatedAnnealer.h>
+#include <kplib/numerics/KpStatistics.h>
 #include <kplib/param/HxParamBase.h>
 #include <kplib/param/HxParamBundle.h>
 #include <kplib/param/HxParamEditCheck.h>

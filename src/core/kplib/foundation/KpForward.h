@@ -117,7 +117,11 @@ class KpSocket;
 class KpSocketTools;
 class TmMsg;
 
+class KpPls;
 class KpRandom;
+class KpSimAnnState;
+class KpSimulatedAnnealer;
+class KpStatistics;
 
 class KpCallable;
 class KpProgressGuiInterface;
