@@ -93,7 +93,11 @@
 #include <kplib/param/HxParameter.h>
 #include <kplib/rawdata/KpPackedIndexing.h>
 #include <kplib/rawdata/KpRawData.h>
+#include <kplib/rawdata/KpRawData2D.h>
+#include <kplib/rawdata/KpRawData3D.h>
 #include <kplib/rawdata/KpSuperPackedIndexing.h>
+#include <kplib/rawdata/KpTypedData2D.h>
+#include <kplib/rawdata/KpTypedData3D.h>
 #include <kplib/rawdata/KpTypedElement.h>
 #include <kplib/rawdata/KpTypedPointer.h>
 #include <kplib/rawdata/TmSSETools.h>

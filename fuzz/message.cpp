@@ -1,0 +1,126 @@
+#include <kplib/foundation/KpMemoryException.h>
+#include <kplib/geometry/KpMat4f.h>
+#include <kplib/geometry/KpPlane.h>
+#include <kplib/log/KpLogFile.h>
+#include <kplib/log/KpResult.h>
+#include <kplib/net/TmMsg.h>
+#include <kplib/rawdata/KpTypedData2D.h>
+#include <kplib/rawdata/TmDataAccess.h>
+#include <kplib/system/KpFilename.h>
+#include <kplib/volume/KpBitfield.h>
+
+#include <algorithm>
+#include <array>
+#include <string>
+#include <vector>
+
+// Any bytes read as any sequence of values: nothing is read beyond the end, and what arrives can be used.
+
+namespace {
+
+volatile unsigned char sink;
+
+void use(const void* data, unsigned long size)
+{
+    const auto* bytes = static_cast<const unsigned char*>(data);
+    for (unsigned long i = 0; i < size; ++i)
+        sink = bytes[i];
+}
+
+template <typename T>
+void readValue(TmMsg& msg)
+{
+    T value;
+    msg >> value;
+    use(&value, sizeof value);
+}
+
+/// An array takes the memory that its count asks for: that is tried up to a megabyte.
+template <typename T>
+void readArray(TmMsg& msg)
+{
+    TmMsg ahead(msg.holds(4) ? 4 : 0, msg.dataPtr() + (msg.holds(4) ? msg.readOffset() : 0));
+    unsigned int count = 0;
+    ahead >> count;
+    KpDArray<T> array;
+    if (count < 1U << 14)
+        msg >> array;
+    if (msg.readOffset() <= msg.size())
+        use(array.data(), static_cast<unsigned long>(array.size()) * sizeof(T));
+}
+
+void readTexts(TmMsg& msg)
+{
+    char* text = nullptr;
+    std::string bytes;
+    KpString string;
+    KpFilename name;
+    KpDArray<char*> texts;
+    msg >> text >> bytes >> string >> name >> texts;
+    use(text, text ? std::strlen(text) : 0);
+    for (const char* each : texts)
+        use(each, each ? std::strlen(each) : 0);
+}
+
+void readImage(TmMsg& msg)
+{
+    KpTypedData2D image;
+    msg >> image;
+    if (image.data())
+        use(image.data(), static_cast<unsigned long>(image.rowStride()) * static_cast<unsigned long>(image.dims()[1]));
+}
+
+void readField(TmMsg& msg)
+{
+    KpBitfield field;
+    msg >> field;
+    sink = static_cast<unsigned char>(field.nSetBits());
+}
+
+void readVolume(TmMsg& msg)
+{
+    TmDataAccess* volume = nullptr;
+    msg >> volume;
+    const KpHandle<TmDataAccess> handle(volume);
+    if (volume && volume->hasData())
+        sink = static_cast<unsigned char>(volume->hash().words()[0]);
+}
+
+void readInner(TmMsg& msg)
+{
+    TmMsg inner;
+    if (msg.bytesAvailable() < 1U << 20)
+        msg >> inner;
+    use(inner.dataPtr(), inner.readOffset());
+}
+
+constexpr std::array readers = {
+    readValue<bool>,    readValue<unsigned short>,
+    readValue<double>,  readValue<KpMat4f>,
+    readValue<KpPlane>, readValue<KpResult>,
+    readArray<bool>,    readArray<int>,
+    readArray<long>,    readArray<KpPlane>,
+    readArray<KpMat4f>, readTexts,
+    readImage,          readField,
+    readVolume,         readInner,
+};
+
+}  // namespace
+
+extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
+{
+    getTheLogInstance().setLogLevel(KpLogOff);
+    const size_t steps = std::min<size_t>(size, size > 0 ? data[0] % 32 : 0);
+    std::vector<unsigned char> bytes(data + steps, data + size);
+    TmMsg random(bytes.size(), bytes.data());
+    TmMsg inTurn(random);
+    try {
+        for (size_t i = 1; i < steps; ++i)
+            readers[data[i] % readers.size()](random);
+        for (size_t i = 0; inTurn.readOffset() < inTurn.size(); ++i)
+            readers[i % readers.size()](inTurn);
+    } catch (const KpMemoryException&) {
+        return 0;  // what a message asks for may be more than there is
+    }
+    return 0;
+}

@@ -1,0 +1,118 @@
+#include <kplib/rawdata/KpRawData2D.h>
+
+#include <kplib/rawdata/detail/KpByteCount.h>
+#include <kplib/rawdata/detail/KpPlaneCopy.h>
+
+#include <cstdlib>
+
+using namespace kplib::detail;
+
+namespace {
+
+PlaneShape shapeOf(const KpRawData2D& image)
+{
+    return {image.dims()[0], image.dims()[1], image.bytesPerPixel()};
+}
+
+Plane planeOf(const KpRawData2D& image)
+{
+    return {image.data(), image.pixelStride(), image.rowStride()};
+}
+
+long bytesOf(const PlaneShape& shape)
+{
+    return byteCount({shape.width, shape.height, shape.bytesPerPixel});
+}
+
+/// A block for the pixels without gaps; null if there is no memory.
+void* allocated(const PlaneShape& shape)
+{
+    return std::malloc(static_cast<size_t>(bytesOf(shape)));
+}
+
+}  // namespace
+
+KpRawData2D& KpRawData2D::operator=(const KpRawData2D& other)
+{
+    if (this == &other)
+        return *this;
+    init(other.dims_[0], other.dims_[1], other.bytesPerPixel_, other.pixelStride_, other.rowStride_, other.data_);
+    if (other.ownedData_) {
+        const PlaneShape shape = shapeOf(other);
+        ownedData_ = data_ = allocated(shape);
+        copyPlane(densePlane(data_, shape), densePlane(other.ownedData_, shape), shape);
+    }
+    return *this;
+}
+
+void KpRawData2D::init(int w, int h, int bytesPerPixel)
+{
+    cleanup();
+    setShape(w, h, bytesPerPixel);
+    if (bytesOf(shapeOf(*this)) != 0)
+        ownedData_ = data_ = allocated(shapeOf(*this));
+}
+
+void KpRawData2D::init(int w, int h, int bytesPerPixel, void* data)
+{
+    cleanup();
+    setShape(w, h, bytesPerPixel);
+    data_ = data;
+}
+
+void KpRawData2D::init(int w, int h, int bytesPerPixel, int rowStride, void* data)
+{
+    init(w, h, bytesPerPixel, data);
+    rowStride_ = rowStride;
+}
+
+void KpRawData2D::init(int w, int h, int bytesPerPixel, int pixelStride, int rowStride, void* data)
+{
+    init(w, h, bytesPerPixel, rowStride, data);
+    pixelStride_ = pixelStride;
+}
+
+void KpRawData2D::cleanup()
+{
+    std::free(ownedData_);
+    ownedData_ = nullptr;
+}
+
+void KpRawData2D::commit(int w, int h, int bytesPerPixel, void* data)
+{
+    init(w, h, bytesPerPixel, data);
+    ownedData_ = data;
+}
+
+bool KpRawData2D::copyData(const KpRawData2D& from)
+{
+    if (dims_[0] != from.dims_[0] || dims_[1] != from.dims_[1] || bytesPerPixel_ != from.bytesPerPixel_)
+        return false;
+    copyPlane(planeOf(*this), planeOf(from), shapeOf(*this));
+    return true;
+}
+
+void KpRawData2D::makeLocal()
+{
+    if (ownedData_)
+        return;
+    const PlaneShape shape = shapeOf(*this);
+    void* const block = allocated(shape);
+    copyPlane(densePlane(block, shape), planeOf(*this), shape);
+    commit(dims_[0], dims_[1], bytesPerPixel_, block);
+}
+
+void KpRawData2D::clear()
+{
+    clearPlane(planeOf(*this), shapeOf(*this));
+}
+
+/// Sizes and the strides of pixels without gaps.
+void KpRawData2D::setShape(int w, int h, int bytesPerPixel)
+{
+    dims_[0] = w;
+    dims_[1] = h;
+    bytesPerPixel_ = bytesPerPixel;
+    pixelStride_ = bytesPerPixel;
+    rowStride_ = static_cast<std::int32_t>(std::int64_t{w} * bytesPerPixel);
+}

@@ -1,0 +1,71 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpForward.h>
+
+#include <cstdint>
+
+/// A block of voxels without gaps, x fastest, either an owner of its memory or a view on somebody else's.
+///
+/// Voxels are bags of bytes: only their size counts. Memory comes from kpmalloc; exhausted memory is a
+/// KpMemoryException, after which the object holds none. Slices have an orientation: 0 is the plane of constant x with
+/// rows along y, 1 that of constant y and 2 that of constant z, both with rows along x. Positions and sizes are not
+/// checked. It cannot be copied: who wants a second block asks for one. One thread may change it, or any number read
+/// it.
+class KPLIB_API KpRawData3D {
+public:
+    /// Empty: sizes and pointers are 0.
+    KpRawData3D() = default;
+    /// As init().
+    KpRawData3D(int nx, int ny, int nz, int bytesPerVoxel) { init(nx, ny, nz, bytesPerVoxel); }
+    KpRawData3D(int nx, int ny, int nz, int bytesPerVoxel, void* data) { init(nx, ny, nz, bytesPerVoxel, data); }
+    KpRawData3D(const KpRawData3D&) = delete;
+    KpRawData3D& operator=(const KpRawData3D&) = delete;
+    ~KpRawData3D() { cleanup(); }
+
+    /// An owner of voxels that are not set to anything, also if there are none.
+    void init(int nx, int ny, int nz, int bytesPerVoxel);
+    /// A view.
+    void init(int nx, int ny, int nz, int bytesPerVoxel, void* data);
+
+    /// Frees the block of an owner. data() stays and is not to be used.
+    void cleanup();
+
+    /// Exchanges the owned block for `p`, also a block of kpmalloc or null; data() is what is owned then.
+    void swapDataPtr(void*& p);
+
+    /// Makes this the owner of `data`, a block of kpmalloc.
+    void commit(int nx, int ny, int nz, int bytesPerVoxel, void* data);
+
+    /// Number, not byte, of the voxel at (`i`, `j`) within slice `k`. Other orientations than 1 and 2 count as 0.
+    long getOffset(int i, int j, int k, int orientation) const;
+
+    /// Width, height and number of the slices. Other orientations than 1 and 2 count as 0.
+    void getDims(int* dims, int orientation) const { getDims(orientation, dims[0], dims[1], dims[2]); }
+    void getDims(int orientation, int& d0, int& d1, int& d2) const;
+
+    /// First voxel of slice `k`, and the bytes from voxel to voxel in a row and from row to row. Other orientations
+    /// than 1 and 2 count as 0.
+    void accessSlice(int orientation, int k, void*& p, int& stride0, int& stride1) const;
+
+    /// Makes `out` a view on slice `k`; or, with `copy`, fills the memory that `out` has to have, without gaps and
+    /// whatever its sizes and strides say. Other orientations than 0, 1 and 2 do nothing.
+    void getSlice(int orientation, int k, KpRawData2D& out, int copy) const;
+
+    /// Overwrites slice `k` by the pixels of `slice`, which lie without gaps, whatever its sizes and strides say. Other
+    /// orientations than 0, 1 and 2 do nothing.
+    void putSlice(int orientation, int k, const KpRawData2D& slice);
+
+    const std::int32_t* dims() const { return dims_; }
+    int bytesPerVoxel() const { return bytesPerVoxel_; }
+    /// The first voxel; a view hands out its memory for writing, too.
+    void* data() const { return data_; }
+    /// The block of an owner, null for a view.
+    void* ownedData() const { return ownedData_; }
+
+private:
+    std::int32_t dims_[3] = {0, 0, 0};
+    std::int32_t bytesPerVoxel_ = 0;
+    void* data_ = nullptr;
+    void* ownedData_ = nullptr;  // null or data_
+};
