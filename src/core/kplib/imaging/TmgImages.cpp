@@ -45,15 +45,15 @@ bool nextField(const char*& fields, std::string_view& field)
     return true;
 }
 
-/// The field of `values` that stands where `name` stands in `names`; empty without one.
-std::string_view fieldOf(const char* names, const char* values, std::string_view name)
+/// The field of `values` that stands where `name` stands in `names`; false without one.
+bool findField(const char* names, const char* values, std::string_view name, std::string_view& value)
 {
-    std::string_view each, value;
+    std::string_view each;
     while (nextField(names, each) && nextField(values, value)) {
         if (each == name)
-            return value;
+            return true;
     }
-    return {};
+    return false;
 }
 
 bool hasOneImage(const HxParamBundle& bundle, const char* name)
@@ -137,7 +137,7 @@ bool frameNumber(const HxParamBundle& object, bool enhanced, int index, int& out
     const HxParamBundle* const all = object.dicomAll();
     const HxParameter* const frames = all ? all->findSorted("G0028-0008") : nullptr;
     const char* value = nullptr;
-    if (!frames || !std::strchr(textOf(*frames), ':') || !frames->getBundleTagValue(value) || std::atoi(value) < 2)
+    if (!frames || !frames->getBundleTagValue(value) || std::atoi(value) < 2)
         return false;
     if (enhanced) {
         out = index;
@@ -161,10 +161,11 @@ bool imageLevelTag(const HxParamBundle& object, int index, const char* tag, KpSt
     if (list && object.findString("ImageLevelTags", names) && names && std::strstr(names, tag)) {
         approximate = false;
         const HxParameter* const image = parameterAt(*list, index + 1L);
-        if (!image)
+        std::string_view field;
+        if (!image || !findField(names, textOf(*image), tag, field))
             return false;
-        value = KpString(fieldOf(names, textOf(*image), tag));
-        return !value.isEmpty();
+        value = KpString(field);
+        return !field.empty();
     }
     approximate = isApproximate(object, list, tag);
     const char* const text = headerText(object, tag);
