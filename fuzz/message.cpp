@@ -35,15 +35,22 @@ void readValue(TmMsg& msg)
     use(&value, sizeof value);
 }
 
-/// An array takes the memory that its count asks for: that is tried up to a megabyte.
+/// Arrays and inner messages take the memory that their counts ask for, which is tried up to some size only. The count
+/// stands `skip` bytes ahead.
+bool isModest(TmMsg& msg, unsigned long skip)
+{
+    if (!msg.holds(skip + sizeof(unsigned int)))
+        return true;
+    unsigned int count = 0;
+    std::memcpy(&count, msg.dataPtr() + msg.readOffset() + skip, sizeof count);
+    return count < 1U << 14;
+}
+
 template <typename T>
 void readArray(TmMsg& msg)
 {
-    TmMsg ahead(msg.holds(4) ? 4 : 0, msg.dataPtr() + (msg.holds(4) ? msg.readOffset() : 0));
-    unsigned int count = 0;
-    ahead >> count;
     KpDArray<T> array;
-    if (count < 1U << 14)
+    if (isModest(msg, 0))
         msg >> array;
     if (msg.readOffset() <= msg.size())
         use(array.data(), static_cast<unsigned long>(array.size()) * sizeof(T));
@@ -83,15 +90,16 @@ void readVolume(TmMsg& msg)
     msg >> volume;
     const KpHandle<TmDataAccess> handle(volume);
     if (volume && volume->hasData())
-        sink = static_cast<unsigned char>(volume->hash().words()[0]);
+        sink = static_cast<unsigned char>(volume->hash().first);
 }
 
 void readInner(TmMsg& msg)
 {
     TmMsg inner;
-    if (msg.bytesAvailable() < 1U << 20)
+    if (isModest(msg, 4 * sizeof(int)))
         msg >> inner;
-    use(inner.dataPtr(), inner.readOffset());
+    if (msg.readOffset() <= msg.size())
+        use(inner.dataPtr(), inner.size());
 }
 
 constexpr std::array readers = {
@@ -117,7 +125,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
     try {
         for (size_t i = 1; i < steps; ++i)
             readers[data[i] % readers.size()](random);
-        for (size_t i = 0; inTurn.readOffset() < inTurn.size(); ++i)
+        for (size_t i = 0; inTurn.readOffset() < inTurn.size() && i < 2 * readers.size(); ++i)
             readers[i % readers.size()](inTurn);
     } catch (const KpMemoryException&) {
         return 0;  // what a message asks for may be more than there is

@@ -10,10 +10,12 @@ JobLog::JobLog(const std::string& folder)
     log.setMaxLogFileSizeInBytes(8000);
     log.setDateTimeFormat(KpLogFile::DateAndTime);
     log.setDefaultModule("Road");
+    log.setLogLevel(KpLogInfo);
     log.open(false);
 }
 
 JobLog::~JobLog()
 {
+    getTheLogInstance().setLogLevel(KpLogOff);
     getTheLogInstance().close();
 }

@@ -113,6 +113,25 @@ Window windowOf(Volume& volume)
     return window;
 }
 
+Window windowOf(const HxParamBundle& root, Volume& volume)
+{
+    Window window;
+    window.isInverted = KpString(root.findTag("G0028-0004", "")) == "MONOCHROME1";
+    KpDArray<float> center, width;
+    root.findTag("G0028-1050", center);
+    root.findTag("G0028-1051", width);
+    if (center.size() > 0 && width.size() > 0 && width[0] >= 1) {
+        window.center = static_cast<double>(center[0]);
+        window.width = static_cast<double>(width[0]);
+        window.origin = "from the header";
+        return window;
+    }
+    const bool isInverted = window.isInverted;
+    window = windowOf(volume);
+    window.isInverted = isInverted;
+    return window;
+}
+
 void display(Volume& volume, const Window& window, Volume& shown)
 {
     shown.dims = volume.dims;

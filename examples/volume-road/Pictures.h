@@ -3,6 +3,7 @@
 #include "OutputFolder.h"
 #include "Volume.h"
 
+#include <kplib/param/HxParamBundle.h>
 #include <kplib/volume/KpBitfield.h>
 
 /// What of the displayed values becomes black and white.
@@ -14,6 +15,8 @@ struct Window {
 
 /// The window from the lowest to the highest value, leaving out half a percent at either end.
 Window windowOf(Volume& volume);
+/// That of the header, or else windowOf() the volume.
+Window windowOf(const HxParamBundle& root, Volume& volume);
 
 /// The volume through the window, as bytes, into `shown`, whose memory is used again. The linear function of DICOM
 /// PS3.3, C.11.2.1.2.1.

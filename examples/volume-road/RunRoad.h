@@ -6,8 +6,14 @@
 #include <optional>
 #include <string>
 
-/// The main job: reads the series in `folder` (that of `uid`, if given), reduces, segments and shows it, and writes
-/// pictures, header, report and log into `target`, all or nothing. A failure's text is one line for the user; a
-/// cancelled job is code Interrupted. `threshold`: the displayed value from which on voxels belong to the object.
-KpResult runRoad(const char* folder, const std::string& uid, std::optional<double> threshold, const std::string& target,
-                 KpProgressInterface& progress);
+/// Where the volume of the main job comes from, and what is to be done with it.
+struct Job {
+    std::string folder;               ///< of a series in DICOM files, or else
+    std::string url;                  ///< of a volume that exportVolume() has written, on an HTTP server
+    std::string uid;                  ///< of the series, where the folder holds several
+    std::optional<double> threshold;  ///< displayed value from which on voxels belong to the object
+};
+
+/// The main job: reads a volume, reduces, segments and shows it, and writes pictures, header, report and log into
+/// `target`, all or nothing. A failure's text is one line for the user; a cancelled job is code Interrupted.
+KpResult runRoad(const Job& job, const std::string& target, KpProgressInterface& progress);

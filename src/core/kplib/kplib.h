@@ -86,6 +86,9 @@
 #include <kplib/log/KpMessageCollector.h>
 #include <kplib/log/KpResult.h>
 #include <kplib/log/KpTerminateProcess.h>
+#include <kplib/net/KpHttpGet.h>
+#include <kplib/net/KpSocket.h>
+#include <kplib/net/KpSocketTools.h>
 #include <kplib/net/TmMsg.h>
 #include <kplib/param/HxParamBase.h>
 #include <kplib/param/HxParamBundle.h>
@@ -100,6 +103,7 @@
 #include <kplib/rawdata/KpTypedData3D.h>
 #include <kplib/rawdata/KpTypedElement.h>
 #include <kplib/rawdata/KpTypedPointer.h>
+#include <kplib/rawdata/TmDataAccess.h>
 #include <kplib/rawdata/TmSSETools.h>
 #include <kplib/system/KpBuildInfo.h>
 #include <kplib/system/KpCPUInfo.h>
@@ -120,8 +124,11 @@
 #include <kplib/system/KpUUID.h>
 #include <kplib/system/KpVersion.h>
 #include <kplib/system/KpWatch.h>
+#include <kplib/threads/KpCallable.h>
 #include <kplib/threads/KpProgressGuiInterface.h>
 #include <kplib/threads/KpProgressInterface.h>
+#include <kplib/threads/KpThread.h>
+#include <kplib/threads/KpWorkerThread.h>
 #include <kplib/threads/ProgressScope.h>
 #include <kplib/volume/KpBitfield.h>
 #include <kplib/volume/KpConnectedComponents.h>

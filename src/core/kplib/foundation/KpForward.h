@@ -106,10 +106,10 @@ class KpSocketTools;
 class TmMsg;
 
 class KpCallable;
-class KpThread;
-class KpWorkerThread;
 class KpProgressGuiInterface;
 class KpProgressInterface;
+class KpThread;
+class KpWorkerThread;
 class ProgressScope;
 
 class KpScopedWatch;

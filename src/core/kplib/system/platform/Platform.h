@@ -51,6 +51,9 @@ struct ProcessMemory {
 };
 bool processMemory(std::int64_t process, ProcessMemory& memory);
 
+/// Names the calling thread for the system's tools; the name is cut where the system has no room for more.
+void setThreadName(const char* name);
+
 /// What this system calls a shared object that others call ".so".
 const char* sharedObjectSuffix();
 

@@ -1,10 +1,12 @@
 #include <kplib/system/platform/Platform.h>
 
 #include <cstdio>
+#include <cstring>
 #include <ctime>
 #include <dirent.h>
 #include <fcntl.h>
 #include <fstream>
+#include <pthread.h>
 #include <set>
 #include <string>
 #include <sys/stat.h>
@@ -99,6 +101,12 @@ bool availableMemory(std::uint64_t& bytes)
 bool processMemory(std::int64_t /*process*/, ProcessMemory& /*memory*/)
 {
     return false;  // no figures here that mean the same as where these are read
+}
+
+void setThreadName(const char* name)
+{
+    constexpr size_t room = 15;
+    pthread_setname_np(pthread_self(), std::string(name, strnlen(name, room)).c_str());
 }
 
 const char* sharedObjectSuffix()

@@ -1,0 +1,223 @@
+#include "Parcel.h"
+
+#include "Oblique.h"
+#include "Space.h"
+
+#include <kplib/foundation/KpHandle.h>
+#include <kplib/param/HxParameter.h>
+#include <kplib/rawdata/TmDataAccess.h>
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+#include <memory>
+
+namespace {
+
+constexpr int mark = 0x31'50'4b'56;  // "VKP1" in the message
+constexpr int deepestTree = 64;
+
+TmMsg& operator<<(TmMsg& msg, const Vector& v)
+{
+    return msg << v[0] << v[1] << v[2];
+}
+
+TmMsg& operator>>(TmMsg& msg, Vector& v)
+{
+    return msg >> v[0] >> v[1] >> v[2];
+}
+
+/// The volume as the library's descriptor of voxels in memory, a view.
+KpHandle<TmDataAccess> accessTo(Volume& volume)
+{
+    const KpVec3l dims(volume.dims[0], volume.dims[1], volume.dims[2]);
+    return new TmDataAccess(dims, KpVec3l(0L, 0L, 0L), static_cast<void*>(volume.bytes.data()), volume.type, 1,
+                            KpAllocator::AllocatorNone);
+}
+
+void writeParameter(TmMsg& msg, const HxParameter& parameter)
+{
+    msg << parameter.primType() << parameter.dimension();
+    if (parameter.primType() == KpPrimType::String) {
+        msg << static_cast<const char*>(parameter.value());
+    } else {
+        const auto bytes =
+            static_cast<unsigned long>(parameter.dimension()) * static_cast<unsigned long>(parameter.primType().size());
+        msg.writeRawBytes(bytes, parameter.value());
+    }
+}
+
+std::unique_ptr<HxParameter> readParameter(TmMsg& msg, const char* name)
+{
+    KpPrimType type;
+    int count = 0;
+    msg >> type >> count;
+    if (!type.isValid() || count < 0)
+        return nullptr;
+    if (type == KpPrimType::String) {
+        char* text = nullptr;
+        msg >> text;
+        return std::make_unique<HxParameter>(name, 1, type, text);
+    }
+    void* values = nullptr;
+    msg.readRawBytes(static_cast<unsigned long>(count) * static_cast<unsigned long>(type.size()), values);
+    return values ? std::make_unique<HxParameter>(name, count, type, values) : nullptr;
+}
+
+bool readChildren(TmMsg& msg, HxParamBundle& bundle, int depth)
+{
+    int count = 0;
+    msg >> count;
+    for (int i = 0; i < count; ++i) {
+        bool isBundle = false;
+        KpString name;
+        if (!msg.holds(1))
+            return false;
+        msg >> isBundle >> name;
+        if (isBundle) {
+            auto child = std::make_unique<HxParamBundle>(name.c_str());
+            if (depth == 0 || !readChildren(msg, *child, depth - 1))
+                return false;
+            bundle.insert(child.release(), 0);
+        } else {
+            auto child = readParameter(msg, name);
+            if (!child)
+                return false;
+            bundle.insert(child.release(), 0);
+        }
+    }
+    return count >= 0;
+}
+
+void writeRegion(TmMsg& msg, const Region& region)
+{
+    msg << region.threshold << region.isThresholdGiven << region.components
+        << static_cast<unsigned long long>(region.voxels) << region.millilitres << region.center << region.box
+        << region.outline;
+}
+
+void readRegion(TmMsg& msg, Region& region)
+{
+    unsigned long long voxels = 0;
+    msg >> region.threshold >> region.isThresholdGiven >> region.components >> voxels >> region.millilitres >>
+        region.center >> region.box >> region.outline;
+    region.voxels = voxels;
+}
+
+/// The voxels into the volume that readGeometry() has described.
+bool readVoxels(TmMsg& msg, Volume& volume)
+{
+    TmDataAccess* received = nullptr;
+    msg >> received;
+    const KpHandle<TmDataAccess> voxels(received);
+    const KpVec3l dims(volume.dims[0], volume.dims[1], volume.dims[2]);
+    if (!voxels || !voxels->hasData() || !(voxels->dims() == dims) || voxels->primType() != volume.type ||
+        voxels->nDataVar() != 1)
+        return false;
+    volume.allocate();
+    std::memcpy(volume.bytes.data(), voxels->dataPtr(0), static_cast<size_t>(voxels->size()));
+    return true;
+}
+
+}  // namespace
+
+void writeGeometry(TmMsg& msg, const Volume& volume)
+{
+    msg << KpVec3l(volume.dims[0], volume.dims[1], volume.dims[2]) << volume.type << volume.spacing << volume.origin;
+    for (const Vector& axis : volume.axes)
+        msg << axis;
+    msg << volume.isPlaced << volume.slope << volume.intercept;
+}
+
+bool readGeometry(TmMsg& msg, Volume& volume)
+{
+    KpVec3l dims;
+    msg >> dims >> volume.type >> volume.spacing >> volume.origin;
+    for (Vector& axis : volume.axes)
+        msg >> axis;
+    msg >> volume.isPlaced >> volume.slope >> volume.intercept;
+    constexpr long longest = 1L << 16;
+    for (int i = 0; i < 3; ++i) {
+        const auto axis = static_cast<size_t>(i);
+        volume.dims[axis] = dims[i];
+        if (dims[i] < 1 || dims[i] > longest || !std::isfinite(volume.spacing[axis]) || volume.spacing[axis] <= 0)
+            return false;
+    }
+    return volume.type.isValid() && volume.type != KpPrimType::String;
+}
+
+void writeTree(TmMsg& msg, const HxParamBundle& bundle)
+{
+    msg << static_cast<int>(bundle.size());
+    for (const HxParamBase* child : bundle) {
+        msg << child->isBundle() << KpString(child->name());
+        if (child->isBundle())
+            writeTree(msg, *static_cast<const HxParamBundle*>(child));
+        else
+            writeParameter(msg, *static_cast<const HxParameter*>(child));
+    }
+}
+
+bool readTree(TmMsg& msg, HxParamBundle& bundle)
+{
+    return readChildren(msg, bundle, deepestTree);
+}
+
+Kp128 contentHash(Volume& volume)
+{
+    return accessTo(volume)->hash();
+}
+
+std::string hexadecimal(const Kp128& hash)
+{
+    const KpString text(0, "%016lx%016lx", __builtin_bswap64(hash.first), __builtin_bswap64(hash.second));
+    return text.c_str();
+}
+
+void writeParcel(TmMsg& msg, Parcel& parcel)
+{
+    const KpHandle<TmDataAccess> voxels = accessTo(parcel.volume);
+    const Kp128 hash = voxels->hash();
+    msg << mark << parcel.frameUid;
+    writeTree(msg, parcel.root);
+    writeGeometry(msg, parcel.volume);
+    msg << parcel.window.center << parcel.window.width << parcel.window.isInverted;
+    writeRegion(msg, parcel.region);
+    msg << static_cast<unsigned long long>(hash.first) << static_cast<unsigned long long>(hash.second)
+        << static_cast<const TmDataAccess*>(voxels.get());
+}
+
+KpResult readParcel(TmMsg& msg, Parcel& parcel)
+{
+    int found = 0;
+    msg >> found;
+    if (found != mark)
+        return badInput("what the peer sends is no volume");
+    msg >> parcel.frameUid;
+    bool isWhole = readTree(msg, parcel.root) && readGeometry(msg, parcel.volume);
+    msg >> parcel.window.center >> parcel.window.width >> parcel.window.isInverted;
+    parcel.window.origin = "from the peer";
+    unsigned long long first = 0, second = 0;
+    if (isWhole) {
+        readRegion(msg, parcel.region);
+        msg >> first >> second;
+        isWhole = readVoxels(msg, parcel.volume) && msg.readOffset() == msg.size() &&
+                  parcel.region.outline.nBits() == static_cast<unsigned long>(parcel.volume.count());
+    }
+    if (!isWhole)
+        return badInput("the peer's message is cut off or damaged");
+    if (contentHash(parcel.volume) != Kp128{first, second})
+        return badInput("the voxels aren't those that were sent: their digests differ");
+    return KpResult();
+}
+
+KpResult writePictures(Parcel& parcel, const OutputFolder& out)
+{
+    Volume shown;
+    const Space space(parcel.frameUid, parcel.volume);
+    display(parcel.volume, parcel.window, shown);
+    KpResult written = writePlanes(shown, parcel.region.outline, out);
+    written << writeOblique(shown, space, parcel.region.outline, out);
+    written << writeOverview(shown, out, "overview.png");
+    return written;
+}

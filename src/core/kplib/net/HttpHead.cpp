@@ -1,0 +1,58 @@
+#include <kplib/net/detail/HttpHead.h>
+
+#include <algorithm>
+#include <boost/algorithm/string/predicate.hpp>
+#include <cstdlib>
+
+namespace {
+
+constexpr std::string_view whiteSpace = " \t\n\v\f\r";
+
+// Far beyond any honest head: a server that goes on and on must not fill the memory.
+constexpr size_t longestHead = 1 << 20;
+
+}  // namespace
+
+size_t kplib::detail::HttpHead::take(std::string_view bytes)
+{
+    size_t used = 0;
+    while (state_ == State::Open && used < bytes.size()) {
+        const size_t newline = bytes.find('\n', used);
+        const size_t end = std::min(newline, bytes.size() - 1) + 1;
+        line_ += bytes.substr(used, end - used);
+        taken_ += end - used;
+        used = end;
+        if (newline != std::string_view::npos) {
+            line_.erase(line_.find_last_not_of(whiteSpace) + 1);
+            state_ = stateAfterLine();
+            line_.clear();
+        }
+        if (state_ == State::Open && taken_ >= longestHead)
+            state_ = State::Unexpected;
+    }
+    return used;
+}
+
+kplib::detail::HttpHead::State kplib::detail::HttpHead::stateAfterLine()
+{
+    if (isFirstLine_) {
+        isFirstLine_ = false;
+        const size_t blank = line_.find(' ');
+        if (blank != std::string::npos)
+            status_ = std::atoi(line_.c_str() + blank + 1);
+        return line_.starts_with("HTTP") ? State::Open : State::Unexpected;
+    }
+    if (line_.empty())
+        return State::Complete;
+    takeField();
+    return State::Open;
+}
+
+void kplib::detail::HttpHead::takeField()
+{
+    const size_t colon = line_.find(':');
+    if (colon == std::string::npos || !boost::algorithm::iequals(line_.substr(0, colon), "Content-Length"))
+        return;
+    hasLength_ = true;
+    length_ = std::atoll(line_.c_str() + colon + 1);  // which skips the white space in front
+}

@@ -1,0 +1,94 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpMutex.h>
+#include <kplib/system/KpWatch.h>
+
+#include <atomic>
+#include <string>
+
+namespace kplib::detail {
+class HttpHead;
+}
+
+/// Reads ranges of a file from an HTTP server, one after the other over a connection that stays open.
+///
+/// Understands http:// only, and responses with a Content-Length; no redirects and no chunked transfer. A response of
+/// any status is delivered: look at status() where it matters. Nothing throws but exhausted memory, and nothing is
+/// logged: errorText() says what failed. After a failure the next request() connects anew.
+///
+/// Belongs to one thread, but for cancel().
+class KPLIB_API KpHttpGet {
+public:
+    enum State : int {
+        NotConnected = 0,  ///< no request under way
+        Failed = 1,        ///< the last operation failed
+        RequestSent = 2,   ///< the head of the response is unread
+        ReadingBody = 3,   ///< the head is read, and bytes of the body remain
+        Finished = 4,      ///< the body is delivered; the connection is open for the next request
+    };
+
+    KpHttpGet();
+    KpHttpGet(const KpHttpGet&) = delete;
+    KpHttpGet& operator=(const KpHttpGet&) = delete;
+    ~KpHttpGet();
+
+    /// Takes server and path from "http://HOST[:PORT][/PATH]". Closes the connection if the server is another one.
+    /// False for another scheme, which closes it too and forgets the host. request() calls this.
+    ///
+    /// The first colon is taken for the port's, even one in the path: a URL with a colon there is not understood.
+    bool setURL(const char* url);
+
+    /// Asks for the whole file; true when the request has gone out.
+    bool request(const char* url);
+    /// Asks for the bytes from `first` to `last`, both included; for the whole file if `first` > `last`. What is left
+    /// of the response before is dropped, with its connection.
+    bool request(const char* url, unsigned long first, unsigned long last);
+
+    /// Waits for the next `size` bytes of the body and gives their number, less only at its end; 0 behind the end. A
+    /// failure is -1, or the number of bytes that came before it (0 if the server closed), and then -1 in the next
+    /// call.
+    long read(void* buffer, unsigned long size);
+
+    /// Length of the response's body, for which its head is waited for where that is still to come; 0 if that fails.
+    long long contentLength();
+    /// Bytes of the body delivered so far.
+    long long bytesRead() const { return bytesReadSoFar_; }
+
+    /// Closes the connection. From another thread this ends a read() that waits, which then fails.
+    void cancel();
+
+    /// Waits for the head of the response. False in any state but RequestSent, or on failure. read() calls this.
+    bool readResponse();
+
+    /// Closes the connection with `text` for the cause; null stands for what the system tells of its last error.
+    void setError(const char* text);
+
+    State state() const { return state_; }
+    int port() const { return port_; }
+    const std::string& host() const { return host_; }
+    const std::string& path() const { return path_; }
+    /// Of the last failure.
+    const std::string& errorText() const { return errorText_; }
+    /// That of the last response, such as 206; 0 while there is none.
+    int status() const { return status_; }
+    /// Seconds spent on the network for this request.
+    double elapsedTime() const { return watch_.getTime2(); }
+
+private:
+    class SocketInUse;
+
+    bool connect();
+    bool receiveHead(kplib::detail::HttpHead& head);
+    void closeConnection();
+
+    int port_ = 0;
+    std::string host_, path_, errorText_;
+    long long contentLength_ = 0, bytesReadSoFar_ = 0;
+    std::atomic<State> state_ = NotConnected;  // atomic what cancel() changes
+    std::atomic<int> status_ = 0;
+    std::atomic<int> socket_ = -1;
+    KpWatch watch_{true};
+    KpMutex closing_{false};    // held by who opens, closes or begins to use the connection
+    bool socketInUse_ = false;  // guarded by it
+};

@@ -1,0 +1,162 @@
+#pragma once
+
+#include <kplib/foundation/Kp128.h>
+#include <kplib/foundation/KpAllocator.h>
+#include <kplib/foundation/KpDArray.h>
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpForward.h>
+#include <kplib/foundation/KpHandableThreaded.h>
+#include <kplib/foundation/KpPrimType.h>
+#include <kplib/geometry/KpBox3i.h>
+#include <kplib/geometry/KpVec3l.h>
+#include <kplib/log/KpResult.h>
+
+#include <cstddef>
+
+/// A volume in memory: sizes, element type, components, strides and the memory itself. Goes around as
+/// KpHandle<TmDataAccess>.
+///
+/// The memory is one block (linear; strides()[2] is above 0) or one block a slice (sliced; strides()[2] is 0). Voxel
+/// (x, y, z) lies at its slice's address + x * strides()[0] + y * strides()[1], in bytes. The object gives its blocks
+/// back through its allocator; with an allocator that frees nothing it is a view, which is valid as long as the memory
+/// is. Coordinates are never checked. Handles may be copied and dropped on any thread; all else has no lock: the fields
+/// of a lock on a region are only kept here, what they mean is up to their users.
+class KPLIB_API TmDataAccess : public KpHandableThreaded {
+public:
+    using DeleteCallback = void (*)(TmDataAccess* object, void* data);
+
+    /// Empty: all sizes are 0; frees with free().
+    TmDataAccess() = default;
+    /// One block of size() bytes out of `allocator`, not set to anything. Without memory the object has no data.
+    TmDataAccess(const KpVec3l& dims, KpPrimType type, int nDataVar, KpAllocator allocator);
+
+    // Strides of 0 are those of data without gaps, but that of z of two slices or more stays 0.
+
+    /// Over one block, or without data if it is null. What `allocator` frees is the object's from now on.
+    TmDataAccess(const KpVec3l& dims, const KpVec3l& strides, void* data, KpPrimType type, int nDataVar,
+                 KpAllocator allocator);
+    TmDataAccess(const KpVec3l& dims, const KpVec3l& strides, std::nullptr_t, KpPrimType type, int nDataVar,
+                 KpAllocator allocator) :
+        TmDataAccess(dims, strides, static_cast<void*>(nullptr), type, nDataVar, allocator)
+    {
+    }
+    /// Over one block a slice, `dims`[2] of them in the order of z; without data if `data` is null.
+    TmDataAccess(const KpVec3l& dims, const KpVec3l& strides, void* const* data, KpPrimType type, int nDataVar,
+                 KpAllocator allocator);
+
+    TmDataAccess(const TmDataAccess&) = delete;
+    TmDataAccess& operator=(const TmDataAccess&) = delete;
+    /// Runs the delete callback, then dataRelease(). An exception out of either ends the process.
+    ~TmDataAccess() override;
+
+    /// Gives the memory back and keeps the description.
+    void dataRelease();
+
+    /// What the destructor runs first; null for nothing.
+    void setDeleteCallback(DeleteCallback callback, void* data);
+    void setPrimType(KpPrimType type) { primType_ = type; }  ///< converts nothing
+    void setAllocator(KpAllocator allocator) { allocator_ = allocator; }
+
+    /// Voxels along x, y and z.
+    KpVec3l dims() const { return dims_; }
+    KpPrimType primType() const { return primType_; }
+    /// Components a voxel.
+    int nDataVar() const { return nDataVar_; }
+    /// Bytes from one voxel to the next along x, y and z.
+    KpVec3l strides() const { return strides_; }
+    KpAllocator allocator() const { return allocator_; }
+
+    /// Bytes of all voxels, without gaps; the largest number where that is out of range.
+    long size() const;
+    /// Whether sizes, strides and the number of blocks go together.
+    bool isValid() const;
+    bool isLinear() const { return strides_[2] > 0; }
+    bool hasData() const { return dataPtrs_.size() > 0; }
+    /// Whether there are no gaps between voxels, rows and slices; never for sliced data.
+    bool isContiguous() const;
+
+    // Addresses; they need data.
+
+    /// Slice `z`.
+    void* dataPtr(long z) const
+    {
+        return isLinear() ? static_cast<char*>(dataPtrs_[0]) + strides_[2] * z : dataPtrs_[z];
+    }
+    /// Voxel (`x`, `y`, `z`).
+    void* dataPtr(long x, long y, long z) const
+    {
+        return static_cast<char*>(dataPtr(z)) + x * strides_[0] + y * strides_[1];
+    }
+    /// The blocks.
+    void* const* dataPtrs() const { return dataPtrs_.data(); }
+
+    /// Makes `out` a view on the voxels of `box`, both bounds inside; null without data. The bounds are not checked,
+    /// and the view doesn't keep this object alive. One slice of sliced data gives a linear view.
+    void subBox(KpHandle<TmDataAccess>& out, const KpBox3i& box) const;
+
+    /// Makes `out` a copy whose memory comes from malloc, whatever `allocator` says; that is meant. Fails, with `out`
+    /// null, if the data aren't contiguous, and, with `out` a copy without data, if there is no memory.
+    KpResult clone(KpHandle<TmDataAccess>& out, KpAllocator allocator) const;
+
+    // A line of voxels, along the first axis of which the coordinate is -1, or along z if that of neither x nor y is.
+    // Of each voxel the first component counts. Never fails: without data, and for types that aren't numbers, nothing
+    // is read or written. Sliced data stay in their first slice: not to be used on them.
+
+    /// Reads dims()[axis] values.
+    KpResult row(long x, long y, long z, float* out) const;
+    /// Writes as many: clamped to the range of the type and cut towards zero. NaN becomes 0, in an int the smallest
+    /// one; so does, in an int, what lies above its range. The description doesn't change, so it is a const operation.
+    KpResult putRow(long x, long y, long z, const float* in) const;
+
+    /// MD5 of type, components, sizes and voxels, whatever the strides of y and z; rows are taken to have no gaps. Of
+    /// an object without data that of the first three. Bytes count as they lie in memory.
+    Kp128 hash() const;
+
+    // The lock that a thread holds on a region.
+
+    void setLockerThreadId(unsigned long id) { lockerThreadId_ = id; }
+    /// 0 for none.
+    unsigned long lockerThreadId() const { return lockerThreadId_; }
+    /// Makes the calling thread the holder.
+    void moveToCurrentThread();
+    bool isLockedWritable() const { return lockedWritable_; }
+    void lockWritable(bool on) { lockedWritable_ = on; }
+    bool isMapDataToMemoryInProgress() const { return mapDataToMemoryInProgress_; }
+    void setMapDataToMemoryInProgress(bool on) { mapDataToMemoryInProgress_ = on; }
+    /// Empty at first.
+    const KpBox3i& lockedROI() const { return lockedROI_; }
+    void setLockedROI(const KpBox3i& box) { lockedROI_ = box; }
+
+private:
+    void fixStrides();
+
+    // A line along `axis` that begins `offset` bytes behind the first voxel.
+    template <typename T>
+    void rowImpl(long offset, int axis, float* out) const;
+    template <typename T>
+    void putRowImpl(long offset, int axis, const float* in, float low, float high) const;
+    template <typename T>
+    void putRowImplF(long offset, int axis, const float* in) const;
+
+    DeleteCallback deleteCallback_ = nullptr;
+    void* deleteCallbackData_ = nullptr;
+    KpVec3l dims_ = {0L, 0L, 0L};
+    KpPrimType primType_;
+    std::int32_t nDataVar_ = 0;
+    KpAllocator allocator_ = KpAllocator::AllocatorMalloc;
+    KpVec3l strides_ = {0L, 0L, 0L};
+    unsigned long lockerThreadId_ = 0;
+    bool lockedWritable_ = false;
+    bool mapDataToMemoryInProgress_ = false;
+    KpBox3i lockedROI_ = {0, -1, 0, -1, 0, -1};
+    KpDArray<void*> dataPtrs_;  // one block, one a slice, or none
+};
+
+/// A bool that is true for null, and nothing else; or sizes, components, type and all voxels without gaps. Of an object
+/// without data the voxels are 0.
+KPLIB_API TmMsg& operator<<(TmMsg& msg, TmDataAccess const* const& object);
+
+/// Makes `object` a new, contiguous object that frees with free() and that nobody holds a reference to; without data
+/// if there is no memory. Null if null was sent, if the message holds less than was announced, or if the sizes make no
+/// sense; no memory is asked for then.
+KPLIB_API TmMsg& operator>>(TmMsg& msg, TmDataAccess*& object);

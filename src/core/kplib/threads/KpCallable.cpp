@@ -1,0 +1,3 @@
+#include <kplib/threads/KpCallable.h>
+
+KpCallable::~KpCallable() = default;

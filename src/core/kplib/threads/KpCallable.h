@@ -1,0 +1,14 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+/// Something that can be invoked; a base for clients.
+class KPLIB_API KpCallable {
+public:
+    KpCallable() = default;
+    KpCallable(const KpCallable&) = default;
+    KpCallable& operator=(const KpCallable&) = default;
+    virtual ~KpCallable();
+
+    virtual void call() = 0;
+};

@@ -1,0 +1,67 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+#include <climits>
+
+struct KpThreadPrivate;
+
+/// A thread of the platform that runs run() of a subclass, and can do so again when that has ended.
+///
+/// The object must outlive its run: its owner calls wait() before the destructor. An exception that leaves run() ends
+/// the process. Failures of the platform don't throw: they are written to the log. finished() and running() may be
+/// polled from any thread.
+class KPLIB_API KpThread {
+public:
+    /// Named "KpThread %d" with the number of the objects made before.
+    KpThread();
+    /// Named so; null takes the generated name. The object counts in either case.
+    explicit KpThread(const char* name);
+    KpThread(const KpThread&) = delete;
+    KpThread& operator=(const KpThread&) = delete;
+    /// Neither stops the thread nor waits for it.
+    virtual ~KpThread();
+
+    /// What the thread does.
+    virtual void run() = 0;
+
+    /// Runs run() on a new thread; when one runs already, blocks until that has ended. The platform is taken to have a
+    /// thread to give: when it hasn't, the object counts as running for good.
+    void start();
+
+    /// Waits for the end of the run, at most `milliseconds`, ULONG_MAX for no limit. False if that was too short, true
+    /// if there was nothing to wait for. Waits once: a wake-up without a cause counts as the end.
+    bool wait(unsigned long milliseconds = ULONG_MAX);
+
+    /// Whether a run has ended, and none has begun since. What run() wrote is then visible.
+    bool finished() const;
+    bool running() const;
+
+    /// Gives up the processor.
+    static void yield();
+    /// Suspend the caller for at least that time; a signal doesn't cut it short. msleep() counts microseconds in 32
+    /// bits, so its longest time is some 71 minutes, and longer ones wrap.
+    static void sleep(unsigned long seconds);
+    static void msleep(unsigned long milliseconds);
+    static void usleep(unsigned long microseconds);
+
+    /// The name, valid until it changes.
+    const char* threadName() const;
+    void setThreadName(const char* name);
+
+    /// Names the calling thread for the tools of the platform, which may keep its first characters only.
+    void setThreadNameNative(const char* name);
+
+private:
+    friend struct KpThreadPrivate;
+
+    KpThreadPrivate* record_;  // keeps the platform's thread header out of here
+};
+
+KPLIB_API int tmCurrentProcessId();
+/// The platform's identifier of the calling thread, never 0.
+KPLIB_API unsigned long tmCurrentThreadId();
+
+/// The main thread is whichever asks first for one of these two, so an application asks from its real one at start-up.
+KPLIB_API unsigned long tmMainThreadId();
+KPLIB_API bool tmIsMainThread();

@@ -1,0 +1,220 @@
+#include "net/Servers.h"
+
+#include <kplib/net/KpHttpGet.h>
+
+#include <climits>
+#include <cstring>
+#include <gtest/gtest.h>
+#include <vector>
+
+using namespace kplib::test;
+
+TEST(KpHttpGet, takesUrlsApart)
+{
+    const struct {
+        const char* url;
+        const char* host;
+        int port;
+        const char* path;
+    } cases[] = {
+        {"http://h/p", "h", 80, "/p"},
+        {"http://h:8080/p/q?r", "h", 8080, "/p/q?r"},
+        {"http://h", "h", 80, "/"},
+        {"http://h:8080", "h", 8080, "/"},
+        {"http://h/a:b", "h/a", 0, "/"},
+        {"http://", "", 80, "/"},
+        {"http://h/a:7/b:c", "h/a", 7, "/b:c"},
+    };
+    KpHttpGet get;
+    for (const auto& c : cases) {
+        EXPECT_TRUE(get.setURL(c.url)) << c.url;
+        EXPECT_EQ(get.host(), c.host) << c.url;
+        EXPECT_EQ(get.port(), c.port) << c.url;
+        EXPECT_EQ(get.path(), c.path) << c.url;
+    }
+    for (const char* url : {"ftp://h/p", "HTTP://h/p", "", static_cast<const char*>(nullptr)}) {
+        EXPECT_TRUE(get.setURL("http://h"));
+        EXPECT_FALSE(get.request(url));
+        EXPECT_EQ(get.host(), "");
+        EXPECT_EQ(get.state(), KpHttpGet::NotConnected);
+    }
+}
+
+TEST(KpHttpGet, sendsOneRequestAConnectionUnlessAllWasRead)
+{
+    std::vector<std::string> requests;
+    ScriptedServer server([&](int peer) {
+        for (std::string text; !(text = ScriptedServer::requestOf(peer)).empty();) {
+            requests.push_back(text);
+            put(peer, "HTTP/1.1 200 OK\r\nContent-Length: 4\r\n\r\nbody");
+        }
+    });
+    const std::string head = "GET /file HTTP/1.1\r\nHost: 127.0.0.1\r\nAccept: */*\r\n", url = server.url();
+    char buffer[8] = "";
+    {
+        KpHttpGet get;
+        EXPECT_EQ(get.read(buffer, 4), -1);
+        EXPECT_EQ(get.errorText(), "Not connected");
+        const auto all = [&] { return get.read(buffer, 3) == 3 && get.read(buffer + 3, 5) == 1; };
+        EXPECT_TRUE(get.request(url.c_str()) && all());
+        EXPECT_STREQ(buffer, "body");
+        EXPECT_TRUE(get.request(url.c_str(), 0, 99) && all());
+        EXPECT_TRUE(get.request(url.c_str(), 5, 5) && get.read(buffer, 2) == 2 && get.status() == 200);
+        EXPECT_EQ(server.connections, 1);
+        EXPECT_TRUE(get.request(url.c_str()));  // after a part of a body
+        EXPECT_TRUE(get.contentLength() == 4 && get.state() == KpHttpGet::ReadingBody);
+        EXPECT_TRUE(get.request(url.c_str()) && get.status() == 0);            // after a head
+        EXPECT_TRUE(get.request(url.c_str(), ULONG_MAX, ULONG_MAX) && all());  // after neither
+        EXPECT_EQ(server.connections, 4);
+        EXPECT_EQ(get.bytesRead(), 4);
+        EXPECT_GT(get.elapsedTime(), 0);
+        get.cancel();
+        EXPECT_TRUE(get.state() == KpHttpGet::NotConnected && get.status() == 0);
+        EXPECT_TRUE(get.request(url.c_str()) && all());
+        EXPECT_EQ(server.connections, 5);
+    }
+    requests.erase(std::remove(requests.begin(), requests.end(), head + "\r\n"), requests.end());
+    ASSERT_GE(requests.size(), 3U);
+    EXPECT_EQ(requests[0], head + "Range: bytes=0-99\r\n\r\n");
+    EXPECT_EQ(requests[1], head + "Range: bytes=5-5\r\n\r\n");
+    EXPECT_EQ(requests[2], head + "Range: bytes=18446744073709551615-18446744073709551615\r\n\r\n");
+}
+
+TEST(KpHttpGet, takesWhatServersSend)
+{
+    const std::string ok = "HTTP/1.1 200 OK\r\n", ten = "Content-Length: 10\r\n", body = "0123456789";
+    const std::string gone = "Connection reset by peer", missing = "Content-Length missing",
+                      odd = "Unexpected response";
+    constexpr bool reset = true;
+    std::string fields;
+    while (fields.size() < 2 << 20)
+        fields += "X: y\r\n";
+    const struct {
+        const char* what;
+        std::string response;
+        long first;  // result of the first read() of up to 100 bytes
+        std::string error = "";
+        int status = 0;
+        bool isReset = false;
+    } cases[] = {
+        {"as usual", ok + ten + "\r\n" + body, 10, "", 200},
+        {"lower case, blanks, bare newlines", "HTTP/1.0 206\ncontent-length:\t 10 \n \n" + body, 10, "", 206},
+        {"no status", "HTTP\r\n" + ten + "\r\n" + body, 10, "", 0},
+        {"not found", "HTTP/1.1 404 Not Found\r\n" + ten + "\r\n" + body, 10, "", 404},
+        {"the last length counts", ok + "Content-Length: 3\r\n" + ten + "\r\n" + body, 10, "", 200},
+        {"more than the length", ok + ten + "\r\n" + body + "more", 10, "", 200},
+        {"length 0", ok + "Content-Length: 0\r\n\r\n", 0, "All data read", 200},
+        {"no number", ok + "Content-Length: x\r\n\r\n", 0, "All data read", 200},
+        {"no length", ok + "Date: 10:10\r\nContent-Length\r\n\r\n" + body, -1, missing},
+        {"blank in the name", ok + "Content-Length : 10\r\n\r\n" + body, -1, missing},
+        {"negative length", ok + "Content-Length: -10\r\n\r\n" + body, -1, missing},
+        {"end in the body", ok + ten + "\r\n012", 3, "Socket closed"},
+        {"end before the body", ok + ten + "\r\n", 0, "Socket closed"},
+        {"longest length", ok + "Content-Length: 99999999999999999999\r\n\r\n012", 3, "Socket closed"},
+        {"end in the head", ok + ten, -1, gone},
+        {"end at once", "", -1, gone},
+        {"reset in the body", ok + ten + "\r\n012", 3, gone, 0, reset},
+        {"reset before the body", ok + ten + "\r\n", -1, gone, 0, reset},
+        {"reset in the head", ok, -1, gone, 0, reset},
+        {"other first line", "ICY 200 OK\r\n" + ten + "\r\n" + body, -1, odd},
+        {"other first line and no more", "ICY 200 OK\r\n", -1, odd},
+        {"empty first line", "\r\n" + ok + ten + "\r\n" + body, -1, odd},
+        {"endless line", ok + "X: " + std::string(2 << 20, 'x'), -1, odd},
+        {"endless head", ok + fields, -1, odd},
+    };
+    for (const auto& c : cases) {
+        for (size_t step : {size_t{1} << 20, size_t{1}, size_t{7}}) {
+            if (c.response.size() > 1000 && step < 1000)
+                continue;
+            SCOPED_TRACE(std::string(c.what) + ", in pieces of " + std::to_string(step));
+            std::atomic<bool> isRead = false;
+            ScriptedServer server([&](int peer) {
+                ScriptedServer::requestOf(peer);
+                put(peer, c.response, step);
+                if (c.isReset) {
+                    for (int i = 0; i < 100 && !isRead; ++i)  // the reset must not overtake the bytes
+                        usleep(1000);
+                    resetAtClose(peer);
+                }
+            });
+            KpHttpGet get;
+            char buffer[100] = "";
+            ASSERT_TRUE(get.request(server.url().c_str()));
+            EXPECT_GE(get.contentLength(), 0);
+            isRead = true;
+            EXPECT_EQ(get.read(buffer, sizeof(buffer)), c.first);
+            EXPECT_EQ(std::string_view(buffer), body.substr(0, static_cast<size_t>(std::max(c.first, 0L))));
+            EXPECT_EQ(get.errorText(), c.error);
+            EXPECT_EQ(get.status(), c.status);
+            const bool good = c.error.empty() || c.error == "All data read";
+            EXPECT_EQ(get.state(), good ? KpHttpGet::Finished : KpHttpGet::Failed);
+            EXPECT_EQ(get.bytesRead(), good ? c.first : 0);
+            EXPECT_EQ(get.read(buffer, sizeof(buffer)), good ? 0 : -1);
+            EXPECT_EQ(get.errorText(), good ? "All data read" : c.error);
+        }
+    }
+}
+
+TEST(KpHttpGet, readsRangesFromNginx)
+{
+    if (!Nginx::isInstalled())
+        GTEST_SKIP() << "nginx is not installed";
+    const Nginx nginx;
+    ASSERT_TRUE(nginx.isRunning);
+    KpHttpGet get;
+    const std::string url = nginx.url();
+    std::vector<char> buffer(1 << 20, 'x');
+    for (long spot : Nginx::spots) {
+        const long wanted = std::min<long>(Nginx::size - spot, 1 << 20);
+        ASSERT_TRUE(get.request(url.c_str(), static_cast<unsigned long>(spot),
+                                static_cast<unsigned long>(spot + (1 << 20) - 1)));
+        EXPECT_EQ(get.contentLength(), wanted);
+        EXPECT_EQ(get.status(), 206);
+        EXPECT_EQ(get.read(buffer.data(), ULONG_MAX), wanted);
+        EXPECT_EQ(std::memcmp(buffer.data(), &spot, sizeof(spot)), 0);
+        EXPECT_EQ(std::count(buffer.begin() + 8, buffer.begin() + std::min(wanted, 65536L), '\0'),
+                  std::min(wanted, 65536L) - 8);
+    }
+    ASSERT_TRUE(get.request(url.c_str()));
+    long total = 0;
+    for (long n; (n = get.read(buffer.data(), buffer.size())) > 0;)
+        total += n;
+    EXPECT_EQ(total, Nginx::size);
+    EXPECT_EQ(get.bytesRead(), Nginx::size);
+    EXPECT_TRUE(get.request(url.c_str(), Nginx::size, Nginx::size + 1) && get.contentLength() > 0);
+    EXPECT_EQ(get.status(), 416);
+    EXPECT_TRUE(get.request(nginx.url("nothing").c_str()) && get.contentLength() > 0);
+    EXPECT_EQ(get.status(), 404);
+}
+
+TEST(KpHttpGetThreads, cancelEndsAReadThatWaits)
+{
+    ScriptedServer server([](int peer) {
+        for (int i = 0; i < 2 && !ScriptedServer::requestOf(peer).empty(); ++i)
+            put(peer, i == 0 ? "HTTP/1.1 200 OK\r\nContent-Length: 3\r\n\r\n012"
+                             : "HTTP/1.1 200 OK\r\nContent-Length: 10\r\n");
+        char byte;
+        recv(peer, &byte, 1, 0);  // until the client has gone
+    });
+    const std::string url = server.url();
+    const size_t descriptors = namesIn("/proc/self/fd").size();
+    for (int i = 0; i < 100; ++i) {
+        KpHttpGet get;
+        std::thread reader([&] {
+            char buffer[10];
+            for (int n = 0; n < 2 && get.request(url.c_str()); ++n) {
+                if (get.read(buffer, sizeof(buffer)) < 1)
+                    break;
+            }
+        });
+        usleep(static_cast<useconds_t>(i * 10));
+        do
+            get.cancel();
+        while (get.state() == KpHttpGet::RequestSent || get.state() == KpHttpGet::ReadingBody);
+        usleep(200);
+        get.cancel();
+        reader.join();
+    }
+    while (namesIn("/proc/self/fd").size() > descriptors)  // the server's end closes a little later
+        usleep(1000);
+}

@@ -1,0 +1,253 @@
+#include <kplib/threads/KpThread.h>
+#include <kplib/threads/KpWorkerThread.h>
+
+#include "Schedule.h"
+
+#include <support/LogCapture.h>
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <chrono>
+#include <cstdlib>
+#include <functional>
+#include <pthread.h>
+#include <random>
+#include <regex>
+#include <semaphore>
+#include <set>
+#include <string>
+
+namespace {
+
+using State = KpWorkerThread::State;
+
+bool acceptsStart(int state)
+{
+    return state == State::NotStarted || state == State::Idle || state == State::CanceledIdle;
+}
+
+// A pass does the steps of a script: h halts until go, p polls suspended(), w wakes the caller.
+struct Puppet final : KpWorkerThread {
+    explicit Puppet(std::string steps) : KpWorkerThread("sixteen letters!"), script(std::move(steps)) {}
+    ~Puppet() override
+    {
+        go.release(9);
+        terminate();
+    }
+    void computeCtor() override
+    {
+        note('(');
+        pthread_getname_np(pthread_self(), nativeName, sizeof nativeName);
+    }
+    void compute() override
+    {
+        note('C');
+        for (char step : script)
+            if (step == 'h')
+                halted.release(), go.acquire();
+            else if (step == 'w')
+                wakeCaller();
+            else if (suspended())
+                note('s');
+        if (canceled())
+            note('x');
+    }
+    void computeDtor() override { note(state() == TerminateRequested ? ')' : '?'); }
+    void note(char what)
+    {
+        journal += what;
+        threads.insert(tmCurrentThreadId());
+    }
+    void bringTo(int wanted)
+    {
+        if (wanted == NotStarted)
+            return;
+        start(false);
+        halted.acquire();
+        if (wanted == SuspendRequested || wanted == Suspended)
+            suspend();
+        if (wanted == CancelRequested || wanted == CanceledIdle)
+            cancel();
+        if (wanted == Suspended || acceptsStart(wanted)) {
+            go.release();
+            wait();
+        }
+        ASSERT_EQ(state(), wanted);
+    }
+
+    std::string script, journal;
+    char nativeName[16] = "";
+    std::set<unsigned long> threads;
+    std::counting_semaphore<> halted{0}, go{0};
+};
+
+}  // namespace
+
+TEST(KpWorkerThreadThreads, followsTheTableOfStates)
+{
+    struct Outcome {
+        bool result;
+        int to;
+    };
+    enum { Not, Idle, Comp, Susp, CIdle, SReq, CReq };
+    const Outcome table[][5] = {
+        // start, suspend, resume, cancel, wait
+        {{true, Comp}, {false, Not}, {false, Not}, {false, Not}, {false, Not}},
+        {{true, Comp}, {false, Idle}, {false, Idle}, {false, Idle}, {false, Idle}},
+        {{false, Comp}, {true, SReq}, {false, Comp}, {true, CReq}, {true, Comp}},
+        {{false, Susp}, {false, Susp}, {true, Comp}, {true, CReq}, {false, Susp}},
+        {{true, Comp}, {false, CIdle}, {false, CIdle}, {false, CIdle}, {false, CIdle}},
+        {{false, SReq}, {false, SReq}, {false, Comp}, {true, CReq}, {true, SReq}},
+        {{false, CReq}, {false, CReq}, {false, CReq}, {false, CReq}, {true, CReq}},
+    };
+    bool timedOut = false;
+    const std::function<bool(Puppet&)> events[] = {
+        [](Puppet& puppet) { return puppet.start(false); },       [](Puppet& puppet) { return puppet.suspend(); },
+        [](Puppet& puppet) { return puppet.resume(); },           [](Puppet& puppet) { return puppet.cancel(); },
+        [&](Puppet& puppet) { return puppet.wait(timedOut, 1); },
+    };
+    for (int from = Not; from <= CReq; ++from)
+        for (int event = 0; event < 5; ++event) {
+            SCOPED_TRACE("from " + std::to_string(from) + " by event " + std::to_string(event));
+            Puppet puppet(from == Susp ? "hph" : "h");
+            ASSERT_NO_FATAL_FAILURE(puppet.bringTo(from));
+            timedOut = true;
+            EXPECT_EQ(events[event](puppet), table[from][event].result);
+            EXPECT_EQ(timedOut, event < 4 || table[from][event].result) << "a wait here never sees the end of a pass";
+            EXPECT_EQ(puppet.state(), table[from][event].to);
+            puppet.go.release(9);
+            EXPECT_FALSE(puppet.terminate());
+            EXPECT_EQ(puppet.state(), State::NotStarted);
+            EXPECT_EQ(std::count(puppet.journal.begin(), puppet.journal.end(), 'C'),
+                      (from != Not) + (event == 0 && table[from][event].result));
+        }
+}
+
+TEST(KpWorkerThreadThreads, oneThreadServesFromConstructorToDestructor)
+{
+    Puppet puppet("");
+    for (const char* journal : {"", "(CC)", "(CC)(CC)"}) {
+        EXPECT_FALSE(puppet.terminate());
+        EXPECT_EQ(puppet.journal, journal);
+        EXPECT_LE(puppet.threads.size(), 1u);
+        EXPECT_FALSE(puppet.threads.contains(tmCurrentThreadId()));
+        puppet.threads.clear();
+        for (int pass = 0; pass < 2; ++pass, puppet.wait())
+            EXPECT_TRUE(puppet.start(pass == 0));
+    }
+    EXPECT_STREQ(puppet.nativeName, "sixteen letters");
+}
+
+TEST(KpWorkerThreadThreads, aSuspendedPassGoesOnAndACallerMayGoBeforeTheEnd)
+{
+    struct Case {
+        bool (KpWorkerThread::*event)();
+        const char* journal;
+        int state;
+    };
+    for (const Case& c :
+         {Case{&KpWorkerThread::resume, "(Cs", State::Idle}, Case{&KpWorkerThread::cancel, "(Csx", State::CanceledIdle},
+          Case{&KpWorkerThread::terminate, "(Cs)", State::NotStarted}}) {
+        Puppet puppet("hpp");
+        puppet.bringTo(State::Suspended);
+        (puppet.*c.event)();
+        puppet.wait();
+        EXPECT_EQ(puppet.journal, c.journal) << "which pauses once";
+        EXPECT_EQ(puppet.state(), c.state);
+    }
+    Puppet puppet("wh");
+    EXPECT_TRUE(puppet.start(true));
+    EXPECT_EQ(puppet.state(), State::Computing);
+}
+
+namespace {
+
+struct Polling final : KpWorkerThread {
+    Polling() : KpWorkerThread(nullptr) {}
+    ~Polling() override { terminate(); }
+    void computeCtor() override { ++lives; }
+    void compute() override
+    {
+        for (int i = 0; i < polls && !canceled(); ++i) {
+            suspended();
+            if (i == polls / 2)
+                wakeCaller();
+        }
+        ++passes;
+    }
+    void computeDtor() override { --lives; }
+    int polls = 0;  // of the next pass
+    int lives = 0;
+    long passes = 0;
+};
+
+// Events in any order, against what they promise whatever the worker does meanwhile.
+void driveAtRandom(unsigned seed)
+{
+    kplib::test::scheduleSeed = seed;
+    std::mt19937 random(seed);
+    Polling worker;
+    long accepted = 0;
+    bool canceled = false, timedOut = false;  // the last pass; the last wait
+    for (int i = 0; i < 200; ++i) {
+        const int before = worker.state();
+        const unsigned event = random() % 16;
+        if (event < 6) {
+            if (acceptsStart(before))
+                worker.polls = static_cast<int>(random() % 5 * 10);
+            const bool started = worker.start(event < 3);
+            ASSERT_TRUE(started || !acceptsStart(before));
+            accepted += started;
+            ASSERT_TRUE(!started || event >= 3 || worker.polls != 0 || worker.passes == accepted);
+            canceled = canceled && !started;
+        } else if (event < 9) {
+            ASSERT_TRUE(!worker.suspend() || before == State::Computing);
+        } else if (event < 11) {
+            ASSERT_TRUE(worker.resume() || before != State::Suspended);
+        } else if (event < 12) {
+            canceled = worker.cancel() || canceled;
+        } else if (event < 15) {
+            const bool waited = worker.wait(timedOut, event < 14 ? ULONG_MAX : 1);
+            const int after = worker.state();
+            ASSERT_TRUE(!waited || !acceptsStart(before));
+            ASSERT_TRUE(timedOut || acceptsStart(after) || after == State::Suspended);
+            ASSERT_TRUE(!acceptsStart(after) || (after == State::CanceledIdle) == canceled);
+        } else {
+            worker.terminate();
+            canceled = false;
+            ASSERT_TRUE(worker.state() == State::NotStarted && worker.lives == 0 && worker.passes == accepted);
+        }
+    }
+}
+
+}  // namespace
+
+// KPLIB_TEST_SECONDS makes it longer.
+TEST(KpWorkerThreadThreads, keepsItsPromisesOnAnySchedule)
+{
+    const char* const asked = std::getenv("KPLIB_TEST_SECONDS");
+    const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(std::atoi(asked ? asked : "3"));
+    for (unsigned seed = 1; std::chrono::steady_clock::now() < end && !HasFailure(); ++seed) {
+        SCOPED_TRACE("seed " + std::to_string(seed));
+        driveAtRandom(seed);
+    }
+    kplib::test::scheduleSeed = 0;
+}
+
+TEST(KpWorkerThreadThreads, losesNoWakeUp)
+{
+    Polling worker;
+    for (long i = 0; i < 100'000; ++i) {
+        ASSERT_TRUE(worker.start(true));
+        if (worker.polls != 0)
+            worker.wait();
+        ASSERT_EQ(worker.passes, i + 1);
+        worker.wait();
+        worker.polls = i % 3 == 0;  // then the next one releases its caller early
+    }
+    const kplib::test::LogCapture log;
+    KpWorkerThread::test();
+    ASSERT_EQ(log.lines().size(), 1);
+    EXPECT_TRUE(std::regex_match(log.lines()[0], std::regex(".* [1-9][0-9]* passes per second\n"))) << log.lines()[0];
+}
