@@ -81,7 +81,7 @@ TmMsg& operator>>(TmMsg& msg, KpBitfield& field)
     void* words = nullptr;
     msg.readRawBytes(bytes, words);
     field.resize(words ? nBits : 0, KpBitfield::INIT_NONE);  // no memory for bits that didn't come
-    if (field.nBits() > 0)
+    if (words && bytes > 0)
         std::memcpy(field.data(), words, bytes);
     return msg;
 }
