@@ -95,18 +95,13 @@ TEST(Message, valuesAreTheirBytesInMemory)
 
 TEST(Message, theFourTextFormsDiffer)
 {
-    EXPECT_EQ(wire("ab", ""), "03000000616200"
-                              "0100000000");
+    EXPECT_EQ(wire("ab", ""), "030000006162000100000000");
     EXPECT_EQ(wire(static_cast<const char*>(nullptr)), "00000000");
-    EXPECT_EQ(wire(std::string("a\0b", 3), std::string()), "03000000610062"
-                                                           "00000000");
-    EXPECT_EQ(wire(KpString(std::string_view("a\0b", 3)), KpString(KpString::NoMemory{}), KpFilename("/c")), "6100"
-                                                                                                             "00"
-                                                                                                             "2f6300");
+    EXPECT_EQ(wire(std::string("a\0b", 3), std::string()), "0300000061006200000000");
+    EXPECT_EQ(wire(KpString(std::string_view("a\0b", 3)), KpString(KpString::NoMemory{}), KpFilename("/c")),
+              "6100002f6300");
     char ab[] = "ab";
-    EXPECT_EQ(wire(KpDArray<char*>{ab, nullptr}), "02000000"
-                                                  "03000000616200"
-                                                  "00000000");
+    EXPECT_EQ(wire(KpDArray<char*>{ab, nullptr}), "020000000300000061620000000000");
 
     TmMsg msg;
     msg << "ab" << static_cast<const char*>(nullptr) << std::string("a\0b", 3) << KpString("k") << KpFilename("/f")
@@ -168,10 +163,7 @@ TEST(Message, compositesHaveTheirForms)
     const LogCapture quiet;
     EXPECT_EQ(wire(KpResult()), "00000000");
     const KpResult failure(KpResult::InternalError, "a", "");
-    EXPECT_EQ(wire(failure), "02000000"
-                             "020000006100"
-                             "0f000000"
-                             "696e7465726e616c206572726f7200");
+    EXPECT_EQ(wire(failure), "020000000200000061000f000000696e7465726e616c206572726f7200");
     TmMsg byHand;
     byHand << 2 << "a"
            << "";
@@ -215,11 +207,7 @@ TEST(Message, imagesLoseTheirGaps)
 {
     unsigned char pixels[] = {1, 2, 99, 3, 4, 99};
     const KpTypedData2D image(2, 2, 1, 3, KpTypedPointer(pixels), 1);
-    EXPECT_EQ(wire(image), "01000000"
-                           "00000000"
-                           "02000000"
-                           "02000000"
-                           "01020304");
+    EXPECT_EQ(wire(image), "0100000000000000020000000200000001020304");
     TmMsg msg;
     msg << image << KpTypedData2D();
     KpTypedData2D copy, none(2, 2, KpPrimType::Byte, 1);
@@ -336,6 +324,7 @@ TEST(Message, bytesOfOthersAreNeitherFreedNorWritten)
         EXPECT_EQ(std::memcmp(bytes, sent, 8), 0);
     }
 }
+
 TEST(Message, readOffsetAndBytesAreIndependent)
 {
     TmMsg msg, other;

@@ -24,17 +24,16 @@ namespace kplib::detail {
 bool readElements(TmMsg& msg, void* elements, unsigned long bytes)
 {
     const unsigned long offset = msg.readOffset();
-    const bool isHeld = msg.holds(bytes);
     void* from = nullptr;
     msg.readRawBytes(bytes, from);
-    if (isHeld && bytes > 0) {
+    if (from && bytes > 0) {
         std::memcpy(elements, from, bytes);
     } else if (bytes > 0) {
         getTheLogInstance().errorf("Buffer overrun in TmMsg::readKpDArray(), offset=%u, numBytes=%u, size=%u",
                                    static_cast<unsigned int>(offset), static_cast<unsigned int>(bytes),
                                    static_cast<unsigned int>(msg.size()));
     }
-    return isHeld;
+    return from != nullptr;
 }
 
 void makeBools(unsigned char* bytes, long count)
