@@ -2,8 +2,9 @@
 
 #include "DicomTree.h"
 
+#include <kplib/imaging/KpSOPInstanceUtility.h>
+#include <kplib/imaging/TmgImages.h>
 #include <kplib/log/KpLogFile.h>
-#include <kplib/param/HxParameter.h>
 #include <kplib/rawdata/KpRawData.h>
 #include <kplib/threads/ProgressScope.h>
 
@@ -309,19 +310,18 @@ void describeVolume(const Series& series, Volume& volume)
     volume.allocate();
 }
 
-/// What differs from image to image, in image order: one text an image, its fields named by ImageLevelTags.
+/// What differs from image to image, in image order, and which instances the volume is made of.
 void addImageLevel(const Series& series, HxParamBundle& root)
 {
     root.set("ImageLevelTags", "G0020-0013,G0008-0018,G0020-0032");
-    HxParamBundle& list = *root.bundle("ImageNumberList", 1);
-    list.set("NumImageNumbers", static_cast<int>(series.slices.size()));
-    for (size_t i = 0; i < series.slices.size(); ++i) {
-        const SliceFile& s = series.slices[i];
-        const KpString name(0, "ImageNr%05zu", i + 1);
-        const KpString text(0, "%d,%s,%.10g\\%.10g\\%.10g", s.number, s.instanceUid.c_str(), s.position[0],
-                            s.position[1], s.position[2]);
-        list.insert(HxParameter::create(name, text), 0);
+    KpDArray<KpString> texts, instances;
+    for (const SliceFile& s : series.slices) {
+        texts.append(KpString(0, "%d,%s,%.10g\\%.10g\\%.10g", s.number, s.instanceUid.c_str(), s.position[0],
+                              s.position[1], s.position[2]));
+        instances.append(KpString(s.instanceUid.c_str()));
     }
+    Tmg::setImageTagList(root.bundle("ImageNumberList", 1), texts);
+    KpSOPInstanceUtility::setSopUIDList(root.bundle("SOPInstanceUIDs", 1), instances);
 }
 
 }  // namespace

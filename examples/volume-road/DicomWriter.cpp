@@ -1,5 +1,7 @@
 #include "DicomWriter.h"
 
+#include "DicomPut.h"
+
 #include <kplib/threads/ProgressScope.h>
 
 #include <dcmtk/config/osconfig.h>
@@ -23,22 +25,6 @@ struct Uids {
         dcmGenerateUniqueIdentifier(frame, SITE_SERIES_UID_ROOT);
     }
 };
-
-void put(DcmItem& item, const DcmTag& tag, const char* text)
-{
-    item.putAndInsertString(tag, text);
-}
-
-void putReals(DcmItem& item, const DcmTag& tag, std::initializer_list<double> values)
-{
-    KpString text;
-    for (double v : values) {
-        if (!text.isEmpty())
-            text += '\\';
-        text += KpString(0, "%.8g", v);  // at most 16 characters, as a decimal string may have
-    }
-    put(item, tag, text);
-}
 
 void putStudy(DcmItem& data, const Uids& uids, const SeriesText& text)
 {
@@ -81,40 +67,6 @@ void putRegion(DcmItem& data)
     put(*item, DCM_CodeMeaning, "Head");
 }
 
-void putImage(DcmItem& data, Volume& volume, const SeriesText& text, long z)
-{
-    const Vector &x = volume.axes[0], &y = volume.axes[1], &normal = volume.axes[2];
-    const double shift = static_cast<double>(z) * volume.spacing[2];
-    put(data, DCM_InstanceNumber, KpString(0, "%ld", z + 1));
-    putReals(data, DCM_ImagePositionPatient,
-             {volume.origin[0] + shift * normal[0], volume.origin[1] + shift * normal[1],
-              volume.origin[2] + shift * normal[2]});
-    putReals(data, DCM_ImageOrientationPatient, {x[0], x[1], x[2], y[0], y[1], y[2]});
-    putReals(data, DCM_PixelSpacing, {volume.spacing[1], volume.spacing[0]});
-    putReals(data, DCM_SliceThickness, {volume.spacing[2]});
-    putReals(data, DCM_SpacingBetweenSlices, {volume.spacing[2]});
-    putReals(data, DCM_RescaleIntercept, {volume.intercept});
-    putReals(data, DCM_RescaleSlope, {volume.slope});
-    put(data, DCM_RescaleType, "US");
-    putReals(data, DCM_WindowCenter, {text.windowCenter});
-    putReals(data, DCM_WindowWidth, {text.windowWidth});
-}
-
-void putPixels(DcmItem& data, Volume& volume, long z)
-{
-    const bool isSigned = volume.type == KpPrimType::Short;
-    put(data, DCM_PhotometricInterpretation, "MONOCHROME2");
-    data.putAndInsertUint16(DCM_SamplesPerPixel, 1);
-    data.putAndInsertUint16(DCM_Rows, static_cast<Uint16>(volume.dims[1]));
-    data.putAndInsertUint16(DCM_Columns, static_cast<Uint16>(volume.dims[0]));
-    data.putAndInsertUint16(DCM_BitsAllocated, 16);
-    data.putAndInsertUint16(DCM_BitsStored, 16);
-    data.putAndInsertUint16(DCM_HighBit, 15);
-    data.putAndInsertUint16(DCM_PixelRepresentation, isSigned ? 1 : 0);
-    data.putAndInsertUint16Array(DCM_PixelData, static_cast<const Uint16*>(volume.slice(z).data),
-                                 static_cast<unsigned long>(volume.sliceCount()));
-}
-
 void putPrivate(DcmItem& data, const Volume& volume, const SeriesText& text)
 {
     put(data, privateCreatorTag, privateCreator);
@@ -138,7 +90,10 @@ KpResult writeSeries(Volume& volume, const SeriesText& text, const char* folder,
         put(data, DCM_SOPInstanceUID, dcmGenerateUniqueIdentifier(instance, SITE_INSTANCE_UID_ROOT));
         putStudy(data, uids, text);
         putRegion(data);
-        putImage(data, volume, text, z);
+        putPlace(data, volume, z);
+        put(data, DCM_RescaleType, "US");
+        putReals(data, DCM_WindowCenter, {text.windowCenter});
+        putReals(data, DCM_WindowWidth, {text.windowWidth});
         putPixels(data, volume, z);
         putPrivate(data, volume, text);
         const KpString path(0, "%s/image%04ld.dcm", folder, z + 1);

@@ -113,19 +113,31 @@ Window windowOf(Volume& volume)
     return window;
 }
 
-Window windowOf(const HxParamBundle& root, Volume& volume)
+std::vector<KpWindowLevel> presetsOf(const HxParamBundle& root)
+{
+    const std::array<std::string, 3> texts{root.findTag("G0028-1050", ""), root.findTag("G0028-1051", ""),
+                                           root.findTag("G0028-1055", "")};
+    std::vector<KpWindowLevel> presets = KpWindowLevel::createFromTags(texts);
+    std::erase_if(presets, [](const KpWindowLevel& p) { return !std::isfinite(p.center()) || !(p.width() >= 1); });
+    return presets;
+}
+
+Window windowOf(const HxParamBundle& root, const KpWindowLevel& preset)
 {
     Window window;
+    window.center = static_cast<double>(preset.center());
+    window.width = static_cast<double>(preset.width());
     window.isInverted = KpString(root.findTag("G0028-0004", "")) == "MONOCHROME1";
-    KpDArray<float> center, width;
-    root.findTag("G0028-1050", center);
-    root.findTag("G0028-1051", width);
-    if (center.size() > 0 && width.size() > 0 && width[0] >= 1) {
-        window.center = static_cast<double>(center[0]);
-        window.width = static_cast<double>(width[0]);
-        window.origin = "from the header";
+    window.origin = "from the header";
+    return window;
+}
+
+Window windowOf(const HxParamBundle& root, Volume& volume)
+{
+    const std::vector<KpWindowLevel> presets = presetsOf(root);
+    Window window = windowOf(root, presets.empty() ? KpWindowLevel() : presets.front());
+    if (!presets.empty())
         return window;
-    }
     const bool isInverted = window.isInverted;
     window = windowOf(volume);
     window.isInverted = isInverted;
@@ -151,10 +163,16 @@ void display(Volume& volume, const Window& window, Volume& shown)
 KpResult writePlanes(Volume& shown, const KpBitfield& outline, const OutputFolder& out)
 {
     const auto [left, back, up] = alongPatientAxes(shown);
-    KpResult result = writePng(cut(shown, outline, left, back, up), out, "axial.png");
+    KpResult result = writeAxial(shown, outline, out, "axial.png");
     result << writePng(cut(shown, outline, left, reversed(up), back), out, "coronal.png");
     result << writePng(cut(shown, outline, back, reversed(up), left), out, "sagittal.png");
     return result;
+}
+
+KpResult writeAxial(Volume& shown, const KpBitfield& outline, const OutputFolder& out, const char* name)
+{
+    const auto [left, back, up] = alongPatientAxes(shown);
+    return writePng(cut(shown, outline, left, back, up), out, name);
 }
 
 KpResult writeOverview(Volume& shown, const OutputFolder& out, const char* name)

@@ -3,6 +3,7 @@
 #include "OutputFolder.h"
 #include "Volume.h"
 
+#include <kplib/imaging/KpWindowLevel.h>
 #include <kplib/param/HxParamBundle.h>
 #include <kplib/volume/KpBitfield.h>
 
@@ -15,7 +16,10 @@ struct Window {
 
 /// The window from the lowest to the highest value, leaving out half a percent at either end.
 Window windowOf(Volume& volume);
-/// That of the header, or else windowOf() the volume.
+/// The windows of the header that can be shown.
+std::vector<KpWindowLevel> presetsOf(const HxParamBundle& root);
+Window windowOf(const HxParamBundle& root, const KpWindowLevel& preset);
+/// The first one of the header, or else windowOf() the volume.
 Window windowOf(const HxParamBundle& root, Volume& volume);
 
 /// The volume through the window, as bytes, into `shown`, whose memory is used again. The linear function of DICOM
@@ -26,6 +30,9 @@ void display(Volume& volume, const Window& window, Volume& shown);
 /// as usual (left on the right side of the picture), with square pixels and the orientation's
 /// letters at the edges. Voxels of `outline`, a mask of the volume's size, are marked.
 KpResult writePlanes(Volume& shown, const KpBitfield& outline, const OutputFolder& out);
+
+/// Writes the axial one of these pictures alone.
+KpResult writeAxial(Volume& shown, const KpBitfield& outline, const OutputFolder& out, const char* name);
 
 /// Writes all slices of a volume of bytes side by side, with the letters of a slice at the edges.
 KpResult writeOverview(Volume& shown, const OutputFolder& out, const char* name);

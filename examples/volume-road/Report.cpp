@@ -2,6 +2,8 @@
 
 #include "Space.h"
 
+#include <kplib/imaging/KpSOPInstanceUtility.h>
+#include <kplib/imaging/TmgImages.h>
 #include <kplib/rawdata/KpRawData.h>
 
 #include <cerrno>
@@ -74,6 +76,30 @@ void addRegion(const Region& region, KpString& text)
                      mm(low.z()), mm(high.x()), mm(high.y()), mm(high.z()));
 }
 
+/// What the header recommends to look at, and the pictures that do.
+void addPresets(const HxParamBundle& root, KpString& text)
+{
+    int number = 0;
+    for (const KpWindowLevel& preset : presetsOf(root))
+        text += KpString(0, "%-20s center %s, width %s %s (preset-%d.png)\n", "preset", preset.centerString().c_str(),
+                         preset.widthString().c_str(), preset.explanation().c_str(), ++number);
+}
+
+/// The instances that the volume, and all that is derived from it, was made of.
+void addInstances(const HxParamBundle& root, KpString& text)
+{
+    const HxParamBundle* const instances = root.bundle("SOPInstanceUIDs");
+    KpDArray<std::string> list;
+    if (!KpSOPInstanceUtility::sopUIDList(instances, list))
+        return;
+    text += KpString(0, "%-20s %ld, hash %s\n", "source instances", list.size(),
+                     KpSOPInstanceUtility::sopUIDHash(instances).c_str());
+    KpDArray<int> numbers;
+    Tmg::imageNumbers3D(root, 0, static_cast<int>(list.size()) - 1, numbers);
+    if (numbers.size() > 0)
+        text += KpString(0, "%-20s %d to %d\n", "image numbers", numbers[0], numbers[numbers.size() - 1]);
+}
+
 }  // namespace
 
 KpResult writeHeader(const HxParamBundle& root, const OutputFolder& out)
@@ -84,14 +110,19 @@ KpResult writeHeader(const HxParamBundle& root, const OutputFolder& out)
 }
 
 KpResult writeReport(const HxParamBundle& root, const Series& series, Volume& volume, const Window& window,
-                     const Region& region, const std::vector<Stage>& stages, const OutputFolder& out)
+                     const Region& region, const std::string& derivedUid, const std::vector<Stage>& stages,
+                     const OutputFolder& out)
 {
     KpString text;
     addSafeTags(root, text);
     text += KpString(0, "%-20s %zu (%d other files skipped)\n", "images", series.slices.size(), series.skippedFiles);
     addVolume(volume, text);
     text += KpString(0, "%-20s center %.6g, width %.6g (%s)\n", "window", window.center, window.width, window.origin);
+    addPresets(root, text);
     addRegion(region, text);
+    addInstances(root, text);
+    if (!derivedUid.empty())
+        text += KpString(0, "%-20s %s\n", "derived series", derivedUid.c_str());
     for (const std::string& warning : series.warnings)
         text += KpString(0, "%-20s %s\n", "warning", warning.c_str());
     for (const Stage& stage : stages)

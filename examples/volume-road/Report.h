@@ -14,6 +14,8 @@ struct Stage {
 /// Writes header.txt: the whole tree in its text form, with the index of private creators.
 KpResult writeHeader(const HxParamBundle& root, const OutputFolder& out);
 
-/// Writes report.txt: what can be told without telling who the patient is.
+/// Writes report.txt: what can be told without telling who the patient is. `derivedUid`: of the derived series, if
+/// there is one.
 KpResult writeReport(const HxParamBundle& root, const Series& series, Volume& volume, const Window& window,
-                     const Region& region, const std::vector<Stage>& stages, const OutputFolder& out);
+                     const Region& region, const std::string& derivedUid, const std::vector<Stage>& stages,
+                     const OutputFolder& out);

@@ -1,5 +1,6 @@
 #include "RunRoad.h"
 
+#include "DerivedSeries.h"
 #include "DicomSeries.h"
 #include "JobLog.h"
 #include "Oblique.h"
@@ -31,16 +32,32 @@ void readVolume(const Job& job, Road& road, KpProgressInterface& progress, Serie
     road.nested("read images", [&] { return readSeries(series, progress, volume, root); });
 }
 
+/// One picture for each window of the header.
+KpResult writePresets(const HxParamBundle& root, Volume& volume, const KpBitfield& outline, const OutputFolder& out)
+{
+    KpResult result;
+    Volume shown;
+    int number = 0;
+    for (const KpWindowLevel& preset : presetsOf(root)) {
+        display(volume, windowOf(root, preset), shown);
+        result << writeAxial(shown, outline, out, KpString(0, "preset-%d.png", ++number));
+    }
+    return result;
+}
+
 }  // namespace
 
 KpResult runRoad(const Job& job, const std::string& target, KpProgressInterface& progress)
 {
-    OutputFolder out;
-    if (KpResult opened = out.open(target); opened.isBad())
+    OutputFolder out, derived;
+    KpResult opened = out.open(target);
+    if (!job.derived.empty())
+        opened << derived.open(job.derived);
+    if (opened.isBad())
         return opened;
     const ProgressScope scope(&progress);
     const JobLog log(out.working());
-    progress.startWorking(9, "");
+    progress.startWorking(job.derived.empty() ? 10 : 11, "");
     Road road(progress);
     Series series;
     HxParamBundle root("Volume");
@@ -66,6 +83,7 @@ KpResult runRoad(const Job& job, const std::string& target, KpProgressInterface&
         display(volume, window, shown);
         return writePlanes(shown, region.outline, out);
     });
+    road.plain("draw presets", [&] { return writePresets(root, volume, region.outline, out); });
     road.plain("cut obliquely", [&] { return writeOblique(shown, *space, region.outline, out); });
     road.plain("draw overviews", [&] {
         display(mean, window, shown);
@@ -74,13 +92,19 @@ KpResult runRoad(const Job& job, const std::string& target, KpProgressInterface&
         written << writeOverview(shown, out, "overview-maximum.png");
         return written;
     });
+    std::string derivedUid;
+    if (!job.derived.empty())
+        road.nested("write derived series",
+                    [&] { return writeDerived(mean, series, 2, derived.working(), progress, derivedUid); });
     road.plain("write texts", [&] {
         KpResult written = writeHeader(root, out);
-        written << writeReport(root, series, volume, window, region, road.stages(), out);
+        written << writeReport(root, series, volume, window, region, derivedUid, road.stages(), out);
         return written;
     });
     KpResult result = road.result();
     if (result.isOk())
         result << out.publish();
+    if (result.isOk() && !job.derived.empty())
+        result << derived.publish();
     return result;
 }

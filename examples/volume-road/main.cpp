@@ -105,8 +105,11 @@ int run(int argc, char** argv)
     CLI::App& road = *app.add_subcommand("run", "read a series; write pictures, header and report");
     addSeries(road);
     addThreshold(road);
-    road.add_option("--http", job.url, "URL of an exported volume on a server, in place of SERIES");
+    CLI::Option* const remote =
+        road.add_option("--http", job.url, "URL of an exported volume on a server, in place of SERIES");
     road.get_option("SERIES")->required(false);
+    road.add_option("--derived", job.derived, "folder for the reduced volume as a DICOM series of its own")
+        ->excludes(remote);
     road.add_option("OUT", target, "folder to write into");
 
     CLI::App& exporting = *app.add_subcommand("export", "write a series as one raw file, for a server to give out");

@@ -169,6 +169,8 @@ TEST(TypedViews, sizeOfPixelsFollowsTheType)
         const KpTypedData3D volumes[] = {{2, 3, 4, type, 2}, {dims, type, 2}, {2, 3, 4, p, 2}, {dims, p, 2}};
         for (const KpTypedData3D& volume : volumes) {
             KpTypedData2D slice;
+            volume.getSlice(3, 2, slice, 0);
+            EXPECT_TRUE(slice.nDataVar() == 2 && slice.primType() == type && !slice.dims()[0]);  // these alone
             volume.getSlice(1, 2, slice, 0);
             for (const KpTypedData2D& image :
                  {slice, {2, 4, type, 2}, {2, 4, p, 2}, {dims, p, 2}, {2, 4, 99, 70, p, 2}})

@@ -68,7 +68,14 @@
 #include <kplib/geometry/KpViewVolume.h>
 #include <kplib/geometry/MathUtils.h>
 #include <kplib/imaging/KpColor.h>
+#include <kplib/imaging/KpCreateUIDs.h>
 #include <kplib/imaging/KpOrientationLetters.h>
+#include <kplib/imaging/KpSOPInstanceUtility.h>
+#include <kplib/imaging/KpWindowLevel.h>
+#include <kplib/imaging/TmgDateTime.h>
+#include <kplib/imaging/TmgImages.h>
+#include <kplib/imaging/TmgSeries.h>
+#include <kplib/imaging/TmgText.h>
 #include <kplib/log/KpCrashDump.h>
 #include <kplib/log/KpDbC.h>
 #include <kplib/log/KpLastError.h>

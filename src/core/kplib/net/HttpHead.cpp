@@ -1,8 +1,8 @@
 #include <kplib/net/detail/HttpHead.h>
 
 #include <algorithm>
-#include <boost/algorithm/string/predicate.hpp>
 #include <cstdlib>
+#include <strings.h>
 
 namespace {
 
@@ -51,7 +51,7 @@ kplib::detail::HttpHead::State kplib::detail::HttpHead::stateAfterLine()
 void kplib::detail::HttpHead::takeField()
 {
     const size_t colon = line_.find(':');
-    if (colon == std::string::npos || !boost::algorithm::iequals(line_.substr(0, colon), "Content-Length"))
+    if (colon == std::string::npos || strcasecmp(line_.substr(0, colon).c_str(), "Content-Length") != 0)
         return;
     hasLength_ = true;
     length_ = std::atoll(line_.c_str() + colon + 1);  // which skips the white space in front

@@ -47,6 +47,9 @@ void TmMsg::resize(long size)
     if (size > buffer_.capacity())
         own();
     buffer_.resize(size);
+    if (externalData_)  // no room behind the size either, so that what is appended doesn't go into somebody else's
+                        // bytes
+        buffer_.setStorage(buffer_.data(), buffer_.size(), buffer_.size());
 }
 
 void TmMsg::reset(long size)

@@ -61,7 +61,8 @@ public:
     void take(TmMsg& other);
 
     /// Makes this a message over bytes of the caller, as the constructor does. Bytes that the message owned are not
-    /// freed: they are the caller's, who has their address from dataPtr(). That is meant.
+    /// freed: they are the caller's, who has their address from dataPtr(). That is meant. What is appended doesn't go
+    /// into the caller's bytes: the message goes on with a copy of its own.
     void setRawData(unsigned long size, unsigned char* data);
 
     /// Equal bytes, and read up to the same offset.

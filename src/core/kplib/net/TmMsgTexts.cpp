@@ -11,7 +11,7 @@ std::string_view readToNul(TmMsg& msg)
     void* bytes = nullptr;
     msg.readRawBytes(0, bytes);
     const auto* const text = static_cast<const char*>(bytes);
-    const unsigned long length = left > 0 ? strnlen(text, left) : 0;
+    const unsigned long length = text ? strnlen(text, left) : 0;
     msg.readRawBytes(length + 1, bytes);
     return {text, length};
 }

@@ -24,17 +24,16 @@ namespace kplib::detail {
 bool readElements(TmMsg& msg, void* elements, unsigned long bytes)
 {
     const unsigned long offset = msg.readOffset();
-    const bool isHeld = msg.holds(bytes);
     void* from = nullptr;
     msg.readRawBytes(bytes, from);
-    if (isHeld && bytes > 0) {
+    if (from && bytes > 0) {
         std::memcpy(elements, from, bytes);
     } else if (bytes > 0) {
         getTheLogInstance().errorf("Buffer overrun in TmMsg::readKpDArray(), offset=%u, numBytes=%u, size=%u",
                                    static_cast<unsigned int>(offset), static_cast<unsigned int>(bytes),
                                    static_cast<unsigned int>(msg.size()));
     }
-    return isHeld;
+    return from != nullptr;
 }
 
 void makeBools(unsigned char* bytes, long count)
@@ -81,7 +80,7 @@ TmMsg& operator>>(TmMsg& msg, KpBitfield& field)
     void* words = nullptr;
     msg.readRawBytes(bytes, words);
     field.resize(words ? nBits : 0, KpBitfield::INIT_NONE);  // no memory for bits that didn't come
-    if (field.nBits() > 0)
+    if (words && bytes > 0)
         std::memcpy(field.data(), words, bytes);
     return msg;
 }

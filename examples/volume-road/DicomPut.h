@@ -1,0 +1,19 @@
+#pragma once
+
+#include "Volume.h"
+
+#include <initializer_list>
+
+class DcmItem;
+class DcmTag;
+
+// Elements of a DICOM image that is being made.
+
+void put(DcmItem& item, const DcmTag& tag, const char* text);
+void putReals(DcmItem& item, const DcmTag& tag, std::initializer_list<double> values);
+
+/// Number, place, orientation, spacing and scale of slice `z`.
+void putPlace(DcmItem& data, const Volume& volume, long z);
+
+/// The pixels of slice `z` of a volume of 16-bit voxels, and what describes them.
+void putPixels(DcmItem& data, Volume& volume, long z);

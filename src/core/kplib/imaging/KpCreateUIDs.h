@@ -1,0 +1,42 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpString.h>
+
+/// Makes DICOM unique identifiers for new objects (PS3.5, 9): root, version, a number for the kind of object, the node,
+/// a counter and the process, separated by dots.
+///
+/// The counter is the time of day and counts on where the clock stands still or goes back: within a process it never
+/// repeats, whatever object or thread asks. That the text stays within the 64 characters of DICOM is up to the root.
+/// createUID() may be called on one object by many threads; setters and lastError() are for one thread.
+class KPLIB_API KpCreateUIDs {
+public:
+    /// What the identifier is for; the values of the layer above, which stand in the UID as 2 to 6.
+    enum UIDtype : int { UIDtype0 = 0, UIDtype1 = 1, UIDtype2 = 2, UIDtype3 = 3, UIDtype4 = 4 };
+
+    KpCreateUIDs();
+
+    /// Version and root as they are at first; the last error stays.
+    void reset();
+
+    /// False for an empty text (or null), which is an error and changes nothing.
+    bool setRootUID(const char* root);
+    bool setVersion(const char* version);
+
+    void setLastError(const KpString& text) { lastError_ = text; }
+    /// The text of the last failure, "" at first; valid until the next one.
+    const char* lastError() const { return lastError_.c_str(); }
+
+    /// A new identifier into `uid`. An unknown type is an error: false, and `uid` is empty. Under a microsecond.
+    bool createUID(UIDtype type, KpString& uid);
+
+    /// The local time: the full year, the month from 1.
+    static void getDateTime(int& year, int& month, int& day, int& hour, int& minute, int& second);
+
+private:
+    bool setText(KpString& field, const char* text, const char* error);
+
+    KpString version_;
+    KpString rootUID_;
+    KpString lastError_;
+};

@@ -1,0 +1,45 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpForward.h>
+
+#include <set>
+#include <string>
+
+// What belongs to each image of a volume, in the parameters of the volume: beside `DICOM` a bundle `ImageNumberList`,
+// whose first child is `NumImageNumbers` and whose others are a text for each image, `ImageNr00001` ... in the order of
+// the images. A text holds fields separated by commas, named by the tags in the parameter `ImageLevelTags`; its first
+// field is the image number. Images are found by their position: such a list must never be sorted, as a caller's
+// HxParamBundle::findSorted() on it may do once names have more than five digits. Nothing here sorts it.
+//
+// Failure is false. Threads as with HxParamBundle.
+
+namespace Tmg {
+
+/// Tags whose value is taken to be the same in all images of a volume, so that the first image may stand for all.
+/// Lives from static initialisation to exit.
+KPLIB_API extern const std::set<std::string> tagsConstantInVolume;
+
+/// Replaces all that `list` holds by the texts of the images; no texts leave it empty.
+KPLIB_API void setImageTagList(HxParamBundle* list, const KpDArray<KpString>& texts);
+
+/// The number of image `index`, counted from 0; false without that image.
+KPLIB_API bool imageNumberFromBundle(const HxParamBundle* list, int index, int& out);
+/// The same from the `ImageNumberList` of `object`, or else the instance number (0020,0013) of its header. `out` is 0
+/// if there is neither.
+KPLIB_API bool imageNumber(const HxParamBundle& object, int index, int& out);
+/// The numbers of the images `first` to `last`, both cut to those that there are. Without a list `out` stays.
+KPLIB_API void imageNumbers3D(const HxParamBundle& object, int first, int last, KpDArray<int>& out);
+
+/// The frame of image `index` in an object of two or more frames (0028,0008): `index` itself in an enhanced one, else
+/// the number behind the last point of its stored SOP Instance UID. findSorted() sorts the header.
+KPLIB_API bool frameNumber(const HxParamBundle& object, bool enhanced, int index, int& out);
+
+/// The value of a tag for image `index`: its own if `ImageLevelTags` names the tag (any name that holds `tag` counts as
+/// that), else that of the header. `approximate` tells that it is the volume's and may differ for this image, as it
+/// never does if there is but one image or the tag is one of tagsConstantInVolume. False, with `approximate` set all
+/// the same, if there is no value, or an empty one of the image's own.
+KPLIB_API bool imageLevelTag(const HxParamBundle& object, int index, const char* tag, KpString& value,
+                             bool& approximate);
+
+}  // namespace Tmg

@@ -1,0 +1,93 @@
+#pragma once
+
+#include <kplib/foundation/KpDArray.h>
+#include <kplib/foundation/KpExport.h>
+#include <kplib/foundation/KpHandable.h>
+#include <kplib/foundation/KpHandle.h>
+#include <kplib/foundation/KpString.h>
+
+#include <string>
+#include <vector>
+
+// What a loader notes of a series and its images. What the texts mean is up to the loader; here they are kept.
+
+namespace Tmg {
+
+/// One image.
+class KPLIB_API ImageInfo {
+public:
+    ImageInfo(const std::string& first, const std::string& second) : first_(first), second_(second) {}
+    ImageInfo(const ImageInfo&) = delete;
+    ImageInfo& operator=(const ImageInfo&) = delete;
+    virtual ~ImageInfo();
+
+    const std::string& first() const { return first_; }
+    const std::string& second() const { return second_; }
+    /// A word for the loader, 0 at first.
+    long long word() const { return word_; }
+    void setWord(long long word) { word_ = word; }
+
+private:
+    std::string first_;
+    std::string second_;
+    long long word_ = 0;
+};
+
+/// A series, which owns its images.
+class KPLIB_API SeriesInfo : public KpHandable {
+public:
+    explicit SeriesInfo(const std::string& series) : series_(series) {}
+    SeriesInfo(const SeriesInfo&) = delete;
+    SeriesInfo& operator=(const SeriesInfo&) = delete;
+    /// Deletes the images.
+    ~SeriesInfo() override;
+
+    const std::string& series() const { return series_; }
+    std::vector<ImageInfo*>& images() { return images_; }
+    const std::vector<ImageInfo*>& images() const { return images_; }
+    /// A flag for the loader, false at first.
+    bool isFlagged() const { return flag_; }
+    void setFlagged(bool flag) { flag_ = flag; }
+
+private:
+    std::string series_;
+    std::vector<ImageInfo*> images_;
+    bool flag_ = false;
+};
+
+/// Collects the images of a series while they come in.
+class KPLIB_API ImageSeriesHelper {
+public:
+    explicit ImageSeriesHelper(const std::string& series) : series_(series) {}
+    ImageSeriesHelper(const ImageSeriesHelper&) = delete;
+    ImageSeriesHelper& operator=(const ImageSeriesHelper&) = delete;
+    /// Deletes the images that are still here.
+    ~ImageSeriesHelper();
+
+    /// Makes the SeriesInfo if there is none yet.
+    void create2DImageSet();
+    /// create2DImageSet(), and a new image of the two texts.
+    void processImage(const std::string& a, const std::string& b);
+
+    const std::string& series() const { return series_; }
+    /// The images so far; who moves them on, as into the images of the SeriesInfo, takes them out of here.
+    std::vector<ImageInfo*>& images() { return images_; }
+    const KpHandle<SeriesInfo>& seriesInfo() const { return seriesInfo_; }
+
+private:
+    std::string series_;
+    std::vector<ImageInfo*> images_;
+    KpHandle<SeriesInfo> seriesInfo_;
+};
+
+/// Brings volumes into a cache ahead of their use. The meaning of names and flags is that of the function installed.
+using VolumeCachePrecache = bool (*)(KpDArray<KpString>& names, bool flag1, bool flag2);
+
+/// Calls the installed function.
+KPLIB_API bool volumeCachePrecache(KpDArray<KpString>& names, bool flag1, bool flag2);
+/// Installs a function, null the default one: process-wide and unlocked, to be set before other threads start.
+KPLIB_API void volumeCacheSetFuncPrecache(VolumeCachePrecache function);
+/// Does nothing and gives false.
+KPLIB_API bool volumeCachePrecache_default(KpDArray<KpString>& names, bool flag1, bool flag2);
+
+}  // namespace Tmg

@@ -1,0 +1,127 @@
+#include <kplib/imaging/KpCreateUIDs.h>
+
+#include <kplib/imaging/detail/KpUIDClock.h>
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <atomic>
+#include <cstdlib>
+#include <ctime>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include <unistd.h>
+
+namespace {
+
+std::atomic<std::time_t> fakeTime;
+
+/// Local time is UTC, and the clock stands at what `fakeTime` says.
+class CreateUIDs : public testing::Test {
+protected:
+    void SetUp() override
+    {
+        setenv("TZ", "UTC", 1);
+        tzset();
+        kplib::detail::uidClock = [] { return fakeTime.load(); };
+    }
+    void TearDown() override { kplib::detail::uidClock = realClock; }
+
+private:
+    std::time_t (*realClock)() = kplib::detail::uidClock;
+};
+
+std::vector<std::string> parts(const KpString& uid)
+{
+    KpDArray<KpString> pieces;
+    uid.explode('.', pieces);
+    return {pieces.begin(), pieces.end()};
+}
+
+long long counterOf(const KpString& uid)
+{
+    const auto pieces = parts(uid);
+    return std::stoll(pieces[pieces.size() - 2]);
+}
+
+TEST_F(CreateUIDs, theTextIsMadeOfItsParts)
+{
+    fakeTime = 4102542245;  // 2100-01-02 03:04:05, later than what other tests take
+    KpCreateUIDs creator;
+    KpString uid;
+    ASSERT_TRUE(creator.createUID(KpCreateUIDs::UIDtype0, uid));
+    const auto pieces = parts(uid);
+    ASSERT_EQ(pieces.size(), 10U);
+    EXPECT_EQ(uid.substr(0, 23).c_str(), std::string("1.2.276.0.77.7.2.8432031"));
+    EXPECT_EQ(pieces[8].substr(0, 13), "1000102030405");
+    EXPECT_EQ(pieces[8].size(), 18U);
+    EXPECT_EQ(std::stoi(pieces[9]), kplib::detail::uidProcessPart(getpid()));
+
+    EXPECT_TRUE(creator.setRootUID("1.2") && creator.setVersion("9"));
+    EXPECT_FALSE(creator.setRootUID(""));
+    EXPECT_STREQ(creator.lastError(), "[setRootUID] Got empty root UID.");
+    EXPECT_FALSE(creator.setVersion(""));
+    EXPECT_STREQ(creator.lastError(), "[setVersion] Got empty version string.");
+    ASSERT_TRUE(creator.createUID(KpCreateUIDs::UIDtype4, uid));
+    EXPECT_EQ(uid.substr(0, 7).c_str(), std::string("1.2.9.6."));
+    EXPECT_FALSE(creator.createUID(static_cast<KpCreateUIDs::UIDtype>(5), uid));
+    EXPECT_TRUE(uid.isEmpty());
+    EXPECT_STREQ(creator.lastError(), "[createUID] Invalid type specified.");
+}
+
+TEST_F(CreateUIDs, theProcessPartHasFiveDigits)
+{
+    const int cases[][2] = {{123456, 23456}, {100005, 90005}, {9999, 99999}, {10000, 10000}, {0, 90000}};
+    for (const auto& [process, part] : cases)
+        EXPECT_EQ(kplib::detail::uidProcessPart(process), part);
+}
+
+TEST_F(CreateUIDs, theCounterRisesWhenTheClockGoesBack)
+{
+    KpCreateUIDs creator;
+    KpString uid;
+    long long last = 0;
+    fakeTime = 4102542245 + 10;
+    for (const int step : {0, 0, -100000, 0, 50, 100, -50}) {
+        fakeTime += step;
+        ASSERT_TRUE(creator.createUID(KpCreateUIDs::UIDtype1, uid));
+        EXPECT_GT(counterOf(uid), last);
+        last = counterOf(uid);
+    }
+}
+
+TEST_F(CreateUIDs, ThreadsNeverGetTheSame)
+{
+    fakeTime = 4102542245 + 10000;
+#ifdef __SANITIZE_THREAD__
+    constexpr size_t count = 5000;
+#else
+    constexpr size_t count = 100000;
+#endif
+    std::vector<std::vector<long long>> taken(8);
+    {
+        std::vector<std::jthread> threads;
+        for (auto& mine : taken) {
+            threads.emplace_back([&mine] {
+                KpCreateUIDs creator;
+                KpString uid;
+                for (size_t i = 0; i < count; ++i) {
+                    creator.createUID(KpCreateUIDs::UIDtype2, uid);
+                    mine.push_back(counterOf(uid));
+                }
+            });
+        }
+    }
+    std::vector<long long> all;
+    for (const auto& mine : taken) {
+        EXPECT_TRUE(std::is_sorted(mine.begin(), mine.end()));
+        all.insert(all.end(), mine.begin(), mine.end());
+    }
+    std::sort(all.begin(), all.end());
+    EXPECT_EQ(std::adjacent_find(all.begin(), all.end()), all.end());
+    EXPECT_EQ(all.size(), 8 * count);
+}
+
+}  // namespace

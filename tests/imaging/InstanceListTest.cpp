@@ -1,0 +1,141 @@
+#include <kplib/imaging/KpSOPInstanceUtility.h>
+
+#include <kplib/param/HxParamBundle.h>
+
+#include <gtest/gtest.h>
+
+#include <random>
+
+namespace {
+
+using List = KpDArray<std::string>;
+using Utility = KpSOPInstanceUtility;
+
+KpDArray<KpString> strings(const List& list)
+{
+    KpDArray<KpString> texts;
+    for (const std::string& each : list)
+        texts.append(KpString(each.c_str()));
+    return texts;
+}
+
+std::string stored(const HxParamBundle& bundle, const char* name)
+{
+    const char* text = nullptr;
+    return bundle.findString(name, text) ? text : "(none)";
+}
+
+std::vector<std::string> asVector(const List& list)
+{
+    return {list.begin(), list.end()};
+}
+
+TEST(InstanceList, isStoredBehindItsCommonPrefix)
+{
+    const struct {
+        List list;
+        const char *prefix, *first;
+    } cases[] = {
+        {{"1.2.3.41", "1.2.3.42"}, "1.2.3.4", "1"},
+        {{"1.2", "2.2"}, "(none)", "1.2"},
+        {{"1.2.3"}, "1.2.3", ""},
+        {{"1.2", "1.2"}, "1.2", ""},
+        {{"1.2.3", "1.2"}, "1.2", ".3"},
+    };
+    for (const auto& each : cases) {
+        HxParamBundle bundle("SOPInstanceUIDs");
+        bundle.set("Old", 1);
+        Utility::setSopUIDList(&bundle, strings(each.list));
+        EXPECT_EQ(stored(bundle, "Prefix"), each.prefix);
+        EXPECT_EQ(stored(bundle, "Image00001"), each.first);
+        EXPECT_EQ(stored(bundle, "Old"), "(none)");
+        List read;
+        ASSERT_TRUE(Utility::sopUIDList(&bundle, read));
+        EXPECT_EQ(asVector(read), asVector(each.list));
+        EXPECT_EQ(stored(bundle, "MD5Hash"), Utility::sopUIDHash(each.list).c_str());
+        EXPECT_FALSE(Utility::sopUIDList(&bundle, read));  // not empty any more
+    }
+    EXPECT_STREQ(Utility::sopUIDHash(List()), "D41D8CD98F00B204E9800998ECF8427E");
+    EXPECT_STREQ(Utility::sopUIDHash(List({"a", "bc"})), "900150983CD24FB0D6963F7D28E17F72");  // of "abc", RFC 1321
+    HxParamBundle bundle("B");
+    bundle.set("Old", 1);
+    Utility::setSopUIDList(&bundle, List());
+    EXPECT_EQ(bundle.size(), 0);
+}
+
+TEST(InstanceList, goesRoundInAllSizesAlsoSorted)
+{
+    std::mt19937 random(7);
+    for (const long count : {2L, 1000L, 99999L, 100000L}) {
+        List list, read;
+        for (long i = 0; i < count; ++i)
+            list.append("1.2.840." + std::to_string(random()) + '.' + std::to_string(i));
+        HxParamBundle bundle("B");
+        Utility::setSopUIDList(&bundle, list);
+        ASSERT_TRUE(Utility::sopUIDList(&bundle, read));
+        EXPECT_TRUE(asVector(read) == asVector(list));
+        bundle.findSorted("MD5Hash");
+        read.clear();
+        EXPECT_EQ(Utility::sopUIDList(&bundle, read), count < 100000) << count;
+        KpDArray<KpString> untouched = strings({"x"});
+        if (count == 100000) {
+            EXPECT_FALSE(Utility::sopUIDList(&bundle, untouched));
+            EXPECT_EQ(untouched.size(), 1);
+        }
+    }
+}
+
+TEST(InstanceList, theStoredHashIsTaken)
+{
+    HxParamBundle bundle("B");
+    EXPECT_FALSE(Utility::hasSopUIDHash(&bundle) || Utility::hasSopUIDHash(nullptr));
+    EXPECT_STREQ(Utility::sopUIDHash(&bundle), "");
+    const List list({"1.2", "2.3"});
+    Utility::setSopUIDList(&bundle, list);
+    const KpString hash = Utility::sopUIDHash(list);
+    EXPECT_TRUE(Utility::checkSOPInstanceUID(&bundle, hash));
+    bundle.remove("MD5Hash");
+    EXPECT_STREQ(Utility::sopUIDHash(&bundle), hash);
+    bundle.set("MD5Hash", "stale");
+    EXPECT_STREQ(Utility::sopUIDHash(&bundle), "stale");
+    EXPECT_FALSE(Utility::checkSOPInstanceUID(&bundle, hash) || Utility::checkSOPInstanceUID(&bundle, "") ||
+                 Utility::checkSOPInstanceUID(nullptr, hash));
+
+    EXPECT_TRUE(Utility::checkSOPInstanceUID(&bundle, list));
+    EXPECT_FALSE(Utility::checkSOPInstanceUID(&bundle, List({"1.2", "2.4"})));
+    EXPECT_FALSE(Utility::checkSOPInstanceUID(&bundle, List({"1.2"})));
+    const List prefixed({"1.2", "1.3"});
+    Utility::setSopUIDList(&bundle, prefixed);
+    EXPECT_FALSE(Utility::checkSOPInstanceUID(&bundle, prefixed));
+}
+
+TEST(InstanceList, aListOutOfOrderIsNone)
+{
+    for (const char* missing : {"Image00001", "Image00002", "NumInputImages"}) {
+        HxParamBundle bundle("B");
+        Utility::setSopUIDList(&bundle, List({"1.2", "2.3", "3.4"}));
+        bundle.remove(missing);
+        List read;
+        EXPECT_FALSE(Utility::sopUIDList(&bundle, read)) << missing;
+    }
+}
+
+TEST(InstanceList, referencesAreExpandedToFrames)
+{
+    using Entries = std::vector<Utility::SopUIDAndFrame>;
+    HxParamBundle object("Object");
+    bool ok = true;
+    EXPECT_TRUE(Utility::getReferencedSOPUIDsAndFrameNumbers(object, true, &ok).empty());
+    EXPECT_FALSE(ok);
+    Utility::setSopUIDList(object.bundle("SOPInstanceUIDs", 1), List({"1.2.0", "1.2.1", "1.2.x"}));
+    EXPECT_EQ(Utility::getReferencedSOPUIDsAndFrameNumbers(object, true, &ok),
+              (Entries{{"1.2.0", -1}, {"1.2.1", -1}, {"1.2.x", -1}}));
+    EXPECT_TRUE(ok);
+    object.setTag("G0028-0008", "2");
+    EXPECT_EQ(Utility::getReferencedSOPUIDsAndFrameNumbers(object, true, nullptr).size(), 6U);
+    EXPECT_EQ(Utility::getReferencedSOPUIDsAndFrameNumbers(object, true, nullptr)[1],
+              (Utility::SopUIDAndFrame{"1.2.0", 1}));
+    EXPECT_EQ(Utility::getReferencedSOPUIDsAndFrameNumbers(object, false, &ok), (Entries{{"1.2", 0}, {"1.2", 1}}));
+}
+
+}  // namespace

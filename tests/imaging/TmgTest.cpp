@@ -1,0 +1,240 @@
+#include <kplib/foundation/KpDArray.h>
+#include <kplib/foundation/KpString.h>
+#include <kplib/imaging/TmgDateTime.h>
+#include <kplib/imaging/TmgImages.h>
+#include <kplib/imaging/TmgSeries.h>
+#include <kplib/imaging/TmgText.h>
+#include <kplib/param/HxParamBundle.h>
+#include <kplib/param/HxParameter.h>
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <ctime>
+#include <random>
+
+namespace {
+
+TEST(TmgDateTime, datesGoThereAndBack)
+{
+    const std::pair<long, const char*> cases[] = {
+        {20240315, "2024-MAR-15"},
+        {20241231, "2024-DEC-31"},
+        {20240001, "2024-DEC-01"},
+        {20241301, "2024-DEC-01"},
+        {1234567, ""},
+        {202403151, "2024-MAR-151"},
+    };
+    for (const auto& [date, text] : cases)
+        EXPECT_EQ(Tmg::dateReformat(date), text);
+    const std::pair<const char*, long> texts[] = {
+        {"2024-mar-15", 20240315}, {"2024-DEC-31", 20241231}, {"2024-XYZ-15", 0},
+        {"20240315", 20240315},    {"2024-MAR-", 202403},     {"2024-MAR-1523", 20240315},
+    };
+    for (const auto& [text, date] : texts)
+        EXPECT_EQ(Tmg::dateReformat(std::string(text)), date) << text;
+
+    Tmg::SetFuncDateReformatLong([](long) { return std::string("hook"); });
+    Tmg::SetFuncDateReformatString([](const std::string&) { return 7L; });
+    EXPECT_EQ(Tmg::dateReformat(20240315), "hook");
+    EXPECT_EQ(Tmg::dateReformat(std::string()), 7);
+    Tmg::SetFuncDateReformatLong(nullptr);
+    Tmg::SetFuncDateReformatString(nullptr);
+    EXPECT_EQ(Tmg::dateReformat(20240315), "2024-MAR-15");
+}
+
+TEST(TmgDateTime, timesAreFormattedAndMadeKeys)
+{
+    const std::pair<const char*, const char*> formatted[] = {
+        {"123456.789", "12:34:56"}, {"1234567", "1234567"}, {"123456", "12:34:56"}, {"12345", "12345"}, {"", ""}};
+    for (const auto& [time, text] : formatted)
+        EXPECT_EQ(Tmg::timeReformat(time), text);
+    const struct {
+        const char *time, *key, *inverted;
+    } keys[] = {
+        {"123456", "1123456123456.", "00116544."},
+        {"123456.000000", "1123456123456.000000", "00116544.999999"},
+        {"003456.25", "1003456003456.25", "00236544.1999874"},
+        {"12345", "12345", "12345"},
+        {"12345.6", "", ""},
+    };
+    for (const auto& each : keys) {
+        EXPECT_EQ(Tmg::timeString(each.time, false), each.key);
+        EXPECT_EQ(Tmg::timeString(each.time, true), each.inverted);
+    }
+    setenv("TZ", "UTC", 1);
+    tzset();
+    EXPECT_EQ(Tmg::splitDateTime(1710469926), (std::pair<long, long>(20240315, 23206)));
+    using Texts = std::pair<std::string, std::string>;
+    EXPECT_EQ(Tmg::splitAndReformatDateTime("20240315 023206.5", ' '), Texts("2024-MAR-15", "02:32:06"));
+    EXPECT_EQ(Tmg::splitAndReformatDateTime("20240315", ' '), Texts());
+    EXPECT_THROW(Tmg::splitAndReformatDateTime("x 1", ' '), std::invalid_argument);
+}
+
+/// The rules one after the other, with all tries.
+bool plainMatch(const char* p, const char* t, char anyRun, char anyOne)
+{
+    if (!*p)
+        return !*t;
+    if (*p == anyRun) {
+        for (;; ++t) {
+            if (plainMatch(p + 1, t, '*', '?'))
+                return true;
+            if (!*t)
+                return false;
+        }
+    }
+    if (*p == anyOne) {
+        if (!*t)
+            return false;
+        return plainMatch(p + 1, t + 1, '*', '?') || plainMatch(p + 1, t, '*', '?');
+    }
+    return *p == *t && plainMatch(p + 1, t + 1, '*', '?');
+}
+
+TEST(TmgText, patternsMatchAsTriedOneByOne)
+{
+    std::mt19937 random(8);
+    const auto text = [&random](const char* letters, size_t most) {
+        std::string made(random() % (most + 1), ' ');
+        for (char& c : made)
+            c = letters[random() % std::strlen(letters)];
+        return made;
+    };
+    int matches = 0;
+    for (int i = 0; i < 20000; ++i) {
+        const std::string pattern = text("ab*?%_", 6), subject = text("ab*%", 6);
+        const bool expected = plainMatch(pattern.c_str(), subject.c_str(), '%', '_');
+        matches += expected;
+        ASSERT_EQ(Tmg::match(pattern.c_str(), subject.c_str(), '%', '_'), expected) << pattern << ' ' << subject;
+    }
+    EXPECT_GT(matches, 1000);
+    EXPECT_TRUE(Tmg::match("a?b", "ab", '*', '?') && Tmg::match("a?b", "axb", '*', '?'));
+    EXPECT_FALSE(Tmg::match("a?b", "axxb", '*', '?'));
+    EXPECT_FALSE(Tmg::match(std::string(2000, '*').append("b").c_str(), std::string(2000, 'a').c_str(), '*', '?'));
+}
+
+TEST(TmgText, setsAndValuesAreLists)
+{
+    EXPECT_TRUE(Tmg::matchSet("mr\\c*", "ct", "\\") && Tmg::matchSet("A", "b a", " "));
+    EXPECT_FALSE(Tmg::matchSet("mr", "ct", "\\") || Tmg::matchSet(nullptr, "a", " ") || Tmg::matchSet("a", "", " "));
+    const struct {
+        const char *target, *additions, *separators, *result;
+        bool added;
+    } cases[] = {
+        {"A\\B", "B\\C", "\\", "A\\B\\C", true}, {"A\\B", "A", "\\", "A\\B", false}, {"", "A", ",", "A", true},
+        {"A;B", "C,D", ",;", "A;B;C;D", true},   {"A,", "B", ",", "A,B", true},      {"A", "B,B", ",", "A,B", true},
+    };
+    for (const auto& each : cases) {
+        KpString target(each.target);
+        EXPECT_EQ(Tmg::addToMultiValueString(target, each.additions, each.separators), each.added);
+        EXPECT_STREQ(target, each.result);
+    }
+    EXPECT_EQ(Tmg::networkToLocalPath("/a/b"), "/a/b");
+}
+
+TEST(TmgImages, numbersComeFromTheListOrTheHeader)
+{
+    HxParamBundle object("Object");
+    int number = 5;
+    EXPECT_FALSE(Tmg::imageNumber(object, 0, number));
+    EXPECT_EQ(number, 0);
+    object.dicomAllCreate()->set("G0020-0013", "Instance Number: 42");
+    EXPECT_TRUE(Tmg::imageNumber(object, 0, number));
+    EXPECT_EQ(number, 42);
+
+    HxParamBundle* list = object.bundle("ImageNumberList", 1);
+    list->set("Old", 1);
+    Tmg::setImageTagList(list, KpDArray<KpString>({"7,a", "8,b", "9"}));
+    KpDArray<int> numbers;
+    const struct {
+        int first, last;
+        std::vector<int> numbers;
+    } cases[] = {{0, 2, {7, 8, 9}}, {-3, 99, {7, 8, 9}}, {1, 1, {8}}, {2, 1, {}}, {5, 9, {}}};
+    for (const auto& each : cases) {
+        Tmg::imageNumbers3D(object, each.first, each.last, numbers);
+        EXPECT_EQ(std::vector<int>(numbers.begin(), numbers.end()), each.numbers);
+    }
+    EXPECT_TRUE(Tmg::imageNumber(object, 2, number));
+    EXPECT_EQ(number, 9);
+    for (const int index : {-1, 3, 0x7fffffff})
+        EXPECT_FALSE(Tmg::imageNumberFromBundle(list, index, number));
+    EXPECT_TRUE(Tmg::imageNumber(object, 3, number));  // falls back on the header
+    EXPECT_EQ(number, 42);
+    EXPECT_FALSE(list->isSorted());
+}
+
+TEST(TmgImages, framesAreNumberedInObjectsOfSeveral)
+{
+    HxParamBundle object("Object");
+    int frame = 0;
+    EXPECT_FALSE(Tmg::frameNumber(object, true, 3, frame));
+    for (const char* single : {"Number of Frames: 1", "2", ":"}) {
+        object.dicomAllCreate()->set("G0028-0008", single);
+        EXPECT_FALSE(Tmg::frameNumber(object, true, 3, frame)) << single;
+    }
+    object.dicomAllCreate()->set("G0028-0008", "Number of Frames: 2");
+    EXPECT_TRUE(Tmg::frameNumber(object, true, 3, frame));
+    EXPECT_EQ(frame, 3);
+    EXPECT_FALSE(Tmg::frameNumber(object, false, 0, frame));
+    object.bundle("SOPInstanceUIDs", 1)->set("Image00001", "1.2.17");
+    EXPECT_TRUE(Tmg::frameNumber(object, false, 0, frame));
+    EXPECT_EQ(frame, 17);
+}
+
+TEST(TmgImages, tagsOfAnImageAreItsOwnOrTheVolumes)
+{
+    HxParamBundle object("Object");
+    KpString value("old");
+    bool approximate = false;
+    const auto ask = [&](int index, const char* tag) {
+        return Tmg::imageLevelTag(object, index, tag, value, approximate);
+    };
+    EXPECT_FALSE(ask(0, "G0018-0050"));
+    EXPECT_FALSE(approximate);  // constant in a volume
+    EXPECT_FALSE(ask(0, "G0008-0032"));
+    EXPECT_TRUE(approximate);
+    object.dicomAllCreate()->set("G0008-0032", "Acquisition Time: 0815");
+    EXPECT_TRUE(ask(0, "G0008-0032") && approximate);
+    EXPECT_STREQ(value, "0815");
+
+    HxParamBundle* list = object.bundle("ImageNumberList", 1);
+    Tmg::setImageTagList(list, KpDArray<KpString>({"1,10.5,", "2"}));
+    object.set("ImageLevelTags", "G0020-0013,G0020-1041,G0018-1041");
+    EXPECT_TRUE(ask(0, "G0020-1041") && !approximate);
+    EXPECT_STREQ(value, "10.5");
+    EXPECT_FALSE(ask(1, "G0020-1041") || approximate);
+    EXPECT_STREQ(value, "10.5");  // no such field: stays
+    EXPECT_FALSE(ask(0, "G0018-1041") || approximate);
+    EXPECT_STREQ(value, "");  // an empty field
+    EXPECT_FALSE(ask(2, "G0020-0013") || approximate);
+    EXPECT_FALSE(ask(0, "1041") || approximate);  // part of a name
+    EXPECT_TRUE(ask(0, "G0008-0032") && approximate);
+    object.bundle("SOPInstanceUIDs", 1)->set("NumInputImages", 1);
+    EXPECT_TRUE(ask(0, "G0008-0032") && !approximate);
+    EXPECT_EQ(Tmg::tagsConstantInVolume.size(), 51U);
+}
+
+TEST(TmgSeries, imagesBelongToWhoHoldsThem)
+{
+    Tmg::ImageSeriesHelper helper("1.2");
+    helper.processImage("a", "b");
+    helper.processImage("c", "d");
+    const Tmg::SeriesInfo* made = helper.seriesInfo().get();
+    helper.create2DImageSet();
+    EXPECT_EQ(helper.seriesInfo().get(), made);
+    EXPECT_EQ(made->series(), "1.2");
+    ASSERT_EQ(helper.images().size(), 2U);
+    EXPECT_EQ(helper.images()[1]->second(), "d");
+    helper.seriesInfo()->images().push_back(helper.images()[0]);  // the other one is deleted by the helper
+    helper.images().erase(helper.images().begin());
+
+    KpDArray<KpString> names;
+    EXPECT_FALSE(Tmg::volumeCachePrecache(names, true, false));
+    Tmg::volumeCacheSetFuncPrecache([](KpDArray<KpString>& n, bool a, bool b) { return n.size() == 0 && a && !b; });
+    EXPECT_TRUE(Tmg::volumeCachePrecache(names, true, false));
+    Tmg::volumeCacheSetFuncPrecache(nullptr);
+    EXPECT_FALSE(Tmg::volumeCachePrecache(names, true, false));
+}
+
+}  // namespace

@@ -1,0 +1,75 @@
+#include <kplib/imaging/KpWindowLevel.h>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using Presets = std::vector<KpWindowLevel>;
+
+KpWindowLevelTagGroup group(const char* center, const char* width, const char* explanation)
+{
+    return std::array<std::string, 3>{center, width, explanation};
+}
+
+/// The presets as texts "centre/width/explanation ...".
+std::string shown(const Presets& presets)
+{
+    std::string text;
+    for (const KpWindowLevel& each : presets)
+        text += each.centerString() + '/' + each.widthString() + '/' + each.explanation() + ' ';
+    return text;
+}
+
+TEST(WindowLevel, presetsComeFromTheValuesAtOnePosition)
+{
+    const struct {
+        const char *center, *width, *explanation, *presets;
+    } cases[] = {
+        {R"(40\-600)", R"(400\1600)", R"(SOFT\LUNG)", "40/400/SOFT -600/1600/LUNG "},
+        {R"(40\50)", "400", "", ""},
+        {R"(1\2)", R"(3\4)", R"(A\B\C)", "1/3/A 2/4/B "},
+        {R"(1\2)", R"(3\4)", "A", "1/3/A 2/4/ "},
+        {R"(1\\3)", R"(4\\6)", R"(A\B\C)", "1/4/A 3/6/C "},
+        {R"(1\2)", R"(\4)", R"(A\B)", "2/4/B "},
+        {"", "", "", ""},
+        {"40 ", " 400", "", "40 / 400/ "},  // blanks stay as they are
+    };
+    for (const auto& each : cases)
+        EXPECT_EQ(shown(KpWindowLevel::createFromTags(group(each.center, each.width, each.explanation))), each.presets);
+}
+
+TEST(WindowLevel, tagsKeepTheTextsAndTheirPlaces)
+{
+    const Presets presets = {{"40", "400.50"}, {"-6e2", "1600", "LUNG"}};
+    const auto tags = KpWindowLevel::toTags(presets);
+    EXPECT_EQ(tags.toArray(), (std::array<std::string, 3>{R"(40\-6e2)", R"(400.50\1600)", R"(\LUNG)"}));
+    EXPECT_EQ(shown(KpWindowLevel::createFromTags(tags)), shown(presets));
+    EXPECT_EQ(KpWindowLevel::toTags({}).toArray(), (std::array<std::string, 3>{}));
+}
+
+TEST(WindowLevel, equalityIsThatOfNumbers)
+{
+    const KpWindowLevel preset(40.0F, 0.1F, "A");
+    EXPECT_EQ(preset.centerString(), "40.000000");
+    EXPECT_EQ(preset.widthString(), "0.100000");
+    EXPECT_TRUE(preset == KpWindowLevel("40", "1e-1", "A"));
+    EXPECT_FALSE(preset == KpWindowLevel("40", "0.1", "B"));
+    EXPECT_FALSE(preset == KpWindowLevel("40", "0.2", "A"));
+    const KpWindowLevel nan("nan", "1");
+    EXPECT_FALSE(nan == nan);
+    EXPECT_TRUE(KpWindowLevel("x", "y") == KpWindowLevel("0", "0"));
+    KpWindowLevel set;
+    set.setCenter(-1.5F);
+    set.setWidth(" 2.5 ");
+    EXPECT_EQ(set.center(), -1.5F);
+    EXPECT_EQ(set.width(), 2.5F);
+}
+
+TEST(WindowLevel, mergingFoldsNeighboursOnly)
+{
+    const Presets one = {{"1", "2"}}, same = {{"1.0", "2"}}, two = {{"1", "2"}, {"3", "4"}};
+    EXPECT_EQ(shown(KpWindowLevel::merge(one, same)), "1/2/ ");
+    EXPECT_EQ(KpWindowLevel::merge(two, two).size(), 4U);
+}
+
+}  // namespace
