@@ -153,7 +153,7 @@ KpResult exportVolume(const std::string& folder, const std::string& uid, const s
     const std::string unfinished = file + ".part";
     if (writeFile(unfinished, head, volume) && std::rename(unfinished.c_str(), file.c_str()) == 0)
         return KpResult();
-    const KpResult failure = badInput("can't write '%s': %s", file.c_str(), std::strerror(errno));
+    KpResult failure = badInput("can't write '%s': %s", file.c_str(), std::strerror(errno));
     std::remove(unfinished.c_str());
     return failure;
 }

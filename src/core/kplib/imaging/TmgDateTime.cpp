@@ -83,7 +83,7 @@ long dateReformatString_default(const std::string& text)
 
 std::string timeReformat(const char* time)
 {
-    const std::string t = time ? time : "";
+    std::string t = time ? time : "";
     if (t.size() < 6 || (t.size() > 6 && t[6] != '.'))
         return t;
     return t.substr(0, 2) + ':' + t.substr(2, 2) + ':' + t.substr(4, 2);

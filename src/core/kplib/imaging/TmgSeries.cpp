@@ -39,7 +39,7 @@ void ImageSeriesHelper::processImage(const std::string& a, const std::string& b)
     create2DImageSet();
     auto image = std::make_unique<ImageInfo>(a, b);
     images_.push_back(image.get());
-    image.release();
+    static_cast<void>(image.release());
 }
 
 bool volumeCachePrecache(KpDArray<KpString>& names, bool flag1, bool flag2)

@@ -98,8 +98,7 @@ bool matchSet(const char* patterns, const char* texts, const char* separators)
 bool addToMultiValueString(KpString& target, const KpString& additions, const char* separators)
 {
     bool isAdded = false;
-    const KpString values(additions);  // may be the target itself
-    KpStringTokenizerGeneral tokens(values, separators);
+    KpStringTokenizerGeneral tokens(additions, separators);
     while (tokens.hasMoreTokens()) {
         const KpString value = tokens.nextToken();
         if (hasValue(target, value, separators))
