@@ -83,6 +83,12 @@
 #include <kplib/net/KpSocket.h>
 #include <kplib/net/KpSocketTools.h>
 #include <kplib/net/TmMsg.h>
+#include <kplib/numerics/KpAlignPointSets.h>
+#include <kplib/numerics/KpDMatrix.h>
+#include <kplib/numerics/KpFitPlane.h>
+#include <kplib/numerics/KpODE2.h>
+#include <kplib/numerics/KpODE3.h>
+#include <kplib/numerics/KpODEBase.h>
 #include <kplib/param/HxParamBase.h>
 #include <kplib/param/HxParamBundle.h>
 #include <kplib/param/HxParamEditCheck.h>
