@@ -218,8 +218,10 @@ void addPlane(const KpDArray<KpVec3f>& surface, KpString& text)
 /// the motion again.
 void addAlignment(const KpDArray<KpVec3f>& surface, KpString& text)
 {
-    KpMat4f motion, found;
-    motion.setTransform(KpVec3f(12, -7, 30), KpRotation(KpVec3f(1, 2, 3), 0.4F), KpVec3f(1, 1, 1));
+    KpMat4f motion, shift, found;
+    motion.setRotate(KpRotation(KpVec3f(1, 2, 3), 0.4F));
+    shift.setTranslate(KpVec3f(12, -7, 30));
+    motion *= shift;
     KpRandom random(20);
     const auto shake = [&random] { return static_cast<float>((random.next() - 0.5) * 0.2); };
     KpDArray<KpVec3f> from, to;

@@ -90,6 +90,12 @@
 #include <kplib/net/KpSocket.h>
 #include <kplib/net/KpSocketTools.h>
 #include <kplib/net/TmMsg.h>
+#include <kplib/numerics/KpAlignPointSets.h>
+#include <kplib/numerics/KpDMatrix.h>
+#include <kplib/numerics/KpFitPlane.h>
+#include <kplib/numerics/KpODE2.h>
+#include <kplib/numerics/KpODE3.h>
+#include <kplib/numerics/KpODEBase.h>
 #include <kplib/numerics/KpPls.h>
 #include <kplib/numerics/KpRandom.h>
 #include <kplib/numerics/KpSimAnnState.h>

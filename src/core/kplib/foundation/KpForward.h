@@ -10,6 +10,8 @@ template <typename T>
 class KpThreadLocalStorage;
 template <typename Lock>
 class KpScopedLockT;
+template <typename T>
+class KpDMatrix;
 template <typename T, T empty>
 class KpID;
 template <typename T>
@@ -80,6 +82,10 @@ class KpVec3i;
 class KpVec3l;
 class KpVec4f;
 class KpVec4i;
+
+class KpFitPlane;
+class KpODE2;
+class KpODE3;
 
 class KpColor;
 class KpPackedIndexing;
