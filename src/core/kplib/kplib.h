@@ -83,6 +83,7 @@
 #include <kplib/net/KpSocket.h>
 #include <kplib/net/KpSocketTools.h>
 #include <kplib/net/TmMsg.h>
+#include <kplib/numerics/KpDelaunay.h>
 #include <kplib/numerics/KpRandom.h>
 #include <kplib/param/HxParamBase.h>
 #include <kplib/param/HxParamBundle.h>

@@ -105,6 +105,7 @@ class KpSocket;
 class KpSocketTools;
 class TmMsg;
 
+class KpDelaunay;
 class KpRandom;
 
 class KpCallable;
