@@ -106,7 +106,7 @@ PointSet<Size> shifted(const float* coordinates, int n)
 template <int Size>
 bool triangulate(const PointSet<Size>& set, const Finder& finder, KpDArray<Simplex<Size>>& result)
 {
-    Mesh<Size> mesh(set.points.data(), set.n, finder);
+    Mesh<Size> mesh(set.points.data(), set.n, set.range, finder);
     for (int i = 0; i < set.n; ++i)
         if (!mesh.insert(i))
             return false;
@@ -118,7 +118,7 @@ template <int Size>
 Finder bestFinder()
 {
     static CircleScan* const scan = best(circleScanPaths<Size>());
-    return {scan, Size == 2 ? 4096 : 16384};
+    return {scan, Size == 2 ? 8192 : 32768};  // where building and keeping the grid begins to pay
 }
 
 template PointSet<2> shifted(const float*, int);

@@ -1,7 +1,6 @@
 #pragma once
 
 #include <kplib/numerics/detail/KpDelaunayGrid.h>
-#include <kplib/numerics/detail/KpDelaunayKernels.h>
 #include <kplib/numerics/detail/KpDelaunayRim.h>
 
 #include <algorithm>
@@ -21,8 +20,9 @@ template <int Size>
 class Mesh {
 public:
     /// Holds the simplex of the last Size + 1 of `points`, whose circle contains whatever is put in. The points have to
-    /// outlive the mesh; it is told how many there will be.
-    Mesh(const Point<Size>* points, int n, const Finder& finder) : points_(points), finder_(finder), expected_(n)
+    /// outlive the mesh; it is told how many there will be, and how far they spread.
+    Mesh(const Point<Size>* points, int n, float range, const Finder& finder) :
+        points_(points), finder_(finder), expected_(n), range_(range)
     {
         reserve(1);
         Simplex<Size> corners;
@@ -67,8 +67,7 @@ private:
         simplices_.resize(needed);
         const long room = simplices_.capacity();
         simplices_.resize(room);
-        for (KpDArray<double>& column : columns_)
-            column.resize(room);
+        circles_.resize(room);
         hits_.resize(room);
         free_.resize(room);
     }
@@ -77,9 +76,7 @@ private:
     {
         const std::int32_t slot = freeCount_ > 0 ? free_[--freeCount_] : used_++;
         simplices_[slot] = simplex;
-        for (int axis = 0; axis < Size; ++axis)
-            columns_[axis][slot] = circle.center[axis];
-        columns_[Size][slot] = circle.squaredRadius;
+        circles_.set(slot, circle);
         if (grid_)
             grid_->insert(slot, circle);
     }
@@ -96,9 +93,7 @@ private:
         }
         free_[freeCount_++] = slot;
         simplices_[slot][0] = -1;
-        columns_[Size][slot] = -1;  // no finite point is in a circle of that size, so the scan needn't ask more
-        for (int axis = 0; axis < Size; ++axis)
-            columns_[axis][slot] = 0;
+        circles_.set(slot, {{}, -1});  // no finite point is in it, so the scan needn't ask for more
         if (grid_)
             grid_->remove(slot);
         return true;
@@ -117,32 +112,25 @@ private:
             std::sort(hits_.begin(), hits_.begin() + found);
             return found;
         }
-        const double* columns[Size + 1];
-        for (int k = 0; k <= Size; ++k)
-            columns[k] = columns_[k].data();
-        return finder_.scan(columns, used_, point.data(), hits_.data());
+        return circles_.scan(finder_.scan, used_, point, hits_.data());
     }
 
     void buildGrid()
     {
-        grid_.emplace(static_cast<long>(expected_) * perPoint);
+        grid_.emplace(static_cast<long>(expected_) * perPoint, range_, finder_.scan);
         for (std::int32_t slot = 0; slot < used_; ++slot)
-            if (isAlive(slot)) {
-                Circle<Size> circle;
-                for (int axis = 0; axis < Size; ++axis)
-                    circle.center[axis] = columns_[axis][slot];
-                circle.squaredRadius = columns_[Size][slot];
-                grid_->insert(slot, circle);
-            }
+            if (isAlive(slot))
+                grid_->insert(slot, circles_[slot]);
     }
 
     const Point<Size>* points_;
     Finder finder_;
     int expected_;
+    float range_;
     std::int32_t used_ = 0;
     long freeCount_ = 0;
-    KpDArray<Simplex<Size>> simplices_;  // a slot each, as the columns
-    KpDArray<double> columns_[Size + 1];
+    KpDArray<Simplex<Size>> simplices_;  // a slot each, as the circles
+    CircleColumns<Size> circles_;
     KpDArray<std::int32_t> free_, hits_;
     CavityRim<Size> rim_;
     std::optional<CircleGrid<Size>> grid_;
