@@ -62,8 +62,9 @@ std::map<std::string, Coordinates> inputs()
     const auto noise = [](int, int) { return std::uniform_real_distribution<double>(-1, 1)(random); };
     const auto scaled = [&](double scale) { return [=](int, int) { return scale * noise(0, 0); }; };
     const auto withOdd = [&](float odd) {
-        Coordinates result = many<Size>(12, noise);
-        result[7 * Size + 1] = odd;
+        Coordinates result = many<Size>(120, noise);
+        for (const int point : {60, 75, 90})  // some of them meet empty slots
+            result[point * Size] = odd;
         return result;
     };
     std::map<std::string, Coordinates> result = {
@@ -175,6 +176,44 @@ void isDelaunay(const Coordinates& c, const KpDArray<Simplex<Size>>& parts)
         ASSERT_LE(count, 2);
 }
 
+/// Asks for the outermost points of each circle, wherever the roundings of its test put them.
+template <int Size>
+void findsTheRimsOfCircles()
+{
+    std::mt19937 random(3);
+    std::uniform_real_distribution<double> places(-1, 1), exponents(-20, 3);
+    CircleGrid<Size> grid(400, 1e6F, circleScanPaths<Size>()[0].run);
+    std::vector<Circle<Size>> circles(1000);
+    for (int i = 0; i < 1000; ++i) {
+        circles[i].squaredRadius = std::pow(10, exponents(random));
+        for (double& x : circles[i].center)  // many end at a border between cells
+            x = i % 4 == 0 ? std::sqrt(circles[i].squaredRadius) : places(random);
+        grid.insert(i, circles[i]);
+    }
+    for (int i = 0; i < 1000; i += 3)
+        grid.remove(i);
+    for (int i = 0; i < 1000; ++i)
+        for (int side = 0; side < 2 * Size; ++side) {
+            Position<Size> point = circles[i].center;
+            double& x = point[side / 2];
+            double inside = x, outside = x + (side % 2 == 0 ? -2 : 2) * std::sqrt(circles[i].squaredRadius);
+            for (int halvings = 0; halvings < 1100; ++halvings) {  // down to neighbours, even beside zero
+                x = (inside + outside) / 2;
+                (contains<Size>(circles[i], point) ? inside : outside) = x;
+            }
+            x = inside;
+            std::int32_t hits[5000];
+            const long found = grid.find(point, 5000, hits);
+            ASSERT_EQ(std::count(hits, hits + found, i) > 0, i % 3 != 0) << i << ' ' << side;
+        }
+}
+
+TEST(KpDelaunay, findsCirclesToTheLastBit)
+{
+    findsTheRimsOfCircles<2>();
+    findsTheRimsOfCircles<3>();
+}
+
 TEST(KpDelaunay, keepsPointsOutOfCircles)
 {
     std::mt19937 random(8);
@@ -220,7 +259,7 @@ TEST(KpDelaunay, shiftsACopyAndRestartsTheSystemsGenerator)
     const auto set = shifted<2>(points.data(), 3);
     EXPECT_EQ(set.range, 8);
     for (int i = 0; i < 6; ++i)
-        EXPECT_NEAR(set.points[i / 2][i % 2], points[i], 4e-8);
+        EXPECT_NEAR(set.points[i / 2][i % 2], points[i], 4e-8 + 6e-8);  // the shift, and its rounding
     EXPECT_NE(set.points[0][0], set.points[0][1]);
     const Point<2> corners[] = {{200, -80}, {-40, 400}, {-40, -80}};
     EXPECT_TRUE(std::equal(corners, corners + 3, &set.points[3]));
@@ -245,6 +284,12 @@ TEST(KpDelaunay, refusesALargeCavity)
     EXPECT_FALSE(KpDelaunay::triangulate2D(reinterpret_cast<KpVec2f*>(fan.data()), 3001, triangles));
     EXPECT_EQ(log.lines(), Lines{"E [] temporary storage exceeded\n"});
     EXPECT_EQ(triangles.size(), 1);
+
+    Coordinates ball = roundAndCenter<3>(9000);
+    KpDArray<KpDelaunay::Tetrahedron> tetrahedra{{1, 2, 3, 4}};
+    EXPECT_FALSE(KpDelaunay::triangulate3D(reinterpret_cast<KpVec3f*>(ball.data()), 9001, tetrahedra));
+    EXPECT_EQ(log.lines().size(), 1);  // this one is not told of
+    EXPECT_EQ(tetrahedra.size(), 1);
 }
 
 template <int Size>

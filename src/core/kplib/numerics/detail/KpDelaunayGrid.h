@@ -143,8 +143,8 @@ private:
         const double cell = x * scale(level);
         if (!(std::abs(cell) < last))
             return false;
-        const auto whole = static_cast<std::int64_t>(cell);
-        hash += static_cast<std::uint64_t>(cell < static_cast<double>(whole) ? whole - 1 : whole) * factors[axis];
+        // Rounded toward zero: the cell around zero is twice as wide, which leaves neighbours neighbours.
+        hash += static_cast<std::uint64_t>(static_cast<std::int64_t>(cell)) * factors[axis];
         return true;
     }
 
