@@ -187,7 +187,7 @@ void findsTheRimsOfCircles()
     for (int i = 0; i < 1000; ++i) {
         circles[i].squaredRadius = std::pow(10, exponents(random));
         for (double& x : circles[i].center)  // many end at a border between cells
-            x = i % 4 == 0 ? std::sqrt(circles[i].squaredRadius) : places(random);
+            x = i % 4 == 0 ? 1 + std::sqrt(circles[i].squaredRadius) : places(random);
         grid.insert(i, circles[i]);
     }
     for (int i = 0; i < 1000; i += 3)

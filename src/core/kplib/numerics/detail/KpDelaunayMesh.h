@@ -68,7 +68,7 @@ private:
         const long room = simplices_.capacity();
         simplices_.resize(room);
         circles_.resize(room);
-        hits_.resize(room);
+        hits_.resize(room + room / worthIt);  // what stands in a cell may be met twice
         free_.resize(room);
     }
 
