@@ -59,7 +59,7 @@ void kpSvd(benchmark::State& state, int rows, const std::string& baseline, doubl
 
 void eigenSolve(benchmark::State& state, int n)
 {
-    const EigenMatrix matrix = noise(n, n), side = noise(n, 1);
+    const EigenMatrix matrix = noise(n, n) + 2 * EigenMatrix::Identity(n, n), side = noise(n, 1);
     for (auto _ : state) {
         Eigen::VectorXf x = matrix.partialPivLu().solve(side);
         benchmark::DoNotOptimize(x.data());
@@ -69,7 +69,7 @@ void eigenSolve(benchmark::State& state, int n)
 
 void kpSolve(benchmark::State& state, int n, const std::string& baseline, double limit)
 {
-    const EigenMatrix matrix = noise(n, n), side = noise(n, 1);
+    const EigenMatrix matrix = noise(n, n) + 2 * EigenMatrix::Identity(n, n), side = noise(n, 1);
     const KpDMatrix<float> a = toKp(matrix);
     std::vector<float> x(static_cast<std::size_t>(n));
     for (auto _ : state) {

@@ -62,12 +62,24 @@ struct Call {
         const int *const i1 = index1.data(), *const i2 = index2.data();
         const float *const w1 = weights1.data(), *const w2 = weights2.data();
         switch (arrays + (isIndexed ? 3 : 0)) {
-        case 0: kpAlignPointSets(result, p1, p2, n(), mode); break;
-        case 1: kpAlignPointSets(result, p1, p2, w1, n(), mode); break;
-        case 2: kpAlignPointSets(result, p1, p2, w1, w2, n(), mode); break;
-        case 3: kpAlignPointSets(result, p1, p2, i1, i2, n(), mode); break;
-        case 4: kpAlignPointSets(result, p1, p2, i1, i2, w1, n(), mode); break;
-        default: kpAlignPointSets(result, p1, p2, i1, i2, w1, w2, n(), mode); break;
+        case 0:
+            kpAlignPointSets(result, p1, p2, n(), mode);
+            break;
+        case 1:
+            kpAlignPointSets(result, p1, p2, w1, n(), mode);
+            break;
+        case 2:
+            kpAlignPointSets(result, p1, p2, w1, w2, n(), mode);
+            break;
+        case 3:
+            kpAlignPointSets(result, p1, p2, i1, i2, n(), mode);
+            break;
+        case 4:
+            kpAlignPointSets(result, p1, p2, i1, i2, w1, n(), mode);
+            break;
+        default:
+            kpAlignPointSets(result, p1, p2, i1, i2, w1, w2, n(), mode);
+            break;
         }
         return result;
     }
@@ -133,7 +145,13 @@ void expectNear(const KpMat4f& result, const Eigen::Matrix4d& expected, double b
 TEST(KpAlignPointSets, equalsAPlainFitWithAnyListsAndWeights)
 {
     for (int trial = 0; trial < 60; ++trial) {
-        Call call{cloud(25, KpVec3f(2, 3, 4)), {}, std::vector<int>(20), std::vector<int>(20), {}, {}, trial % 2 == 1,
+        Call call{cloud(25, KpVec3f(2, 3, 4)),
+                  {},
+                  std::vector<int>(20),
+                  std::vector<int>(20),
+                  {},
+                  {},
+                  trial % 2 == 1,
                   trial / 2 % 3};
         call.points2 = moved(call.points1, someMotion(KpVec3f(1, 1.5F, 0.7F)));
         std::iota(call.index1.begin(), call.index1.end(), 0);
