@@ -65,7 +65,7 @@ TEST(KpODE, samplesTheCircleByItsArcLength)
             ode.setTolerance(1e-4F);
             ode.setHMinMax(1e-4F, 0.5F);
             ode.setHSampling(0.03F);
-            ode.init(KpVec2f(2, 0), 0.05F);
+            ode.init(KpVec2f(2, 0), 5);  // far too long a step
             for (int i = 1; i <= 300; ++i) {
                 KpVec2f point, derivative, second;
                 ASSERT_EQ(ode.next(point, derivative, second), 0);
@@ -79,22 +79,6 @@ TEST(KpODE, samplesTheCircleByItsArcLength)
                 EXPECT_LT((second + radius * (dt * dt / 2)).length(), 0.2F * dt * dt) << i;
             }
         }
-    }
-}
-
-TEST(KpODE, followsTheSpiralAtItsOwnSpeed)
-{
-    KpODE3 ode;
-    ode.setNormalization(0);
-    ode.setTolerance(1e-5F);
-    ode.setHSampling(0.1F);
-    ode.setMethod(KpODE3::RK54);
-    ode.init(KpVec3f(1, 0, 1));
-    KpVec3f point;
-    for (int i = 1; i <= 50; ++i) {
-        ASSERT_EQ(ode.next(point), 0);
-        const float t = 0.1F * static_cast<float>(i);
-        EXPECT_LT((point - KpVec3f(std::cos(t), std::sin(t), std::exp(t / 2))).length(), 0.01F);
     }
 }
 
@@ -148,48 +132,39 @@ int notANumber(const KpVec2f& /*x*/, KpVec2f& derivative, void* /*userData*/)
 
 TEST(KpODE, tellsWhyItEnds)
 {
-    struct Case {
+    using O = KpODE2;
+    constexpr auto circle = O::defaultRightHandSide;
+    const struct {
         const char* what;
-        void (*setUp)(KpODE2&);
+        O::RightHandSide field;
+        int method, checkHMin;
+        float tolerance, hMin, hMax;
         int code, status;
+    } cases[] = {
+        {"no field", nowhere, 2, 0, 0.02F, 0.1F, 10, O::ZeroField, O::ZeroField},
+        {"no such method", circle, 5, 0, 0.02F, 0.1F, 10, O::MethodOutOfRange, O::MethodOutOfRange},
+        {"negative method", circle, -1, 0, 0.02F, 0.1F, 10, O::MethodOutOfRange, O::MethodOutOfRange},
+        {"tolerance out of reach", circle, 2, 0, 0, 0.1F, 10, O::StepTooSmall, O::StepTooSmall},
+        {"no step is good enough", circle, 2, 0, -1, 0, 10, O::StepTooSmall, O::StepTooSmall},
+        {"steps of no length", circle, 2, 0, 0.02F, 0, 0, O::StepTooSmall, O::StepTooSmall},
+        {"short steps unwanted", circle, 2, 1, 0.02F, 0.2F, 0.1F, O::StepTooSmall, O::Success},
+        {"no numbers", notANumber, 2, 0, 0.02F, 0.1F, 10, O::StepTooSmall, O::StepTooSmall},
     };
-    const Case cases[] = {
-        {"no field", [](KpODE2& o) { o.setRightHandSide(nowhere, nullptr); }, KpODE2::ZeroField, KpODE2::ZeroField},
-        {"no such method", [](KpODE2& o) { o.setMethod(5); }, KpODE2::MethodOutOfRange, KpODE2::MethodOutOfRange},
-        {"negative method", [](KpODE2& o) { o.setMethod(-1); }, KpODE2::MethodOutOfRange, KpODE2::MethodOutOfRange},
-        {"tolerance out of reach", [](KpODE2& o) { o.setTolerance(0); }, KpODE2::StepTooSmall, KpODE2::StepTooSmall},
-        {"no step is good enough",
-         [](KpODE2& o) {
-             o.setTolerance(-1);
-             o.setHMinMax(0, 1);
-         },
-         KpODE2::StepTooSmall, KpODE2::StepTooSmall},
-        {"steps of no length", [](KpODE2& o) { o.setHMinMax(0, 0); }, KpODE2::StepTooSmall, KpODE2::StepTooSmall},
-        {"short steps unwanted",
-         [](KpODE2& o) {
-             o.setCheckHMin(1);
-             o.setHMinMax(0.2F, 0.1F);
-         },
-         KpODE2::StepTooSmall, KpODE2::Success},
-        {"no numbers", [](KpODE2& o) { o.setRightHandSide(notANumber, nullptr); }, KpODE2::StepTooSmall,
-         KpODE2::StepTooSmall},
-    };
-    for (const Case& c : cases) {
-        for (const float h0 : {0.0F, 0.5F}) {
-            SCOPED_TRACE(c.what);
-            KpODE2 ode;
-            c.setUp(ode);
-            ode.init(KpVec2f(1, 0), h0);
-            KpVec2f point;
-            int code = 0;
-            for (int i = 0; i < 1000 && code == 0; ++i)
-                code = ode.next(point);
-            EXPECT_EQ(code, c.code);
-            EXPECT_EQ(ode.status(), c.status);
-            ode.setRightHandSide(KpODE2::defaultRightHandSide, nullptr);
-            ode.init(KpVec2f(1, 0));
-            EXPECT_EQ(ode.status(), 0);
-        }
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.what);
+        KpODE2 ode;
+        ode.setRightHandSide(c.field, nullptr);
+        ode.setMethod(c.method);
+        ode.setCheckHMin(c.checkHMin);
+        ode.setTolerance(c.tolerance);
+        ode.setHMinMax(c.hMin, c.hMax);
+        ode.init(KpVec2f(1, 0));
+        KpVec2f point;
+        int code = 0;
+        for (int i = 0; i < 1000 && code == 0; ++i)
+            code = ode.next(point);
+        EXPECT_EQ(code, c.code);
+        EXPECT_EQ(ode.status(), c.status);
     }
 }
 
@@ -203,25 +178,11 @@ TEST(KpODE, derivesTheFirstStep)
     ode.setTolerance(1e9F);
     ode.init(KpVec3f(0, 2, 0), -1);
     EXPECT_FLOAT_EQ(ode.h(), 5);
-    ode.init(KpVec3f(0, 2, 0), 7);
+    ode.init(KpVec3f(0, 0, 4), 7);  // straight up
     EXPECT_FLOAT_EQ(ode.h(), 7);
-}
-
-TEST(KpODE, adaptsItsSteps)
-{
-    KpODE2 ode;  // on a circle of radius 0.1, where a step of 1 is far too long
-    ode.setHMinMax(1e-3F, 10);
-    ode.setTolerance(1e-4F);
-    ode.init(KpVec2f(0.1F, 0), 1);
-    KpVec2f y, f;
-    float used = 0;
-    for (int i = 0; i < 20; ++i) {
-        ASSERT_EQ(ode.nextRK(y, f, used), 0);
-        EXPECT_NEAR(y.length(), 0.1F, 2e-3F);
-        EXPECT_LT(used, 0.1F);
-        EXPECT_LE(ode.h(), 2 * used);
-    }
-    EXPECT_GT(used, 0.01F);  // and not ever smaller
+    KpVec3f point, derivative;
+    EXPECT_EQ(ode.next(point, derivative), 0);
+    EXPECT_LT((derivative - KpVec3f(0, 0, derivative.z())).length(), 1e-6F);
 }
 
 TEST(KpODE, copiesPointToThemselves)
@@ -240,27 +201,21 @@ TEST(KpODE, copiesPointToThemselves)
 TEST(KpODE, walksAsFarAsAChordIsNear)
 {
     int code = 9;
-    struct Case {
+    const struct {
         bool isStraight;
         int minSteps, maxSteps;
         float tolerance;
         int low, high;
+    } cases[] = {
+        {true, 0, 5, 0.1F, 5, 5},    {true, 0, -3, 0.1F, 0, 0},   {true, 0, 50, 0.1F, 6, 10},  // the field ends
+        {false, 7, 50, 1e-6F, 7, 7}, {false, 0, 50, 1e-6F, 0, 0}, {false, 0, 50, -1, 1, 15},
     };
-    const Case cases[] = {
-        {true, 0, 5, 0.1F, 5, 5},    {true, 0, 0, 0.1F, 0, 0},
-        {true, 0, -3, 0.1F, 0, 0},   {true, 0, 50, 0.1F, 15, 20},  // the field ends
-        {false, 0, 50, 1e-6F, 0, 0}, {false, 7, 50, 1e-6F, 7, 7},
-        {false, 0, 50, -1, 1, 15},   {false, 0, 500, 0.1F, 5, 49},
-    };
-    for (const Case& c : cases) {
+    for (const auto& c : cases) {
         KpODE2 ode;
         if (c.isStraight)
             ode.setRightHandSide(half, &code);
         ode.setHSampling(0.1F);
-        ode.setHMinMax(0.01F, 1);
-        ode.init(KpVec2f(1e-4F, 0), 0.1F);
-        if (!c.isStraight)
-            ode.init(KpVec2f(1, 0), 1);
+        ode.init(KpVec2f(1, 0), 0.1F);
         KpVec2f point, derivative;
         const int steps = ode.nextSL(point, derivative, c.minSteps, c.maxSteps, c.tolerance);
         EXPECT_GE(steps, c.low);

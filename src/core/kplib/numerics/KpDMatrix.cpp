@@ -85,7 +85,7 @@ bool KpDMatrix<T>::SVD(KpDMatrix& U, T* w, KpDMatrix& V, int maxIterations) cons
 {
     U = *this;
     V.resize(cols_, cols_);
-    return kplib::detail::SingularValues(U, w, V).run(maxIterations);
+    return kplib::detail::computeSingularValues(U, w, V, maxIterations);
 }
 
 template <typename T>
