@@ -212,10 +212,10 @@ TEST(KpAlignPointSets, appliesTheInitialMatrixToWhateverThereIs)
 
 TEST(KpCompTransform, takesCentredMatrices)
 {
-    const float rows[][3] = {{1, 0, 0}, {0, 2, 0}, {0, 0, 3}, {-1, -2, -3}};
+    const float rows[] = {1, 0, 0, 0, 2, 0, 0, 0, 3, -1, -2, -3};
     KpDMatrix<float> a(4, 3), b(4, 3);
-    std::copy_n(rows[0], 12, a.data());
-    std::transform(rows[0], rows[0] + 12, b.data(), [](float v) { return 2 * v; });
+    std::copy_n(rows, 12, a.data());
+    std::transform(rows, rows + 12, b.data(), [](float v) { return 2 * v; });
     const KpMat4f expected(2, 0, 0, 0, 0, 2, 0, 0, 0, 0, 2, 0, 4 - 2, 5 - 4, 6 - 6, 1);
     KpMat4f scaled, affine;
     kpCompRigidTransform(a, b, KpVec3f(1, 2, 3), KpVec3f(4, 5, 6), scaled, true);
