@@ -20,9 +20,14 @@ template <int Fixed>
 class SingularValues {
 public:
     SingularValues(KpDMatrix<float>& u, float* w, KpDMatrix<float>& v) :
-        u_(u.data()), w_(w), v_(v.data()), m_(u.rows()), n_(u.cols()), super_(1, n_), rv_(super_.data())
+        u_(u.data()), w_(w), v_(v.data()), m_(u.rows()), n_(u.cols())
     {
+        if (n_ > small)
+            large_.resize(1, n_);
+        rv_ = n_ > small ? large_.data() : small_;
     }
+    SingularValues(const SingularValues&) = delete;
+    SingularValues& operator=(const SingularValues&) = delete;
 
     bool run(int maxIterations)
     {
@@ -37,6 +42,8 @@ public:
     }
 
 private:
+    static constexpr int small = 8;  // so many columns need no memory from the heap
+
     int m() const { return Fixed ? Fixed : m_; }
     int n() const { return Fixed ? Fixed : n_; }
     float* u(int row) const { return u_ + static_cast<std::ptrdiff_t>(row) * n(); }
@@ -73,6 +80,13 @@ private:
         w_[i] = 0;
         if (scale == 0)
             return;
+        if (i + 1 == m()) {  // the reflector of one element changes a sign: the same to the bit, and no root
+            for (int j = i + 1; j < n(); ++j)
+                u(i)[j] = -u(i)[j];
+            w_[i] = -u(i)[i];
+            u(i)[i] *= 2;
+            return;
+        }
         for (int k = i; k < m(); ++k) {
             u(k)[i] /= scale;
             squares += u(k)[i] * u(k)[i];
@@ -104,6 +118,13 @@ private:
             scale += std::abs(row[k]);
         if (scale == 0)
             return;
+        if (l + 1 == n()) {
+            for (int j = l; j < m(); ++j)
+                u(j)[l] = -u(j)[l];
+            rv_[l] = -row[l];
+            row[l] *= 2;
+            return;
+        }
         for (int k = l; k < n(); ++k) {
             row[k] /= scale;
             squares += row[k] * row[k];
@@ -150,7 +171,8 @@ private:
     {
         for (int i = std::min(m(), n()) - 1; i >= 0; --i) {
             const float inverse = w_[i] == 0 ? 0 : 1 / w_[i];
-            std::fill(u(i) + i + 1, u(i) + n(), 0.0F);
+            for (int j = i + 1; j < n(); ++j)
+                u(i)[j] = 0;
             for (int j = i + 1; j < n() && inverse != 0; ++j) {
                 float sum = 0;
                 for (int k = i + 1; k < m(); ++k)
@@ -232,9 +254,8 @@ private:
         const auto turn = [&c, &s](float a, float b) {
             const float norm = pythag(a, b);
             if (norm != 0) {
-                const float inverse = 1 / norm;
-                c = a * inverse;
-                s = b * inverse;
+                c = a / norm;
+                s = b / norm;
             }
             return norm;
         };
@@ -262,8 +283,9 @@ private:
     float* v_;
     int m_, n_;
     float norm_ = 0;
-    KpDMatrix<float> super_;  // one row: the superdiagonal, element i above w[i]
-    float* rv_;
+    float small_[small];
+    KpDMatrix<float> large_;
+    float* rv_;  // the superdiagonal in one of them, element i above w[i]
 };
 
 }  // namespace
