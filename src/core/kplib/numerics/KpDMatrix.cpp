@@ -17,6 +17,8 @@ KpDMatrix<T>::~KpDMatrix()
 template <typename T>
 KpDMatrix<T>& KpDMatrix<T>::operator=(const KpDMatrix& other)
 {
+    if (this == &other)
+        return *this;
     resize(other.rows_, other.cols_);
     std::copy_n(other.data_, place(rows_), data_);
     return *this;
