@@ -1,11 +1,13 @@
 #include "net/Servers.h"
 #include "support/LogCapture.h"
+#include "support/TempFolder.h"
 
 #include <kplib/net/KpSocket.h>
 #include <kplib/net/KpSocketTools.h>
 
 #include <algorithm>
 #include <cerrno>
+#include <csignal>
 #include <cstring>
 #include <gtest/gtest.h>
 #include <vector>
