@@ -154,7 +154,7 @@ TEST(KpSocket, receivesAsManyBytesAsAskedForOrALine)
         {"all", 6, 0, 6, "abc\nde..", ""},
         {"too few", 7, 0, 0, "abc\nde..", ""},
         {"nothing", 0, 0, 0, "........", "abc\nde"},
-        {"a line that just fits", 4, 1, 4, "abc\n0...", "de"},
+        {"a line", 7, 1, 4, "abc\n0...", "de"},
         {"a longer line", 3, 1, 3, "abc0....", "\nde"},
         {"no room", 1, 1, 0, "........", "abc\nde"},
     };
