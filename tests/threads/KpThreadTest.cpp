@@ -34,11 +34,11 @@ void namesAndMainThread()
     _exit(good ? 7 : 1);
 }
 
-void sleepsLong()
+void sleepTooLong(void (*sleep)())
 {
     std::signal(SIGALRM, [](int) { _exit(7); });
     ualarm(50'000, 0);
-    KpThread::usleep(1ul << 32);
+    sleep();
     _exit(1);
 }
 
@@ -97,7 +97,8 @@ TEST(KpThreadThreads, numbersObjectsAndTakesTheFirstToAskForTheMainThread)
 TEST(KpThreadThreads, sleepsItsTimeThroughSignals)
 {
     testing::FLAGS_gtest_death_test_style = "threadsafe";
-    EXPECT_EXIT(sleepsLong(), testing::ExitedWithCode(7), "");
+    EXPECT_EXIT(sleepTooLong([] { KpThread::usleep(1ul << 32); }), testing::ExitedWithCode(7), "");
+    EXPECT_EXIT(sleepTooLong([] { KpThread::sleep(ULONG_MAX); }), testing::ExitedWithCode(7), "");
     std::signal(SIGALRM, [](int) {});
     ualarm(1000, 1000);
     const auto begin = std::chrono::steady_clock::now();
