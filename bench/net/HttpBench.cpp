@@ -1,4 +1,5 @@
-#include <net/Servers.h>
+#include "Nginx.h"
+
 #include <support/Bench.h>
 
 #include <kplib/net/KpHttpGet.h>
@@ -13,7 +14,7 @@
 
 namespace {
 
-using kplib::test::Nginx;
+using kplib::bench::Nginx;
 
 const Nginx& nginx()
 {
