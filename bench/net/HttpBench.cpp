@@ -1,5 +1,4 @@
-#include "Nginx.h"
-
+#include <net/Nginx.h>
 #include <support/Bench.h>
 
 #include <kplib/net/KpHttpGet.h>
@@ -14,7 +13,7 @@
 
 namespace {
 
-using kplib::bench::Nginx;
+using kplib::test::Nginx;
 
 const Nginx& nginx()
 {

@@ -1,3 +1,4 @@
+#include "net/Nginx.h"
 #include "net/Servers.h"
 #include "support/TempFolder.h"
 
@@ -153,6 +154,32 @@ int __wrap_pthread_mutex_unlock(pthread_mutex_t* mutex)
         usleep(100);
     return result;
 }
+}
+
+TEST(KpHttpGet, readsRangesFromNginx)
+{
+    if (!kplib::test::Nginx::isInstalled())
+        GTEST_SKIP() << "nginx is not installed";
+    const kplib::test::Nginx nginx;
+    ASSERT_TRUE(nginx.isRunning);
+    KpHttpGet get;
+    std::vector<char> buffer(1 << 20);
+    for (const long spot : nginx.spots) {
+        const auto first = static_cast<unsigned long>(spot);
+        const long wanted = std::min(nginx.size - spot, static_cast<long>(buffer.size()));
+        ASSERT_TRUE(get.request(nginx.url().c_str(), first, first + buffer.size() - 1));
+        EXPECT_EQ(get.read(buffer.data(), ULONG_MAX), wanted);
+        EXPECT_EQ(get.status(), 206);
+        EXPECT_EQ(std::memcmp(buffer.data(), &spot, sizeof(spot)), 0);
+    }
+    ASSERT_TRUE(get.request(nginx.url().c_str()));
+    while (get.read(buffer.data(), buffer.size()) > 0) {
+    }
+    EXPECT_EQ(get.bytesRead(), nginx.size);
+    EXPECT_TRUE(get.request(nginx.url().c_str(), nginx.size, nginx.size + 1) && get.contentLength() > 0);
+    EXPECT_EQ(get.status(), 416);
+    EXPECT_TRUE(get.request(nginx.url("nothing").c_str()) && get.contentLength() > 0);
+    EXPECT_EQ(get.status(), 404);
 }
 
 TEST(KpHttpGetThreads, cancelEndsAReadThatWaitsAndMixesNoResponses)

@@ -6,22 +6,26 @@
 #include <kplib/net/KpSocket.h>
 
 #include <csignal>
+#include <filesystem>
+#include <fstream>
 #include <string>
 #include <sys/prctl.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
-namespace kplib::bench {
+namespace kplib::test {
 
-using kplib::test::Listener;
-using kplib::test::TempFolder;
-
-/// nginx on a free port, with a sparse file "volume" of 256 MiB.
+/// nginx on a free port, with a sparse file "volume" of 256 MiB that holds its own offset at each spot.
 class Nginx {
 public:
     Nginx()
     {
-        std::filesystem::resize_file(folder_.file("volume", ""), 256 << 20);
+        const std::string volume = folder_.file("volume", "");
+        std::filesystem::resize_file(volume, size);
+        std::fstream file(volume, std::ios::in | std::ios::out | std::ios::binary);
+        for (const long spot : spots)
+            file.seekp(spot).write(reinterpret_cast<const char*>(&spot), sizeof spot);
+        file.close();
         std::string conf = geteuid() == 0 ? "user root;" : "";  // the folder is this user's alone
         conf += "daemon off; worker_processes 1; pid pid; events {} http { access_log off; sendfile on; "
                 "keepalive_requests 100000000; server { root .; listen 127.0.0.1:" +
@@ -45,8 +49,14 @@ public:
         if (isRunning && kill(process_, SIGTERM) == 0)
             waitpid(process_, nullptr, 0);
     }
-    std::string url() const { return "http://127.0.0.1:" + std::to_string(port) + "/volume"; }
+    static bool isInstalled() { return access(program, X_OK) == 0; }
+    std::string url(const char* name = "volume") const
+    {
+        return "http://127.0.0.1:" + std::to_string(port) + '/' + name;
+    }
 
+    static constexpr long size = 256L << 20;
+    static constexpr long spots[] = {0, 4097, (200L << 20) + 3, size - 100};
     const int port = Listener().port;
     bool isRunning = false;
 
@@ -57,4 +67,4 @@ private:
     pid_t process_ = -1;
 };
 
-}  // namespace kplib::bench
+}  // namespace kplib::test
