@@ -22,17 +22,6 @@ const struct {
     {"G0018-5100", "patient position"}, {"G0028-0004", "photometric type"}, {"G0002-0010", "transfer syntax"},
 };
 
-KpResult writeText(const KpString& text, const OutputFolder& out, const char* name)
-{
-    FILE* const file = std::fopen(out.pathOf(name).c_str(), "wb");
-    const auto length = static_cast<unsigned long>(text.length());
-    const bool isWritten = file && KpRawData::fwrite(const_cast<char*>(text.c_str()), 1, length, file) == length;
-    const bool isClosed = file && std::fclose(file) == 0;
-    if (!isWritten || !isClosed)
-        return badInput("can't write %s: %s", name, std::strerror(errno));
-    return KpResult();
-}
-
 void addSafeTags(const HxParamBundle& root, KpString& text)
 {
     for (const auto& [tag, name] : safeTags) {
@@ -101,6 +90,17 @@ void addInstances(const HxParamBundle& root, KpString& text)
 }
 
 }  // namespace
+
+KpResult writeText(const KpString& text, const OutputFolder& out, const char* name)
+{
+    FILE* const file = std::fopen(out.pathOf(name).c_str(), "wb");
+    const auto length = static_cast<unsigned long>(text.length());
+    const bool isWritten = file && KpRawData::fwrite(const_cast<char*>(text.c_str()), 1, length, file) == length;
+    const bool isClosed = file && std::fclose(file) == 0;
+    if (!isWritten || !isClosed)
+        return badInput("can't write %s: %s", name, std::strerror(errno));
+    return KpResult();
+}
 
 KpResult writeHeader(const HxParamBundle& root, const OutputFolder& out)
 {

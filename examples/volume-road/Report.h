@@ -11,6 +11,8 @@ struct Stage {
     double seconds;
 };
 
+KpResult writeText(const KpString& text, const OutputFolder& out, const char* name);
+
 /// Writes header.txt: the whole tree in its text form, with the index of private creators.
 KpResult writeHeader(const HxParamBundle& root, const OutputFolder& out);
 

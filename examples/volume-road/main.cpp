@@ -2,6 +2,7 @@
 
 #include "DicomTree.h"
 #include "DicomWriter.h"
+#include "Measure.h"
 #include "NiftiVolume.h"
 #include "OutputFolder.h"
 #include "PeerRoad.h"
@@ -112,6 +113,11 @@ int run(int argc, char** argv)
         ->excludes(remote);
     road.add_option("OUT", target, "folder to write into");
 
+    CLI::App& measuring = *app.add_subcommand("measure", "measure the largest region of a series");
+    addSeries(measuring);
+    addThreshold(measuring);
+    measuring.add_option("OUT", target, "folder to write into")->required();
+
     CLI::App& exporting = *app.add_subcommand("export", "write a series as one raw file, for a server to give out");
     addSeries(exporting);
     exporting.add_option("FILE", file, "the file to write")->required();
@@ -155,6 +161,8 @@ int run(int argc, char** argv)
         return report(serveRoad(port, target));
     if (sending)
         return report(sendRoad(job, host, port, target, progress));
+    if (measuring)
+        return report(measureRoad(job, target, progress));
     if (exporting)
         return report(exportVolume(job.folder, job.uid, file, progress));
     return report(runRoad(job, target, progress));

@@ -10,6 +10,8 @@ template <typename T>
 class KpThreadLocalStorage;
 template <typename Lock>
 class KpScopedLockT;
+template <typename T>
+class KpDMatrix;
 template <typename T, T empty>
 class KpID;
 template <typename T>
@@ -81,6 +83,10 @@ class KpVec3l;
 class KpVec4f;
 class KpVec4i;
 
+class KpFitPlane;
+class KpODE2;
+class KpODE3;
+
 class KpColor;
 class KpPackedIndexing;
 class KpRawData;
@@ -100,10 +106,28 @@ class KpMorphology;
 class KpNeighborIterator33;
 class KpScanConvert;
 
+class AbstractEllipse2D;
+class AbstractShape2D;
+class Angle2D;
+class Circle2D;
+class CurvedShape2D;
+class Ellipse2D;
+class KpLine2D;
+class Polygon2D;
+class Polyline2D;
+class Rectangle2D;
+class Shape2D;
+
 class KpHttpGet;
 class KpSocket;
 class KpSocketTools;
 class TmMsg;
+
+class KpPls;
+class KpRandom;
+class KpSimAnnState;
+class KpSimulatedAnnealer;
+class KpStatistics;
 
 class KpCallable;
 class KpProgressGuiInterface;

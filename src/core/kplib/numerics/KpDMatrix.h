@@ -1,0 +1,81 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+#include <cstddef>
+
+/// A dense matrix of any size, row by row, with the linear algebra that the 3x3 and 4x4 types cannot do. float is the
+/// one element type there is.
+///
+/// Each matrix owns its block: copies are deep. An empty one has no block. Exhausted memory is a KpMemoryException
+/// where nothing else is said, and the matrix is as before. No shared state; one thread at a time.
+template <typename T>
+class KpDMatrix {
+public:
+    using value_type = T;
+
+    KpDMatrix() noexcept = default;
+    /// The elements are not set to anything.
+    KpDMatrix(int rows, int cols) { resize(rows, cols); }
+    KpDMatrix(const KpDMatrix& other) { *this = other; }
+    KpDMatrix(KpDMatrix&& other) noexcept { swap(other); }
+    ~KpDMatrix();
+
+    KpDMatrix& operator=(const KpDMatrix& other);
+    KpDMatrix& operator=(KpDMatrix&& other) noexcept
+    {
+        KpDMatrix(static_cast<KpDMatrix&&>(other)).swap(*this);
+        return *this;
+    }
+    void swap(KpDMatrix& other) noexcept;
+
+    /// Nothing if the shape is this one. Else the elements keep their places in memory, not their rows and columns,
+    /// and new ones are not set to anything. Negative counts are not allowed.
+    void resize(int rows, int cols);
+
+    int rows() const noexcept { return rows_; }
+    int cols() const noexcept { return cols_; }
+    /// Element [i][j] is at i * cols() + j; null for an empty matrix.
+    T* data() noexcept { return data_; }
+    const T* data() const noexcept { return data_; }
+    /// The elements of a row; m[row][column], not checked.
+    T* operator[](int row) noexcept { return data_ + place(row); }
+    const T* operator[](int row) const noexcept { return data_ + place(row); }
+
+    /// Exchanges rows and columns, by way of a new block.
+    void transpose();
+
+    /// The product this * other, each element summed from the first column on in the width of T. Shapes that don't fit:
+    /// one error in the log, and this stays.
+    KpDMatrix& operator*=(const KpDMatrix& other);
+
+    /// The singular values of this m by n matrix A: A = U diag(w) transpose(V), with U m by n and V n by n, whose
+    /// columns are orthonormal (those of U that belong to a row that A doesn't have are 0). `w`: place for n values,
+    /// none negative, in no order. False, with one warning in the log and the three left as they stand, if a value
+    /// hasn't converged when its `maxIterations`-th iteration begins; 30 is plenty. U and V are neither this nor
+    /// each other. O(m n^2). Golub and Reinsch, "Singular value decomposition and least squares solutions",
+    /// Numerische Mathematik 14, 1970.
+    bool SVD(KpDMatrix& U, T* w, KpDMatrix& V, int maxIterations) const;
+
+    /// Solves A x = b for each of the `count` sides `rhs`, of n elements each, in place; A is this n by n matrix and
+    /// stays. 0 on success. 1, with a warning or errors in the log and the sides untouched, for a matrix that isn't
+    /// square, is singular, or for exhausted memory. Solutions are refined until the residual is 1e-5 of the side; one
+    /// that stays above 1e-4 is kept, with a warning. O(n^3).
+    int solveLRdecomp(T** rhs, int count) const;
+    /// The same with room from the caller: `lr` are n rows of n elements and receive the factors, with rows exchanged;
+    /// `sign` is 1 or -1 for an even or odd number of exchanges. Gaussian elimination with partial pivoting and
+    /// iterative refinement: Golub and Van Loan, "Matrix Computations", 3.4 and 3.5.
+    int solveLRdecomp(T** lr, T** rhs, int count, T& sign) const;
+
+    /// sqrt(a * a + b * b) without overflow on the way, the root in double precision.
+    static T pythag(T a, T b);
+
+private:
+    std::size_t place(int row) const { return static_cast<std::size_t>(row) * static_cast<std::size_t>(cols_); }
+
+    int rows_ = 0;
+    int cols_ = 0;
+    T* data_ = nullptr;
+};
+
+extern template class KPLIB_API KpDMatrix<float>;

@@ -1,0 +1,150 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+/// What the integrators of curves in a vector field share, KpODE2 in the plane and KpODE3 in space: streamlines.
+///
+/// An embedded Runge-Kutta method goes along the field in steps that fit the error; the curve is handed out at equal
+/// spacing of its parameter, from the cubic Hermite segment of each step. The parameter is arc length, unless
+/// setNormalization(0) leaves the field its own speed. Set up, init(), then next() or nextSL() until they give another
+/// code than 0. Nothing is logged, nothing allocated. One thread at a time; the field is called on it.
+template <typename Vector>
+class KPLIB_API KpODEBase {
+public:
+    using value_type = Vector;
+
+    /// The field at `x`. 0, or any other code where there is no field: the integration then stops with this code.
+    using RightHandSide = int (*)(const Vector& x, Vector& derivative, void* userData);
+
+    enum Method : int {
+        RK21,  ///< explicit midpoint, second order, against Euler
+        RK32,  ///< Bogacki and Shampine, 3(2)
+        RK43,  ///< classic fourth order, with a third-order check
+        RK54,  ///< Dormand and Prince, 5(4)
+        RKCK,  ///< Cash and Karp, 5(4)
+    };
+    /// By method: a step changes by a ratio of errors to this power.
+    static const float exponent[5];
+
+    /// What next() and the like return; other codes are those of the right-hand side.
+    enum Code : int {
+        Success = 0,
+        Frozen = 1,
+        ZeroField = 2,
+        StepTooSmall = 3,
+        MethodOutOfRange = 5,
+    };
+
+    KpODEBase() { state_.userData = this; }
+    /// User data that is the object itself becomes the copy.
+    KpODEBase(const KpODEBase& other) { *this = other; }
+    KpODEBase& operator=(const KpODEBase& other);
+    ~KpODEBase() = default;
+
+    void setMethod(int method) { state_.method = method; }
+    /// `min`: rejected steps below it end the integration. `max` bounds all steps but the first.
+    void setHMinMax(float min, float max);
+    /// Distance between samples along the parameter.
+    void setHSampling(float hSampling) { state_.hSampling = hSampling; }
+    /// The largest accepted error of a step.
+    void setTolerance(float tolerance) { state_.tolerance = tolerance; }
+    /// A factor on the field; -1 goes backward.
+    void setOrientation(float orientation) { state_.orientation = orientation; }
+    /// If not 0, the field counts with a length of `orientation` everywhere.
+    void setNormalization(int normalization) { state_.normalization = normalization; }
+    /// If not 0, next() ends as soon as a step was below the smallest allowed one.
+    void setCheckHMin(int checkHMin) { state_.checkHMin = checkHMin; }
+    /// `userData` is passed to each call of `field`; it is the object itself until this is called.
+    void setRightHandSide(RightHandSide field, void* userData);
+    /// A circular field: (-y, x), and z / 2 in space.
+    static int defaultRightHandSide(const Vector& x, Vector& derivative, void* userData);
+
+    /// Starts a curve, with a first step of `h0`; if that isn't above 0, with one derived from the tolerance.
+    void init(const Vector& start, float h0 = 0);
+
+    /// The next sample, with its derivatives by the parameter of its own segment, which runs from 0 to 1. Gives
+    /// status(), or StepTooSmall of setCheckHMin(). When the integration has ended, the samples stay at the end of the
+    /// curve, or with `flag` go on along the last cubic. Ends with StepTooSmall, too, where a step no longer advances
+    /// the parameter.
+    int next(Vector& point, int flag = 0);
+    int next(Vector& point, Vector& derivative, int flag = 0);
+    int next(Vector& point, Vector& derivative, Vector& secondDerivative, int flag = 0);
+
+    /// One accepted step at its own size: the new point, the field there, and the size. On another code than 0 the
+    /// three are untouched.
+    int nextRK(Vector& y, Vector& f, float& hUsed);
+
+    // One attempt at a step of h() from the current point: the new point, the field there, and the estimated error.
+    // Another code than 0, and all three untouched, if the field fails.
+
+    int rk21(Vector& y, Vector& f, Vector& error) const;
+    /// Bogacki and Shampine, "A 3(2) pair of Runge-Kutta formulas", Applied Mathematics Letters 2(4), 1989.
+    int rk32(Vector& y, Vector& f, Vector& error) const;
+    int rk43(Vector& y, Vector& f, Vector& error) const;
+    /// Dormand and Prince, "A family of embedded Runge-Kutta formulae", Journal of Computational and Applied
+    /// Mathematics 6(1), 1980.
+    int rk54(Vector& y, Vector& f, Vector& error) const;
+    /// Cash and Karp, "A variable order Runge-Kutta method for initial value problems with rapidly varying right-hand
+    /// sides", ACM Transactions on Mathematical Software 16(3), 1990.
+    int rkck(Vector& y, Vector& f, Vector& error) const;
+
+    /// Samples on while the chord stays within `tolerance` of the curve (at or below 0: within a tenth of the sampling
+    /// distance), but at least `minSteps` and at most `maxSteps`: streamlines of few vertices. Gives the index of the
+    /// sample that it stopped at, `maxSteps` if it went through, and 0 for none.
+    int nextSL(Vector& point, Vector& derivative, int minSteps, int maxSteps, float tolerance);
+
+    /// Stops at `point`, a boundary for instance: the current point, with the status Frozen.
+    void freeze(const Vector& point);
+
+    float h() const { return state_.h; }
+    float hMin() const { return state_.hMin; }
+    float hMax() const { return state_.hMax; }
+    float hSampling() const { return state_.hSampling; }
+    float tolerance() const { return state_.tolerance; }
+    float orientation() const { return state_.orientation; }
+    int checkHMin() const { return state_.checkHMin; }
+    /// 0 while the integration runs, else the code that it ended with.
+    int status() const { return state_.status; }
+    int normalization() const { return state_.normalization; }
+    int method() const { return state_.method; }
+    void* userData() const { return state_.userData; }
+    RightHandSide rightHandSide() const { return state_.rightHandSide; }
+
+private:
+    struct State {
+        float h = 1;
+        float hMin = 0.1F;
+        float hMax = 10;
+        float hSampling = 1;
+        float tolerance = 0.02F;
+        float orientation = 1;
+        int checkHMin = 0;
+        int status = 0;
+        int normalization = 1;
+        int method = RK43;
+        void* userData = nullptr;
+        float segmentStart = 0, segmentEnd = 0, sample = 0;
+        Vector lastPoint{}, lastDerivative{};
+        Vector currentPoint{}, currentDerivative{};
+        // A value and its forward differences: of the point, and of its first and second derivative.
+        Vector points[4]{}, derivatives[3]{}, secondDerivatives[2]{};
+        RightHandSide rightHandSide = defaultRightHandSide;
+    };
+
+    template <typename Tableau>
+    int attemptWith(Vector& y, Vector& f, Vector& error) const;
+    int attempt(Vector& y, Vector& f, Vector& error) const;
+    int attemptWithSmallerSteps(Vector& y, Vector& f, Vector& error);
+    bool isMethod() const { return state_.method >= RK21 && state_.method <= RKCK; }
+    double stepFactor(float error) const;
+
+    int evaluate(const Vector& x, Vector& derivative) const;
+    bool orient(Vector& derivative) const;
+
+    int advanceToSample();
+    int nextSegment();
+    void setCubic();
+    void advanceDifferences();
+
+    State state_;
+};

@@ -1,0 +1,38 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+/// The state of a search that KpSimulatedAnnealer improves: proposes changes of itself and commits them.
+class KPLIB_API KpSimAnnState {
+public:
+    /// Proposes a change, at random; gives by how much it would change the energy.
+    float suggestChange()
+    {
+        changePending_ = true;
+        return doSuggestChange();
+    }
+    /// Makes the change that was proposed last.
+    void executeChange()
+    {
+        changePending_ = false;
+        doExecuteChange();
+    }
+    /// The energy, which the search wants low.
+    float evaluate() { return doEvaluate(); }
+
+    /// Whether the last proposal has not been made.
+    bool isChangePending() const { return changePending_; }
+
+protected:
+    KpSimAnnState() = default;
+    KpSimAnnState(const KpSimAnnState&) = default;
+    KpSimAnnState& operator=(const KpSimAnnState&) = default;
+    ~KpSimAnnState() = default;  // states are not deleted through this class
+
+    virtual float doSuggestChange() = 0;
+    virtual void doExecuteChange() = 0;
+    virtual float doEvaluate() = 0;
+
+private:
+    bool changePending_ = false;
+};

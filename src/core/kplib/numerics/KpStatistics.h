@@ -1,0 +1,28 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+
+/// Student's t-test and the special functions under it, after W. H. Press et al., "Numerical Recipes", 2nd edition, 6.1
+/// and 6.4. Results are good to single precision. Pure functions.
+class KPLIB_API KpStatistics {
+public:
+    KpStatistics() = delete;
+
+    /// The natural logarithm of the gamma function for `x` above 0. C. Lanczos, "A precision approximation of the gamma
+    /// function", 1964.
+    static float gammln(float x);
+
+    /// The continued fraction of the incomplete beta function, by Lentz's method. If 100 rounds are too few, the log
+    /// says so, and what is reached by then is given.
+    static float betacf(float a, float b, float x);
+
+    /// The regularised incomplete beta function; 0 for an `x` outside 0 to 1.
+    static float betai(float a, float b, float x);
+
+    /// The probability that Student's t with `dof` degrees of freedom lies between -`t` and `t`.
+    static float integratedStudentDistribution(float t, float dof);
+
+    /// The two-sided significance of the difference of two means: how probable it is that samples of these sizes and
+    /// standard deviations differ at least as much by chance. Their variances are pooled.
+    static float tTest(int n1, float mean1, float deviation1, int n2, float mean2, float deviation2);
+};

@@ -1,0 +1,55 @@
+#pragma once
+
+#include <kplib/foundation/KpExport.h>
+#include <kplib/geometry/KpVec2f.h>
+
+#include <vector>
+
+/// A line in the plane, or the segment between two points: a position and a direction that keeps its length.
+///
+/// A plain value. An empty line has no direction (or a NaN in it); what would need one then refers to the position.
+class KPLIB_API KpLine2D {
+public:
+    /// Empty: four zeros.
+    constexpr KpLine2D() = default;
+    /// From `p0` to `p1`.
+    KpLine2D(const KpVec2f& p0, const KpVec2f& p1) { setValue(p0, p1); }
+
+    void makeEmpty() { *this = KpLine2D(); }
+    void setValue(const KpVec2f& p0, const KpVec2f& p1) { setPosDir(p0, p1 - p0); }
+    void setPosDir(const KpVec2f& position, const KpVec2f& direction)
+    {
+        position_ = position;
+        direction_ = direction;
+    }
+
+    const KpVec2f& position() const { return position_; }
+    const KpVec2f& direction() const { return direction_; }
+    /// Both ends of the segment.
+    std::vector<KpVec2f> getCoordinates() const { return {position_, position_ + direction_}; }
+
+    /// Whether a number is NaN or the direction is exactly zero.
+    bool isEmpty() const;
+    bool isNotEmpty() const { return !isEmpty(); }
+
+    /// Distance of `p` from the line, which goes on at both ends: above 0 to the left of the direction (y upward). From
+    /// a line without direction it is never negative.
+    float getDistanceTo(const KpVec2f& p) const;
+    float getDistance2To(const KpVec2f& p) const;  ///< its square
+
+    /// The point of the line, or of the segment alone, next to `p`.
+    KpVec2f getClosestPoint(const KpVec2f& p, bool clampToSegment) const;
+
+    /// Moves the line sideways, to the left of its direction (y upward).
+    void translate(float distance);
+
+    /// Whether the lines meet, and where, into `out` if it isn't null. Parallel lines and empty ones never do. With
+    /// `segmentsOnly` the point has to lie in both segments, ends included.
+    bool intersects(const KpLine2D& other, bool segmentsOnly, KpVec2f* out) const;
+    bool intersects(const KpLine2D& other, KpVec2f* out) const { return intersects(other, false, out); }
+    bool intersectsSegments(const KpLine2D& other, KpVec2f* out) const { return intersects(other, true, out); }
+
+private:
+    KpVec2f position_{0, 0};
+    KpVec2f direction_{0, 0};
+};

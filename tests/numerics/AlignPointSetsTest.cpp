@@ -1,0 +1,251 @@
+#include <kplib/numerics/KpAlignPointSets.h>
+
+#include <kplib/geometry/KpMat4f.h>
+#include <kplib/geometry/KpRotation.h>
+#include <kplib/numerics/KpDMatrix.h>
+
+#include <Eigen/Dense>
+#include <gtest/gtest.h>
+
+#include <numeric>
+#include <random>
+#include <vector>
+
+namespace {
+
+using Points = std::vector<KpVec3f>;
+using Eigen::Matrix3d, Eigen::MatrixXd, Eigen::RowVector3d, Eigen::VectorXd;
+
+std::mt19937 engine(1);
+
+float number(float low, float high)
+{
+    return std::uniform_real_distribution<float>(low, high)(engine);
+}
+
+Points cloud(int n, const KpVec3f& extent)
+{
+    Points points(static_cast<std::size_t>(n));
+    for (KpVec3f& p : points)
+        p = KpVec3f(number(-1, 1), number(-1, 1), number(-1, 1)) * extent + KpVec3f(1, -2, 3);
+    return points;
+}
+
+KpMat4f someMotion(const KpVec3f& scale)
+{
+    KpMat4f motion;
+    motion.setTransform(KpVec3f(number(-9, 9), 4, -5), KpRotation(number(-1, 1), number(-1, 1), number(-1, 1), 0.5F),
+                        scale, KpRotation(0.1F, 0.2F, 0.3F, 1));
+    return motion;
+}
+
+Points moved(const Points& points, const KpMat4f& motion)
+{
+    Points result(points.size());
+    motion.multVecMatrix(points, result.data());
+    return result;
+}
+
+/// The pairs of one call, and which overload takes them.
+struct Call {
+    Points points1, points2;
+    std::vector<int> index1, index2;
+    std::vector<float> weights1, weights2;
+    bool isIndexed;
+    int arrays;  // of weights
+
+    int n() const { return static_cast<int>(index1.size()); }
+    KpMat4f align(int mode) const
+    {
+        KpMat4f result;
+        const KpVec3f *const p1 = points1.data(), *const p2 = points2.data();
+        const int *const i1 = index1.data(), *const i2 = index2.data();
+        const float *const w1 = weights1.data(), *const w2 = weights2.data();
+        switch (arrays + (isIndexed ? 3 : 0)) {
+        case 0: kpAlignPointSets(result, p1, p2, n(), mode); break;
+        case 1: kpAlignPointSets(result, p1, p2, w1, n(), mode); break;
+        case 2: kpAlignPointSets(result, p1, p2, w1, w2, n(), mode); break;
+        case 3: kpAlignPointSets(result, p1, p2, i1, i2, n(), mode); break;
+        case 4: kpAlignPointSets(result, p1, p2, i1, i2, w1, n(), mode); break;
+        default: kpAlignPointSets(result, p1, p2, i1, i2, w1, w2, n(), mode); break;
+        }
+        return result;
+    }
+};
+
+MatrixXd gathered(const Points& points, const std::vector<int>& index)
+{
+    MatrixXd rows(index.size(), 3);
+    for (std::size_t i = 0; i < index.size(); ++i) {
+        const KpVec3f& p = points[static_cast<std::size_t>(index[i])];
+        rows.row(static_cast<long>(i)) << p.x(), p.y(), p.z();
+    }
+    return rows;
+}
+
+VectorXd gathered(const std::vector<float>& weights, const std::vector<int>& index)
+{
+    VectorXd result(index.size());
+    for (std::size_t i = 0; i < index.size(); ++i)
+        result[static_cast<long>(i)] = weights[static_cast<std::size_t>(index[i])];
+    return result;
+}
+
+/// The fit in double precision, with matrices as the textbooks have them; for sets that are neither flat nor mirrored.
+Eigen::Matrix4d reference(const Call& call, int mode)
+{
+    VectorXd w1 = VectorXd::Ones(call.n()), w2 = w1;
+    if (call.arrays > 0) {
+        w1 = gathered(call.weights1, call.index1);
+        w2 = gathered(call.arrays == 1 ? call.weights1 : call.weights2, call.index2);
+    }
+    MatrixXd b = gathered(call.points1, call.index1), a = gathered(call.points2, call.index2);
+    const RowVector3d c1 = w1.transpose() * b / w1.sum();
+    const RowVector3d c2 = w2.transpose() * a / (call.arrays == 2 ? w2.sum() : w1.sum());
+    b.rowwise() -= c1;
+    a.rowwise() -= c2;
+    a = w2.asDiagonal() * a;
+    if (call.arrays == 2)
+        b = w1.asDiagonal() * b;
+    Matrix3d m;
+    if (mode == 2) {
+        m = (a.transpose() * a).inverse() * (a.transpose() * b);
+    } else {
+        const Eigen::JacobiSVD<Matrix3d> svd(a.transpose() * b, Eigen::ComputeFullU | Eigen::ComputeFullV);
+        m = svd.matrixU() * svd.matrixV().transpose();
+        if (mode == 1)
+            m *= b.cwiseProduct(a * m).sum() / (a * m).squaredNorm();
+    }
+    Eigen::Matrix4d result = Eigen::Matrix4d::Identity();
+    result.topLeftCorner<3, 3>() = m;
+    result.bottomLeftCorner<1, 3>() = c1 - c2 * m;
+    return result;
+}
+
+void expectNear(const KpMat4f& result, const Eigen::Matrix4d& expected, double bound)
+{
+    for (int i = 0; i < 4; ++i) {
+        for (int j = 0; j < 4; ++j)
+            EXPECT_NEAR(static_cast<double>(result[i][j]), expected(i, j), bound) << i << ' ' << j;
+    }
+}
+
+TEST(KpAlignPointSets, equalsAPlainFitWithAnyListsAndWeights)
+{
+    for (int trial = 0; trial < 60; ++trial) {
+        Call call{cloud(25, KpVec3f(2, 3, 4)), {}, std::vector<int>(20), std::vector<int>(20), {}, {}, trial % 2 == 1,
+                  trial / 2 % 3};
+        call.points2 = moved(call.points1, someMotion(KpVec3f(1, 1.5F, 0.7F)));
+        std::iota(call.index1.begin(), call.index1.end(), 0);
+        call.index2 = call.index1;
+        if (call.isIndexed) {
+            for (std::size_t i = 0; i < 20; ++i) {
+                call.index1[i] = static_cast<int>(7 * i % 25);
+                call.index2[i] = (call.index1[i] + (i == 3 ? 1 : 0)) % 25;  // one wrong pair: weights tell which list
+            }
+        }
+        for (std::size_t i = 0; i < 25; ++i) {
+            call.points1[i] += KpVec3f(number(-0.1F, 0.1F), number(-0.1F, 0.1F), number(-0.1F, 0.1F));
+            call.weights1.push_back(number(0.5F, 1.5F));
+            call.weights2.push_back(number(0.5F, 1.5F));
+        }
+        for (const int mode : {0, 1, 2}) {
+            SCOPED_TRACE(testing::Message() << "trial " << trial << " mode " << mode);
+            expectNear(call.align(mode), reference(call, mode), 2e-4);
+        }
+    }
+}
+
+TEST(KpAlignPointSets, carriesFlatSetsBackByAProperRotation)
+{
+    const KpVec3f extents[] = {{1, 1, 1}, {2, 3, 0}, {0, 4, 4}, {5, 0, 0}, {0, 0, 2}, {0, 0, 0}};
+    for (const KpVec3f& extent : extents) {
+        for (const float scale : {1.0F, 2.0F}) {
+            SCOPED_TRACE(testing::Message() << extent << " scaled by " << scale);
+            const Points points2 = cloud(scale == 1 ? 3 : 50, extent);
+            const Points points1 = moved(points2, someMotion(KpVec3f(scale, scale, scale)));
+            KpMat4f result;
+            if (extent == KpVec3f(0, 0, 0) && scale != 1)
+                continue;  // one point has no scale
+            kpAlignPointSets(result, points1.data(), points2.data(), static_cast<int>(points1.size()), scale != 1);
+            EXPECT_NEAR(result.det3(), scale * scale * scale, 1e-3F);
+            const Points found = moved(points2, result);
+            for (std::size_t i = 0; i < found.size(); ++i)
+                EXPECT_LT((found[i] - points1[i]).length(), 1e-3F);
+        }
+    }
+}
+
+TEST(KpAlignPointSets, turnsMirroredSetsButDoesNotMirrorThem)
+{
+    for (int trial = 0; trial < 20; ++trial) {
+        const Points points2 = cloud(40, KpVec3f(5, 3, 1));
+        const Points points1 = moved(points2, someMotion(KpVec3f(1, 1, -1)));
+        KpMat4f result;
+        kpAlignPointSets(result, points1.data(), points2.data(), 40, 0);
+        EXPECT_NEAR(result.det3(), 1, 1e-4F);
+        // No small turn of it is nearer.
+        const auto distance = [&](const KpMat4f& motion) {
+            const Points at = moved(points2, motion);
+            double sum = 0;
+            for (std::size_t i = 0; i < at.size(); ++i)
+                sum += static_cast<double>((at[i] - points1[i]).squaredLength());
+            return sum;
+        };
+        const KpVec3f centre = std::accumulate(points1.begin(), points1.end(), KpVec3f(0, 0, 0)) / 40.0F;
+        for (const KpVec3f& axis : {KpVec3f(1, 0, 0), KpVec3f(0, 1, 0), KpVec3f(0, 0, 1)}) {
+            KpMat4f turn;
+            turn.setTransform(KpVec3f(0, 0, 0), KpRotation(axis, 0.1F), KpVec3f(1, 1, 1), KpRotation(axis, 0), centre);
+            EXPECT_LT(distance(result), distance(result * turn));
+        }
+    }
+}
+
+TEST(KpAlignPointSets, appliesTheInitialMatrixToWhateverThereIs)
+{
+    const Points points = cloud(3, KpVec3f(1, 2, 3));
+    const float zeros[] = {1, -1, 0}, ones[] = {1, 1, 1};
+    const int index[] = {0, 1, 2};
+    const KpMat4f initial = someMotion(KpVec3f(1, 2, 3)), before = someMotion(KpVec3f(1, 1, 1));
+    const KpVec3f* const p = points.data();
+    for (const KpMat4f* const with : {static_cast<const KpMat4f*>(nullptr), &initial}) {
+        const auto expectIdentity = [&](auto... arguments) {
+            KpMat4f result = before;
+            kpAlignPointSets(result, p, p, arguments..., with);
+            EXPECT_EQ(result, with ? initial : KpMat4f::identity());
+        };
+        int none = 0;
+        expectIdentity(none, 0);
+        expectIdentity(index, index, none, 0);
+        expectIdentity(ones, -1, 0);
+        expectIdentity(zeros, 3, 0);
+        expectIdentity(zeros, ones, 3, 1);
+        expectIdentity(index, index, zeros, 3, 2);
+        expectIdentity(index, index, ones, zeros, 3, 0);
+        KpMat4f result = before;
+        kpAlignPointSets(result, p, p, 3, 3, with);
+        EXPECT_EQ(result, with ? before * initial : before);
+    }
+}
+
+TEST(KpCompTransform, takesCentredMatrices)
+{
+    const KpMat4f motion = someMotion(KpVec3f(1, 1, 1));
+    KpDMatrix<float> a(10, 3), b(10, 3);
+    for (int i = 0; i < 10; ++i) {
+        const KpVec3f from(number(-1, 1), number(-1, 1), number(-1, 1)), to = motion.multDirMatrix(from) * 2.0F;
+        std::copy(from.begin(), from.end(), a[i]);
+        std::copy(to.begin(), to.end(), b[i]);
+    }
+    const KpVec3f centroidA(1, 2, 3), centroidB(4, 5, 6);
+    KpMat4f scaled, affine;
+    kpCompRigidTransform(a, b, centroidA, centroidB, scaled, true);
+    kpCompAffineTransform(a, b, centroidA, centroidB, affine);
+    for (const KpMat4f& result : {scaled, affine}) {
+        EXPECT_LT((result.multVecMatrix(centroidA) - centroidB).length(), 1e-5F);
+        for (const KpVec3f& axis : {KpVec3f(1, 0, 0), KpVec3f(0, 1, 0), KpVec3f(0, 0, 1)})
+            EXPECT_LT((result.multDirMatrix(axis) - motion.multDirMatrix(axis) * 2.0F).length(), 1e-5F);
+    }
+}
+
+}  // namespace

@@ -1,0 +1,241 @@
+#include <kplib/numerics/KpDMatrix.h>
+
+#include <kplib/numerics/detail/KpLinearSolver.h>
+#include <support/FailingMalloc.h>
+#include <support/LogCapture.h>
+
+#include <Eigen/Dense>
+#include <gtest/gtest.h>
+
+#include <random>
+#include <vector>
+
+using kplib::test::FailingMalloc, kplib::test::Lines, kplib::test::LogCapture;
+
+namespace {
+
+using Matrix = Eigen::Matrix<float, Eigen::Dynamic, Eigen::Dynamic, Eigen::RowMajor>;
+
+Matrix noise(int rows, int cols)
+{
+    static std::mt19937 random(1);
+    std::uniform_real_distribution<float> number(-1, 1);
+    return Matrix::NullaryExpr(rows, cols, [&] { return number(random); });
+}
+
+KpDMatrix<float> toKp(const Matrix& matrix)
+{
+    KpDMatrix<float> result(static_cast<int>(matrix.rows()), static_cast<int>(matrix.cols()));
+    std::copy_n(matrix.data(), matrix.size(), result.data());
+    return result;
+}
+
+Matrix toEigen(const KpDMatrix<float>& matrix)
+{
+    return Eigen::Map<const Matrix>(matrix.data(), matrix.rows(), matrix.cols());
+}
+
+Matrix from(int rows, int cols, std::initializer_list<float> elements)
+{
+    return Eigen::Map<const Matrix>(elements.begin(), rows, cols);
+}
+
+const std::pair<const char*, Matrix> decomposed[] = {
+    {"empty", Matrix(0, 0)},
+    {"no rows", Matrix(0, 2)},
+    {"one element", from(1, 1, {-3})},
+    {"identity", Matrix::Identity(4, 4)},
+    {"nothing", Matrix::Zero(3, 3)},
+    {"rank one", from(3, 1, {1, 2, 3}) * from(1, 3, {3, -1, 2})},
+    {"only a superdiagonal", from(3, 3, {0, 1, 0, 0, 0, 2, 0, 0, 0})},
+    {"a zero in the diagonal", from(3, 3, {1, 2, 0, 0, 0, 3, 0, 0, 4})},
+    {"equal values", from(3, 3, {0, -2, 0, 2, 0, 0, 0, 0, -2})},
+    {"small", noise(3, 3)},
+    {"large numbers", noise(3, 3) * 1e18F},
+    {"small numbers", noise(3, 3) * 1e-15F},
+    {"tall", noise(100, 3)},
+    {"wide", noise(3, 7)},
+    {"square", noise(20, 20)},
+    {"two equal columns", noise(8, 3) * from(3, 4, {1, 0, 1, 0, 0, 1, 0, 0, 0, 0, 0, 1})},
+};
+
+TEST(KpDMatrixSvd, equalsTheSingularValuesOfEigenAndMakesUpTheMatrix)
+{
+    for (const auto& [what, matrix] : decomposed) {
+        SCOPED_TRACE(what);
+        const KpDMatrix<float> a = toKp(matrix);
+        KpDMatrix<float> kpU, kpV;
+        Eigen::VectorXf w = Eigen::VectorXf::Constant(matrix.cols(), -1);
+        ASSERT_TRUE(a.SVD(kpU, w.data(), kpV, 30));
+        EXPECT_EQ(toEigen(a), matrix);
+        const Matrix u = toEigen(kpU), v = toEigen(kpV);
+        ASSERT_EQ(u.rows(), matrix.rows());
+        ASSERT_EQ(v.rows(), matrix.cols());
+        if (matrix.size() == 0)
+            continue;
+        const float scale = std::max(matrix.norm(), 1e-30F), bound = 3e-6F * static_cast<float>(matrix.cols());
+        EXPECT_LE((u * w.asDiagonal() * v.transpose() - matrix).norm(), bound * scale);
+        EXPECT_LE((v.transpose() * v - Matrix::Identity(v.cols(), v.cols())).norm(), bound);
+        if (matrix.rows() >= matrix.cols()) {
+            EXPECT_LE((u.transpose() * u - Matrix::Identity(u.cols(), u.cols())).norm(), bound);
+        }
+        std::sort(w.begin(), w.end(), std::greater<>());
+        Eigen::VectorXf expected = Eigen::VectorXf::Zero(w.size());
+        const Eigen::JacobiSVD<Eigen::MatrixXd> reference(matrix.cast<double>());
+        expected.head(std::min(matrix.rows(), matrix.cols())) = reference.singularValues().cast<float>();
+        EXPECT_LE((w - expected).norm(), bound * scale);
+        EXPECT_GE(w.minCoeff(), 0);
+    }
+}
+
+TEST(KpDMatrixSvd, tellsWhatDoesNotConverge)
+{
+    const Matrix withNaN = Matrix::Constant(2, 2, std::numeric_limits<float>::quiet_NaN());
+    const std::tuple<Matrix, int, bool> cases[] = {
+        {noise(3, 3), 1, false}, {noise(3, 3), 0, false}, {Matrix::Identity(3, 3), 1, true}, {withNaN, 30, false}};
+    for (const auto& [matrix, maxIterations, isFine] : cases) {
+        const LogCapture log;
+        KpDMatrix<float> u, v;
+        float w[3];
+        EXPECT_EQ(toKp(matrix).SVD(u, w, v, maxIterations), isFine);
+        const std::string line = "W no convergence in " + std::to_string(maxIterations) + " svd iterations \n";
+        EXPECT_EQ(log.lines(), isFine ? Lines{} : Lines{line});
+    }
+}
+
+TEST(KpDMatrix, multipliesAndTransposesAnyShape)
+{
+    const Matrix a = noise(5, 3), b = noise(3, 4);
+    KpDMatrix<float> product = toKp(a);
+    product *= toKp(b);
+    EXPECT_TRUE(toEigen(product).isApprox(a * b, 1e-6F));
+    product.transpose();
+    EXPECT_TRUE(toEigen(product).isApprox((a * b).transpose(), 1e-6F));
+
+    const LogCapture log;
+    const KpDMatrix<float> before = product;
+    product *= toKp(a);
+    EXPECT_EQ(toEigen(product), toEigen(before));
+    EXPECT_EQ(log.lines(), Lines{"E KpDMatrix:operator*: Can not multiply 4x5 matrix by 5x3 matrix.\n"});
+}
+
+TEST(KpDMatrix, ownsItsBlock)
+{
+    KpDMatrix<float> a = toKp(from(2, 3, {1, 2, 3, 4, 5, 6})), copy = a;
+    copy[1][2] = 7;
+    EXPECT_EQ(a[1][2], 6);
+    a.resize(3, 2);  // the elements keep their places in memory
+    EXPECT_EQ(toEigen(a), from(3, 2, {1, 2, 3, 4, 5, 6}));
+    a = *&a;
+    const KpDMatrix<float> moved = std::move(a);
+    EXPECT_EQ(moved[2][1], 6);
+    copy.resize(0, 0);
+    EXPECT_EQ(copy.data(), nullptr);
+    const FailingMalloc failing(0);
+    EXPECT_ANY_THROW(copy.resize(10, 10));
+    EXPECT_EQ(copy.rows(), 0);
+}
+
+TEST(KpDMatrixSolve, equalsEigen)
+{
+    for (const int n : {0, 1, 2, 3, 4, 5, 8, 9, 50, 101}) {
+        SCOPED_TRACE(n);
+        const Matrix matrix = noise(n, n), sides = noise(3, n);
+        const KpDMatrix<float> a = toKp(matrix);
+        KpDMatrix<float> x = toKp(sides), lr = a;
+        float* rhs[] = {x[0], x[1], x[2]};
+        ASSERT_EQ(a.solveLRdecomp(rhs, 3), 0);
+        EXPECT_EQ(toEigen(a), matrix);
+        if (n == 0)
+            continue;
+        const Eigen::PartialPivLU<Eigen::MatrixXd> reference(matrix.cast<double>());
+        const Matrix solutions = toEigen(x).transpose();
+        EXPECT_LE((matrix * solutions - sides.transpose()).norm(), 2e-5F * sides.norm());
+        EXPECT_TRUE(solutions.isApprox(reference.solve(sides.transpose().cast<double>()).cast<float>(), 1e-3F));
+
+        std::vector<float*> rows;
+        for (int i = 0; i < n; ++i)
+            rows.push_back(lr[i]);
+        float sign = 0;
+        ASSERT_EQ(a.solveLRdecomp(rows.data(), rhs, 0, sign), 0);
+        const double det = toEigen(lr).cast<double>().diagonal().prod() * static_cast<double>(sign);
+        EXPECT_NEAR(det / reference.determinant(), 1, 1e-2);
+    }
+}
+
+TEST(KpDMatrixSolve, takesTheLastOfEqualPivotsAndTellsBadSolutions)
+{
+    // What a row of 1 + epsilon leaves of the residual is above its bound, but still the solution there is.
+    const KpDMatrix<float> a = toKp(from(2, 2, {1, 1, -1, -1.0000001F}));
+    KpDMatrix<float> lr(2, 2);
+    float side[] = {0.3F, 0.7F}, sign = 0;
+    float *rows[] = {lr[0], lr[1]}, *rhs[] = {side};
+    const LogCapture log;
+    EXPECT_EQ(a.solveLRdecomp(rows, rhs, 1, sign), 0);
+    EXPECT_EQ(sign, -1);
+    EXPECT_EQ(toEigen(lr).row(0), from(1, 2, {-1, -1.0000001F}));
+    ASSERT_EQ(log.lines().size(), 1U);
+    EXPECT_EQ(log.lines()[0].rfind("W norm(residuum) / norm(rhs) = ", 0), 0U) << log.lines()[0];
+
+    float zeros[] = {0, 0};
+    rhs[0] = zeros;
+    EXPECT_EQ(a.solveLRdecomp(rhs, 1), 0);
+    EXPECT_EQ(zeros[0], 0);
+    EXPECT_EQ(log.lines().size(), 1U);
+}
+
+TEST(KpDMatrixSolve, leavesTheSidesWhereItFails)
+{
+    const std::string text = " KpDMatrix::solveLRdecomp: ", noMemory = "E" + text + "Not Enough Memory";
+    const Matrix dependent = from(2, 2, {1, 2, 2, 4}), regular = Matrix::Identity(2, 2);
+    const std::tuple<Matrix, long, Lines> cases[] = {
+        {Matrix::Zero(2, 2), -1, {"E" + text + "Singular Matrix-2\n", "E i, n: 0 2\n"}},
+        {dependent, -1, {"E" + text + "Singular Matrix-2\n", "E i, n: 1 2\n"}},
+        {Matrix::Zero(2, 3), -1, {"W" + text + "must be a square matrix.\n"}},
+        {regular, 0, {noMemory + ".\n"}},
+        {regular, 1, {noMemory + " (0).\n"}},
+        {regular, 2, {noMemory + " (1).\n"}},
+        {regular, 3, {noMemory + ".\n"}},
+        {regular, 4, {noMemory + ".\n"}},
+    };
+    for (const auto& [matrix, failsAt, lines] : cases) {
+        SCOPED_TRACE(lines[0]);
+        const KpDMatrix<float> a = toKp(matrix);
+        float side[] = {5, 6};
+        float* rhs[] = {side};
+        const LogCapture log;
+        {
+            const FailingMalloc failing(failsAt, 1);
+            EXPECT_EQ(a.solveLRdecomp(rhs, 1), 1);
+        }
+        EXPECT_EQ(log.lines(), lines);
+        EXPECT_EQ(side[1], 6);
+    }
+}
+
+TEST(Eliminate, everyPathEqualsThePlainOne)
+{
+    for (const auto& path : kplib::detail::eliminatePaths()) {
+        for (int n = 1; path.usable && n < 40; ++n) {
+            KpDMatrix<float> expected = toKp(noise(n, n)), result = expected;
+            std::vector<float*> expectedRows, rows;
+            for (int i = 0; i < n; ++i) {
+                expectedRows.push_back(expected[i]);
+                rows.push_back(result[i]);
+            }
+            kplib::detail::eliminatePaths()[0].run(expectedRows.data(), n / 4, n);
+            path.run(rows.data(), n / 4, n);
+            EXPECT_EQ(toEigen(result), toEigen(expected)) << path.name << ' ' << n;
+        }
+    }
+}
+
+TEST(KpDMatrix, pythagDoesNotOverflow)
+{
+    const float cases[][3] = {{3, -4, 5}, {-3e30F, 4e30F, 5e30F}, {3e-30F, 4e-30F, 5e-30F}, {0, 0, 0}, {0, -2, 2}};
+    for (const auto& [a, b, expected] : cases)
+        EXPECT_FLOAT_EQ(KpDMatrix<float>::pythag(a, b), expected);
+    EXPECT_TRUE(std::isnan(KpDMatrix<float>::pythag(std::numeric_limits<float>::quiet_NaN(), 0)));
+}
+
+}  // namespace
