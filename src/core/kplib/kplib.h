@@ -92,6 +92,7 @@
 #include <kplib/net/TmMsg.h>
 #include <kplib/numerics/KpAlignPointSets.h>
 #include <kplib/numerics/KpDMatrix.h>
+#include <kplib/numerics/KpDelaunay.h>
 #include <kplib/numerics/KpFitPlane.h>
 #include <kplib/numerics/KpODE2.h>
 #include <kplib/numerics/KpODE3.h>

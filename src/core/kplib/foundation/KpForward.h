@@ -123,6 +123,7 @@ class KpSocket;
 class KpSocketTools;
 class TmMsg;
 
+class KpDelaunay;
 class KpPls;
 class KpRandom;
 class KpSimAnnState;

@@ -171,7 +171,7 @@ private:
 
 const float* numbers(const KpVec3f* points)
 {
-    return points ? points->data() : nullptr;
+    return reinterpret_cast<const float*>(points);  // a vector is its three floats; without pairs the lists may be null
 }
 
 /// Null for index lists or weights that there are none of.

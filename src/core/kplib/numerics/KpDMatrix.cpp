@@ -17,6 +17,8 @@ KpDMatrix<T>::~KpDMatrix()
 template <typename T>
 KpDMatrix<T>& KpDMatrix<T>::operator=(const KpDMatrix& other)
 {
+    if (this == &other)
+        return *this;
     resize(other.rows_, other.cols_);
     std::copy_n(other.data_, place(rows_), data_);
     return *this;
@@ -85,7 +87,7 @@ bool KpDMatrix<T>::SVD(KpDMatrix& U, T* w, KpDMatrix& V, int maxIterations) cons
 {
     U = *this;
     V.resize(cols_, cols_);
-    return kplib::detail::SingularValues(U, w, V).run(maxIterations);
+    return kplib::detail::computeSingularValues(U, w, V, maxIterations);
 }
 
 template <typename T>

@@ -106,13 +106,17 @@ SolverRows::~SolverRows()
 }
 
 LinearSolver::LinearSolver(const float* a, int n, float** lr) :
-    a_(a), n_(n), lr_(lr), work_(allocate<float>(4 * n)), permutation_(allocate<int>(n)), b_(work_.get()),
-    residual_(b_ + n), x_(residual_ + n), correction_(x_ + n)
+    a_(a), n_(n), lr_(lr), work_(allocate<float>(4 * n)), permutation_(allocate<int>(n))
 {
-    if (isComplete())
-        std::iota(permutation_.get(), permutation_.get() + n, 0);
-    else
+    if (!isComplete()) {
         logExhausted();
+        return;
+    }
+    b_ = work_.get();
+    residual_ = b_ + n;
+    x_ = residual_ + n;
+    correction_ = x_ + n;
+    std::iota(permutation_.get(), permutation_.get() + n, 0);
 }
 
 bool LinearSolver::decompose(float& sign)

@@ -52,7 +52,7 @@ private:
     float** lr_;
     std::unique_ptr<float[], FreeBlock> work_;
     std::unique_ptr<int[], FreeBlock> permutation_;  // the row of `a` that stands in each row of `lr`
-    float *b_, *residual_, *x_, *correction_;
+    float *b_ = nullptr, *residual_ = nullptr, *x_ = nullptr, *correction_ = nullptr;  // within work_
 };
 
 /// One step of the elimination: the factors of `column` in the rows below it, and what they leave of the lower right.

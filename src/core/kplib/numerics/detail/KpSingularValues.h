@@ -4,7 +4,6 @@
 
 #include <algorithm>
 #include <cmath>
-#include <memory>
 
 namespace kplib::detail {
 
@@ -19,34 +18,8 @@ inline float pythag(float a, float b)
     return static_cast<float>(greater * std::sqrt(1.0 + static_cast<double>(ratio * ratio)));
 }
 
-/// The work of KpDMatrix::SVD(): Householder reflections to a bidiagonal matrix, then implicit QR sweeps.
-class SingularValues {
-public:
-    /// `u` comes as the matrix itself.
-    SingularValues(KpDMatrix<float>& u, float* w, KpDMatrix<float>& v);
-
-    bool run(int maxIterations);
-
-private:
-    void bidiagonalize();
-    void reflectColumn(int i);
-    void reflectRow(int i);
-    void accumulateRight();
-    void accumulateLeft();
-    bool diagonalize(int k, int maxIterations);
-    int findSplit(int k, bool& cancels) const;
-    void cancel(int l, int k);
-    float shift(int l, int k) const;
-    void sweep(int l, int k);
-    bool vanishes(float value) const { return std::abs(value) + norm_ == norm_; }
-
-    KpDMatrix<float>& u_;
-    float* w_;
-    KpDMatrix<float>& v_;
-    int m_, n_;
-    float norm_ = 0;
-    KpDMatrix<float> super_;  // one row: the superdiagonal, element i above w[i]
-    float* rv_;
-};
+/// The work of KpDMatrix::SVD() on a matrix that stands in `u`, with `v` of its size: Householder reflections to a
+/// bidiagonal matrix, then implicit QR sweeps.
+bool computeSingularValues(KpDMatrix<float>& u, float* w, KpDMatrix<float>& v, int maxIterations);
 
 }  // namespace kplib::detail

@@ -1,0 +1,39 @@
+#pragma once
+
+#include <kplib/foundation/KpDArray.h>
+#include <kplib/foundation/KpExport.h>
+
+#include <array>
+#include <cstdint>
+
+class KpVec2f;
+class KpVec3f;
+
+/// Delaunay triangulations of points in the plane and in space: no point lies inside the circle or sphere through the
+/// corners of another part.
+///
+/// The points go in one after the other: what has the new one in its circle makes way for a fan around it (A. Bowyer,
+/// "Computing Dirichlet tessellations", and D. F. Watson, both in The Computer Journal 24(2), 1981). They are worked on
+/// as copies, shifted at random by up to half a hundred-millionth of their range, with KpRandom::rand(): so equal or
+/// regular points are no trouble, and two processes may choose differently where the choice is open. Parts that are
+/// nearly flat are left out, so the hull may have small gaps.
+///
+/// Both restart the system's generator with srand(367). They throw KpMemoryException with the result unchanged; memory
+/// is linear in the number of points, and the time about n log n for points in no special order. Any number of threads.
+class KPLIB_API KpDelaunay {
+public:
+    using Triangle = std::array<std::int32_t, 3>;     ///< indices of points
+    using Tetrahedron = std::array<std::int32_t, 4>;  ///< indices of points
+
+    /// The triangles of `n` points, counter-clockwise. False, with an error in the log and `triangles` unchanged, if
+    /// one point falls into circles whose common outline has more than 1025 edges. Points in a line have no triangles.
+    static bool triangulate2D(KpVec2f* points, int n, KpDArray<Triangle>& triangles);
+
+    /// The tetrahedra of `n` points, the first three corners clockwise as seen from the fourth. False, with
+    /// `tetrahedra` unchanged, if one point falls into spheres whose common surface has more than 16385 faces.
+    static bool triangulate3D(KpVec3f* points, int n, KpDArray<Tetrahedron>& tetrahedra);
+
+    /// Draws the outlines of `triangles` into an EPS file, to look at, fitted into a square of 425 points. False if
+    /// `path` can't be written to.
+    static bool writeEPS(const char* path, KpVec2f* points, int n, KpDArray<Triangle>& triangles);
+};

@@ -1,0 +1,79 @@
+#pragma once
+
+#include <array>
+#include <cstdint>
+
+namespace kplib::detail::delaunay {
+
+// In the plane (Size 2) a simplex is a triangle, its faces are edges and its sphere is a circle.
+
+template <int Size>
+using Point = std::array<float, Size>;
+template <int Size>
+using Position = std::array<double, Size>;
+template <int Size>
+using Face = std::array<std::int32_t, Size>;
+template <int Size>
+using Simplex = std::array<std::int32_t, Size + 1>;
+
+template <int Size>
+struct Circle {
+    Position<Size> center;
+    double squaredRadius;
+};
+
+/// Whether `point` is inside or on `circle`. Every other way to ask has to round as this one does; what isn't a number
+/// counts as inside.
+template <int Size>
+bool contains(const Circle<Size>& circle, const Position<Size>& point)
+{
+    double rest = circle.squaredRadius;
+    for (int axis = 0; axis < Size; ++axis) {
+        const double d = point[axis] - circle.center[axis];
+        rest -= d * d;
+        if (rest < 0)
+            return false;
+    }
+    return true;
+}
+
+template <typename T>
+T determinant(const std::array<std::array<T, 2>, 2>& m)
+{
+    return m[0][0] * m[1][1] - m[0][1] * m[1][0];
+}
+
+template <typename T>
+T determinant(const std::array<std::array<T, 3>, 3>& m)
+{
+    return m[0][0] * (m[1][1] * m[2][2] - m[1][2] * m[2][1]) - m[0][1] * (m[1][0] * m[2][2] - m[1][2] * m[2][0]) +
+           m[0][2] * (m[1][0] * m[2][1] - m[1][1] * m[2][0]);
+}
+
+/// The circle through point `last` and the corners of `face`, where the bisectors between them and `last` meet.
+template <int Size>
+Circle<Size> circleThrough(const Point<Size>* points, const Face<Size>& face, int last)
+{
+    const Point<Size>& p = points[last];
+    std::array<Position<Size>, Size> sides;
+    Position<Size> right{};
+    for (int k = 0; k < Size; ++k)
+        for (int axis = 0; axis < Size; ++axis) {
+            const double corner = points[face[k]][axis];
+            sides[k][axis] = corner - p[axis];
+            right[k] += (corner + p[axis]) * sides[k][axis] / 2;
+        }
+    const double all = determinant(sides);
+    Circle<Size> circle{};
+    for (int axis = 0; axis < Size; ++axis) {
+        auto replaced = sides;  // Cramer's rule
+        for (int k = 0; k < Size; ++k)
+            replaced[k][axis] = right[k];
+        circle.center[axis] = determinant(replaced) / all;
+        const double d = circle.center[axis] - p[axis];
+        circle.squaredRadius += d * d;
+    }
+    return circle;
+}
+
+}  // namespace kplib::detail::delaunay

@@ -1,0 +1,342 @@
+#include <numerics/PlainDelaunay.h>
+#include <support/LogCapture.h>
+#include <support/TempFolder.h>
+
+#include <kplib/geometry/KpVec2f.h>
+#include <kplib/geometry/KpVec3f.h>
+#include <kplib/numerics/KpDelaunay.h>
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstdlib>
+#include <limits>
+#include <map>
+#include <random>
+#include <set>
+#include <string>
+
+using namespace kplib::detail::delaunay;
+using namespace kplib::test;
+
+namespace {
+
+constexpr double pi = 3.141592653589793;
+constexpr float infinite = std::numeric_limits<float>::infinity(), nan = std::numeric_limits<float>::quiet_NaN();
+
+using Coordinates = std::vector<float>;
+
+template <int Size, typename Make>
+Coordinates many(int n, Make make)  // of the number of a point and an axis
+{
+    Coordinates result;
+    for (int i = 0; i < n; ++i)
+        for (int axis = 0; axis < Size; ++axis)
+            result.push_back(static_cast<float>(make(i, axis)));
+    return result;
+}
+
+/// On the unit circle, or spread over the unit sphere.
+template <int Size>
+Coordinates round(int n)
+{
+    return many<Size>(n, [n](int i, int axis) {
+        const double z = Size == 2 ? 0 : 1 - (2 * i + 1.0) / n;
+        const double angle = Size == 2 ? 2 * pi * i / n : i * pi * (3 - std::sqrt(5.0)), r = std::sqrt(1 - z * z);
+        return axis == 2 ? z : axis == 1 ? r * std::sin(angle) : r * std::cos(angle);
+    });
+}
+
+template <int Size>
+Coordinates roundAndCenter(int n)
+{
+    Coordinates result = round<Size>(n);
+    result.resize(result.size() + Size);
+    return result;
+}
+
+template <int Size>
+std::map<std::string, Coordinates> inputs()
+{
+    static std::mt19937 random(5);
+    const auto noise = [](int, int) { return std::uniform_real_distribution<double>(-1, 1)(random); };
+    const auto scaled = [&](double scale) { return [=](int, int) { return scale * noise(0, 0); }; };
+    const auto withOdd = [&](float odd) {
+        Coordinates result = many<Size>(120, noise);
+        for (const int point : {60, 75, 90})  // some of them meet empty slots
+            result[point * Size] = odd;
+        return result;
+    };
+    std::map<std::string, Coordinates> result = {
+        {"noise", many<Size>(600, noise)},
+        {"tiny", many<Size>(100, scaled(1e-38))},
+        {"huge", many<Size>(100, scaled(1e18))},
+        {"beyond the first circle", many<Size>(30, scaled(1e20))},
+        {"clusters within clusters",
+         many<Size>(600, [&](int i, int) { return std::pow(4.0, -(i / 60)) * noise(0, 0); })},
+        {"far clusters", many<Size>(300, [&](int i, int) { return i % 3 * 1e4 + noise(0, 0) * 1e-2; })},
+        {"lattice",
+         many<Size>(343, [](int i, int axis) { return axis == 0   ? i % 7
+                                                      : axis == 1 ? i / 7 % 7
+                                                                  : i / 49; })},
+        {"twice the same", many<Size>(120, [](int i, int axis) { return (i % 60 * 37 + axis * (i % 60) * 11) % 61; })},
+        {"one place", many<Size>(9, [](int, int) { return 0.7; })},
+        {"a line", many<Size>(80, [](int i, int axis) { return axis == 0 ? i * 0.1 : 0; })},
+        {"a slanted line", many<Size>(80, [](int i, int axis) { return i * (axis + 1); })},
+        {"round", round<Size>(200)},
+        {"round with a centre", roundAndCenter<Size>(200)},
+        {"infinite", withOdd(infinite)},
+        {"not a number", withOdd(nan)},
+    };
+    for (int n = 0; n <= Size + 2; ++n)
+        result[std::to_string(n) + " points"] = many<Size>(n, noise);
+    return result;
+}
+
+template <int Size>
+std::vector<std::pair<std::string, Finder>> finders()
+{
+    std::vector<std::pair<std::string, Finder>> result;
+    for (const auto& path : circleScanPaths<Size>())
+        if (path.usable) {
+            result.push_back({path.name, {path.run, std::numeric_limits<long>::max()}});
+            result.push_back({std::string("grid and ") + path.name, {path.run, 100}});
+            result.push_back({std::string("early grid and ") + path.name, {path.run, 0}});
+        }
+    return result;
+}
+
+template <int Size>
+void comparesToPlain(const std::string& what, const Coordinates& coordinates)
+{
+    const auto set = shifted<Size>(coordinates.data(), static_cast<int>(coordinates.size() / Size));
+    const auto expected = plainDelaunay<Size>(set, Size == 2 ? 1025 : 16385);
+    for (const auto& [name, finder] : finders<Size>()) {
+        SCOPED_TRACE(std::to_string(Size) + "D, " + what + ", " + name);
+        KpDArray<Simplex<Size>> result{{7, 8, 9}};
+        ASSERT_EQ(triangulate<Size>(set, finder, result), expected.has_value());
+        if (expected)
+            ASSERT_EQ(std::vector(result.begin(), result.end()), *expected);
+        else
+            ASSERT_EQ(result.size(), 1);
+    }
+}
+
+TEST(KpDelaunay, equalsThePlainInsertionInEveryIndex)
+{
+    for (const auto& [what, coordinates] : inputs<2>())
+        comparesToPlain<2>(what, coordinates);
+    for (const auto& [what, coordinates] : inputs<3>())
+        comparesToPlain<3>(what, coordinates);
+    for (const int n : {300, 500, 700, 1300})  // until a cavity is too large
+        comparesToPlain<2>("fan", roundAndCenter<2>(n));
+}
+
+/// Every part is turned the right way and has no point within its circle; together they are one ball.
+template <int Size>
+void isDelaunay(const Coordinates& c, const KpDArray<Simplex<Size>>& parts)
+{
+    const int n = static_cast<int>(c.size() / Size);
+    KpDArray<Point<Size>> points;
+    for (int i = 0; i < n; ++i) {
+        points.append({});
+        std::copy_n(c.begin() + i * Size, Size, points[i].begin());
+    }
+    std::map<std::vector<int>, int> cells[Size + 1];  // by their corners, how often they occur
+    for (Simplex<Size> part : parts) {
+        Face<Size> face;
+        std::copy_n(part.begin(), Size, face.begin());
+        const Circle<Size> circle = circleThrough<Size>(points.data(), face, part[Size]);
+        std::array<Position<Size>, Size> sides;
+        for (int k = 0; k < Size; ++k)
+            for (int axis = 0; axis < Size; ++axis)
+                sides[k][axis] = double{points[part[k]][axis]} - points[part[Size]][axis];
+        ASSERT_GT(determinant(sides), 0);
+        for (int i = 0; i < n; ++i) {
+            double d = 0;
+            for (int axis = 0; axis < Size; ++axis)
+                d += std::pow(points[i][axis] - circle.center[axis], 2);
+            ASSERT_GT(std::sqrt(d), std::sqrt(circle.squaredRadius) - 1e-5) << i;
+        }
+        std::sort(part.begin(), part.end());
+        for (unsigned some = 1; some < 2U << Size; ++some) {
+            std::vector<int> cell;
+            for (int k = 0; k <= Size; ++k)
+                if (some >> k & 1)
+                    cell.push_back(part[k]);
+            ++cells[cell.size() - 1][cell];
+        }
+    }
+    long euler = 0;
+    for (int k = 0; k <= Size; ++k)
+        euler += (k % 2 == 0 ? 1 : -1) * static_cast<long>(cells[k].size());
+    EXPECT_EQ(euler, 1);
+    EXPECT_EQ(cells[0].size(), n);
+    for (const auto& [face, count] : cells[Size - 1])
+        ASSERT_LE(count, 2);
+}
+
+/// Asks for the outermost points of each circle, wherever the roundings of its test put them.
+template <int Size>
+void findsTheRimsOfCircles()
+{
+    std::mt19937 random(3);
+    std::uniform_real_distribution<double> places(-1, 1), exponents(-20, 3);
+    CircleGrid<Size> grid(400, 1e6F, circleScanPaths<Size>()[0].run);
+    std::vector<Circle<Size>> circles(1000);
+    for (int i = 0; i < 1000; ++i) {
+        circles[i].squaredRadius = std::pow(10, exponents(random));
+        for (double& x : circles[i].center)  // many end at a border between cells
+            x = i % 4 == 0 ? 1 + std::sqrt(circles[i].squaredRadius) : places(random);
+        grid.insert(i, circles[i]);
+    }
+    for (int i = 0; i < 1000; i += 3)
+        grid.remove(i);
+    for (int i = 0; i < 1000; ++i)
+        for (int side = 0; side < 2 * Size; ++side) {
+            Position<Size> point = circles[i].center;
+            double& x = point[side / 2];
+            double inside = x, outside = x + (side % 2 == 0 ? -2 : 2) * std::sqrt(circles[i].squaredRadius);
+            for (int halvings = 0; halvings < 1100; ++halvings) {  // down to neighbours, even beside zero
+                x = (inside + outside) / 2;
+                (contains<Size>(circles[i], point) ? inside : outside) = x;
+            }
+            x = inside;
+            std::int32_t hits[5000];
+            const long found = grid.find(point, 5000, hits);
+            ASSERT_EQ(std::count(hits, hits + found, i) > 0, i % 3 != 0) << i << ' ' << side;
+        }
+}
+
+TEST(KpDelaunay, findsCirclesToTheLastBit)
+{
+    findsTheRimsOfCircles<2>();
+    findsTheRimsOfCircles<3>();
+}
+
+TEST(KpDelaunay, keepsPointsOutOfCircles)
+{
+    std::mt19937 random(8);
+    const auto noise = [&](int, int) { return std::uniform_real_distribution<double>(0, 1)(random); };
+    Coordinates plane = many<2>(1500, noise), space = many<3>(300, noise);
+    KpDArray<KpDelaunay::Triangle> triangles;
+    ASSERT_TRUE(KpDelaunay::triangulate2D(reinterpret_cast<KpVec2f*>(plane.data()), 1500, triangles));
+    isDelaunay<2>(plane, triangles);
+    KpDArray<KpDelaunay::Tetrahedron> tetrahedra;
+    ASSERT_TRUE(KpDelaunay::triangulate3D(reinterpret_cast<KpVec3f*>(space.data()), 300, tetrahedra));
+    isDelaunay<3>(space, tetrahedra);
+}
+
+TEST(KpDelaunay, turnsItsPartsAndDropsFlatOnes)
+{
+    struct Case {
+        const char* what;
+        std::vector<KpVec2f> points;
+        long count;
+    };
+    const Case cases[] = {
+        {"nothing", {}, 0},
+        {"clockwise", {{0, 0}, {0, 1}, {1, 0}}, 1},
+        {"counter-clockwise", {{0, 0}, {1, 0}, {0, 1}}, 1},
+        {"a square", {{0, 0}, {1, 0}, {1, 1}, {0, 1}}, 2},
+        {"in a line", {{0, 0}, {1, 0}, {2, 0}, {3, 0}, {7, 0}}, 0},
+    };
+    for (Case c : cases) {
+        SCOPED_TRACE(c.what);
+        KpDArray<KpDelaunay::Triangle> triangles{{1, 2, 3}};
+        ASSERT_TRUE(KpDelaunay::triangulate2D(c.points.data(), static_cast<int>(c.points.size()), triangles));
+        EXPECT_EQ(triangles.size(), c.count);
+        for (const auto& t : triangles) {
+            const KpVec2f a = c.points[t[1]] - c.points[t[0]], b = c.points[t[2]] - c.points[t[0]];
+            EXPECT_EQ(a.x() * b.y() - a.y() * b.x(), 1);
+        }
+    }
+}
+
+TEST(KpDelaunay, shiftsACopyAndRestartsTheSystemsGenerator)
+{
+    Coordinates points = {0, 0, 1, 2, 4, 8};
+    const auto set = shifted<2>(points.data(), 3);
+    EXPECT_EQ(set.range, 8);
+    for (int i = 0; i < 6; ++i)
+        EXPECT_NEAR(set.points[i / 2][i % 2], points[i], 4e-8 + 6e-8);  // the shift, and its rounding
+    EXPECT_NE(set.points[0][0], set.points[0][1]);
+    const Point<2> corners[] = {{200, -80}, {-40, 400}, {-40, -80}};
+    EXPECT_TRUE(std::equal(corners, corners + 3, &set.points[3]));
+    const Coordinates solid = {1, 2, 3, 2, 4, 7};
+    const Point<3> corners3[] = {{801, -198, -397}, {-99, 1602, -397}, {-99, -198, 3203}, {-99, -198, -397}};
+    EXPECT_TRUE(std::equal(corners3, corners3 + 4, &shifted<3>(solid.data(), 2).points[2]));
+
+    KpDArray<KpDelaunay::Triangle> triangles;
+    const Coordinates before = points;
+    KpDelaunay::triangulate2D(reinterpret_cast<KpVec2f*>(points.data()), 3, triangles);
+    const int drawn = std::rand();
+    std::srand(367);
+    EXPECT_EQ(drawn, std::rand());
+    EXPECT_EQ(points, before);
+}
+
+TEST(KpDelaunay, refusesALargeCavity)
+{
+    Coordinates fan = roundAndCenter<2>(3000);
+    KpDArray<KpDelaunay::Triangle> triangles{{1, 2, 3}};
+    const LogCapture log;
+    EXPECT_FALSE(KpDelaunay::triangulate2D(reinterpret_cast<KpVec2f*>(fan.data()), 3001, triangles));
+    EXPECT_EQ(log.lines(), Lines{"E [] temporary storage exceeded\n"});
+    EXPECT_EQ(triangles.size(), 1);
+
+    Coordinates ball = roundAndCenter<3>(9000);
+    KpDArray<KpDelaunay::Tetrahedron> tetrahedra{{1, 2, 3, 4}};
+    EXPECT_FALSE(KpDelaunay::triangulate3D(reinterpret_cast<KpVec3f*>(ball.data()), 9001, tetrahedra));
+    EXPECT_EQ(log.lines().size(), 1);  // this one is not told of
+    EXPECT_EQ(tetrahedra.size(), 1);
+}
+
+template <int Size>
+void fillsRim(int limit)
+{
+    CavityRim<Size> rim;
+    for (int round = 0; round < 2; ++round, rim.clear()) {
+        for (int i = 0; i < limit; ++i)
+            ASSERT_TRUE(rim.flip({i / 100, i % 100}));
+        EXPECT_FALSE(rim.flip({-1, 0}));
+        EXPECT_TRUE(rim.flip({0, 5}));  // taken out
+        EXPECT_EQ(rim.begin()[5], (Face<Size>{(limit - 1) / 100, (limit - 1) % 100}));
+        EXPECT_TRUE(rim.flip({-1, 0}));
+        EXPECT_EQ(rim.size(), limit);
+    }
+}
+
+TEST(KpDelaunay, boundsTheRim)
+{
+    fillsRim<2>(1025);
+    fillsRim<3>(16385);
+    CavityRim<2> rim;
+    for (const Face<2>& face : {Face<2>{1, 2}, {1, 2}, {3, 4}, {1, 2}})
+        rim.flip(face);  // two faces aren't searched, and of equals the first goes
+    EXPECT_EQ(std::vector(rim.begin(), rim.end()), (std::vector<Face<2>>{{3, 4}, {1, 2}}));
+}
+
+TEST(KpDelaunay, drawsItsTriangles)
+{
+    const TempFolder folder;
+    const std::string path = folder / "mesh.eps";
+    KpVec2f points[] = {{1, 1}, {5, 1}, {5, 3}, {1, 3}};
+    KpDArray<KpDelaunay::Triangle> triangles{{0, 1, 2}, {0, 2, 3}};
+    const std::string head = "%!PS-Adobe-2.0 EPSF-2.0\n%%BoundingBox: 84 207 511 634\n/M  { moveto } bind def\n"
+                             "/L { lineto } bind def\n/CS { closepath stroke } bind def\n85 208 translate\n"
+                             "425 425 scale\n";
+    ASSERT_TRUE(KpDelaunay::writeEPS(path.c_str(), points, 4, triangles));
+    EXPECT_EQ(contentOf(path), head + "0 0.25 translate\n0.25 0.25 scale\n0 setlinewidth\n"
+                                      "0 0 M 4 0 L 4 2 L CS\n0 0 M 4 2 L 0 2 L CS\nshowpage\n");
+    triangles.clear();
+    for (KpVec2f& p : points)
+        p = KpVec2f(p.y(), p.x());
+    ASSERT_TRUE(KpDelaunay::writeEPS(path.c_str(), points, 4, triangles));
+    EXPECT_EQ(contentOf(path), head + "0.25 0 translate\n0.25 0.25 scale\n0 setlinewidth\nshowpage\n");
+    ASSERT_TRUE(KpDelaunay::writeEPS(path.c_str(), nullptr, 0, triangles));
+    EXPECT_EQ(contentOf(path), head + "showpage\n");
+    EXPECT_FALSE(KpDelaunay::writeEPS((folder / "no/where").c_str(), points, 4, triangles));
+}
+
+}  // namespace

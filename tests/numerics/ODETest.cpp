@@ -1,0 +1,226 @@
+#include <kplib/numerics/KpODE2.h>
+#include <kplib/numerics/KpODE3.h>
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <limits>
+
+namespace {
+
+using Attempt = int (KpODE3::*)(KpVec3f&, KpVec3f&, KpVec3f&) const;
+
+struct MethodCase {
+    const char* name;
+    Attempt attempt;
+    int method, order, errorOrder;  // powers of the step in the error of a step, and in its estimate
+};
+
+const MethodCase methods[] = {
+    {"rk21", &KpODE3::rk21, KpODE3::RK21, 3, 2}, {"rk32", &KpODE3::rk32, KpODE3::RK32, 4, 3},
+    {"rk43", &KpODE3::rk43, KpODE3::RK43, 5, 4}, {"rk54", &KpODE3::rk54, KpODE3::RK54, 6, 5},
+    {"rkck", &KpODE3::rkck, KpODE3::RKCK, 6, 5},
+};
+
+// Its curves are x(t) = tan(t + a), y(t) = y0 exp(sin t) with z the time: no order condition is empty on it.
+int curved(const KpVec3f& x, KpVec3f& derivative, void* /*userData*/)
+{
+    derivative = KpVec3f(1 + x.x() * x.x(), x.y() * std::cos(x.z()), 1);
+    return 0;
+}
+
+TEST(KpODE, attemptsHaveTheOrderOfTheirMethod)
+{
+    for (const MethodCase& c : methods) {
+        SCOPED_TRACE(c.name);
+        float errors[2], estimates[2];
+        const float h = c.order == 6 ? 0.5F : 0.25F;
+        for (int i = 0; i < 2; ++i) {
+            const float step = h / static_cast<float>(1 + i);
+            KpODE3 ode;
+            ode.setRightHandSide(curved, nullptr);
+            ode.setNormalization(0);
+            ode.init(KpVec3f(0.2F, 1, 0), step);
+            KpVec3f y, f, error, field;
+            ASSERT_EQ((ode.*c.attempt)(y, f, error), 0);
+            curved(y, field, nullptr);
+            EXPECT_EQ(f, field);
+            errors[i] = (y - KpVec3f(std::tan(step + std::atan(0.2F)), std::exp(std::sin(step)), step)).length();
+            estimates[i] = error.length();
+        }
+        EXPECT_GT(std::log2(errors[0] / errors[1]), c.order - 0.6F);  // any wrong coefficient costs an order
+        EXPECT_GT(std::log2(estimates[0] / estimates[1]), c.errorOrder - 0.6F);
+        EXPECT_LT(errors[1], estimates[1]);
+    }
+}
+
+TEST(KpODE, samplesTheCircleByItsArcLength)
+{
+    for (const MethodCase& c : methods) {
+        for (const float orientation : {1.0F, -1.0F}) {
+            SCOPED_TRACE(testing::Message() << c.name << ' ' << orientation);
+            KpODE2 ode;
+            ode.setMethod(c.method);
+            ode.setOrientation(orientation);
+            ode.setTolerance(1e-4F);
+            ode.setHMinMax(1e-4F, 0.5F);
+            ode.setHSampling(0.03F);
+            ode.init(KpVec2f(2, 0), 5);  // far too long a step
+            for (int i = 1; i <= 300; ++i) {
+                KpVec2f point, derivative, second;
+                ASSERT_EQ(ode.next(point, derivative, second), 0);
+                const float angle = orientation * 0.03F * static_cast<float>(i) / 2;
+                const KpVec2f radius(std::cos(angle), std::sin(angle));
+                EXPECT_LT((point - radius * 2.0F).length(), 0.01F) << i;
+                // The derivatives are by the parameter of the segment: dt along the circle, dt squared by its
+                // curvature.
+                const float dt = derivative.length();
+                EXPECT_GT(derivative.dot(KpVec2f(-radius.y(), radius.x())) * orientation, 0.999F * dt) << i;
+                EXPECT_LT((second + radius * (dt * dt / 2)).length(), 0.2F * dt * dt) << i;
+            }
+        }
+    }
+}
+
+// Along x with steps of ever 0.5 until the field ends.
+int half(const KpVec2f& x, KpVec2f& derivative, void* code)
+{
+    derivative = KpVec2f(3, 0);
+    return x.x() <= 2 ? 0 : *static_cast<int*>(code);
+}
+
+TEST(KpODE, staysAtTheEndOfItsCurveOrGoesOnAlongTheLastCubic)
+{
+    int code = 77;
+    KpODE2 ode;
+    ode.setRightHandSide(half, &code);
+    ode.setHMinMax(0.1F, 0.5F);
+    ode.setHSampling(0.25F);
+    ode.init(KpVec2f(0, 1), 0.5F);
+    KpVec2f point;
+    for (int i = 1; i <= 8; ++i) {
+        ASSERT_EQ(ode.next(point), 0);
+        EXPECT_NEAR(point.x(), 0.25F * static_cast<float>(i), 1e-5F);
+    }
+    KpODE2 flagged = ode;
+    for (int i = 0; i < 2; ++i) {
+        EXPECT_EQ(ode.next(point), code);
+        EXPECT_EQ(point, KpVec2f(2, 1));
+    }
+    EXPECT_EQ(ode.status(), code);
+    EXPECT_FLOAT_EQ(ode.h(), 0.5F / 16);  // quartered twice
+    for (int i = 1; i <= 3; ++i) {
+        EXPECT_EQ(flagged.next(point, 1), code);
+        EXPECT_NEAR(point.x(), 2 + 0.25F * static_cast<float>(i), 1e-5F);
+    }
+    flagged.freeze(KpVec2f(5, 6));
+    EXPECT_EQ(flagged.next(point), KpODE2::Frozen);
+    EXPECT_EQ(point, KpVec2f(5, 6));
+}
+
+int nowhere(const KpVec2f& /*x*/, KpVec2f& derivative, void* /*userData*/)
+{
+    derivative = KpVec2f(0, 0);
+    return 0;
+}
+
+int notANumber(const KpVec2f& /*x*/, KpVec2f& derivative, void* /*userData*/)
+{
+    derivative = KpVec2f(std::numeric_limits<float>::quiet_NaN(), 0);
+    return 0;
+}
+
+TEST(KpODE, tellsWhyItEnds)
+{
+    using O = KpODE2;
+    constexpr auto circle = O::defaultRightHandSide;
+    const struct {
+        const char* what;
+        O::RightHandSide field;
+        int method, checkHMin;
+        float tolerance, hMin, hMax;
+        int code, status;
+    } cases[] = {
+        {"no field", nowhere, 2, 0, 0.02F, 0.1F, 10, O::ZeroField, O::ZeroField},
+        {"no such method", circle, 5, 0, 0.02F, 0.1F, 10, O::MethodOutOfRange, O::MethodOutOfRange},
+        {"negative method", circle, -1, 0, 0.02F, 0.1F, 10, O::MethodOutOfRange, O::MethodOutOfRange},
+        {"tolerance out of reach", circle, 2, 0, 0, 0.1F, 10, O::StepTooSmall, O::StepTooSmall},
+        {"no step is good enough", circle, 2, 0, -1, 0, 10, O::StepTooSmall, O::StepTooSmall},
+        {"steps of no length", circle, 2, 0, 0.02F, 0, 0, O::StepTooSmall, O::StepTooSmall},
+        {"short steps unwanted", circle, 2, 1, 0.02F, 0.2F, 0.1F, O::StepTooSmall, O::Success},
+        {"no numbers", notANumber, 2, 0, 0.02F, 0.1F, 10, O::StepTooSmall, O::StepTooSmall},
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.what);
+        KpODE2 ode;
+        ode.setRightHandSide(c.field, nullptr);
+        ode.setMethod(c.method);
+        ode.setCheckHMin(c.checkHMin);
+        ode.setTolerance(c.tolerance);
+        ode.setHMinMax(c.hMin, c.hMax);
+        ode.init(KpVec2f(1, 0));
+        KpVec2f point;
+        int code = 0;
+        for (int i = 0; i < 1000 && code == 0; ++i)
+            code = ode.next(point);
+        EXPECT_EQ(code, c.code);
+        EXPECT_EQ(ode.status(), c.status);
+    }
+}
+
+TEST(KpODE, derivesTheFirstStep)
+{
+    KpODE3 ode;
+    ode.setTolerance(0.0081F);
+    ode.setNormalization(0);
+    ode.init(KpVec3f(0, 2, 0));
+    EXPECT_FLOAT_EQ(ode.h(), 0.15F);  // 0.3, for a field of length 2
+    ode.setTolerance(1e9F);
+    ode.init(KpVec3f(0, 2, 0), -1);
+    EXPECT_FLOAT_EQ(ode.h(), 5);
+    ode.init(KpVec3f(0, 0, 4), 7);  // straight up
+    EXPECT_FLOAT_EQ(ode.h(), 7);
+    KpVec3f point, derivative;
+    EXPECT_EQ(ode.next(point, derivative), 0);
+    EXPECT_LT((derivative - KpVec3f(0, 0, derivative.z())).length(), 1e-6F);
+}
+
+TEST(KpODE, copiesPointToThemselves)
+{
+    KpODE2 ode;
+    int other = 0;
+    KpODE2 copy(ode);
+    EXPECT_EQ(copy.userData(), &copy);
+    ode.setRightHandSide(half, &other);
+    copy = ode;
+    EXPECT_EQ(copy.userData(), &other);
+    copy = KpODE2();
+    EXPECT_EQ(copy.userData(), &copy);
+}
+
+TEST(KpODE, walksAsFarAsAChordIsNear)
+{
+    int code = 9;
+    const struct {
+        bool isStraight;
+        int minSteps, maxSteps;
+        float tolerance;
+        int low, high;
+    } cases[] = {
+        {true, 0, 5, 0.1F, 5, 5},    {true, 0, -3, 0.1F, 0, 0},   {true, 0, 50, 0.1F, 6, 10},  // the field ends
+        {false, 7, 50, 1e-6F, 7, 7}, {false, 0, 50, 1e-6F, 0, 0}, {false, 0, 50, -1, 1, 15},
+    };
+    for (const auto& c : cases) {
+        KpODE2 ode;
+        if (c.isStraight)
+            ode.setRightHandSide(half, &code);
+        ode.setHSampling(0.1F);
+        ode.init(KpVec2f(1, 0), 0.1F);
+        KpVec2f point, derivative;
+        const int steps = ode.nextSL(point, derivative, c.minSteps, c.maxSteps, c.tolerance);
+        EXPECT_GE(steps, c.low);
+        EXPECT_LE(steps, c.high);
+    }
+}
+
+}  // namespace
