@@ -77,8 +77,10 @@ TEST(Polyline2D, changesDropTheBox)
     EXPECT_TRUE(line.boundingBox() == Rectangle2D({0, 2}, {4, 9}));
     line.set(0, {-1, 0});
     EXPECT_TRUE(line.boundingBox() == Rectangle2D({-1, 0}, {4, 9}));
-    line.offset({1, 1});
-    EXPECT_TRUE(line.boundingBox() == Rectangle2D({0, 1}, {5, 10}));
+    line.offset({2, 1});
+    EXPECT_TRUE(line.boundingBox() == Rectangle2D({1, 1}, {6, 10}));
+    line.offset(line.at(0));  // (1, 1), one of its own
+    EXPECT_TRUE(line.boundingBox() == Rectangle2D({2, 2}, {7, 11}));
     line.setVertices({{2, 2}});
     EXPECT_TRUE(line.boundingBox() == Rectangle2D({2, 2}, {2, 2}));
     line.clear();
