@@ -1,4 +1,4 @@
-#include <net/Servers.h>
+#include <net/Nginx.h>
 #include <support/Bench.h>
 
 #include <kplib/net/KpHttpGet.h>

@@ -77,7 +77,7 @@ Volume inWords(Volume& volume)
     constexpr double steps = 65535;
     const double range = static_cast<double>(high) - static_cast<double>(low);
     const double step = range > 0 ? range / steps : 1;
-    KpRawData::mapLinear(words.voxels(), volume.voxels(), count, -static_cast<double>(low), 1 / step);
+    KpRawData::mapLinear(words.voxels(), volume.voxels(), count, step / 2 - static_cast<double>(low), 1 / step);
     words.intercept = volume.intercept + static_cast<double>(low) * volume.slope;
     words.slope = volume.slope * step;
     return words;
@@ -99,11 +99,13 @@ void putSources(DcmItem& data, const std::string& sopClass, const Series& source
 KpResult writeDerived(Volume& reduced, const Series& source, long factor, const std::string& folder,
                       KpProgressInterface& progress, std::string& uid)
 {
+    const SliceFile& front = source.slices.front();
     DcmFileFormat first;
-    if (KpResult loaded = loadDicom(source.slices.front().path.c_str(), first); loaded.isBad())
+    if (KpResult loaded = loadDicom(front.path.c_str(), first); loaded.isBad())
         return loaded;
     OFString sopClass;
     first.getDataset()->findAndGetOFString(DCM_SOPClassUID, sopClass);
+    factor = std::min(factor, static_cast<long>(source.slices.size()));
     uid = newUid(seriesKind);
     Volume words = inWords(reduced);
     const ProgressScope scope(&progress);
@@ -122,6 +124,8 @@ KpResult writeDerived(Volume& reduced, const Series& source, long factor, const 
         putSources(data, sopClass.c_str(), source, z * factor, factor);
         putPlace(data, words, z);
         putPixels(data, words, z);
+        // The values run as they did in the source, dark ones high or low.
+        put(data, DCM_PhotometricInterpretation, front.isInverted ? "MONOCHROME1" : "MONOCHROME2");
         const KpString path(0, "%s/image%04ld.dcm", folder.c_str(), z + 1);
         const OFCondition status = file.saveFile(path.c_str(), EXS_LittleEndianExplicit);
         if (status.bad())

@@ -48,21 +48,6 @@ bool realsOf(DcmItem& item, const DcmTagKey& tag, double* out, unsigned long n)
     return true;
 }
 
-constexpr double shortest = 1e-4, longest = 1e6;  // mm; what is beyond is no measure of a patient
-
-bool isLength(double mm)
-{
-    return mm >= shortest && mm <= longest;
-}
-
-/// Whether these are a place and two directions at right angles.
-bool isPlace(const Vector& position, const Vector& row, const Vector& column)
-{
-    constexpr double tolerance = 0.01;
-    return dot(position, position) <= longest * longest && std::abs(dot(row, row) - 1) < tolerance &&
-           std::abs(dot(column, column) - 1) < tolerance && std::abs(dot(row, column)) < tolerance;
-}
-
 void readPlace(DcmItem& data, SliceFile& slice)
 {
     Vector position{}, row{}, column{};
@@ -199,7 +184,7 @@ KpResult measureSpacing(Series& series, double& spacing)
     std::vector<double> gaps;
     for (size_t i = 1; i < slices.size(); ++i) {
         gaps.push_back(slices[i].place() - slices[i - 1].place());
-        if (gaps.back() < shortest)
+        if (gaps.back() < shortestLength)
             return badInput("'%s' and '%s' lie at the same place", slices[i - 1].path.c_str(), slices[i].path.c_str());
     }
     std::vector<double> sorted = gaps;

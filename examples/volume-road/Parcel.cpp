@@ -89,6 +89,14 @@ bool readChildren(TmMsg& msg, HxParamBundle& bundle, int depth)
     return count >= 0;
 }
 
+/// Whether the library works on such elements.
+bool isVoxelType(KpPrimType type)
+{
+    constexpr KpPrimType::Type types[] = {KpPrimType::Byte, KpPrimType::Short, KpPrimType::UShort,
+                                          KpPrimType::Int,  KpPrimType::Float, KpPrimType::Double};
+    return std::find(std::begin(types), std::end(types), type) != std::end(types);
+}
+
 void writeRegion(TmMsg& msg, const Region& region)
 {
     msg << region.threshold << region.isThresholdGiven << region.components
@@ -140,10 +148,12 @@ bool readGeometry(TmMsg& msg, Volume& volume)
     for (int i = 0; i < 3; ++i) {
         const auto axis = static_cast<size_t>(i);
         volume.dims[axis] = dims[i];
-        if (dims[i] < 1 || dims[i] > longest || !std::isfinite(volume.spacing[axis]) || volume.spacing[axis] <= 0)
+        if (dims[i] < 1 || dims[i] > longest || !isLength(volume.spacing[axis]))
             return false;
     }
-    return volume.type.isValid() && volume.type != KpPrimType::String;
+    const auto& [x, y, normal] = volume.axes;
+    return isPlace(volume.origin, x, y) && dot(normal, cross(x, y)) > 0.9 && dot(normal, normal) < 1.1 &&
+           std::isfinite(volume.slope) && std::isfinite(volume.intercept) && isVoxelType(volume.type);
 }
 
 void writeTree(TmMsg& msg, const HxParamBundle& bundle)

@@ -73,10 +73,11 @@ KpResult receiveMessage(int socket, TmMsg& msg)
 /// The peer confirms a message by a line with the digest of its voxels.
 KpResult awaitConfirmation(int socket, const std::string& hash)
 {
-    KpString line;
-    if (KpSocket::readLine(socket, line) < 1)
+    std::string line(hash.size() + 1, '\0');  // not what a stranger takes for a line: it may never end
+    const int size = static_cast<int>(line.size());
+    if (KpSocket::receive(socket, line.data(), size, 0) != size)
         return badInput("the peer doesn't confirm the message");
-    if (!(line == (hash + "\n").c_str()))
+    if (line != hash + '\n')
         return badInput("the peer has other voxels than those that were sent");
     return KpResult();
 }

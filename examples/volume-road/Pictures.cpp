@@ -118,7 +118,8 @@ std::vector<KpWindowLevel> presetsOf(const HxParamBundle& root)
     const std::array<std::string, 3> texts{root.findTag("G0028-1050", ""), root.findTag("G0028-1051", ""),
                                            root.findTag("G0028-1055", "")};
     std::vector<KpWindowLevel> presets = KpWindowLevel::createFromTags(texts);
-    std::erase_if(presets, [](const KpWindowLevel& p) { return !std::isfinite(p.center()) || !(p.width() >= 1); });
+    std::erase_if(presets,
+                  [](const KpWindowLevel& p) { return !std::isfinite(p.center() + p.width()) || !(p.width() >= 1); });
     return presets;
 }
 

@@ -7,6 +7,7 @@
 #include <kplib/rawdata/KpTypedPointer.h>
 
 #include <array>
+#include <cmath>
 
 using Vector = std::array<double, 3>;
 
@@ -37,6 +38,21 @@ inline double dot(const Vector& a, const Vector& b)
 inline Vector cross(const Vector& a, const Vector& b)
 {
     return {a[1] * b[2] - a[2] * b[1], a[2] * b[0] - a[0] * b[2], a[0] * b[1] - a[1] * b[0]};
+}
+
+constexpr double shortestLength = 1e-4, longestLength = 1e6;  // mm; what is beyond is no measure of a patient
+
+inline bool isLength(double mm)
+{
+    return mm >= shortestLength && mm <= longestLength;
+}
+
+/// Whether these are a place and two directions at right angles.
+inline bool isPlace(const Vector& position, const Vector& row, const Vector& column)
+{
+    constexpr double tolerance = 0.01;
+    return dot(position, position) <= longestLength * longestLength && std::abs(dot(row, row) - 1) < tolerance &&
+           std::abs(dot(column, column) - 1) < tolerance && std::abs(dot(row, column)) < tolerance;
 }
 
 /// A failure whose text is one line for the user, formatted as by printf.

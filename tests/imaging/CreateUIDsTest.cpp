@@ -90,6 +90,9 @@ TEST_F(CreateUIDs, theCounterRisesWhenTheClockGoesBack)
         EXPECT_GT(counterOf(uid), last);
         last = counterOf(uid);
     }
+    fakeTime += 200000;
+    ASSERT_TRUE(creator.createUID(KpCreateUIDs::UIDtype1, uid));
+    EXPECT_EQ(counterOf(uid) % 100000, (last + 1) % 1000);
 }
 
 TEST_F(CreateUIDs, ThreadsNeverGetTheSame)

@@ -104,6 +104,11 @@ TEST(InstanceList, theStoredHashIsTaken)
     EXPECT_TRUE(Utility::checkSOPInstanceUID(&bundle, list));
     EXPECT_FALSE(Utility::checkSOPInstanceUID(&bundle, List({"1.2", "2.4"})));
     EXPECT_FALSE(Utility::checkSOPInstanceUID(&bundle, List({"1.2"})));
+    bundle.set("Image00003", "3.4");
+    EXPECT_FALSE(Utility::checkSOPInstanceUID(&bundle, list));
+    bundle.remove("Image00003");
+    bundle.remove("Image00001");
+    EXPECT_FALSE(Utility::checkSOPInstanceUID(&bundle, list));
     const List prefixed({"1.2", "1.3"});
     Utility::setSopUIDList(&bundle, prefixed);
     EXPECT_FALSE(Utility::checkSOPInstanceUID(&bundle, prefixed));
@@ -111,6 +116,10 @@ TEST(InstanceList, theStoredHashIsTaken)
 
 TEST(InstanceList, aListOutOfOrderIsNone)
 {
+    HxParamBundle empty("B");
+    empty.set("NumInputImages", 0);
+    List none;
+    EXPECT_FALSE(Utility::sopUIDList(&empty, none));
     for (const char* missing : {"Image00001", "Image00002", "NumInputImages"}) {
         HxParamBundle bundle("B");
         Utility::setSopUIDList(&bundle, List({"1.2", "2.3", "3.4"}));
@@ -131,6 +140,8 @@ TEST(InstanceList, referencesAreExpandedToFrames)
     EXPECT_EQ(Utility::getReferencedSOPUIDsAndFrameNumbers(object, true, &ok),
               (Entries{{"1.2.0", -1}, {"1.2.1", -1}, {"1.2.x", -1}}));
     EXPECT_TRUE(ok);
+    object.setTag("G0028-0008", "1");
+    EXPECT_EQ(Utility::getReferencedSOPUIDsAndFrameNumbers(object, true, nullptr)[1].frame, -1);
     object.setTag("G0028-0008", "2");
     EXPECT_EQ(Utility::getReferencedSOPUIDsAndFrameNumbers(object, true, nullptr).size(), 6U);
     EXPECT_EQ(Utility::getReferencedSOPUIDsAndFrameNumbers(object, true, nullptr)[1],

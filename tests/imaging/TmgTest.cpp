@@ -62,9 +62,10 @@ TEST(TmgDateTime, timesAreFormattedAndMadeKeys)
         EXPECT_EQ(Tmg::timeString(each.time, false), each.key);
         EXPECT_EQ(Tmg::timeString(each.time, true), each.inverted);
     }
-    setenv("TZ", "UTC", 1);
-    tzset();
-    EXPECT_EQ(Tmg::splitDateTime(1710469926), (std::pair<long, long>(20240315, 23206)));
+    for (const auto& [zone, time] : {std::pair("XYZ-3", 53206L), std::pair("UTC", 23206L)}) {
+        setenv("TZ", zone, 1);
+        EXPECT_EQ(Tmg::splitDateTime(1710469926), std::pair(20240315L, time));
+    }
     using Texts = std::pair<std::string, std::string>;
     EXPECT_EQ(Tmg::splitAndReformatDateTime("20240315 023206.5", ' '), Texts("2024-MAR-15", "02:32:06"));
     EXPECT_EQ(Tmg::splitAndReformatDateTime("20240315", ' '), Texts());

@@ -1,4 +1,6 @@
+#include "net/Nginx.h"
 #include "net/Servers.h"
+#include "support/TempFolder.h"
 
 #include <kplib/net/KpHttpGet.h>
 
@@ -17,26 +19,17 @@ TEST(KpHttpGet, takesUrlsApart)
         int port;
         const char* path;
     } cases[] = {
-        {"http://h/p", "h", 80, "/p"},
-        {"http://h:8080/p/q?r", "h", 8080, "/p/q?r"},
-        {"http://h", "h", 80, "/"},
-        {"http://h:8080", "h", 8080, "/"},
-        {"http://h/a:b", "h/a", 0, "/"},
-        {"http://", "", 80, "/"},
-        {"http://h/a:7/b:c", "h/a", 7, "/b:c"},
+        {"http://h/p", "h", 80, "/p"},   {"http://h:8080/p/q?r", "h", 8080, "/p/q?r"},
+        {"http://h", "h", 80, "/"},      {"http://h:8080", "h", 8080, "/"},
+        {"http://h/a:b", "h/a", 0, "/"}, {"http://h/a:7/b:c", "h/a", 7, "/b:c"},
     };
     KpHttpGet get;
     for (const auto& c : cases) {
-        EXPECT_TRUE(get.setURL(c.url)) << c.url;
-        EXPECT_EQ(get.host(), c.host) << c.url;
-        EXPECT_EQ(get.port(), c.port) << c.url;
-        EXPECT_EQ(get.path(), c.path) << c.url;
+        EXPECT_TRUE(get.setURL(c.url) && get.host() == c.host && get.port() == c.port && get.path() == c.path) << c.url;
     }
     for (const char* url : {"ftp://h/p", "HTTP://h/p", "", static_cast<const char*>(nullptr)}) {
         EXPECT_TRUE(get.setURL("http://h"));
-        EXPECT_FALSE(get.request(url));
-        EXPECT_EQ(get.host(), "");
-        EXPECT_EQ(get.state(), KpHttpGet::NotConnected);
+        EXPECT_TRUE(!get.request(url) && get.host().empty() && get.state() == KpHttpGet::NotConnected);
     }
 }
 
@@ -66,12 +59,9 @@ TEST(KpHttpGet, sendsOneRequestAConnectionUnlessAllWasRead)
         EXPECT_TRUE(get.request(url.c_str()) && get.status() == 0);            // after a head
         EXPECT_TRUE(get.request(url.c_str(), ULONG_MAX, ULONG_MAX) && all());  // after neither
         EXPECT_EQ(server.connections, 4);
-        EXPECT_EQ(get.bytesRead(), 4);
-        EXPECT_GT(get.elapsedTime(), 0);
+        EXPECT_TRUE(get.bytesRead() == 4 && get.elapsedTime() > 0);
         get.cancel();
         EXPECT_TRUE(get.state() == KpHttpGet::NotConnected && get.status() == 0);
-        EXPECT_TRUE(get.request(url.c_str()) && all());
-        EXPECT_EQ(server.connections, 5);
     }
     requests.erase(std::remove(requests.begin(), requests.end(), head + "\r\n"), requests.end());
     ASSERT_GE(requests.size(), 3U);
@@ -98,13 +88,11 @@ TEST(KpHttpGet, takesWhatServersSend)
         bool isReset = false;
     } cases[] = {
         {"as usual", ok + ten + "\r\n" + body, 10, "", 200},
-        {"lower case, blanks, bare newlines", "HTTP/1.0 206\ncontent-length:\t 10 \n \n" + body, 10, "", 206},
+        {"lower case, blanks, bare newlines", "HTTP/1.0 404\ncontent-length:\t 10 \n \n" + body, 10, "", 404},
         {"no status", "HTTP\r\n" + ten + "\r\n" + body, 10, "", 0},
-        {"not found", "HTTP/1.1 404 Not Found\r\n" + ten + "\r\n" + body, 10, "", 404},
         {"the last length counts", ok + "Content-Length: 3\r\n" + ten + "\r\n" + body, 10, "", 200},
         {"more than the length", ok + ten + "\r\n" + body + "more", 10, "", 200},
         {"length 0", ok + "Content-Length: 0\r\n\r\n", 0, "All data read", 200},
-        {"no number", ok + "Content-Length: x\r\n\r\n", 0, "All data read", 200},
         {"no length", ok + "Date: 10:10\r\nContent-Length\r\n\r\n" + body, -1, missing},
         {"blank in the name", ok + "Content-Length : 10\r\n\r\n" + body, -1, missing},
         {"negative length", ok + "Content-Length: -10\r\n\r\n" + body, -1, missing},
@@ -112,12 +100,10 @@ TEST(KpHttpGet, takesWhatServersSend)
         {"end before the body", ok + ten + "\r\n", 0, "Socket closed"},
         {"longest length", ok + "Content-Length: 99999999999999999999\r\n\r\n012", 3, "Socket closed"},
         {"end in the head", ok + ten, -1, gone},
-        {"end at once", "", -1, gone},
         {"reset in the body", ok + ten + "\r\n012", 3, gone, 0, reset},
         {"reset before the body", ok + ten + "\r\n", -1, gone, 0, reset},
         {"reset in the head", ok, -1, gone, 0, reset},
         {"other first line", "ICY 200 OK\r\n" + ten + "\r\n" + body, -1, odd},
-        {"other first line and no more", "ICY 200 OK\r\n", -1, odd},
         {"empty first line", "\r\n" + ok + ten + "\r\n" + body, -1, odd},
         {"endless line", ok + "X: " + std::string(2 << 20, 'x'), -1, odd},
         {"endless head", ok + fields, -1, odd},
@@ -155,63 +141,73 @@ TEST(KpHttpGet, takesWhatServersSend)
     }
 }
 
+static thread_local bool stopsBehindMutexes = false;
+
+extern "C" {
+int __real_pthread_mutex_unlock(pthread_mutex_t*);
+int __wrap_pthread_mutex_unlock(pthread_mutex_t* mutex);
+
+int __wrap_pthread_mutex_unlock(pthread_mutex_t* mutex)
+{
+    const int result = __real_pthread_mutex_unlock(mutex);
+    if (stopsBehindMutexes)
+        usleep(100);
+    return result;
+}
+}
+
 TEST(KpHttpGet, readsRangesFromNginx)
 {
-    if (!Nginx::isInstalled())
+    if (!kplib::test::Nginx::isInstalled())
         GTEST_SKIP() << "nginx is not installed";
-    const Nginx nginx;
+    const kplib::test::Nginx nginx;
     ASSERT_TRUE(nginx.isRunning);
     KpHttpGet get;
-    const std::string url = nginx.url();
-    std::vector<char> buffer(1 << 20, 'x');
-    for (long spot : Nginx::spots) {
-        const long wanted = std::min<long>(Nginx::size - spot, 1 << 20);
-        ASSERT_TRUE(get.request(url.c_str(), static_cast<unsigned long>(spot),
-                                static_cast<unsigned long>(spot + (1 << 20) - 1)));
-        EXPECT_EQ(get.contentLength(), wanted);
-        EXPECT_EQ(get.status(), 206);
+    std::vector<char> buffer(1 << 20);
+    for (const long spot : nginx.spots) {
+        const auto first = static_cast<unsigned long>(spot);
+        const long wanted = std::min(nginx.size - spot, static_cast<long>(buffer.size()));
+        ASSERT_TRUE(get.request(nginx.url().c_str(), first, first + buffer.size() - 1));
         EXPECT_EQ(get.read(buffer.data(), ULONG_MAX), wanted);
+        EXPECT_EQ(get.status(), 206);
         EXPECT_EQ(std::memcmp(buffer.data(), &spot, sizeof(spot)), 0);
-        EXPECT_EQ(std::count(buffer.begin() + 8, buffer.begin() + std::min(wanted, 65536L), '\0'),
-                  std::min(wanted, 65536L) - 8);
     }
-    ASSERT_TRUE(get.request(url.c_str()));
-    long total = 0;
-    for (long n; (n = get.read(buffer.data(), buffer.size())) > 0;)
-        total += n;
-    EXPECT_EQ(total, Nginx::size);
-    EXPECT_EQ(get.bytesRead(), Nginx::size);
-    EXPECT_TRUE(get.request(url.c_str(), Nginx::size, Nginx::size + 1) && get.contentLength() > 0);
+    ASSERT_TRUE(get.request(nginx.url().c_str()));
+    while (get.read(buffer.data(), buffer.size()) > 0) {
+    }
+    EXPECT_EQ(get.bytesRead(), nginx.size);
+    EXPECT_TRUE(get.request(nginx.url().c_str(), nginx.size, nginx.size + 1) && get.contentLength() > 0);
     EXPECT_EQ(get.status(), 416);
     EXPECT_TRUE(get.request(nginx.url("nothing").c_str()) && get.contentLength() > 0);
     EXPECT_EQ(get.status(), 404);
 }
 
-TEST(KpHttpGetThreads, cancelEndsAReadThatWaits)
+TEST(KpHttpGetThreads, cancelEndsAReadThatWaitsAndMixesNoResponses)
 {
-    ScriptedServer server([](int peer) {  // answers once, and the second time in part
-        for (int i = 0; i < 2 && !ScriptedServer::requestOf(peer).empty(); ++i)
-            put(peer, i == 0 ? "HTTP/1.1 200 OK\r\nContent-Length: 3\r\n\r\n012"
-                             : "HTTP/1.1 200 OK\r\nContent-Length: 10\r\n");
-        char byte;
-        recv(peer, &byte, 1, 0);  // until the client has gone
+    ScriptedServer server([](int peer) {  // sends the start of the range, of which there may be only a part
+        for (std::string text; !(text = ScriptedServer::requestOf(peer)).empty();) {
+            const std::string number = text.substr(text.find('=') + 1, 4);
+            put(peer, "HTTP/1.1 200 OK\r\nContent-Length: 4\r\n\r\n" + number.substr(number.back() == '0'));
+        }
     });
     const std::string url = server.url();
     const size_t descriptors = namesIn("/proc/self/fd").size();
-    for (int i = 0; i < 100; ++i) {
-        KpHttpGet get;
-        std::atomic<bool> isDone = false;
-        std::thread reader([&] {
-            char buffer[10];
-            while (get.request(url.c_str()) && get.read(buffer, sizeof(buffer)) > 0) {
-            }
-            isDone = true;
-        });
-        for (usleep(static_cast<useconds_t>(i * 10)); !isDone; usleep(20))
+    KpHttpGet get;
+    std::atomic<bool> isDone = false;
+    std::thread other([&] {
+        for (stopsBehindMutexes = true; !isDone; usleep(50))
             get.cancel();
-        reader.join();
-        EXPECT_TRUE(get.state() == KpHttpGet::NotConnected || get.state() == KpHttpGet::Failed);
+    });
+    for (unsigned long i = 1000; i < 4000; ++i) {
+        char buffer[5] = "";
+        if (!get.request(url.c_str(), i, i))
+            continue;
+        usleep(static_cast<useconds_t>(i % 7 * 30));
+        EXPECT_TRUE(get.read(buffer, 4) != 4 || buffer == std::to_string(i)) << i << " got " << buffer;
     }
+    isDone = true;
+    other.join();
+    get.cancel();
     for (int i = 0; i < 1000 && namesIn("/proc/self/fd").size() > descriptors; ++i)
         usleep(1000);  // the server's end closes a little later
     EXPECT_EQ(namesIn("/proc/self/fd").size(), descriptors);

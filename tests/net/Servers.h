@@ -1,19 +1,13 @@
 #pragma once
 
-#include <support/TempFolder.h>
-
-#include <kplib/net/KpSocket.h>
-
+#include <algorithm>
 #include <arpa/inet.h>
 #include <atomic>
-#include <csignal>
 #include <functional>
 #include <netinet/tcp.h>
 #include <string>
 #include <string_view>
-#include <sys/prctl.h>
 #include <sys/socket.h>
-#include <sys/wait.h>
 #include <thread>
 #include <unistd.h>
 
@@ -93,59 +87,6 @@ public:
 private:
     Listener listener_;
     std::thread thread_;
-};
-
-/// nginx on a free port, with a sparse file "volume" of 256 MiB that holds its own offset at each spot.
-class Nginx {
-public:
-    static constexpr long size = 256L << 20;
-    static constexpr long spots[] = {0, 65536, (100L << 20) + 12345, size - 8};
-    static bool isInstalled() { return access(program, X_OK) == 0; }
-
-    Nginx()
-    {
-        const std::string volume = folder_.file("volume", "");
-        std::filesystem::resize_file(volume, size);
-        std::fstream file(volume);
-        for (long spot : spots)
-            file.seekp(spot).write(reinterpret_cast<const char*>(&spot), sizeof(spot));
-        file.close();
-        std::string conf = geteuid() == 0 ? "user root;" : "";  // the folder is this user's alone
-        conf += "daemon off; worker_processes 1; pid pid; events {} http { access_log off; sendfile on; "
-                "keepalive_requests 100000000; server { root .; listen 127.0.0.1:" +
-                std::to_string(port) + "; }";
-        for (const char* kind : {"client_body", "proxy", "fastcgi", "uwsgi", "scgi"})
-            conf += std::string(kind) + "_temp_path temporary;";
-        conf = folder_.file("conf", conf + "}");
-        process_ = fork();
-        if (process_ == 0) {
-            prctl(PR_SET_PDEATHSIG, SIGTERM);
-            execl(program, "nginx", "-p", folder_.path.c_str(), "-c", conf.c_str(), "-e", "log", nullptr);
-            _exit(1);
-        }
-        for (int attempt = 0; attempt < 1000 && !isRunning && waitpid(process_, nullptr, WNOHANG) == 0; ++attempt) {
-            usleep(10000);
-            isRunning = KpSocket::close(KpSocket::connect("127.0.0.1", port, 0, 0, 0)) == 0;
-        }
-    }
-    ~Nginx()
-    {
-        if (isRunning && kill(process_, SIGTERM) == 0)
-            waitpid(process_, nullptr, 0);
-    }
-    std::string url(const std::string& name = "volume") const
-    {
-        return "http://127.0.0.1:" + std::to_string(port) + "/" + name;
-    }
-
-    const int port = Listener().port;
-    bool isRunning = false;
-
-private:
-    static constexpr const char* program = "/usr/sbin/nginx";
-
-    TempFolder folder_;
-    pid_t process_ = -1;
 };
 
 }  // namespace kplib::test

@@ -38,9 +38,9 @@ TEST(KpLine2D, theClosestPointMayBeKeptInTheSegment)
         EXPECT_EQ(line.getClosestPoint(each.p, false), each.onLine);
         EXPECT_EQ(line.getClosestPoint(each.p, true), each.onSegment);
     }
-    KpLine2D moved = line;
-    moved.translate(2);
-    EXPECT_EQ(moved.getCoordinates(), (std::vector<KpVec2f>{{1, 2}, {3, 2}}));
+    KpLine2D moved({1, 1}, {4, 5});
+    moved.translate(5);
+    EXPECT_EQ(moved.getCoordinates(), (std::vector<KpVec2f>{{-3, 4}, {0, 8}}));
 }
 
 TEST(KpLine2D, intersectionsIncludeTheEndsOfSegments)

@@ -77,8 +77,10 @@ TEST(Polyline2D, changesDropTheBox)
     EXPECT_TRUE(line.boundingBox() == Rectangle2D({0, 2}, {4, 9}));
     line.set(0, {-1, 0});
     EXPECT_TRUE(line.boundingBox() == Rectangle2D({-1, 0}, {4, 9}));
-    line.offset({1, 1});
-    EXPECT_TRUE(line.boundingBox() == Rectangle2D({0, 1}, {5, 10}));
+    line.offset({2, 1});
+    EXPECT_TRUE(line.boundingBox() == Rectangle2D({1, 1}, {6, 10}));
+    line.offset(line.at(0));  // (1, 1), one of its own
+    EXPECT_TRUE(line.boundingBox() == Rectangle2D({2, 2}, {7, 11}));
     line.setVertices({{2, 2}});
     EXPECT_TRUE(line.boundingBox() == Rectangle2D({2, 2}, {2, 2}));
     line.clear();
@@ -97,9 +99,10 @@ TEST(Polyline2D, closesAndMeasures)
     EXPECT_EQ(line.lengthOfSegment(99), 0);
     EXPECT_TRUE(!line.isClosed() && line.close() && line.isClosed() && line.close());
     EXPECT_EQ(line.size(), 6U);
-    EXPECT_FALSE(Polyline2D({{0, 0}, {0, 0}}).close());
+    EXPECT_FALSE(Polyline2D({{0, 0}, {0, 0}}).close() || Polyline2D({{0, 0}, {0, 0}}).isClosed());
 
     EXPECT_EQ(line.closestPoint({3, 2}).second, KpVec2f(3, 2));
+    EXPECT_EQ(Polyline2D({{0, 2}, {0, 0}, {4, 0}}).closestPoint({2, 2}).second, KpVec2f(0, 2));  // the first of equals
     EXPECT_FALSE(Polyline2D().closestPoint({1, 1}).first);
     EXPECT_EQ(Polyline2D({{7, 7}}).closestPoint({1, 1}).second, KpVec2f(7, 7));
     EXPECT_EQ(Polyline2D({{7, 7}, {7, 7}}).closestPoint({1, 1}).second, KpVec2f(7, 7));
@@ -142,7 +145,8 @@ TEST(Polygon2D, isFilled)
     // On the border: the right and the lower (greater y) side of a square count.
     const Polygon2D square({{0, 0}, {2, 0}, {2, 2}, {0, 2}});
     EXPECT_TRUE(square.contains({2, 1}) && square.contains({1, 2}));
-    EXPECT_FALSE(square.contains({0, 1}) && square.contains({1, 0}));
+    EXPECT_FALSE(square.contains({0, 1}) || square.contains({1, 0}));
+    EXPECT_TRUE(Polygon2D({{0, 0}, {4, 0}, {0, 4}}).contains({2, 2}));
     EXPECT_FALSE(Polygon2D().contains({0, 0}));
 }
 
@@ -155,8 +159,10 @@ TEST(Angle2D, hasThreeVertices)
     EXPECT_EQ(angle.size(), 3U);
     angle.setVertices({{2, 2}, {0, 0}, {2, 2}});
     EXPECT_EQ(angle.angle(), std::make_pair(true, 0.0F));
-    angle.setVertices({{0.03F, 0}, {0, 0}, {2, 2}});  // an arm of 0.0009
-    EXPECT_FALSE(angle.isValid() || angle.angle().first);
+    for (const KpVec2f& end : {KpVec2f(0.03F, 0), KpVec2f(2, 2)}) {  // one arm or the other of 0.0009
+        angle.setVertices({end, {0, 0}, KpVec2f(2.03F, 2) - end});
+        EXPECT_FALSE(angle.isValid() || angle.angle().first);
+    }
     EXPECT_TRUE(Angle2D({{1, 0}, {0, 0}}).isEmpty() && !Angle2D({{1, 0}, {0, 0}}).angle().first);
 }
 

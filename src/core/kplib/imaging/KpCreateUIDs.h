@@ -8,7 +8,7 @@
 ///
 /// The counter is the time of day and counts on where the clock stands still or goes back: within a process it never
 /// repeats, whatever object or thread asks. That the text stays within the 64 characters of DICOM is up to the root.
-/// createUID() may be called on one object by many threads; setters and lastError() are for one thread.
+/// createUID() may be called on one object by many threads, for types that there are; all else is for one thread.
 class KPLIB_API KpCreateUIDs {
 public:
     /// What the identifier is for; the values of the layer above, which stand in the UID as 2 to 6.

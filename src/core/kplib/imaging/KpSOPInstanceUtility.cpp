@@ -4,6 +4,7 @@
 #include <kplib/system/KpCoder.h>
 
 #include <algorithm>
+#include <cstdio>
 #include <string_view>
 
 namespace {

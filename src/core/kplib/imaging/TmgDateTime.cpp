@@ -115,6 +115,7 @@ std::pair<long, long> splitDateTime(long seconds)
 {
     const std::time_t time = seconds;
     std::tm local{};
+    tzset();  // as localtime() does, and localtime_r() need not
     if (!localtime_r(&time, &local))
         return {0, 0};
     return {local.tm_year * 10000L + local.tm_mon * 100L + local.tm_mday + 19000100L,

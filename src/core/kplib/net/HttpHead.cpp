@@ -51,7 +51,8 @@ kplib::detail::HttpHead::State kplib::detail::HttpHead::stateAfterLine()
 void kplib::detail::HttpHead::takeField()
 {
     const size_t colon = line_.find(':');
-    if (colon == std::string::npos || strcasecmp(line_.substr(0, colon).c_str(), "Content-Length") != 0)
+    constexpr std::string_view name = "Content-Length";
+    if (colon != name.size() || strncasecmp(line_.c_str(), name.data(), colon) != 0)
         return;
     hasLength_ = true;
     length_ = std::atoll(line_.c_str() + colon + 1);  // which skips the white space in front

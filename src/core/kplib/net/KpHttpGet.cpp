@@ -61,7 +61,7 @@ KpHttpGet::KpHttpGet()
 
 KpHttpGet::~KpHttpGet()
 {
-    closeConnection();
+    closeConnection(NotConnected);
 }
 
 bool KpHttpGet::setURL(const char* url)
@@ -209,22 +209,22 @@ long long KpHttpGet::contentLength()
 
 void KpHttpGet::cancel()
 {
-    closeConnection();
-    state_ = NotConnected;
+    closeConnection(NotConnected);
 }
 
 void KpHttpGet::setError(const char* text)
 {
     errorText_ = text ? text : KpSocket::lastError().c_str();
-    closeConnection();
-    state_ = Failed;
+    closeConnection(Failed);
 }
 
-void KpHttpGet::closeConnection()
+// In one step: a connection that another thread opens in between would be taken for one without a response under way.
+void KpHttpGet::closeConnection(State next)
 {
     const KpScopedLockT<KpMutex> lock(&closing_);
     const int socket = socket_.exchange(-1);
     status_ = 0;
+    state_ = next;
     if (socket < 0)
         return;
     if (socketInUse_)

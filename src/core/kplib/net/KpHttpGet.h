@@ -80,7 +80,7 @@ private:
 
     bool connect();
     bool receiveHead(kplib::detail::HttpHead& head);
-    void closeConnection();
+    void closeConnection(State next);
 
     int port_ = 0;
     std::string host_, path_, errorText_;

@@ -28,19 +28,23 @@ struct Lentz {
     }
 };
 
-}  // namespace
-
-float KpStatistics::gammln(float x)
+double logGamma(double z)
 {
     constexpr double coefficients[] = {76.18009172947146,  -86.50532032941678,   24.01409824083091,
                                        -1.231739572450155, 0.001208650973866179, -5.395239384953e-06};
-    const double z = static_cast<double>(x);
     const double shifted = z + 5.5;
     const double t = shifted - (z + 0.5) * std::log(shifted);
     double series = 1.000000000190015, y = z;
     for (const double coefficient : coefficients)
         series += coefficient / ++y;
-    return static_cast<float>(std::log(2.5066282746310007 * series / z) - t);
+    return std::log(2.5066282746310007 * series / z) - t;
+}
+
+}  // namespace
+
+float KpStatistics::gammln(float x)
+{
+    return static_cast<float>(logGamma(static_cast<double>(x)));
 }
 
 float KpStatistics::betacf(float a, float b, float x)
@@ -64,15 +68,15 @@ float KpStatistics::betai(float a, float b, float x)
 {
     if (x < 0 || x > 1)
         return 0;
-    const double realX = static_cast<double>(x);
+    const double realA = static_cast<double>(a), realB = static_cast<double>(b), realX = static_cast<double>(x);
     float front = 0;
     if (x != 0 && x != 1) {
-        const float beta = gammln(a + b) - gammln(a) - gammln(b);
-        front = static_cast<float>(std::exp(static_cast<double>(beta) + static_cast<double>(a) * std::log(realX) +
-                                            static_cast<double>(b) * std::log(1 - realX)));
+        // In double precision: of large arguments the logarithms nearly cancel out.
+        const double beta = logGamma(realA + realB) - logGamma(realA) - logGamma(realB);
+        front = static_cast<float>(std::exp(beta + realA * std::log(realX) + realB * std::log(1 - realX)));
     }
     // The fraction converges fast on one side of the mean; symmetry gives the other side.
-    if (realX < (static_cast<double>(a) + 1) / (static_cast<double>(a) + static_cast<double>(b) + 2))
+    if (realX < (realA + 1) / (realA + realB + 2))
         return front * betacf(a, b, x) / a;
     return 1 - front * betacf(b, a, 1 - x) / b;
 }

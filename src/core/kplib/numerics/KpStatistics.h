@@ -3,7 +3,7 @@
 #include <kplib/foundation/KpExport.h>
 
 /// Student's t-test and the special functions under it, after W. H. Press et al., "Numerical Recipes", 2nd edition, 6.1
-/// and 6.4. Results are good to single precision. Pure functions.
+/// and 6.4. Results are good to six digits, with parameters of many thousands to three. Pure functions.
 class KPLIB_API KpStatistics {
 public:
     KpStatistics() = delete;

@@ -4,12 +4,12 @@
 
 namespace {
 
-/// Whether the ray from `p` toward greater x crosses the edge. Horizontal edges are never crossed.
+/// Whether the ray from `p` toward greater x crosses the edge. No `p` passes the first test for a horizontal edge.
 bool crosses(const KpVec2f& p, const KpVec2f& a, const KpVec2f& b)
 {
     if (!(p.y() > std::min(a.y(), b.y()) && p.y() <= std::max(a.y(), b.y()) && p.x() <= std::max(a.x(), b.x())))
         return false;
-    return a.y() != b.y() && (a.x() == b.x() || (p.y() - a.y()) * (b.x() - a.x()) / (b.y() - a.y()) + a.x() >= p.x());
+    return a.x() == b.x() || (p.y() - a.y()) * (b.x() - a.x()) / (b.y() - a.y()) + a.x() >= p.x();
 }
 
 }  // namespace

@@ -29,7 +29,7 @@ void Polyline2D::clear()
     changeVertices().clear();
 }
 
-void Polyline2D::offset(const KpVec2f& v)
+void Polyline2D::offset(KpVec2f v)
 {
     for (KpVec2f& vertex : changeVertices())
         vertex += v;

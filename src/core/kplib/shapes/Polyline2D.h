@@ -25,7 +25,7 @@ public:
     void set(size_t i, const KpVec2f& v);
     void clear();
     /// Adds `v` to all vertices.
-    void offset(const KpVec2f& v);
+    void offset(KpVec2f v);
     void invalidateBoundingBox() { isBoxValid_ = false; }
 
     /// No vertices.

@@ -35,7 +35,7 @@ KpString nameOfNext(const char* name)
 struct KpThreadPrivate {
     explicit KpThreadPrivate(const char* given) : name(nameOfNext(given)) {}
 
-    static KpThreadPrivate* make(const char* name, const char* parameters);
+    static KpThreadPrivate* make(const char* name, const char* failure);
     static void* startIt(void* object);
 
     pthread_attr_t attributes{};
@@ -46,11 +46,12 @@ struct KpThreadPrivate {
     KpString name;
 };
 
-KpThreadPrivate* KpThreadPrivate::make(const char* name, const char* parameters)
+/// `failure`: the error line, formatted with the error's code.
+KpThreadPrivate* KpThreadPrivate::make(const char* name, const char* failure)
 {
     auto* const record = new KpThreadPrivate(name);
     if (const int error = pthread_attr_init(&record->attributes))
-        getTheLogInstance().errorf("KpThread::KpThread(%s) failed (error code: %d)\n", parameters, error);
+        getTheLogInstance().errorf(failure, error);
     return record;
 }
 
@@ -65,9 +66,12 @@ void* KpThreadPrivate::startIt(void* object)
     return nullptr;
 }
 
-KpThread::KpThread() : record_(KpThreadPrivate::make(nullptr, "")) {}
+KpThread::KpThread() : record_(KpThreadPrivate::make(nullptr, "KpThread::KpThread() failed (error code: %d)\n")) {}
 
-KpThread::KpThread(const char* name) : record_(KpThreadPrivate::make(name, "const char*")) {}
+KpThread::KpThread(const char* name) :
+    record_(KpThreadPrivate::make(name, "KpThread::KpThread(const char*) failed (error code: %d)\n"))
+{
+}
 
 KpThread::~KpThread()
 {
