@@ -19,7 +19,8 @@ class KpVec3f;
 /// nearly flat are left out, so the hull may have small gaps.
 ///
 /// Both restart the system's generator with srand(367). They throw KpMemoryException with the result unchanged; memory
-/// is linear in the number of points, and the time about n log n for points in no special order. Any number of threads.
+/// is linear in the number of points, and the time about n log n, for points in no special order. Any number of
+/// threads.
 class KPLIB_API KpDelaunay {
 public:
     using Triangle = std::array<std::int32_t, 3>;     ///< indices of points
@@ -34,6 +35,6 @@ public:
     static bool triangulate3D(KpVec3f* points, int n, KpDArray<Tetrahedron>& tetrahedra);
 
     /// Draws the outlines of `triangles` into an EPS file, to look at, fitted into a square of 425 points. False if
-    /// `path` can't be written to.
+    /// `path` can't be opened; what happens to the bytes after that isn't told.
     static bool writeEPS(const char* path, KpVec2f* points, int n, KpDArray<Triangle>& triangles);
 };
