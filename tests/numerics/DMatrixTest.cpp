@@ -46,6 +46,7 @@ const std::pair<const char*, Matrix> decomposed[] = {
     {"nothing", Matrix::Zero(3, 3)},
     {"rank one", from(3, 1, {1, 2, 3}) * from(1, 3, {3, -1, 2})},
     {"only a superdiagonal", from(3, 3, {0, 1, 0, 0, 0, 2, 0, 0, 0})},
+    {"a zero before the last value", from(3, 2, {0.75F, -1, 0, 0, 0, 1})},
     {"a zero in the diagonal", from(3, 3, {1, 2, 0, 0, 0, 3, 0, 0, 4})},
     {"small", noise(3, 3)},
     {"large numbers", noise(3, 3) * 1e18F},

@@ -148,13 +148,14 @@ TEST(KpODE, tellsWhyItEnds)
         ode.setCheckHMin(c.checkHMin);
         ode.setTolerance(c.tolerance);
         ode.setHMinMax(c.hMin, c.hMax);
-        ode.init(KpVec2f(1, 0));
+        ode.init(KpVec2f(1, 0), 1);
         KpVec2f point;
         int code = 0;
         for (int i = 0; i < 1000 && code == 0; ++i)
             code = ode.next(point);
         EXPECT_EQ(code, c.code);
         EXPECT_EQ(ode.status(), c.status);
+        EXPECT_EQ(std::isnan(point.x()), c.speed == &noNumber);
     }
 }
 
