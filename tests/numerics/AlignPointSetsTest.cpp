@@ -7,7 +7,6 @@
 #include <Eigen/Dense>
 #include <gtest/gtest.h>
 
-#include <numeric>
 #include <random>
 #include <vector>
 
@@ -58,29 +57,14 @@ struct Call {
     KpMat4f align(int mode) const
     {
         KpMat4f result;
-        const KpVec3f *const p1 = points1.data(), *const p2 = points2.data();
-        const int *const i1 = index1.data(), *const i2 = index2.data();
+        const auto call = [&](auto... lists) {
+            kpAlignPointSets(result, points1.data(), points2.data(), lists..., n(), mode);
+        };
         const float *const w1 = weights1.data(), *const w2 = weights2.data();
-        switch (arrays + (isIndexed ? 3 : 0)) {
-        case 0:
-            kpAlignPointSets(result, p1, p2, n(), mode);
-            break;
-        case 1:
-            kpAlignPointSets(result, p1, p2, w1, n(), mode);
-            break;
-        case 2:
-            kpAlignPointSets(result, p1, p2, w1, w2, n(), mode);
-            break;
-        case 3:
-            kpAlignPointSets(result, p1, p2, i1, i2, n(), mode);
-            break;
-        case 4:
-            kpAlignPointSets(result, p1, p2, i1, i2, w1, n(), mode);
-            break;
-        default:
-            kpAlignPointSets(result, p1, p2, i1, i2, w1, w2, n(), mode);
-            break;
-        }
+        const auto withWeights = [&](auto... index) {
+            arrays == 0 ? call(index...) : arrays == 1 ? call(index..., w1) : call(index..., w1, w2);
+        };
+        isIndexed ? withWeights(index1.data(), index2.data()) : withWeights();
         return result;
     }
 };
@@ -131,22 +115,12 @@ Eigen::Matrix4d reference(const Call& call, int mode)
 TEST(KpAlignPointSets, equalsAPlainFitWithAnyListsAndWeights)
 {
     for (int trial = 0; trial < 60; ++trial) {
-        Call call{cloud(25, KpVec3f(2, 3, 4)),
-                  {},
-                  std::vector<int>(20),
-                  std::vector<int>(20),
-                  {},
-                  {},
-                  trial % 2 == 1,
-                  trial / 2 % 3};
+        Call call{cloud(25, KpVec3f(2, 3, 4)), {}, {}, {}, {}, {}, trial % 2 == 1, trial / 2 % 3};
         call.points2 = moved(call.points1, someMotion(KpVec3f(1, 1.5F, trial < 40 ? 0.7F : -0.7F)));
-        std::iota(call.index1.begin(), call.index1.end(), 0);
-        call.index2 = call.index1;
-        if (call.isIndexed) {
-            for (std::size_t i = 0; i < 20; ++i) {
-                call.index1[i] = static_cast<int>(7 * i % 25);
-                call.index2[i] = (call.index1[i] + (i == 3 ? 1 : 0)) % 25;  // one wrong pair: weights tell which list
-            }
+        for (int i = 0; i < 20; ++i) {
+            call.index1.push_back(call.isIndexed ? 7 * i % 25 : i);
+            const bool isWrong = call.isIndexed && i == 3;  // one pair, which tells which list the weights are of
+            call.index2.push_back((call.index1.back() + (isWrong ? 1 : 0)) % 25);
         }
         for (std::size_t i = 0; i < 25; ++i) {
             call.points1[i] += KpVec3f(number(-0.1F, 0.1F), number(-0.1F, 0.1F), number(-0.1F, 0.1F));

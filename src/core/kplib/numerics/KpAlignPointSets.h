@@ -10,8 +10,8 @@
 // `mode`: 0 a rigid motion, 1 a rigid motion with a uniform scale, 2 any affine map; any other leaves `result`.
 // `initial`, if given, is applied after what was found: `result` becomes result * initial at the end in any case.
 // `n`: count of pairs; with none (for lists with weights: or fewer), or with weights whose sum is exactly 0, the
-// identity. Mirrored and flat sets give a proper rotation. O(n), in two or three walks over the lists without a copy.
-// Safe from any thread.
+// identity. Mirrored and flat sets give a proper rotation; the scale of points that are all one is not a number. O(n),
+// in two or three walks over the lists without a copy. Safe from any thread.
 
 /// Pair i is points1[index1[i]] with points2[index2[i]].
 KPLIB_API void kpAlignPointSets(KpMat4f& result, const KpVec3f* points1, const KpVec3f* points2, const int* index1,

@@ -205,7 +205,7 @@ int KpODEBase<Vector>::nextRK(Vector& y, Vector& f, float& hUsed)
         }
         if (state_.h < state_.hMin || state_.h == 0)  // a step of 0 cannot shrink
             return StepTooSmall;
-        const double factor = err == 0 ? 0.5 : std::max(stepFactor(err), 0.5);
+        const double factor = err == 0 ? 0.5 : std::max(0.5, stepFactor(err));  // a NaN counts as 0.5
         state_.h = static_cast<float>(static_cast<double>(state_.h) * factor);
     }
 }

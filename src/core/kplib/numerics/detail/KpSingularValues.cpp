@@ -8,10 +8,17 @@
 namespace kplib::detail {
 namespace {
 
+/// `magnitude` with the sign of `value`. A zero counts as positive whatever its sign, which is left to chance by what
+/// comes before.
+float withSignOf(float value, float magnitude)
+{
+    return value >= 0 ? magnitude : -magnitude;
+}
+
 /// A reflector that makes a scaled vector with the first element `f` and the sum of squares `s` a multiple g of the
 /// first axis; `h` is half the squared length of its normal, negative.
 struct Reflector {
-    Reflector(float f, float s) : g(-std::copysign(std::sqrt(s), f)), h(f * g - s) {}
+    Reflector(float f, float s) : g(-withSignOf(f, std::sqrt(s))), h(f * g - s) {}
     float g, h;
 };
 
@@ -80,7 +87,7 @@ private:
         w_[i] = 0;
         if (scale == 0)
             return;
-        if (i + 1 == m()) {  // the reflector of one element changes a sign: the same to the bit, and no root
+        if (i + 1 == m()) {  // the reflector of one element changes a sign: the same, and no root
             for (int j = i + 1; j < n(); ++j)
                 u(i)[j] = -u(i)[j];
             w_[i] = -u(i)[i];
@@ -244,7 +251,7 @@ private:
     {
         const float x = w_[l], y = w_[k - 1], z = w_[k], g = rv_[k - 1], h = rv_[k];
         const float f = ((y - z) * (y + z) + (g - h) * (g + h)) / (2 * h * y);
-        const float root = std::copysign(pythag(f, 1), f);
+        const float root = withSignOf(f, pythag(f, 1));
         return ((x - z) * (x + z) + h * (y / (f + root) - h)) / x;
     }
 

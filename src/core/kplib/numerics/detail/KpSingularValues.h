@@ -13,8 +13,8 @@ inline float pythag(float a, float b)
     if (a == 0 && b == 0)
         return 0;
     const float magnitudeA = std::abs(a), magnitudeB = std::abs(b);
-    const float greater = std::max(magnitudeA, magnitudeB);
-    const float ratio = std::min(magnitudeA, magnitudeB) / greater;
+    const auto [smaller, greater] = std::minmax(magnitudeA, magnitudeB);  // a NaN is one of the two
+    const float ratio = smaller / greater;
     return static_cast<float>(greater * std::sqrt(1.0 + static_cast<double>(ratio * ratio)));
 }
 
