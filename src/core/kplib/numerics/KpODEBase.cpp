@@ -227,14 +227,14 @@ int KpODEBase<Vector>::next(Vector& point, Vector& derivative, int flag)
 template <typename Vector>
 int KpODEBase<Vector>::next(Vector& point, Vector& derivative, Vector& secondDerivative, int flag)
 {
-    int code = state_.status;
-    if (code == Success)
-        code = advanceToSample();
-    const bool isStopped = code != Success && (!flag || state_.status == Success);
-    if (code != Success && !isStopped)
+    const int code = state_.status == Success ? advanceToSample() : state_.status;
+    if (code != Success && state_.status == Success)
+        return code;  // of setCheckHMin(): there is no sample yet
+    const bool isEnd = code != Success && !flag;
+    if (code != Success && flag)
         advanceDifferences();
-    point = isStopped ? state_.currentPoint : state_.points[0];
-    derivative = isStopped ? state_.currentDerivative : state_.derivatives[0];
+    point = isEnd ? state_.currentPoint : state_.points[0];
+    derivative = isEnd ? state_.currentDerivative : state_.derivatives[0];
     secondDerivative = state_.secondDerivatives[0];
     return code;
 }

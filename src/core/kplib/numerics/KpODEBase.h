@@ -52,7 +52,8 @@ public:
     void setOrientation(float orientation) { state_.orientation = orientation; }
     /// If not 0, the field counts with a length of `orientation` everywhere.
     void setNormalization(int normalization) { state_.normalization = normalization; }
-    /// If not 0, next() ends as soon as a step was below the smallest allowed one.
+    /// If not 0, next() gives StepTooSmall, and no sample, as soon as a step was below the smallest allowed one; the
+    /// status stays.
     void setCheckHMin(int checkHMin) { state_.checkHMin = checkHMin; }
     /// `userData` is passed to each call of `field`; it is the object itself until this is called.
     void setRightHandSide(RightHandSide field, void* userData);
@@ -63,7 +64,7 @@ public:
     void init(const Vector& start, float h0 = 0);
 
     /// The next sample, with its derivatives by the parameter of its own segment, which runs from 0 to 1. Gives
-    /// status(), or StepTooSmall of setCheckHMin(). When the integration has ended, the samples stay at the end of the
+    /// status(), or what setCheckHMin() asks for. When the integration has ended, the samples stay at the end of the
     /// curve, or with `flag` go on along the last cubic. Ends with StepTooSmall, too, where a step no longer advances
     /// the parameter.
     int next(Vector& point, int flag = 0);
