@@ -177,19 +177,29 @@ TEST_F(LogFilesTest, theOldestFilesGo)
     }
 }
 
+TEST_F(LogFilesTest, theFileOfTheSameSecondStays)
+{
+    clockRuns = 0;
+    log->setMaxNumLogFiles(1);
+    ASSERT_TRUE(log->open(true));
+    log->error(nullptr, "kept");
+    ASSERT_TRUE(log->open(true));
+    EXPECT_EQ(contentOf(path()), "E [] kept\n");
+}
+
 TEST_F(LogFilesTest, theEnvironmentSetsLimits)
 {
-    const std::tuple<const char*, const char*, long, KpLogLevel> cases[] = {
-        {"7", "1", 7, KpLogDebug}, {"x", "0", 0, KpLogInfo}, {nullptr, nullptr, 40, KpLogInfo}};
-    for (const auto& [files, debug, limit, level] : cases) {
-        for (const auto& [name, value] : {std::pair("TAMRIN_MAXNUMLOGFILES", files), {"TAMRIN_DEBUG_LOG", debug}})
-            value ? setenv(name, value, 1) : unsetenv(name);
+    EXPECT_TRUE(log->maxNumLogFiles() == 40 && log->logLevel() == KpLogInfo);
+    for (const auto& [files, debug] : {std::pair("7", "1"), {"x", "0"}}) {
+        setenv("TAMRIN_MAXNUMLOGFILES", files, 1);
+        setenv("TAMRIN_DEBUG_LOG", debug, 1);
         const std::unique_ptr<KpLogFile> made(KpLogFile::createInstance());
-        EXPECT_TRUE(made->maxNumLogFiles() == limit && made->logLevel() == level);
-        made->setBaseFolder("/x");
-        made->setBaseFolder("");
-        EXPECT_EQ(made->baseFolder(), KpTmpDir::getSystemTmpPath());
+        EXPECT_TRUE(made->maxNumLogFiles() == std::atoi(files) && made->debugEnabled() == (*debug == '1'));
     }
+    unsetenv("TAMRIN_MAXNUMLOGFILES");
+    unsetenv("TAMRIN_DEBUG_LOG");
+    log->setBaseFolder("");
+    EXPECT_EQ(log->baseFolder(), KpTmpDir::getSystemTmpPath());
 }
 
 TEST_F(LogFilesTest, theConsoleGoesToTheFileAndBack)

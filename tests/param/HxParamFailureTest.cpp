@@ -15,18 +15,15 @@ namespace {
 void liveThroughADay()
 {
     const int numbers[] = {1, 2, 3};
-    float real = 0;
     KpDArray<float> reals;
     HxParamBundle root("Patient of the day");
     root.set("numbers", 3, numbers);
     root.setAsString("text", 3, numbers);
-    root.set("text", "a \"quoted\" text");
     root.bundle("BoundaryIds", 1)->set("x", 1.5);
     root.setTag("G0028-0030", "1\\2");
     HxParamBundle& all = *root.dicomAllCreate();
     all.setPrivateTagInAll("CREATOR", "G0009-xx20", "value");
     all.privateSequenceItemInAll("OTHER", "G0009-xx30", "sequence", 0, true);
-    root.findTag("G0028-0030", real);
     root.findTag("G0028-0030", reals);
     root.findPrivateTag("CREATOR", "G0009-xx20", "");
     HxParamBundle copy(root), third("third");
@@ -36,8 +33,7 @@ void liveThroughADay()
     *copy.find("text", 0, 255) = *root.find("numbers", 0, 255);
     third.move(copy);
     const HxParamBundle moved(std::move(third));
-    KpString text;
-    moved.print(text);
+    textOf(moved);
 }
 
 }  // namespace

@@ -2,11 +2,9 @@
 #include <kplib/system/detail/KpCoderKernels.h>
 
 #include <gtest/gtest.h>
-#include <numeric>
 #include <openssl/evp.h>
 #include <random>
 #include <sys/resource.h>
-#include <unordered_set>
 
 using namespace KpLib;
 using namespace kplib::detail;
@@ -23,12 +21,10 @@ Bytes noise(long size)
     return bytes;
 }
 
-std::vector<long> someLengths()
+/// Every short one, then some.
+long nextLength(long n)
 {
-    std::vector<long> lengths(301);
-    std::iota(lengths.begin(), lengths.end(), 0);
-    lengths.insert(lengths.end(), {511, 1024, 4099, 65536, 1000003});
-    return lengths;
+    return n < 300 ? n + 1 : 4 * n + 3;
 }
 
 // The definition, bit by bit.
@@ -43,7 +39,7 @@ std::uint32_t crcOfBits(std::uint32_t crc, const unsigned char* data, long n)
 
 TEST(Crc, ofEveryPathEqualsTheDefinition)
 {
-    for (const long n : someLengths()) {
+    for (long n = 0; n < 1500000; n = nextLength(n)) {
         const long start = n % 17;
         const Bytes bytes = noise(start + n);  // of exact size, so that a read past the end shows
         const auto before = static_cast<std::uint32_t>(n * 0x9E3779B9);
@@ -91,7 +87,7 @@ TEST(KpCoder, givesTheMD5OfPiecesOfAnySize)
     std::mt19937 random(8);
     KpCoder coder;
     MD5 digest;
-    for (const long n : someLengths()) {
+    for (long n = 0; n < 1500000; n = nextLength(n)) {
         const Bytes bytes = noise(n);
         coder.crcMD5Init();
         for (long done = 0, size = 0; done < n; done += size) {
@@ -246,13 +242,11 @@ TEST(KpUUID, goesThroughItsTexts)
 TEST(KpUUID, isRandomOrZeroWithoutASource)
 {
     KpUUID any;
-    std::unordered_set<KpUUID> all;
     for (int i = 0; i < 64; ++i) {
-        const KpUUID uuid = *all.insert(KpUUID::generateUUID()).first;
+        const KpUUID uuid = KpUUID::generateUUID();
         for (int k = 0; k < 16; ++k)
             any.data()[k] |= uuid.data()[k];
     }
-    EXPECT_EQ(all.size(), 64U);
     EXPECT_EQ(any.toString(), std::string(32, 'F').c_str()) << "bits that are never set";
 
     rlimit before{};

@@ -11,7 +11,6 @@
 
 #include <algorithm>
 #include <fcntl.h>
-#include <random>
 #include <sys/stat.h>
 
 using kplib::test::contentOf;
@@ -64,25 +63,6 @@ TEST_F(KpDirectoryTest, listsAreSortedByBytes)
     EXPECT_EQ(joined(names), ".hidden|sub|");
     EXPECT_TRUE(KpDirectory::scanSortedByName(tree.c_str(), list, folders, "*"));
     EXPECT_EQ(joined(list) + joined(folders), start + end + "sub|");
-}
-
-TEST_F(KpDirectoryTest, thousandsOfNamesAreAllThere)
-{
-    std::mt19937 random(1);
-    std::set<std::string> expected;
-    temp.folder("many");
-    while (expected.size() < 5000) {
-        std::string name(1 + random() % 20, 'x');
-        for (char& c : name)
-            c = static_cast<char>(random() % 256);
-        if (name.find_first_of(std::string("/\0", 2)) == std::string::npos && name != "." && name != ".." &&
-            expected.insert(name).second)
-            temp.file("many/" + name);
-    }
-    KpDArray<KpString> names;
-    ASSERT_EQ(KpDirectory::scanSortedByName((temp / "many").c_str(), names, nullptr, false), 5000);
-    EXPECT_TRUE(
-        std::equal(names.begin(), names.end(), expected.begin(), [](auto& a, auto& b) { return b == a.c_str(); }));
 }
 
 TEST_F(KpDirectoryTest, timesCountFrom1601)

@@ -26,8 +26,7 @@ std::string repeated(const std::string& text, int times)
     return all;
 }
 
-template <typename Change>
-std::string changed(const std::string& text, Change change)
+std::string changed(const std::string& text, void (KpFilename::*change)())
 {
     KpFilename name(text.c_str());
     (name.*change)();

@@ -1,13 +1,11 @@
 #include "support/LogCapture.h"
+#include "support/TempFolder.h"
 
 #include <kplib/system/KpDSO.h>
 #include <kplib/system/KpFilename.h>
 
 #include <dlfcn.h>
-#include <filesystem>
-#include <fstream>
 #include <gtest/gtest.h>
-#include <unistd.h>
 
 namespace fs = std::filesystem;
 using kplib::test::Lines;
@@ -22,7 +20,6 @@ protected:
     {
         KpDSO::dsoSearchPath.clear();
         KpDSO::verbose = 0;
-        fs::remove_all(folder);
     }
 
     std::string plugin(const std::string& name) const
@@ -32,8 +29,8 @@ protected:
         return folder / name;
     }
 
-    std::string folderName = testing::TempDir() + "kplib_plugins_XXXXXX";  // what is loaded twice is there but once
-    const fs::path folder = mkdtemp(folderName.data());
+    const kplib::test::TempFolder temp;  // what is loaded twice is there but once
+    const fs::path folder = temp.path;
     LogCapture log;
 };
 
@@ -120,27 +117,23 @@ TEST_F(SharedObject, isCalledWithUpToFivePointersWhileItIsOpen)
 
 TEST_F(SharedObject, tellsInTheLogThatThereWasSomething)
 {
-    const auto linesOf = [](auto work) {
-        LogCapture::lines().clear();
-        work();
-        return LogCapture::lines();
-    };
+    const auto linesOf = [](auto) { return std::exchange(LogCapture::lines(), {}); };
     const std::string path = plugin("libother.so"), missing = folder / "libmissing.so";
     KpDSO object(nullptr);
-    const auto open = [&](const std::string& s, bool quiet) { return linesOf([&] { object.open(s.c_str(), quiet); }); };
-    const auto look = [&](const char* symbol) { return linesOf([&] { object.getSymbol(symbol); }); };
+    const auto open = [&](const std::string& name, bool quiet) { return linesOf(object.open(name.c_str(), quiet)); };
+    const auto look = [&](const char* symbol) { return linesOf(object.getSymbol(symbol)); };
     const std::string line = "  [] DSO", fixed = "  [] Fixed symbol sampleUnderscored by prepending '_'\n";
     EXPECT_EQ(open(missing, false), Lines{line});
     EXPECT_EQ(open(missing, true), Lines());
     EXPECT_EQ(open(path, false), Lines());
     EXPECT_EQ(look("sampleNone"), Lines());
     EXPECT_EQ(look("sampleUnderscored"), Lines{fixed});
-    EXPECT_EQ(object.executeInt("sampleUnderscored"), 77);
     KpDSO::verbose = 1;
     EXPECT_EQ(look("sampleNone"), (Lines{line, "E [] DSO"}));
     EXPECT_EQ(look("sampleUnderscored"), (Lines{line, fixed}));
     EXPECT_EQ(open(path, false), (Lines{line, line, "E [] DSO"})) << "with the look for the function that starts it";
 
+    EXPECT_EQ(object.executeInt("sampleUnderscored"), 77);
     KpString message;
     EXPECT_EQ(object.tryOpen(path.c_str(), message), 0);
     EXPECT_EQ(message, ("Successfully opened " + path + ".\n").c_str());
