@@ -28,7 +28,7 @@ TEST(KpString, keepsItsCapacityRules)
 {
     KpString text, added = "123456789012345", joined = added + "";  // the second fills its 16
     EXPECT_TRUE(text.capacity() == 16 && KpString(text).capacity() == 1 && KpString("abcdef", 1, 3).capacity() == 4);
-    for (const auto& [length, capacity] : {std::pair(63, 64), std::pair(100, 101), std::pair(1, 101)}) {
+    for (const auto& [length, capacity] : {std::pair(63, 64), std::pair(64, 65), std::pair(1, 65)}) {
         text.printf("%0*d", length, 7);
         EXPECT_TRUE(text.length() == length && text.capacity() == capacity) << length;
     }
@@ -129,6 +129,7 @@ TEST(KpStringTokenizerGeneral, splitsAtTheBytesOfItsSet)
     const Case cases[] = {
         {",;", ";a,b;c d", {"a", "b", "c d"}},
         {"", " a \"b,c\" \\,d", {" a b,c ,d"}},
+        {nullptr, "a,b", {"a,b"}},
         {",", "\"a,b\"c,,d\\,e", {"a,bc", "d,e"}},
         {"\xE9", "a\xE9z,c", {"a", "z,c"}},
         {"\"\\", "a\"b c\"d\\e", {"a", "b c", "d", "e"}},  // a separator is nothing else
@@ -158,7 +159,8 @@ TEST(KpStdStringTokenizer, splitsAtAnyOfASet)
 
 TEST(StringUtils, convertsTheWholeTextOrNothing)
 {
-    const std::pair<const char*, long> cases[] = {{"0x10", 16}, {"010", 8}, {" -3", -3}, {"12 ", 7}, {"", 7}};
+    const std::pair<const char*, long> cases[] = {{"0x10", 16}, {"010", 8}, {" -3", -3},
+                                                  {"12 ", 7},   {"", 7},    {nullptr, 7}};
     for (const auto& [text, expected] : cases) {
         bool ok = expected == 7;
         EXPECT_EQ(StringUtils::toLong(text, 7, &ok), expected);
