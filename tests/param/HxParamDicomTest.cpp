@@ -78,12 +78,11 @@ TEST(DicomTags, ofEnhancedObjectsAreFoundInTheGroups)
 
 TEST(DicomTags, areMappedForEnhancedObjects)
 {
-    const char* const cases[][2] = {{"G0018-0081", "G0018-9082"},
-                                    {"g0008-002a", "G0018-9074"},
-                                    {"x0018.1060 and on", "G0020-9153"},
-                                    {"G0018-0082", "-"},
-                                    {"G0018", "-"}};
-    for (const auto& [tag, expected] : cases) {
+    for (const auto& [tag, expected] : {std::pair("G0018-0081", "G0018-9082"),
+                                        {"g0008-002a", "G0018-9074"},
+                                        {"x0018.1060 and on", "G0020-9153"},
+                                        {"G0018-0082", "-"},
+                                        {"G0018", "-"}}) {
         KpString mapped("-");
         EXPECT_EQ(HxParamBundle::replaceTag(tag, mapped), expected != std::string("-")) << tag;
         EXPECT_EQ(mapped, expected);
