@@ -155,7 +155,6 @@ TEST(MD5, isNullUnlessItsTextHas32Characters)
 {
     const char* const text = "0123456789ABCDEFFEDCBA9876543210";
     MD5 digest;
-    EXPECT_EQ(hex(digest), "");
     digest.fromString(text);
     EXPECT_EQ(hex(digest), text);
     for (const std::string& other : {std::string(31, 'A'), std::string(33, 'A')}) {
@@ -210,8 +209,7 @@ TEST(MD5Coder, framesTextsAndTellsEmptyBlocks)
         {(MD5Coder() << withNul).md5(), image(3L) + withNul},
         {(MD5Coder() << std::string()).md5(), image(0L)},
         {MD5Coder().append("abc", 3).md5(), "abc"},
-        {MD5Coder().append(nullptr, 0).md5(), image(4711)},
-    };
+        {MD5Coder().append(nullptr, 0).md5(), image(4711)}};
     for (const auto& [digest, bytes] : cases)
         EXPECT_EQ(hex(digest), hex(reference(bytes))) << testing::PrintToString(bytes);
     MD5Coder coder;

@@ -35,10 +35,8 @@ TEST(KpCPUInfo, dividesTheTotalsThatDoNotContradictEachOther)
     const struct {
         kplib::platform::ProcessorCounts totals;
         CpuCounts expected;  // -1: none
-    } cases[] = {
-        {{3, 4, 4}, {3, 1, 1}},    {{2, 16, 32}, {2, 8, 2}},  {{1, 4, 7}, {1, 4, 1}},
-        {{1, 4, 3}, {-1, -1, -1}}, {{1, 0, 4}, {-1, -1, -1}}, {{0, 4, 4}, {-1, -1, -1}},
-    };
+    } cases[] = {{{3, 4, 4}, {3, 1, 1}},    {{2, 16, 32}, {2, 8, 2}},  {{1, 4, 7}, {1, 4, 1}},
+                 {{1, 4, 3}, {-1, -1, -1}}, {{1, 0, 4}, {-1, -1, -1}}, {{0, 4, 4}, {-1, -1, -1}}};
     for (const auto& c : cases) {
         CpuCounts counts{-1, -1, -1};
         EXPECT_EQ(countsOf(c.totals, counts), c.expected.packages > 0);
@@ -57,8 +55,7 @@ TEST(KpCPUInfo, agreesWithTheKernel)
     }
     const std::pair<unsigned, const char*> features[] = {
         {1, "mmx"},   {2, "mmxext"}, {4, "3dnow"},    {8, "3dnowext"},  {16, "sse"},      {32, "sse2"},
-        {64, "cmov"}, {512, "pni"},  {1024, "ssse3"}, {2048, "sse4_1"}, {4096, "sse4_2"}, {8192, "avx"},
-    };
+        {64, "cmov"}, {512, "pni"},  {1024, "ssse3"}, {2048, "sse4_1"}, {4096, "sse4_2"}, {8192, "avx"}};
     std::istringstream in(told("flags"));
     const std::set<std::string> flags{std::istream_iterator<std::string>(in), {}};
     unsigned expected = 0;

@@ -61,8 +61,7 @@ TEST_F(SharedObject, isLookedForFromTheLastFolderToTheFirst)
     EXPECT_NE(KpDSO("libm.so.6").getSymbol("cos"), nullptr) << "when all folders have failed";
     const std::pair<const char*, const char*> cases[] = {
         {"pick", "two/libpick.so"}, {"libpick", "two/libpick.so"},      {"libpick.7", "two/libpick.7"},
-        {"skip", "one/libskip.so"}, {"sub/deep.so", "one/sub/deep.so"}, {"text", "one/libtext.so"},
-    };
+        {"skip", "one/libskip.so"}, {"sub/deep.so", "one/sub/deep.so"}, {"text", "one/libtext.so"}};
     for (const auto& [name, expected] : cases) {
         KpDSO object(nullptr);
         EXPECT_EQ(object.open(name, true), 0) << name;
@@ -80,12 +79,10 @@ TEST_F(SharedObject, isLookedForFromTheLastFolderToTheFirst)
 
 TEST_F(SharedObject, isStartedAtEachOpeningIfItHasAFunctionForThat)
 {
-    const std::tuple<const char*, const char*, int> cases[] = {
-        {"a/libsample.x.so", "a/libsample.x.so", 0},
-        {"b/libsample.so", "b/libsample", 1},
-        {"xyzsample.9", "xyzsample.9", 1},
-        {"d/s.", "d/s.", 0},
-    };
+    const std::tuple<const char*, const char*, int> cases[] = {{"a/libsample.x.so", "a/libsample.x.so", 0},
+                                                               {"b/libsample.so", "b/libsample", 1},
+                                                               {"xyzsample.9", "xyzsample.9", 1},
+                                                               {"d/s.", "d/s.", 0}};
     for (const auto& [name, opened, expected] : cases) {
         plugin(name);
         KpDSO object((folder / opened).c_str());

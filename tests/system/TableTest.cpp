@@ -299,8 +299,7 @@ TEST(KpTable, checkFindsWhatDoesNotHoldUnlessItIsSkipped)
         {"row outside", row + to, bytes(outside)},
         {"cell outside", row + list, bytes(cellOutside)},
         {"target between rows", cell, bytes(row + 1)},
-        {"list without end", cell + 1, bytes(cell)},
-    };
+        {"list without end", cell + 1, bytes(cell)}};
     for (const auto& [what, place, wrong] : faults) {
         const std::string saved(static_cast<char*>(place), wrong.size());
         std::memcpy(place, wrong.data(), wrong.size());

@@ -8,18 +8,16 @@
 
 TEST(KpVersion, readsNumbersJoinedByDots)
 {
-    const std::pair<const char*, const char*> cases[] = {
-        {"7.100", "7.100.0.0"},
-        {"7", "7.0.0.0"},
-        {"1.2.3.4.5", "1.2.3.4"},
-        {" 1. 2", "1.2.0.0"},
-        {"", "0.0.0.0"},
-        {"1.2.", "0.0.0.0"},
-        {"1.4294967296", "0.0.0.0"},
-        {"1.x", "0.0.0.0"},
-        {"1 .2", "0.0.0.0"},
-        {"4294967295", "4294967295.0.0.0"},
-    };
+    const std::pair<const char*, const char*> cases[] = {{"7.100", "7.100.0.0"},
+                                                         {"7", "7.0.0.0"},
+                                                         {"1.2.3.4.5", "1.2.3.4"},
+                                                         {" 1. 2", "1.2.0.0"},
+                                                         {"", "0.0.0.0"},
+                                                         {"1.2.", "0.0.0.0"},
+                                                         {"1.4294967296", "0.0.0.0"},
+                                                         {"1.x", "0.0.0.0"},
+                                                         {"1 .2", "0.0.0.0"},
+                                                         {"4294967295", "4294967295.0.0.0"}};
     struct DotBetweenThousands : std::numpunct<char> {
         char do_thousands_sep() const override { return '.'; }
         std::string do_grouping() const override { return "\3"; }
@@ -55,12 +53,10 @@ TEST(KpBuildInfo, tellsWhatTheBuildHasSet)
     const std::string build = "Build " + KpBuildInfo::getBuildTag("VERSION_BUILD");
     const std::string time = KpBuildInfo::getBuildTag("VERSION_BUILD_TIME");
     EXPECT_TRUE(std::regex_match(time, std::regex(R"(\d{4}-[A-Z][a-z]{2}-\d\d \d\d:\d\d:\d\d)"))) << time;
-    const std::pair<int, std::string> strings[] = {
-        {1, version.toString()},
-        {4, three + " (Linux, 64-bit " + build + ")"},
-        {8, three + " (" + build + ", " + time + ")"},
-        {9, version.toString() + " (" + time + ")"},
-    };
+    const std::pair<int, std::string> strings[] = {{1, version.toString()},
+                                                   {4, three + " (Linux, 64-bit " + build + ")"},
+                                                   {8, three + " (" + build + ", " + time + ")"},
+                                                   {9, version.toString() + " (" + time + ")"}};
     for (const auto& [flags, expected] : strings)
         EXPECT_EQ(KpBuildInfo::getBuildString(flags), expected) << flags;
 }
