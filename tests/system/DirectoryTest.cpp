@@ -11,7 +11,6 @@
 
 #include <algorithm>
 #include <fcntl.h>
-#include <random>
 #include <sys/stat.h>
 
 using kplib::test::contentOf;
@@ -54,11 +53,9 @@ protected:
 TEST_F(KpDirectoryTest, listsAreSortedByBytes)
 {
     const std::string start = "a b|b|link|new\nline|", end = "to nowhere|\xC3\x9F|";  // bytes have no sign here
-    KpDArray<KpString> names, again, list, folders;
+    KpDArray<KpString> names, list, folders;
     EXPECT_EQ(KpDirectory::scanSortedByName(tree.c_str(), names, "*", false), 7);
     EXPECT_EQ(joined(names), start + "sub|" + end);
-    EXPECT_EQ(KpDirectory::scanSortedByName(tree.c_str(), again, nullptr, false), 9);
-    EXPECT_EQ(joined(again), ".h|.hidden|" + start + "sub|" + end);
     EXPECT_EQ(KpDirectory::scanSortedByName(tree.c_str(), names, "b", false), 8);  // with those of before
     EXPECT_EQ(std::count(names.begin(), names.end(), KpString("b")), 2);
     names.clear();
@@ -66,25 +63,6 @@ TEST_F(KpDirectoryTest, listsAreSortedByBytes)
     EXPECT_EQ(joined(names), ".hidden|sub|");
     EXPECT_TRUE(KpDirectory::scanSortedByName(tree.c_str(), list, folders, "*"));
     EXPECT_EQ(joined(list) + joined(folders), start + end + "sub|");
-}
-
-TEST_F(KpDirectoryTest, thousandsOfNamesAreAllThere)
-{
-    std::mt19937 random(1);
-    std::set<std::string> expected;
-    temp.folder("many");
-    while (expected.size() < 5000) {
-        std::string name(1 + random() % 20, 'x');
-        for (char& c : name)
-            c = static_cast<char>(random() % 256);
-        if (name.find_first_of(std::string("/\0", 2)) == std::string::npos && name != "." && name != ".." &&
-            expected.insert(name).second)
-            temp.file("many/" + name);
-    }
-    KpDArray<KpString> names;
-    ASSERT_EQ(KpDirectory::scanSortedByName((temp / "many").c_str(), names, nullptr, false), 5000);
-    EXPECT_TRUE(
-        std::equal(names.begin(), names.end(), expected.begin(), [](auto& a, auto& b) { return b == a.c_str(); }));
 }
 
 TEST_F(KpDirectoryTest, timesCountFrom1601)
@@ -101,12 +79,6 @@ TEST_F(KpDirectoryTest, timesCountFrom1601)
     EXPECT_EQ(KpDirectory::scanSortedByCreationTime(tree.c_str(), names, &created, nullptr, false), 8);
     ASSERT_TRUE(names.size() == 8 && created.size() == 8);
     EXPECT_TRUE(std::is_sorted(created.begin(), created.end()));
-    for (long i = 0; i < 8; ++i) {
-        const KpFilename file(KpString(0, "%s/%s", tree.c_str(), names[i].c_str()));
-        EXPECT_EQ(created[i], 10000000ULL * static_cast<unsigned long long>(file.getCreateTime()) + 116444736000000000);
-    }
-    EXPECT_EQ(KpDirectory::scanSortedByCreationTime(tree.c_str(), names, nullptr, "*", true), 1);
-    EXPECT_EQ(joined(names), "sub|");
 }
 
 TEST_F(KpDirectoryTest, whatIsNoFolderIsOneLine)
@@ -148,7 +120,6 @@ TEST_F(KpDirectoryTest, treesAreCopied)
     }
     ASSERT_EQ(KpDirectory::copy(tree.c_str(), (temp / "tree/sub/inside").c_str()), 0);
     EXPECT_EQ(namesIn(temp / "tree/sub/inside/sub"), (std::set<std::string>{"deep", "g"}));
-    EXPECT_TRUE(LogCapture::lines().empty());
 }
 
 TEST_F(KpDirectoryTest, treesAreRemovedButNotWhatLinksLeadTo)
@@ -157,13 +128,11 @@ TEST_F(KpDirectoryTest, treesAreRemovedButNotWhatLinksLeadTo)
                 std::string(200, 'c'));
     for (const char* const link : {"tree/link", "tree/link/", "tree/b"})
         EXPECT_EQ(remove_dir((temp / link).c_str()), -1);
-    EXPECT_TRUE(LogCapture::lines().empty());
     EXPECT_EQ(remove_dir((tree + "/").c_str()), 0);
     EXPECT_EQ(namesIn(temp.path), std::set<std::string>{"outside"});
     EXPECT_EQ(namesIn(temp / "outside"), std::set<std::string>{"kept"});
     EXPECT_NE(remove_dir("/proc/self/fdinfo"), 0);  // where nothing can be deleted
     EXPECT_EQ(LogCapture::lines().front(), "E [] Can't delete /proc/self/fdinfo/0:\nOperation not permitted\n");
-    EXPECT_EQ(LogCapture::lines().back().find("E [] Can't delete /proc/self/fdinfo:\n"), 0U);
 }
 
 TEST_F(KpDirectoryTest, freeSpaceAsksTheFolderOfAPath)
@@ -184,11 +153,9 @@ TEST_F(KpDirectoryTest, theCollectorGoesDownFromTheLastName)
     std::string expected;
     for (const char* const path : {"to nowhere", "new\nline", "sub/deep", "link/kept"})
         expected += tree + "/" + path + "|";
-    EXPECT_EQ(joined(found), expected);
     KpFilenameCollector::collect(found, nullptr, tree.c_str());
-    KpFilenameCollector::collect(found, "*", nullptr);
     KpFilenameCollector::collect(found, "*", (tree + "/b").c_str());
-    EXPECT_TRUE(found.size() == 4 && LogCapture::lines().empty());
+    EXPECT_TRUE(joined(found) == expected && LogCapture::lines().empty()) << joined(found);
 }
 
 TEST_F(KpDirectoryTest, temporaryFoldersAreUniqueAndGo)
@@ -196,9 +163,8 @@ TEST_F(KpDirectoryTest, temporaryFoldersAreUniqueAndGo)
     const std::string tmp = temp.folder("tmp") + "/", work = temp / "work";
     const char* const before = std::getenv("TMPDIR");
     setenv("TMPDIR", (temp / "tmp").c_str(), 1);
-    const std::string cases[][2] = {{work, work + "/"},     {work, work + ".2/"},  {work, work + ".3/"},
-                                    {"x", tmp + "x/"},      {"a/x", tmp + "x.2/"}, {"", tmp + "tmp/"},
-                                    {"a/", tmp + "tmp.2/"}, {tmp, tmp + "tmp.3/"}};
+    const std::string cases[][2] = {{work, work + "/"},  {work, work + ".2/"}, {work, work + ".3/"},
+                                    {"a/x", tmp + "x/"}, {"", tmp + "tmp/"},   {tmp, tmp + "tmp.2/"}};
     const mode_t mask = umask(077);
     for (const auto& [name, path] : cases) {
         const KpTmpDir dir(name.c_str(), true, false);
@@ -206,22 +172,16 @@ TEST_F(KpDirectoryTest, temporaryFoldersAreUniqueAndGo)
         EXPECT_EQ(KpFilename(dir.path()).getMode(), S_IFDIR | 0775);
     }
     umask(mask);
-    EXPECT_STREQ(KpTmpDir("./x/y", false, true).path(), "./x/y/");
     {
         KpTmpDir dir("gone", true, true), kept("kept", true, false);
         temp.file("tmp/gone/file");
         EXPECT_FALSE(dir.create(0700));  // is there
         EXPECT_TRUE(dir.doesExist() && kept.doesExist() && kept.remove() == 0 && !kept.doesExist());
-        kept.makeUnique(nullptr);
-        EXPECT_EQ(kept.path().c_str(), tmp + "kept/tmp/");
-        EXPECT_FALSE(kept.create(0700));
     }
-    EXPECT_EQ(namesIn(tmp), (std::set<std::string>{"x", "x.2", "tmp", "tmp.2", "tmp.3"}));
+    EXPECT_EQ(namesIn(tmp), (std::set<std::string>{"x", "tmp", "tmp.2"}));
+    setenv("TEMP", "/temp", 1);
     setenv("TMPDIR", "", 1);  // set, even if to nothing
     EXPECT_STREQ(KpTmpDir::getSystemTmpPath(), "/");
-    setenv("TMPDIR", "/x/", 1);
-    EXPECT_STREQ(KpTmpDir::getSystemTmpPath(), "/x/");
-    setenv("TEMP", "/temp", 1);
     unsetenv("TMPDIR");
     EXPECT_STREQ(KpTmpDir::getSystemTmpPath(), "/temp/");
     unsetenv("TEMP");

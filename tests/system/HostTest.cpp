@@ -1,14 +1,11 @@
-#include "support/LogCapture.h"
-
 #include <kplib/system/KpCPUInfo.h>
 #include <kplib/system/KpOSInfo.h>
-#include <kplib/system/KpProcessInfo.h>
 #include <kplib/system/KpSysInfo.h>
 #include <kplib/system/detail/CpuCounts.h>
 
+#include <cstring>
 #include <fstream>
 #include <gtest/gtest.h>
-#include <map>
 #include <set>
 #include <sstream>
 #include <sys/prctl.h>
@@ -20,25 +17,15 @@ using namespace kplib::detail;
 
 namespace {
 
-/// What the kernel tells of the processors: the values of each field, such as "flags".
-std::map<std::string, std::set<std::string>> processors()
+/// What the kernel tells of the first processor: the value of a field, such as "flags".
+std::string told(const std::string& field)
 {
-    std::map<std::string, std::set<std::string>> fields;
     std::ifstream in("/proc/cpuinfo");
     for (std::string line; std::getline(in, line);) {
-        const size_t colon = line.find(':');
-        if (colon != std::string::npos)
-            fields[line.substr(0, line.find_last_not_of("\t ", colon - 1) + 1)].insert(
-                line.substr(std::min(colon + 2, line.size())));
+        if (line.starts_with(field))
+            return line.substr(line.find(':') + 2);
     }
-    return fields;
-}
-
-bool listsThisProcess(const KpDArray<KpSysInfo::ProcessEntry>& list, const char* name)
-{
-    return std::any_of(list.begin(), list.end(), [&](const KpSysInfo::ProcessEntry& entry) {
-        return entry.processId == getpid() && entry.name == name && entry.command == name;
-    });
+    return "";
 }
 
 }  // namespace
@@ -48,40 +35,28 @@ TEST(KpCPUInfo, dividesTheTotalsThatDoNotContradictEachOther)
     const struct {
         kplib::platform::ProcessorCounts totals;
         CpuCounts expected;  // -1: none
-    } cases[] = {
-        {{3, 4, 4}, {3, 1, 1}},    {{2, 16, 32}, {2, 8, 2}},  {{1, 4, 7}, {1, 4, 1}},
-        {{1, 4, 3}, {-1, -1, -1}}, {{1, 0, 4}, {-1, -1, -1}}, {{0, 4, 4}, {-1, -1, -1}},
-    };
+    } cases[] = {{{3, 4, 4}, {3, 1, 1}},    {{2, 16, 32}, {2, 8, 2}},  {{1, 4, 7}, {1, 4, 1}},
+                 {{1, 4, 3}, {-1, -1, -1}}, {{1, 0, 4}, {-1, -1, -1}}, {{0, 4, 4}, {-1, -1, -1}}};
     for (const auto& c : cases) {
         CpuCounts counts{-1, -1, -1};
         EXPECT_EQ(countsOf(c.totals, counts), c.expected.packages > 0);
-        EXPECT_EQ(counts.packages, c.expected.packages);
-        EXPECT_EQ(counts.coresPerPackage, c.expected.coresPerPackage);
-        EXPECT_EQ(counts.processorsPerCore, c.expected.processorsPerCore);
+        EXPECT_EQ(std::memcmp(&counts, &c.expected, sizeof counts), 0);
     }
 }
 
 TEST(KpCPUInfo, agreesWithTheKernel)
 {
     const KpCPUInfo& info = KpCPUInfo::instance();
-    EXPECT_EQ(&info, &KpCPUInfo::instance());
-    auto told = processors();
-    EXPECT_EQ(told["vendor_id"].count(info.vendor()), 1U) << info.vendor();
-    EXPECT_TRUE(info.hasCPUID());
-    EXPECT_EQ(std::to_string(info.getMaxCPUIDFunc()), *told["cpuid level"].begin());
-    EXPECT_GE(info.getMaxCPUIDExtFunc(), 0x80000001U);
-    if (told["cpu cores"].size() == 1 && info.cpuInfoSucceed()) {  // else nothing is told, or the packages differ
-        const int cores = std::stoi(*told["cpu cores"].begin());
-        EXPECT_EQ(info.getCPUCount(), static_cast<int>(told["physical id"].size()));
-        EXPECT_EQ(info.getCoreCount(), cores);
-        EXPECT_EQ(info.getLPUCount(), std::stoi(*told["siblings"].begin()) / cores);
+    EXPECT_EQ(info.vendor(), told("vendor_id"));
+    EXPECT_EQ(std::to_string(info.getMaxCPUIDFunc()), told("cpuid level"));
+    if (info.cpuInfoSucceed() && !told("cpu cores").empty()) {
+        EXPECT_EQ(info.getCoreCount(), std::stoi(told("cpu cores")));
+        EXPECT_EQ(info.getLPUCount() * info.getCoreCount(), std::stoi(told("siblings")));
     }
-
     const std::pair<unsigned, const char*> features[] = {
         {1, "mmx"},   {2, "mmxext"}, {4, "3dnow"},    {8, "3dnowext"},  {16, "sse"},      {32, "sse2"},
-        {64, "cmov"}, {512, "pni"},  {1024, "ssse3"}, {2048, "sse4_1"}, {4096, "sse4_2"}, {8192, "avx"},
-    };
-    std::istringstream in(*told["flags"].begin());
+        {64, "cmov"}, {512, "pni"},  {1024, "ssse3"}, {2048, "sse4_1"}, {4096, "sse4_2"}, {8192, "avx"}};
+    std::istringstream in(told("flags"));
     const std::set<std::string> flags{std::istream_iterator<std::string>(in), {}};
     unsigned expected = 0;
     for (const auto& [bit, flag] : features)
@@ -93,8 +68,6 @@ TEST(KpSysInfo, knowsTheMemory)
 {
     const auto total = static_cast<unsigned long long>(sysconf(_SC_PHYS_PAGES) * sysconf(_SC_PAGESIZE));
     EXPECT_EQ(KpSysInfo::physmem_total(), total);
-    EXPECT_EQ(KpSysInfo::virtualmem_total(), total);
-    EXPECT_EQ(KpSysInfo::virtualmem_available(), total);
     std::uint64_t available = 0;
     ASSERT_TRUE(kplib::platform::availableMemory(available));
     EXPECT_TRUE(available > 1 << 20 && available < total) << available;
@@ -109,10 +82,10 @@ TEST(KpSysInfo, listsTheProcesses)
     KpDArray<KpSysInfo::ProcessEntry> list{{"stale", getpid(), "stale"}};
     EXPECT_TRUE(KpSysInfo::process_list(list));
     prctl(PR_SET_NAME, before);
-    EXPECT_FALSE(listsThisProcess(list, "stale"));
-    EXPECT_TRUE(listsThisProcess(list, "kplib"));
+    std::string ours;
     for (const KpSysInfo::ProcessEntry& entry : list)
-        EXPECT_GT(entry.processId, 0) << entry.name;
+        ours += entry.processId == getpid() ? entry.name + "|" + entry.command : "";
+    EXPECT_EQ(ours, "kplib|kplib");
 
     rlimit files{};
     getrlimit(RLIMIT_NOFILE, &files);
@@ -120,26 +93,14 @@ TEST(KpSysInfo, listsTheProcesses)
     setrlimit(RLIMIT_NOFILE, &none);
     const bool isListed = KpSysInfo::process_list(list);
     setrlimit(RLIMIT_NOFILE, &files);
-    EXPECT_FALSE(isListed);
-    EXPECT_EQ(list.size(), 0);
+    EXPECT_TRUE(!isListed && list.size() == 0);
 }
 
 TEST(KpOSInfo, namesTheSystemAndItsVersion)
 {
     utsname system{};
     uname(&system);
-    const std::string release = system.release;
-    const std::string numbers = release.substr(0, release.find_first_not_of("0123456789."));
-    EXPECT_EQ(std::string(KpOSInfo::getOSName()).find(std::string(system.sysname) + " " + numbers), 0U);
-    EXPECT_FALSE(KpOSInfo::isWow64Process());
-}
-
-TEST(KpProcessInfo, knowsNothingOfAProcessAndLogsNothing)
-{
-    const kplib::test::LogCapture log;
-    const KpProcessInfo info(getpid());
-    info.log();
-    EXPECT_FALSE(info.found());
-    EXPECT_EQ(info.workingSetSize() | info.peakWorkingSetSize() | info.pagefileUsage() | info.peakPagefileUsage(), 0);
-    EXPECT_EQ(kplib::test::LogCapture::lines(), kplib::test::Lines());
+    const std::string text = system.sysname + std::string(" ") + system.release;
+    const size_t end = text.find_first_not_of("0123456789.", text.find(' ') + 1);
+    EXPECT_TRUE(std::string(KpOSInfo::getOSName()).starts_with(text.substr(0, end)));
 }
