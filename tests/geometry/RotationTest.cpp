@@ -18,19 +18,13 @@ KpRotation turn(std::mt19937& random)
 
 TEST(KpRotation, turnsRowVectors)
 {
-    expectNear(KpRotation(z, pi / 2) * x, y, tight);
-    expectNear(KpRotation(x * 7, pi / 2) * y, z, tight);
-    expectNear(KpRotation(y, pi / 2) * z, x, tight);
-    EXPECT_EQ(KpRotation::identity().toMat3f(), KpMat3f::identity());
+    expectNear(KpRotation(z * 7, pi / 2) * x, y, tight);
     std::mt19937 random(1);
     for (int i = 0; i < 200; ++i) {
         const KpRotation a = turn(random), b = turn(random);
         auto v = some<KpVec3f>(random);
         expectNear((a * b) * v, b * (a * v), tight);
         expectNear(a.inverse() * (a * v), v, tight);
-        KpRotation product = a;
-        product *= b;
-        EXPECT_TRUE(product.equals(a * b, tight));
         const KpVec3f turned = a.toMat3f().multVecMatrix(v);
         a.multVec(v, v);
         EXPECT_EQ(v, turned);
@@ -78,7 +72,6 @@ TEST(KpRotation, comparesQuaternionsAndRotations)
 
 TEST(KpRotation, takesOneDirectionToAnother)
 {
-    EXPECT_EQ(KpRotation(x * 3, x * 5), KpRotation::identity());
     EXPECT_EQ(KpRotation(x, -x), KpRotation(0, 0, 1, 0));
     EXPECT_EQ(KpRotation(y, -y), KpRotation(0, 0, -1, 0));
     EXPECT_FLOAT_EQ(KpRotation(origin, x)[3], std::sqrt(0.5F));
