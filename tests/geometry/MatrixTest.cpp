@@ -313,7 +313,6 @@ TEST(KpMat4f, printsRowsInTwoLines)
     EXPECT_TRUE(printed.starts_with("         1\t         0\t  -0.33333\n         0\n"));
     EXPECT_EQ(std::count(printed.begin(), printed.end(), '\n'), 8);
     EXPECT_TRUE(m.dump().starts_with(R"({"m00":"1.000000","m01":"0.000000","m02":"-0.333333",)"));
-    EXPECT_TRUE(m.dump().ends_with(R"(,"m32":"0.000000","m33":"1.000000"})"));
 }
 
 }  // namespace

@@ -25,9 +25,7 @@ struct Layout {
 };
 const Layout layouts[] = {{"dense", 0, 0, false},
                           {"gaps between rows", 0, 3, false},
-                          {"gaps between voxels", 5, 0, false},
                           {"gaps everywhere", 5, 3, false},
-                          {"sliced", 0, 0, true},
                           {"sliced with gaps", 0, 3, true}};
 
 /// Calls `work(volume, layout)` for 5 x 4 x 3 voxels of two components of each type in each layout.
@@ -174,17 +172,15 @@ TEST(Volume, linesEqualTheirVoxelsOneByOne)
                 const long voxel = gap + long{sizeof(T)}, n = dims[axis], origin = 2000;
                 Bytes memory = someValues<std::uint8_t>(18 * 19 * 20 * voxel + origin, 8);
                 const TmDataAccess volume(dims, {voxel, 0L, 0L}, &memory[origin], typeOf<T>, 1, none);
-                const std::array step{voxel, 18 * voxel, 18 * 19 * voxel};
-                long first = origin;
-                for (int i = 0; i < 3; ++i)
-                    first += i == axis ? 0 : at[i] * step[i];
+                std::array<long, 3> on = at;
                 std::vector<float> in = someValues<float>(n, 9), out(n), values(n);
                 in[0] = NAN;
                 in[1] = 2147483648.0F;
                 Bytes expected = memory;
                 for (long i = 0; i < n; ++i) {
                     const T value = cut(in[i], T{});
-                    std::memcpy(&expected[first + i * step[axis]], &value, sizeof value);
+                    on[axis] = i;
+                    std::memcpy(&expected[origin + ((on[2] * 19 + on[1]) * 18 + on[0]) * voxel], &value, sizeof value);
                     values[i] = static_cast<float>(value);
                 }
                 EXPECT_TRUE(volume.putRow(at[0], at[1], at[2], in.data()).isOk() && memory == expected);

@@ -108,8 +108,8 @@ TEST(DownSample, progressFollowsTheLayers)
     auto *const means = KpRawData::downSample3D, *const labels = KpRawData::downSampleLabels3D;
     // clang-format off
     const struct { decltype(means) call; int f, cancelAfter, type; const char* told; long written; } runs[] = {
-        {means, 2, 0, 7, "w 0/9 c 1/9 c 3/9 c 5/9 c 7/9 s ", 8}, {labels, 2, 0, 7, "w 0/9 c 1/9 c 2/9 c 3/9 c 4/9 s ", 8},
-        {means, 2, 1, 7, "w 0/9 c s ", 2},                           {labels, 2, 2, 7, "w 0/9 c 1/9 c s ", 4},
+        {means, 2, 0, 7, "w 0/9 c 1/9 c 3/9 c 5/9 c 7/9 s ", 8}, {labels, 2, 2, 7, "w 0/9 c 1/9 c s ", 4},
+        {means, 2, 1, 7, "w 0/9 c s ", 2},
         {means, 3, 0, 7, "w 0/9 c 1/9 c 4/9 c 7/9 s ", 0},       {labels, 3, 0, 7, "w 0/9 c 1/9 c 2/9 c 3/9 s ", 0},
         {means, 4, 0, 7, "", 0},  // more than one above the size
         {means, 0, 0, 7, "", 0}, {labels, 0, 0, 7, "", 0}, {means, 2, 0, 8, "", 0}, {labels, 2, 0, -3, "", 0}};

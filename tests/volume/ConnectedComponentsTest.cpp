@@ -35,10 +35,8 @@ int expectAsDefined(std::vector<T> data, Dims dims, T low, T high, int neighbour
     EXPECT_EQ(CC::do_label(data.data(), labels.data(), table, low, high, dims.of, neighbours, labelMode), count);
     EXPECT_TRUE(labels == expected);
     EXPECT_TRUE(CC::dbg_add == added && CC::dbg_clean == cleaned && CC::dbg_merge == 0);
-    EXPECT_EQ(table.size(), expectedTable.size());
-    EXPECT_EQ(std::memcmp(table.data(), expectedTable.data(),
-                          sizeof(Component) * std::min(table.size(), expectedTable.size())),
-              0);
+    EXPECT_TRUE(table.size() == expectedTable.size() &&
+                std::memcmp(table.data(), expectedTable.data(), sizeof(Component) * table.size()) == 0);
     if constexpr (std::is_same_v<T, L>) {
         if (labelMode == 0) {  // labels in place of the values
             EXPECT_EQ(CC::do_label(data.data(), data.data(), table, low, high, dims.of, neighbours, 0), count);
