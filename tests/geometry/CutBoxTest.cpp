@@ -3,7 +3,6 @@
 #include <kplib/geometry/KpCutBoxPlane.h>
 #include <kplib/geometry/KpCutBoxPlaneDouble.h>
 #include <kplib/geometry/KpPlane.h>
-#include <kplib/geometry/detail/CutBox.h>
 
 #include <bit>
 #include <set>
@@ -39,18 +38,6 @@ bool isCut(const Vector* vertices, std::size_t count, const KpBox3f& box, unsign
 }
 
 }  // namespace
-
-TEST(CutBoxTable, joinsCornersOnBothSidesInEveryRow)
-{
-    for (unsigned mask = 0; mask < 128; ++mask) {
-        const std::uint8_t* const row = kplib::detail::cuts[mask];
-        EXPECT_LE(row[0], 6);
-        for (int i = 1; i <= row[0]; ++i) {
-            const unsigned a = row[i] >> 4, b = row[i] & 15;
-            EXPECT_TRUE(b < a && a < 8 && std::has_single_bit(a ^ b) && (mask >> a & 1) != (mask >> b & 1)) << mask;
-        }
-    }
-}
 
 TEST(KpCutBoxPlane, cutsEachDividedEdgeInOrder)
 {

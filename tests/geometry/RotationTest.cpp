@@ -57,9 +57,7 @@ TEST(KpRotation, survivesOtherForms)
     KpRotation(x, 1.9e-5F).getValue(axis, angle);
     EXPECT_TRUE(axis == z && angle == 0) << "nearly no turn";
     KpRotation(x, 2.1e-5F).getValue(axis, angle);
-    EXPECT_EQ(axis, x);
-    EXPECT_EQ(KpRotation(origin, 0.0F), KpRotation::identity());
-    EXPECT_TRUE(std::isnan(KpRotation(0, 0, 0, 0)[0]));
+    EXPECT_TRUE(axis == x && std::isnan(KpRotation(0, 0, 0, 0)[0]));
 }
 
 TEST(KpRotation, comparesQuaternionsAndRotations)
@@ -92,10 +90,7 @@ TEST(KpRotation, takesOneDirectionToAnother)
 TEST(KpRotation, slerpGoesTheShorterWayAtSteadySpeed)
 {
     const auto angleBetween = [](const KpRotation& a, const KpRotation& b) {
-        KpVec3f axis;
-        float angle;
-        (a.inverse() * b).getValue(axis, angle);
-        return std::min(angle, 2 * pi - angle);
+        return 2 * std::acos(std::min(1.0F, std::abs((a.inverse() * b)[3])));
     };
     std::mt19937 random(4);
     for (int i = 0; i < 200; ++i) {

@@ -80,10 +80,7 @@ constexpr double densities[] = {0.001, 0.02, 0.2, 0.5, 0.8, 0.98, 0.999};
 TEST(Morphology, equalsTheDefinitionForEveryRowWidth)
 {
     std::mt19937 random(52);
-    std::vector<int> widths{510, 511, 512, 513};
-    for (int width = 1; width <= 130; ++width)
-        widths.push_back(width);
-    for (int width : widths)
+    for (int width = 1; width <= 513; width += width == 130 ? 380 : 1)
         for (int round = 0; round < 4; ++round) {
             const KpVec3i dims(width, 1 + static_cast<int>(random() % 4), 1 + static_cast<int>(random() % 4));
             const double density = densities[random() % std::size(densities)];
@@ -99,9 +96,7 @@ TEST(Morphology, equalsTheDefinitionForEveryRowWidth)
                                                 << " erodes " << erodes << " iterations " << iterations);
                 const Field result = expected.field();
                 ASSERT_TRUE(morphed(src, dims, reach, erodes, iterations, true) == result);
-                if (width % 8 == 1) {
-                    ASSERT_TRUE(morphed(src, dims, reach, erodes, iterations, false) == result);
-                }
+                ASSERT_TRUE(width % 8 != 1 || morphed(src, dims, reach, erodes, iterations, false) == result);
             }
         }
 }
