@@ -78,6 +78,7 @@ TEST(KpPlane, meetsLinesAndPlanes)
         const KpVec3f d = line.direction() * line.direction();
         EXPECT_EQ(line.position()[static_cast<int>(std::max_element(d.begin(), d.end()) - d.begin())], 0);
     }
+    EXPECT_TRUE(KpPlane({1, -1, 0}, 1.0F).intersect(KpPlane(z, 1), line) && line.position().x() == 0) << "of equals";
     EXPECT_FALSE(KpPlane(z, 1).intersect(KpPlane({1e-6F, 0, 1}, 1.0F), line));
     EXPECT_TRUE(isNaN(line.position()) && isNaN(line.direction()));
 }

@@ -25,6 +25,7 @@ TEST(KpRotation, turnsRowVectors)
         auto v = some<KpVec3f>(random);
         expectNear((a * b) * v, b * (a * v), tight);
         expectNear(a.inverse() * (a * v), v, tight);
+        EXPECT_TRUE((KpRotation(a) *= b).equals(a * b, tight));
         const KpVec3f turned = a.toMat3f().multVecMatrix(v);
         a.multVec(v, v);
         EXPECT_EQ(v, turned);
@@ -63,7 +64,7 @@ TEST(KpRotation, survivesOtherForms)
 TEST(KpRotation, comparesQuaternionsAndRotations)
 {
     const KpRotation q(1, 2, 3, 4), negative(-1, -2, -3, -4);
-    EXPECT_FALSE(q == negative || q.equals(q, 0));
+    EXPECT_FALSE(q == negative || q.equals(q, 0) || q.equals(negative, 0));
     EXPECT_TRUE(q.equals(negative, 1e-30F));
     EXPECT_FALSE(KpRotation(1, 0, 0, 1).equals({1, 0, 0, -1}, 0.5F)) << "each half fits one of the two";
 }
