@@ -194,6 +194,18 @@ TEST(KpMat4f, leavesWhatIsNotAffineToDecomposition)
     EXPECT_EQ(kept, KpMat4f::identity());
 }
 
+TEST(KpMat4f, measuresPivotsByTheirRowsAndPrefersTheLater)
+{
+    KpMat4f m(1, 2, 0, 0, 5, 10, 1, 0, 2, 1, 4, 0, 0, 0, 0, 0);  // each begins with half of its largest
+    int index[4];
+    float sign;
+    m.LUDecomposition(index, sign);
+    EXPECT_TRUE(index[0] == 2 && m[3][3] == 1e-6F);
+    m = KpMat4f(0, 1, 100, 0, 0, 0.5F, 0, 1, 1, 0, 0, 0, 0, 0, 0, 1);  // the first row keeps its measure as it moves
+    m.LUDecomposition(index, sign);
+    EXPECT_TRUE(index[0] == 2 && index[1] == 1);
+}
+
 // The eigenvectors are the columns of `v`: A v = v diag(evalues), and v is orthogonal.
 void expectEigen(const KpMat3f& a, const float (&evalues)[3], const KpMat3f& v)
 {
