@@ -113,9 +113,10 @@ TEST(KpViewVolume, changesShape)
         expectNear(scaled.llf(), toWorld(v, KpVec3f(0.5F, 0, 0)));
         scaled.scale(-0.5F);
         scaled.scaleHeight(3);
-        expectNear(scaled.llf(), toWorld(v, KpVec3f(0.625F, -0.25F, 0)));
-        expectNear(scaled.lrf(), toWorld(v, KpVec3f(0.875F, -0.25F, 0)));
-        expectNear(scaled.projPoint() + scaled.ulfO(), toWorld(v, KpVec3f(0.625F, 1.25F, 0)));
+        scaled.scaleWidth(2);
+        expectNear(scaled.llf(), toWorld(v, KpVec3f(0.5F, -0.25F, 0)));
+        expectNear(scaled.lrf(), toWorld(v, KpVec3f(1, -0.25F, 0)));
+        expectNear(scaled.projPoint() + scaled.ulfO(), toWorld(v, KpVec3f(0.5F, 1.25F, 0)));
 
         // A place on the screen goes with the matrix; a mirror exchanges left and right.
         const bool isMirror = round % 3 == 0;
