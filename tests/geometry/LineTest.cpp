@@ -78,7 +78,6 @@ TEST(KpLine, meetsBoxesAtTheirEdges)
         KpVec3f position, direction;
         float tolerance, enter, exit;  // x of the points; NaN is a miss
     } cases[] = {
-        {"along x", box, {9, 0, 0}, x, 0, 1, 3},
         {"against x", box, {9, 0, 0}, -x, 0, 3, 1},
         {"in a face", box, y, x, 0, 1, 3},
         {"beside a face, within the tolerance", box, y * 1.25F, x, 0.5F, 1, 3},
@@ -108,9 +107,8 @@ TEST(KpLine, picksWhatIsNearerThanAnAngleOrARadius)
         float angle;
         bool box, point, segment, end;  // `end` runs from there on away from the line
     } cases[] = {
-        {-1.5F, true, true, true, false}, {-1, true, false, false, false},  {-0.5F, false, false, false, false},
-        {0.6F, true, true, true, false},  {0.3F, true, false, true, false}, {0.2F, false, false, false, false},
-        {0, false, false, false, false},  {-3.5F, true, true, true, true},  {0.9F, true, true, true, true},
+        {-1.5F, true, true, true, false},   {-1, true, false, false, false}, {0.3F, true, false, true, false},
+        {0.2F, false, false, false, false}, {-3.5F, true, true, true, true}, {0.9F, true, true, true, true},
     };
     KpVec3f out;
     for (const auto& c : cases) {
@@ -124,8 +122,7 @@ TEST(KpLine, picksWhatIsNearerThanAnAngleOrARadius)
         EXPECT_TRUE(c.end ? out == end : isNaN(out));
     }
     EXPECT_TRUE(alongX.intersect(0, KpBox3f(2, 3, -1, 1, -1, 1))) << "angle 0, and the line crosses";
-    EXPECT_FALSE(alongX.intersect(-9, KpBox3f(3, 2, -1, 1, -1, 1))) << "empty";
-    EXPECT_FALSE(alongX.intersect(-9, origin) || alongX.intersect(-9, -x)) << "not in front";
+    EXPECT_FALSE(alongX.intersect(-9, KpBox3f(3, 2, -1, 1, -1, 1)) || alongX.intersect(-9, origin)) << "empty, behind";
     EXPECT_FALSE(alongX.intersect(-9, y, y + x, out) || alongX.intersect(-9, y, y, out)) << "parallel, no length";
     for (float t = 1; t < 100; ++t)  // on the line, whatever rounding leaves
         EXPECT_TRUE(KpLine(origin, {0.1F, 0.7F, 0.3F}).intersect(1e-3F, KpVec3f(0.1F, 0.7F, 0.3F) * t)) << t;

@@ -46,23 +46,6 @@ TEST(KpSphereSheetProjector, isASphereThatTurnsIntoASheet)
     expectNear(projector(false, true).project(screen(6.4F / 7.4F, 0)), below + up * 0.625F, 1e-4F);
 }
 
-TEST(KpSphereSheetProjector, takesLinesOfTheWorldWithTheirOwnDirection)
-{
-    std::mt19937 random(66);
-    const KpVec3f onSphere(0.1F, 0.2F, std::sqrt(0.95F)), foot(3, 0, 0);
-    for (int round = 0; round < 100; ++round) {
-        auto p = projector(true, round % 2);
-        KpVec3f slope(someNumber(random, -0.3F, 0.3F), someNumber(random, -0.3F, 0.3F), -1);
-        slope.normalize();
-        expectNear(p.intersect(KpLine(onSphere - slope, onSphere)), onSphere);
-        expectNear(p.planeDir(), round % 2 ? -slope : z);
-        p.setOrientToEye(false);
-        expectNear(p.intersect(KpLine(foot - slope, foot)), foot - slope * (0.5F / 3));
-        p.setFront(false);
-        expectNear(p.intersect(KpLine(foot - slope, foot)), foot + slope * (0.5F / 3));
-    }
-}
-
 TEST(KpSphereSheetProjector, turnsFromPointToPoint)
 {
     std::mt19937 random(66);

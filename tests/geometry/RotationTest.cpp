@@ -18,19 +18,14 @@ KpRotation turn(std::mt19937& random)
 
 TEST(KpRotation, turnsRowVectors)
 {
-    expectNear(KpRotation(z, pi / 2) * x, y, tight);
-    expectNear(KpRotation(x * 7, pi / 2) * y, z, tight);
-    expectNear(KpRotation(y, pi / 2) * z, x, tight);
-    EXPECT_EQ(KpRotation::identity().toMat3f(), KpMat3f::identity());
+    expectNear(KpRotation(z * 7, pi / 2) * x, y, tight);
     std::mt19937 random(1);
     for (int i = 0; i < 200; ++i) {
         const KpRotation a = turn(random), b = turn(random);
         auto v = some<KpVec3f>(random);
         expectNear((a * b) * v, b * (a * v), tight);
         expectNear(a.inverse() * (a * v), v, tight);
-        KpRotation product = a;
-        product *= b;
-        EXPECT_TRUE(product.equals(a * b, tight));
+        EXPECT_TRUE((KpRotation(a) *= b).equals(a * b, tight));
         const KpVec3f turned = a.toMat3f().multVecMatrix(v);
         a.multVec(v, v);
         EXPECT_EQ(v, turned);
@@ -63,22 +58,19 @@ TEST(KpRotation, survivesOtherForms)
     KpRotation(x, 1.9e-5F).getValue(axis, angle);
     EXPECT_TRUE(axis == z && angle == 0) << "nearly no turn";
     KpRotation(x, 2.1e-5F).getValue(axis, angle);
-    EXPECT_EQ(axis, x);
-    EXPECT_EQ(KpRotation(origin, 0.0F), KpRotation::identity());
-    EXPECT_TRUE(std::isnan(KpRotation(0, 0, 0, 0)[0]));
+    EXPECT_TRUE(axis == x && std::isnan(KpRotation(0, 0, 0, 0)[0]));
 }
 
 TEST(KpRotation, comparesQuaternionsAndRotations)
 {
     const KpRotation q(1, 2, 3, 4), negative(-1, -2, -3, -4);
-    EXPECT_FALSE(q == negative || q.equals(q, 0));
+    EXPECT_FALSE(q == negative || q.equals(q, 0) || q.equals(negative, 0));
     EXPECT_TRUE(q.equals(negative, 1e-30F));
     EXPECT_FALSE(KpRotation(1, 0, 0, 1).equals({1, 0, 0, -1}, 0.5F)) << "each half fits one of the two";
 }
 
 TEST(KpRotation, takesOneDirectionToAnother)
 {
-    EXPECT_EQ(KpRotation(x * 3, x * 5), KpRotation::identity());
     EXPECT_EQ(KpRotation(x, -x), KpRotation(0, 0, 1, 0));
     EXPECT_EQ(KpRotation(y, -y), KpRotation(0, 0, -1, 0));
     EXPECT_FLOAT_EQ(KpRotation(origin, x)[3], std::sqrt(0.5F));
@@ -99,10 +91,7 @@ TEST(KpRotation, takesOneDirectionToAnother)
 TEST(KpRotation, slerpGoesTheShorterWayAtSteadySpeed)
 {
     const auto angleBetween = [](const KpRotation& a, const KpRotation& b) {
-        KpVec3f axis;
-        float angle;
-        (a.inverse() * b).getValue(axis, angle);
-        return std::min(angle, 2 * pi - angle);
+        return 2 * std::acos(std::min(1.0F, std::abs((a.inverse() * b)[3])));
     };
     std::mt19937 random(4);
     for (int i = 0; i < 200; ++i) {

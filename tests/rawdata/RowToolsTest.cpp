@@ -40,7 +40,7 @@ TEST(RowTools, mirrorsRowsInPlaceAndInCopies)
                 SCOPED_TRACE(testing::Message() << rows << " rows of " << width << " to " << room);
                 const long n = std::max(rows, 0L);
                 const auto bytes = someValues<std::uint8_t>(n * width, 5);
-                std::vector<std::uint8_t> copy(n * room, 7), expected = copy, mirrored = bytes;
+                Bytes copy(n * room, 7), expected = copy, mirrored = bytes;
                 for (long y = 0; y < n; ++y)
                     std::copy_n(bytes.data() + y * width, std::min(width, room), expected.data() + (n - 1 - y) * room);
                 TmSSETools::memcpyMirrorY(bytes.data(), rows, width, copy.data(), room);

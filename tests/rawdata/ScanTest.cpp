@@ -64,7 +64,6 @@ TEST(IsConstant, oddCases)
     EXPECT_TRUE(KpRawData::isConstant(values.data(), 1000)) << "zeros are equal, and NaN behind the head is skipped";
     EXPECT_FALSE(KpRawData::isConstant(values.data() + 500, 1)) << "NaN at the head";
     EXPECT_FALSE(KpRawData::isConstant({pair, KpPrimType::Complex}, 1));
-    EXPECT_TRUE(KpRawData::isConstant({nullptr, KpPrimType::Complex}, 0));
     EXPECT_FALSE(KpRawData::isConstant({values.data(), KpPrimType::SByte}, 1));
 }
 
@@ -85,12 +84,10 @@ TEST(Memset, cutsIntegersAndRoundsReals)
         };
         for (const auto& [value, stored] : cases)
             expectFilled(value, std::is_integral_v<T> ? T(stored) : T(value), 101, 1);
-        expectFilled(-1000, static_cast<T>(-1000), 2, 0);
         expectFilled(77, T(77), (9L << 20) / sizeof(T), sizeof(T));
     });
     const auto error = logged([] { KpRawData::memset({nullptr, KpPrimType::UInt}, 5, 1); });
-    const auto same = logged([] { KpRawData::memset({nullptr, KpPrimType::UInt}, 5.0, 0); });
-    EXPECT_TRUE(error == "E Unsupported data type uint in KpRawData::memset()\n" && same == error) << error;
+    EXPECT_EQ(error, "E Unsupported data type uint in KpRawData::memset()\n");
 }
 
 TEST(SwapBytes, reversesTheBytesOfEachWord)

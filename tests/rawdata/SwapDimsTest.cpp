@@ -1,25 +1,18 @@
-#include <kplib/rawdata/KpRawData.h>
+#include "Elements.h"
+
 #include <kplib/rawdata/detail/KpTransposeKernels.h>
 
-#include <gtest/gtest.h>
 #include <support/FailingMalloc.h>
-#include <support/LogCapture.h>
 
-#include <algorithm>
-#include <random>
-#include <vector>
+using namespace kplib::test;
 
 namespace {
 
-using Bytes = std::vector<unsigned char>;
 const int perms[6][3] = {{0, 1, 2}, {0, 2, 1}, {1, 0, 2}, {2, 1, 0}, {2, 0, 1}, {1, 2, 0}};
 
-Bytes noise(std::size_t size)
+Bytes noise(long size)
 {
-    std::mt19937 random(static_cast<unsigned>(size));
-    Bytes bytes(size);
-    std::generate(bytes.begin(), bytes.end(), [&] { return static_cast<unsigned char>(random()); });
-    return bytes;
+    return someValues<std::uint8_t>(size, static_cast<unsigned>(size));
 }
 
 /// The definition: each voxel goes to the place that its coordinates have in the new order.
@@ -28,14 +21,12 @@ Bytes permuted(const Bytes& from, const int* dims, const int* perm, int voxelSiz
     Bytes to(from.size());
     int at[3];
     const unsigned char* voxel = from.data();
-    for (at[2] = 0; at[2] < dims[2]; ++at[2]) {
-        for (at[1] = 0; at[1] < dims[1]; ++at[1]) {
+    for (at[2] = 0; at[2] < dims[2]; ++at[2])
+        for (at[1] = 0; at[1] < dims[1]; ++at[1])
             for (at[0] = 0; at[0] < dims[0]; ++at[0], voxel += voxelSize) {
                 const int place = (at[perm[2]] * dims[perm[1]] + at[perm[1]]) * dims[perm[0]] + at[perm[0]];
                 std::copy_n(voxel, voxelSize, to.data() + place * voxelSize);
             }
-        }
-    }
     return to;
 }
 
@@ -43,29 +34,21 @@ Bytes permuted(const Bytes& from, const int* dims, const int* perm, int voxelSiz
 
 TEST(SwapDims, putsEachVoxelWhereItsCoordinatesAre)
 {
-    const struct {
-        KpPrimType type;
-        int nDataVar;
-    } voxels[] = {{KpPrimType::Byte, 1},   {KpPrimType::Byte, 3},  {KpPrimType::Byte, 4}, {KpPrimType::UShort, 1},
-                  {KpPrimType::Float, 1},  {KpPrimType::Float, 2}, {KpPrimType::UInt, 1}, {KpPrimType::Double, 1},
-                  {KpPrimType::Double, 3}, {KpPrimType::Short, 2}, {KpPrimType::SByte, 4}};
-    const int sizes[][3] = {{2, 3, 4}, {5, 5, 5},   {1, 7, 3},   {7, 1, 3},
-                            {7, 3, 1}, {33, 17, 9}, {40, 8, 16}, {6, 31, 31}};
-    for (const auto& [type, nDataVar] : voxels) {
-        for (const auto& size : sizes) {
+    const std::pair<KpPrimType, int> voxels[] = {
+        {KpPrimType::Byte, 1},   {KpPrimType::Byte, 3},   {KpPrimType::Byte, 4},  {KpPrimType::UInt, 1},
+        {KpPrimType::UShort, 1}, {KpPrimType::Double, 1}, {KpPrimType::Float, 2}, {KpPrimType::Double, 3}};
+    for (const auto& [type, nDataVar] : voxels)
+        for (const auto& size :
+             {std::array{2, 3, 4}, {5, 5, 5}, {1, 7, 3}, {7, 1, 3}, {7, 3, 1}, {33, 17, 9}, {40, 8, 16}})
             for (const int* perm : perms) {
-                int dims[3] = {size[0], size[1], size[2]};
+                std::array<int, 3> dims = size;
                 const int voxelSize = type.size() * nDataVar;
-                const Bytes before = noise(static_cast<std::size_t>(size[0] * size[1] * size[2] * voxelSize));
+                const Bytes before = noise(long{size[0]} * size[1] * size[2] * voxelSize);
                 Bytes data = before;
-                ASSERT_TRUE(KpRawData::swapDims({data.data(), type}, dims, perm, nDataVar));
-                ASSERT_EQ(data, permuted(before, size, perm, voxelSize))
-                    << type.name() << perm[0] << perm[1] << perm[2];
-                for (int i = 0; i < 3; ++i)
-                    EXPECT_EQ(dims[i], size[perm[i]]);
+                ASSERT_TRUE(KpRawData::swapDims({data.data(), type}, dims.data(), perm, nDataVar));
+                ASSERT_EQ(data, permuted(before, size.data(), perm, voxelSize)) << type.name() << perm[0] << perm[1];
+                EXPECT_EQ(dims, (std::array{size[perm[0]], size[perm[1]], size[perm[2]]}));
             }
-        }
-    }
 }
 
 TEST(SwapDims, changesNothingWhereItFails)
@@ -73,7 +56,7 @@ TEST(SwapDims, changesNothingWhereItFails)
     Bytes data = noise(2 * 3 * 4 * 8);
     const Bytes before = data;
     int dims[3] = {2, 3, 4};
-    const kplib::test::LogCapture log;
+    const LogCapture log;
     for (const auto& perm : {std::array{0, 0, 1}, std::array{1, 2, 3}, std::array{-1, 0, 1}})
         EXPECT_FALSE(KpRawData::swapDims({data.data(), KpPrimType::Byte}, dims, perm.data(), 1));
     EXPECT_TRUE(log.lines().empty());
@@ -81,7 +64,7 @@ TEST(SwapDims, changesNothingWhereItFails)
     EXPECT_FALSE(KpRawData::swapDims({data.data(), KpPrimType::UInt}, dims, perms[1], 2));
     EXPECT_EQ(log.lines().size(), 2U);
     for (const long n : {0, 1}) {  // the slice, the bits
-        const kplib::test::FailingMalloc failing(n, 1);
+        const FailingMalloc failing(n, 1);
         EXPECT_FALSE(KpRawData::swapDims({data.data(), KpPrimType::Byte}, dims, perms[3], 1));
     }
     EXPECT_EQ(data, before);
@@ -93,17 +76,14 @@ TEST(SwapDims, changesNothingWhereItFails)
 
 TEST(TransposeKernels, agreeWithTheDefinition)
 {
-    for (const long size : {1, 2, 4, 8}) {
-        for (const auto& path : kplib::detail::transposePaths(size)) {
-            for (const long rows : {1, 2, 7, 16, 33, 70}) {
-                for (const long columns : {1, 3, 8, 31, 32, 65}) {
-                    const Bytes from = noise(static_cast<std::size_t>(rows * columns * size));
+    for (const int size : {1, 2, 4, 8})
+        for (const auto& path : kplib::detail::transposePaths(size))
+            for (const int rows : {1, 2, 7, 16, 33, 70})
+                for (const int columns : {1, 3, 8, 31, 32, 65}) {
+                    const Bytes from = noise(long{rows} * columns * size);
                     Bytes to(from.size());
                     path.run(from.data(), to.data(), rows, columns);
-                    const int dims[] = {static_cast<int>(columns), static_cast<int>(rows), 1};
-                    ASSERT_EQ(to, permuted(from, dims, perms[2], static_cast<int>(size))) << path.name << size;
+                    const int dims[] = {columns, rows, 1};
+                    ASSERT_EQ(to, permuted(from, dims, perms[2], size)) << path.name << size;
                 }
-            }
-        }
-    }
 }

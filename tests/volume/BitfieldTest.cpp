@@ -20,9 +20,8 @@ namespace {
 using Words = std::vector<BitWord>;
 using Labels = std::vector<unsigned char>;
 
-constexpr unsigned long sizes[] = {0,   1,   2,   3,   4,   5,   7,   27,  30,  31,   32,   33,   34,   36,   61,
-                                   63,  64,  65,  67,  95,  96,  97,  98,  99,  125,  127,  128,  129,  130,  191,
-                                   192, 193, 255, 256, 511, 512, 513, 543, 544, 4095, 4096, 4097, 8200, 12345};
+constexpr unsigned long sizes[] = {0,  1,  2,   3,   4,   5,   31,  32,  33,  34,   63,   64,   65,   67,
+                                   96, 97, 127, 128, 129, 191, 255, 256, 257, 4095, 4096, 4097, 12345};
 
 /// Bits alike, alike but for one, or noise, by the seed; behind the last bit there is noise.
 KpBitfield someField(unsigned long nBits, unsigned seed)
@@ -54,19 +53,6 @@ Labels someLabels(unsigned long n, unsigned seed)
 
 }  // namespace
 
-TEST(KpBitfield, copiesByItselfAndMovesItsStorage)
-{
-    const KpBitfield field = someField(100, 5);
-    KpBitfield copy(field), other = someField(40, 5);
-    copy.toggleAll();
-    other = field;
-    EXPECT_TRUE(copy != field && wordsOf(other) == wordsOf(field));
-    const auto* const storage = other.data();
-    copy = KpBitfield(std::move(other));
-    EXPECT_TRUE(copy.data() == storage && copy == field);
-    EXPECT_TRUE(KpBitfield() == KpBitfield() && KpBitfield() != field);
-}
-
 TEST(KpBitfield, resizingFillsWhatIsAddedButForASpareWord)
 {
     constexpr BitWord before = 0xA5A5A5A5;
@@ -85,11 +71,8 @@ TEST(KpBitfield, resizingFillsWhatIsAddedButForASpareWord)
                         << old << " to " << now << " by " << init << " at " << i;
                 }
                 field.setAll();
-                ASSERT_EQ(wordsOf(field), Words(words, ~0U)) << "with the spare word";
-                field.unsetAll();
-                ASSERT_EQ(wordsOf(field), Words(words, 0));
                 field.toggleAll();
-                ASSERT_EQ(wordsOf(field), Words(words, ~0U));
+                ASSERT_EQ(wordsOf(field), Words(words, 0)) << "with the spare word";
             }
 }
 
@@ -112,10 +95,10 @@ TEST(KpBitfield, answersByItsBitsAndIgnoresWhatLiesBehind)
             const KpBitfield field = someField(n, seed);
             KpString text;
             field.print(text);
-            const std::string bits(text.c_str());
-            ASSERT_EQ(bits.size(), n);
+            std::string bits;
             for (unsigned long i = 0; i < n; ++i)
-                ASSERT_EQ(bits[i] == '1', field.test(i));
+                bits += field.test(i) ? '1' : '0';
+            ASSERT_EQ(text.c_str(), bits);
             const unsigned long first = std::min(bits.find('1'), n), firstUnset = std::min(bits.find('0'), n);
             EXPECT_EQ(field.nSetBits(), static_cast<unsigned long>(std::count(bits.begin(), bits.end(), '1')));
             EXPECT_TRUE(field.firstSetBit() == first && field.isAnyBitSet() == (first < n)) << bits;
@@ -165,7 +148,6 @@ TEST(BitfieldKernels, everyRowEqualsThePlainOne)
                 expectSame(findFirstPaths(), a.data(), n, skipped);
                 expectSame(findLastPaths(), a.data(), n, skipped);
             }
-            expectSame(anyPaths<BitAnd>(), a.data(), b.data(), n);
             expectSame(anyPaths<BitsMissing>(), a.data(), b.data(), n);
             for (const auto& path : combinePaths<BitXor>())
                 if (Words result = a, expected = a; path.usable) {
@@ -236,7 +218,7 @@ TEST(KpBitfield, mergesIntoLabelsByPolicy)
 TEST(KpBitfield, filesHoldTheBytesOfTheBits)
 {
     const std::string path = testing::TempDir() + "bitfield";
-    for (unsigned long n : {0, 1, 8, 9, 32, 100}) {
+    for (unsigned long n : {0, 1, 8, 9, 100}) {
         const KpBitfield field = someField(n, 4);
         KpBitfield loaded(300, KpBitfield::INIT_SET);
         ASSERT_TRUE(field.save(path.c_str()) && loaded.load(path.c_str(), n));
@@ -260,7 +242,6 @@ TEST(KpBitfield, digestTakesAQuarterOfTheBitsAndTheLastWord)
         Words words;
         const char* digest;
     } cases[] = {
-        {0, {}, "D41D8CD98F00B204E9800998ECF8427E"},                                     // nothing
         {64, {0xFFFF6261, 0x12345678, 0x66656463}, "E80B5017098950FC58AAD83C8C14978E"},  // abcdef
         {104, {0xFF636261, 1, 2, 0xFFFFFF64}, "181C9F04920A0CAED5C51A8FF26DD8D1"},       // abcd and three zeros
     };
@@ -273,10 +254,13 @@ TEST(KpBitfield, digestTakesAQuarterOfTheBitsAndTheLastWord)
     }
 }
 
-TEST(KpBitfield, exhaustedMemoryLeavesTheFieldAsItWas)
+TEST(KpBitfield, copiesByItselfAndStaysAsItWasWithoutMemory)
 {
     const KpBitfield before = someField(100, 4);
-    KpBitfield field = before;
+    KpBitfield field = someField(40, 5);
+    field = before;
     EXPECT_THROW(field.resize(~0UL, KpBitfield::INIT_SET), KpMemoryException);
-    EXPECT_TRUE(field == before && wordsOf(field) == wordsOf(before));
+    EXPECT_EQ(wordsOf(field), wordsOf(before));
+    const auto* const storage = field.data();
+    EXPECT_EQ(KpBitfield(std::move(field)).data(), storage);
 }

@@ -80,10 +80,7 @@ constexpr double densities[] = {0.001, 0.02, 0.2, 0.5, 0.8, 0.98, 0.999};
 TEST(Morphology, equalsTheDefinitionForEveryRowWidth)
 {
     std::mt19937 random(52);
-    std::vector<int> widths{510, 511, 512, 513};
-    for (int width = 1; width <= 130; ++width)
-        widths.push_back(width);
-    for (int width : widths)
+    for (int width = 1; width <= 513; width += width == 130 ? 380 : 1)
         for (int round = 0; round < 4; ++round) {
             const KpVec3i dims(width, 1 + static_cast<int>(random() % 4), 1 + static_cast<int>(random() % 4));
             const double density = densities[random() % std::size(densities)];
@@ -99,9 +96,7 @@ TEST(Morphology, equalsTheDefinitionForEveryRowWidth)
                                                 << " erodes " << erodes << " iterations " << iterations);
                 const Field result = expected.field();
                 ASSERT_TRUE(morphed(src, dims, reach, erodes, iterations, true) == result);
-                if (width % 8 == 1) {
-                    ASSERT_TRUE(morphed(src, dims, reach, erodes, iterations, false) == result);
-                }
+                ASSERT_TRUE(width % 8 != 1 || morphed(src, dims, reach, erodes, iterations, false) == result);
             }
         }
 }
@@ -178,15 +173,14 @@ TEST(Morphology, nothingToDo)
     EXPECT_EQ(dst.nBits(), 0UL);
 }
 
-struct Starved {
-    int width, reach;
-    bool fillsAll;
-};
-
 TEST(Morphology, withoutAWorkAreaSetsAllOrDoesWithout)
 {
+    const struct {
+        int width, reach;
+        bool fillsAll;
+    } cases[] = {{31, 3, false}, {32, 1, false}, {33, 1, true}, {32, 2, true}, {32, 3, true}};
     std::mt19937 random(56);
-    for (const Starved& c : {Starved{31, 3, false}, {32, 1, false}, {33, 1, true}, {32, 2, true}, {32, 3, true}})
+    for (const auto& c : cases)
         for (bool erodes : {false, true}) {
             const KpVec3i dims(c.width, 4, 1);
             const Field src = noise(dims, 0.5, random).field();
@@ -196,7 +190,7 @@ TEST(Morphology, withoutAWorkAreaSetsAllOrDoesWithout)
                 const kplib::test::FailingMalloc failing(0);
                 if (c.reach == 1)
                     (erodes ? KpMorphology::erosion2D_4 : KpMorphology::dilation2D_4)(src, inPlane, {c.width, 4});
-                if (c.reach == 3)
+                else
                     (erodes ? KpMorphology::erosion2D_8 : KpMorphology::dilation2D_8)(src, inPlane, {c.width, 4});
             }
             {
@@ -204,12 +198,8 @@ TEST(Morphology, withoutAWorkAreaSetsAllOrDoesWithout)
                 in3D = morphed(src, dims, c.reach, erodes, 1, true);
             }
             EXPECT_TRUE(c.fillsAll ? !in3D.isAnyBitUnset() : in3D == plain) << c.width << ' ' << c.reach;
-            if (c.reach == 1) {
-                EXPECT_TRUE(c.fillsAll ? !inPlane.isAnyBitUnset() : inPlane == plain) << c.width;
-            }
-            if (c.reach == 3) {
-                EXPECT_TRUE(inPlane == plain) << c.width << ": 8 neighbours need none in aligned rows";
-            }
+            const bool fillsPlane = c.fillsAll && c.reach == 1;  // 8 neighbours need no area in aligned rows
+            EXPECT_TRUE(c.reach == 2 || (fillsPlane ? !inPlane.isAnyBitUnset() : inPlane == plain)) << c.width;
         }
 }
 
