@@ -53,7 +53,6 @@ const std::pair<const char*, Matrix> decomposed[] = {
     {"small numbers", noise(3, 3) * 1e-15F},
     {"tall", noise(100, 3)},
     {"wide", noise(3, 7)},
-    {"square", noise(20, 20)},
     {"two equal columns", noise(8, 3) * from(3, 4, {1, 0, 1, 0, 0, 1, 0, 0, 0, 0, 0, 1})},
 };
 
