@@ -33,7 +33,6 @@ TEST(TmgDateTime, datesGoThereAndBack)
     EXPECT_EQ(Tmg::dateReformat(std::string()), 7);
     Tmg::SetFuncDateReformatLong(nullptr);
     Tmg::SetFuncDateReformatString(nullptr);
-    EXPECT_EQ(Tmg::dateReformat(20240315), "2024-MAR-15");
 }
 
 TEST(TmgDateTime, timesAreFormattedAndMadeKeys)
@@ -146,7 +145,6 @@ TEST(TmgImages, framesAreNumberedInObjectsOfSeveral)
 {
     HxParamBundle object("Object");
     int frame = 0;
-    EXPECT_FALSE(Tmg::frameNumber(object, true, 3, frame));
     for (const char* single : {"Number of Frames: 1", "2", ":"}) {
         object.dicomAllCreate()->set("G0028-0008", single);
         EXPECT_FALSE(Tmg::frameNumber(object, true, 3, frame)) << single;
@@ -207,7 +205,6 @@ TEST(TmgSeries, imagesBelongToWhoHoldsThem)
     Tmg::volumeCacheSetFuncPrecache([](KpDArray<KpString>& n, bool a, bool b) { return n.size() == 0 && a && !b; });
     EXPECT_TRUE(Tmg::volumeCachePrecache(names, true, false));
     Tmg::volumeCacheSetFuncPrecache(nullptr);
-    EXPECT_FALSE(Tmg::volumeCachePrecache(names, true, false));
 }
 
 }  // namespace

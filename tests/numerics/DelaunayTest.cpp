@@ -238,17 +238,14 @@ TEST(KpDelaunay, shiftsACopyAndRestartsTheSystemsGenerator)
 TEST(KpDelaunay, refusesALargeCavity)
 {
     Coordinates fan = roundAndCenter<2>(3000);
+    Coordinates ball = roundAndCenter<3>(9000);
     KpDArray<KpDelaunay::Triangle> triangles{{1, 2, 3}};
+    KpDArray<KpDelaunay::Tetrahedron> tetrahedra{{1, 2, 3, 4}};
     const LogCapture log;
     EXPECT_FALSE(KpDelaunay::triangulate2D(reinterpret_cast<KpVec2f*>(fan.data()), 3001, triangles));
-    EXPECT_EQ(log.lines(), Lines{"E [] temporary storage exceeded\n"});
-    EXPECT_EQ(triangles.size(), 1);
-
-    Coordinates ball = roundAndCenter<3>(9000);
-    KpDArray<KpDelaunay::Tetrahedron> tetrahedra{{1, 2, 3, 4}};
     EXPECT_FALSE(KpDelaunay::triangulate3D(reinterpret_cast<KpVec3f*>(ball.data()), 9001, tetrahedra));
-    EXPECT_EQ(log.lines().size(), 1);  // this one is not told of
-    EXPECT_EQ(tetrahedra.size(), 1);
+    EXPECT_EQ(log.lines(), Lines{"E [] temporary storage exceeded\n"});  // in the plane only
+    EXPECT_TRUE(triangles.size() == 1 && tetrahedra.size() == 1);
 }
 
 template <int Size>
