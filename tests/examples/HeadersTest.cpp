@@ -1,7 +1,6 @@
 #include "volume-road/DicomTree.h"
 
 #include <kplib/foundation/KpDArray.h>
-#include <kplib/foundation/KpString.h>
 #include <kplib/imaging/KpWindowLevel.h>
 #include <kplib/imaging/TmgImages.h>
 
@@ -67,15 +66,7 @@ bool textOf(Header& header, const DcmTagKey& tag, std::string& text)
     return isThere;
 }
 
-struct Headers : testing::Test {
-    void SetUp() override
-    {
-        if (allHeaders().empty())
-            GTEST_SKIP() << "no real headers on this machine";
-    }
-};
-
-TEST_F(Headers, windowsAreThoseOfTheFile)
+TEST(Headers, windowsAreThoseOfTheFile)
 {
     for (const auto& header : allHeaders()) {
         SCOPED_TRACE(header->path);
@@ -97,7 +88,7 @@ TEST_F(Headers, windowsAreThoseOfTheFile)
     }
 }
 
-TEST_F(Headers, numbersAreThoseOfTheFile)
+TEST(Headers, numbersAreThoseOfTheFile)
 {
     for (const auto& header : allHeaders()) {
         SCOPED_TRACE(header->path);
@@ -109,34 +100,6 @@ TEST_F(Headers, numbersAreThoseOfTheFile)
         }
         const bool hasFrames = header->data().findAndGetSint32(DCM_NumberOfFrames, expected).good() && expected >= 2;
         EXPECT_EQ(Tmg::frameNumber(header->root, true, 1, number), hasFrames);
-    }
-}
-
-/// The creator of the block in which a private element lies; empty without a reservation.
-std::string creatorOf(Header& header, const DcmTag& tag)
-{
-    std::string creator;
-    textOf(header, DcmTagKey(tag.getGTag(), static_cast<Uint16>(tag.getETag() >> 8)), creator);
-    return creator;
-}
-
-TEST_F(Headers, privateTagsAreFoundByTheirCreators)
-{
-    for (const auto& header : allHeaders()) {
-        SCOPED_TRACE(header->path);
-        for (unsigned long i = 0; i < header->data().card(); ++i) {
-            const DcmElement& element = *header->data().getElement(i);
-            const DcmTag& tag = element.getTag();
-            if (!tag.isPrivate() || tag.isPrivateReservation() || tag.getETag() < 0x1000 || element.ident() == EVR_SQ)
-                continue;
-            const std::string creator = creatorOf(*header, tag);
-            if (creator.empty())
-                continue;
-            const KpString full(0, "G%04X-%04X", tag.getGTag(), tag.getETag());
-            const KpString inBlock(0, "G%04X-00%02X", tag.getGTag(), tag.getETag() & 255);
-            EXPECT_STREQ(header->root.findPrivateTag(creator.c_str(), inBlock, "none"),
-                         header->root.findTag(full, "none"));
-        }
     }
 }
 

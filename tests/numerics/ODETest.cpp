@@ -27,10 +27,8 @@ TEST(KpODE, attemptsHaveTheOrderOfTheirMethod)
 {
     for (const auto& c : methods) {
         SCOPED_TRACE(c.method);
-        float errors[2], estimates[2];
-        const float h = c.order == 6 ? 0.5F : 0.25F;
-        for (int i = 0; i < 2; ++i) {
-            const float step = h / static_cast<float>(1 + i);
+        float errors[2], estimates[2], step = c.order == 6 ? 0.5F : 0.25F;
+        for (int i = 0; i < 2; ++i, step /= 2) {
             KpODE3 ode;
             ode.setRightHandSide(curved, nullptr);
             ode.setNormalization(0);
@@ -74,7 +72,7 @@ TEST(KpODE, samplesTheCircleByItsArcLength)
     }
 }
 
-// Along x with steps of ever 0.5 until the field ends.
+// Along x until the field ends.
 int half(const KpVec2f& x, KpVec2f& derivative, void* code)
 {
     derivative = KpVec2f(3, 0);
