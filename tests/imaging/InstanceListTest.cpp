@@ -52,6 +52,8 @@ TEST(InstanceList, isStoredBehindItsCommonPrefix)
         List read;
         ASSERT_TRUE(Utility::sopUIDList(&bundle, read));
         EXPECT_EQ(asVector(read), asVector(each.list));
+        KpDArray<KpString> texts = strings({"old"});
+        EXPECT_TRUE(Utility::sopUIDList(&bundle, texts) && texts.size() == read.size());
         EXPECT_EQ(stored(bundle, "MD5Hash"), Utility::sopUIDHash(each.list).c_str());
         EXPECT_FALSE(Utility::sopUIDList(&bundle, read));  // not empty any more
     }
