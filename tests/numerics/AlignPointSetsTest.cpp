@@ -186,16 +186,14 @@ TEST(KpAlignPointSets, appliesTheInitialMatrixToWhateverThereIs)
 
 TEST(KpCompTransform, takesCentredMatrices)
 {
-    const float rows[] = {1, 0, 0, 0, 2, 0, 0, 0, 3, -1, -2, -3};
     KpDMatrix<float> a(4, 3), b(4, 3);
-    std::copy_n(rows, 12, a.data());
-    std::transform(rows, rows + 12, b.data(), [](float v) { return 2 * v; });
+    std::copy_n(std::begin({1.F, 0.F, 0.F, 0.F, 2.F, 0.F, 0.F, 0.F, 3.F, -1.F, -2.F, -3.F}), 12, a.data());
+    std::transform(a.data(), a.data() + 12, b.data(), [](float v) { return 2 * v; });
     const KpMat4f expected(2, 0, 0, 0, 0, 2, 0, 0, 0, 0, 2, 0, 4 - 2, 5 - 4, 6 - 6, 1);
     KpMat4f scaled, affine;
     kpCompRigidTransform(a, b, KpVec3f(1, 2, 3), KpVec3f(4, 5, 6), scaled, true);
     kpCompAffineTransform(a, b, KpVec3f(1, 2, 3), KpVec3f(4, 5, 6), affine);
-    EXPECT_TRUE(scaled.equals(expected, 1e-5F));
-    EXPECT_TRUE(affine.equals(expected, 1e-5F));
+    EXPECT_TRUE(scaled.equals(expected, 1e-5F) && affine.equals(expected, 1e-5F));
 }
 
 }  // namespace

@@ -53,7 +53,6 @@ const std::pair<const char*, Matrix> decomposed[] = {
     {"small numbers", noise(3, 3) * 1e-15F},
     {"tall", noise(100, 3)},
     {"wide", noise(3, 7)},
-    {"square", noise(20, 20)},
     {"two equal columns", noise(8, 3) * from(3, 4, {1, 0, 1, 0, 0, 1, 0, 0, 0, 0, 0, 1})},
 };
 
@@ -103,12 +102,9 @@ TEST(KpDMatrix, multipliesAndTransposesAnyShape)
     KpDMatrix<float> product = toKp(a);
     product *= toKp(b);
     product.transpose();
-    EXPECT_TRUE(toEigen(product).isApprox((a * b).transpose(), 1e-6F));
-
     const LogCapture log;
-    const Matrix before = toEigen(product);
     product *= product;
-    EXPECT_EQ(toEigen(product), before);
+    EXPECT_TRUE(toEigen(product).isApprox((a * b).transpose(), 1e-6F));
     EXPECT_EQ(log.lines(), Lines{"E [] KpDMatrix:operator*: Can not multiply 4x5 matrix by 4x5 matrix.\n"});
 }
 
@@ -220,10 +216,8 @@ TEST(KpDMatrix, pythagDoesNotOverflow)
     const float cases[][3] = {{3, -4, 5}, {-3e30F, 4e30F, 5e30F}, {3e-30F, 4e-30F, 5e-30F}, {0, 0, 0}, {0, -2, 2}};
     for (const auto& [a, b, expected] : cases)
         EXPECT_FLOAT_EQ(KpDMatrix<float>::pythag(a, b), expected);
-    for (const float other : {0.0F, 1.0F}) {
-        EXPECT_TRUE(std::isnan(KpDMatrix<float>::pythag(NAN, other)));
-        EXPECT_TRUE(std::isnan(KpDMatrix<float>::pythag(other, NAN)));
-    }
+    for (const auto& [a, b] : {std::pair(0.0F, NAN), {1.0F, NAN}, {NAN, 0.0F}, {NAN, 1.0F}})
+        EXPECT_TRUE(std::isnan(KpDMatrix<float>::pythag(a, b)));
 }
 
 }  // namespace

@@ -37,19 +37,13 @@ Coordinates many(int n, Make make)  // of the number of a point and an axis
 
 /// On the unit circle, or spread over the unit sphere.
 template <int Size>
-Coordinates round(int n)
+Coordinates roundAndCenter(int n)
 {
-    return many<Size>(n, [n](int i, int axis) {
+    Coordinates result = many<Size>(n, [n](int i, int axis) {
         const double z = Size == 2 ? 0 : 1 - (2 * i + 1.0) / n;
         const double angle = Size == 2 ? 2 * pi * i / n : i * pi * (3 - std::sqrt(5.0)), r = std::sqrt(1 - z * z);
         return axis == 2 ? z : axis == 1 ? r * std::sin(angle) : r * std::cos(angle);
     });
-}
-
-template <int Size>
-Coordinates roundAndCenter(int n)
-{
-    Coordinates result = round<Size>(n);
     result.resize(result.size() + Size);
     return result;
 }
@@ -74,15 +68,14 @@ std::map<std::string, Coordinates> inputs()
         {"clusters within clusters",
          many<Size>(600, [&](int i, int) { return std::pow(4.0, -(i / 60)) * noise(0, 0); })},
         {"far clusters", many<Size>(300, [&](int i, int) { return i % 3 * 1e4 + noise(0, 0) * 1e-2; })},
-        {"lattice",
-         many<Size>(343, [](int i, int axis) { return axis == 0   ? i % 7
-                                                      : axis == 1 ? i / 7 % 7
-                                                                  : i / 49; })},
+        {"lattice", many<Size>(343, [](int i, int axis) { return i /
+                                                                 (axis == 0   ? 1
+                                                                  : axis == 1 ? 7
+                                                                              : 49) %
+                                                                 7; })},
         {"twice the same", many<Size>(120, [](int i, int axis) { return (i % 60 * 37 + axis * (i % 60) * 11) % 61; })},
         {"one place", many<Size>(9, [](int, int) { return 0.7; })},
-        {"a line", many<Size>(80, [](int i, int axis) { return axis == 0 ? i * 0.1 : 0; })},
         {"a slanted line", many<Size>(80, [](int i, int axis) { return i * (axis + 1); })},
-        {"round", round<Size>(200)},
         {"round with a centre", roundAndCenter<Size>(200)},
         {"infinite", withOdd(infinite)},
         {"not a number", withOdd(nan)},
@@ -127,7 +120,7 @@ TEST(KpDelaunay, equalsThePlainInsertionInEveryIndex)
         comparesToPlain<2>(what, coordinates);
     for (const auto& [what, coordinates] : inputs<3>())
         comparesToPlain<3>(what, coordinates);
-    for (const int n : {300, 500, 700, 1300})  // until a cavity is too large
+    for (const int n : {700, 1300})  // the cavity of the second is too large
         comparesToPlain<2>("fan", roundAndCenter<2>(n));
 }
 
@@ -214,32 +207,6 @@ TEST(KpDelaunay, keepsPointsOutOfCircles)
     EXPECT_TRUE((contains<2>({{1, 1}, nan}, {4, 5})));
 }
 
-TEST(KpDelaunay, turnsItsPartsAndDropsFlatOnes)
-{
-    struct Case {
-        const char* what;
-        std::vector<KpVec2f> points;
-        long count;
-    };
-    const Case cases[] = {
-        {"nothing", {}, 0},
-        {"clockwise", {{0, 0}, {0, 1}, {1, 0}}, 1},
-        {"counter-clockwise", {{0, 0}, {1, 0}, {0, 1}}, 1},
-        {"a square", {{0, 0}, {1, 0}, {1, 1}, {0, 1}}, 2},
-        {"in a line", {{0, 0}, {1, 0}, {2, 0}, {3, 0}, {7, 0}}, 0},
-    };
-    for (Case c : cases) {
-        SCOPED_TRACE(c.what);
-        KpDArray<KpDelaunay::Triangle> triangles{{1, 2, 3}};
-        ASSERT_TRUE(KpDelaunay::triangulate2D(c.points.data(), static_cast<int>(c.points.size()), triangles));
-        EXPECT_EQ(triangles.size(), c.count);
-        for (const auto& t : triangles) {
-            const KpVec2f a = c.points[t[1]] - c.points[t[0]], b = c.points[t[2]] - c.points[t[0]];
-            EXPECT_EQ(a.x() * b.y() - a.y() * b.x(), 1);
-        }
-    }
-}
-
 TEST(KpDelaunay, shiftsACopyAndRestartsTheSystemsGenerator)
 {
     Coordinates zeros(2000);
@@ -271,17 +238,14 @@ TEST(KpDelaunay, shiftsACopyAndRestartsTheSystemsGenerator)
 TEST(KpDelaunay, refusesALargeCavity)
 {
     Coordinates fan = roundAndCenter<2>(3000);
+    Coordinates ball = roundAndCenter<3>(9000);
     KpDArray<KpDelaunay::Triangle> triangles{{1, 2, 3}};
+    KpDArray<KpDelaunay::Tetrahedron> tetrahedra{{1, 2, 3, 4}};
     const LogCapture log;
     EXPECT_FALSE(KpDelaunay::triangulate2D(reinterpret_cast<KpVec2f*>(fan.data()), 3001, triangles));
-    EXPECT_EQ(log.lines(), Lines{"E [] temporary storage exceeded\n"});
-    EXPECT_EQ(triangles.size(), 1);
-
-    Coordinates ball = roundAndCenter<3>(9000);
-    KpDArray<KpDelaunay::Tetrahedron> tetrahedra{{1, 2, 3, 4}};
     EXPECT_FALSE(KpDelaunay::triangulate3D(reinterpret_cast<KpVec3f*>(ball.data()), 9001, tetrahedra));
-    EXPECT_EQ(log.lines().size(), 1);  // this one is not told of
-    EXPECT_EQ(tetrahedra.size(), 1);
+    EXPECT_EQ(log.lines(), Lines{"E [] temporary storage exceeded\n"});  // in the plane only
+    EXPECT_TRUE(triangles.size() == 1 && tetrahedra.size() == 1);
 }
 
 template <int Size>
@@ -313,7 +277,7 @@ TEST(KpDelaunay, drawsItsTriangles)
 {
     const TempFolder folder;
     const std::string path = folder / "mesh.eps";
-    KpVec2f points[] = {{1, 1}, {5, 1}, {5, 3}, {1, 3}};
+    KpVec2f points[] = {{1, 1}, {5, 1}, {5, 3}, {1, 3}}, upright[] = {{1, 1}, {1, 5}, {3, 5}, {3, 1}};
     KpDArray<KpDelaunay::Triangle> triangles{{0, 1, 2}, {0, 2, 3}};
     const std::string head = "%!PS-Adobe-2.0 EPSF-2.0\n%%BoundingBox: 84 207 511 634\n/M  { moveto } bind def\n"
                              "/L { lineto } bind def\n/CS { closepath stroke } bind def\n85 208 translate\n"
@@ -322,9 +286,7 @@ TEST(KpDelaunay, drawsItsTriangles)
     EXPECT_EQ(contentOf(path), head + "0 0.25 translate\n0.25 0.25 scale\n0 setlinewidth\n"
                                       "0 0 M 4 0 L 4 2 L CS\n0 0 M 4 2 L 0 2 L CS\nshowpage\n");
     triangles.clear();
-    for (KpVec2f& p : points)
-        p = KpVec2f(p.y(), p.x());
-    ASSERT_TRUE(KpDelaunay::writeEPS(path.c_str(), points, 4, triangles));
+    ASSERT_TRUE(KpDelaunay::writeEPS(path.c_str(), upright, 4, triangles));
     EXPECT_EQ(contentOf(path), head + "0.25 0 translate\n0.25 0.25 scale\n0 setlinewidth\nshowpage\n");
     ASSERT_TRUE(KpDelaunay::writeEPS(path.c_str(), nullptr, 0, triangles));
     EXPECT_EQ(contentOf(path), head + "showpage\n");

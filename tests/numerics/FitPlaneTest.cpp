@@ -43,7 +43,6 @@ TEST(KpFitPlane, needsThreePointsOrOne)
     EXPECT_EQ(plane.projection(), KpMat4f::identity());
     EXPECT_EQ(plane.orthogonalPlaneFit(), 0);
     EXPECT_EQ(plane.centroid(), KpVec3f(2, 2, 3));
-    EXPECT_EQ(plane.normal().x(), 0);
     plane.points() = {KpVec3f(1, 2, 3), KpVec3f(1, 3, 3), KpVec3f(1, 2, 4)};  // a normal along x has no basis
     EXPECT_EQ(plane.createPlane(), plane.projection());
     EXPECT_LT((plane.projection().multMatrixVec(KpVec3f(9, 9, 9)) - plane.centroid()).length(), 1e-5F);

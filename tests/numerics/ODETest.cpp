@@ -27,10 +27,8 @@ TEST(KpODE, attemptsHaveTheOrderOfTheirMethod)
 {
     for (const auto& c : methods) {
         SCOPED_TRACE(c.method);
-        float errors[2], estimates[2];
-        const float h = c.order == 6 ? 0.5F : 0.25F;
-        for (int i = 0; i < 2; ++i) {
-            const float step = h / static_cast<float>(1 + i);
+        float errors[2], estimates[2], step = c.order == 6 ? 0.5F : 0.25F;
+        for (int i = 0; i < 2; ++i, step /= 2) {
             KpODE3 ode;
             ode.setRightHandSide(curved, nullptr);
             ode.setNormalization(0);
@@ -66,9 +64,7 @@ TEST(KpODE, samplesTheCircleByItsArcLength)
                 const float angle = orientation * 0.03F * static_cast<float>(i) / 2;
                 const KpVec2f radius(std::cos(angle), std::sin(angle));
                 EXPECT_LT((point - radius * 2.0F).length(), 0.01F) << i;
-                // The derivatives are by the parameter of the segment: dt along the circle, dt squared by its
-                // curvature.
-                const float dt = derivative.length();
+                const float dt = derivative.length();  // both are by the parameter of the segment
                 EXPECT_GT(derivative.dot(KpVec2f(-radius.y(), radius.x())) * orientation, 0.999F * dt) << i;
                 EXPECT_LT((second + radius * (dt * dt / 2)).length(), 0.2F * dt * dt) << i;
             }
@@ -76,7 +72,7 @@ TEST(KpODE, samplesTheCircleByItsArcLength)
     }
 }
 
-// Along x with steps of ever 0.5 until the field ends.
+// Along x until the field ends.
 int half(const KpVec2f& x, KpVec2f& derivative, void* code)
 {
     derivative = KpVec2f(3, 0);
@@ -97,19 +93,15 @@ TEST(KpODE, staysAtTheEndOfItsCurveOrGoesOnAlongTheLastCubic)
         EXPECT_NEAR(point.x(), 0.25F * static_cast<float>(i), 1e-5F);
     }
     KpODE2 flagged = ode;
-    for (int i = 0; i < 2; ++i) {
-        EXPECT_EQ(ode.next(point), code);
-        EXPECT_EQ(point, KpVec2f(2, 1));
-    }
-    EXPECT_EQ(ode.status(), code);
+    for (int i = 0; i < 2; ++i)
+        EXPECT_TRUE(ode.next(point) == code && point == KpVec2f(2, 1) && ode.status() == code);
     EXPECT_FLOAT_EQ(ode.h(), 0.5F / 16);  // quartered twice
     for (int i = 1; i <= 3; ++i) {
         EXPECT_EQ(flagged.next(point, 1), code);
         EXPECT_NEAR(point.x(), 2 + 0.25F * static_cast<float>(i), 1e-5F);
     }
     flagged.freeze(KpVec2f(5, 6));
-    EXPECT_EQ(flagged.next(point), KpODE2::Frozen);
-    EXPECT_EQ(point, KpVec2f(5, 6));
+    EXPECT_TRUE(flagged.next(point) == KpODE2::Frozen && point == KpVec2f(5, 6));
 }
 
 /// The same everywhere, as the user data has it.
@@ -128,16 +120,16 @@ TEST(KpODE, tellsWhyItEnds)
         float* speed;  // null: the circular field
         int method, checkHMin;
         float tolerance, hMin, hMax;
-        int code, status;
+        int code;
     } cases[] = {
-        {"no field", &zero, 2, 0, 0.02F, 0.1F, 10, O::ZeroField, O::ZeroField},
-        {"no such method", nullptr, 5, 0, 0.02F, 0.1F, 10, O::MethodOutOfRange, O::MethodOutOfRange},
-        {"negative method", nullptr, -1, 0, 0.02F, 0.1F, 10, O::MethodOutOfRange, O::MethodOutOfRange},
-        {"tolerance out of reach", nullptr, 2, 0, 0, 0.1F, 10, O::StepTooSmall, O::StepTooSmall},
-        {"no step is good enough", nullptr, 2, 0, -1, 0, 10, O::StepTooSmall, O::StepTooSmall},
-        {"steps of no length", nullptr, 2, 0, 0.02F, 0, 0, O::StepTooSmall, O::StepTooSmall},
-        {"short steps unwanted", nullptr, 2, 1, 0.02F, 0.2F, 0.1F, O::StepTooSmall, O::Success},
-        {"no numbers", &noNumber, 2, 0, 0.02F, 0.1F, 10, O::StepTooSmall, O::StepTooSmall},
+        {"no field", &zero, 2, 0, 0.02F, 0.1F, 10, O::ZeroField},
+        {"no such method", nullptr, 5, 0, 0.02F, 0.1F, 10, O::MethodOutOfRange},
+        {"negative method", nullptr, -1, 0, 0.02F, 0.1F, 10, O::MethodOutOfRange},
+        {"tolerance out of reach", nullptr, 2, 0, 0, 0.1F, 10, O::StepTooSmall},
+        {"no step is good enough", nullptr, 2, 0, -1, 0, 10, O::StepTooSmall},
+        {"steps of no length", nullptr, 2, 0, 0.02F, 0, 0, O::StepTooSmall},
+        {"short steps unwanted", nullptr, 2, 1, 0.02F, 0.2F, 0.1F, O::StepTooSmall},
+        {"no numbers", &noNumber, 2, 0, 0.02F, 0.1F, 10, O::StepTooSmall},
     };
     for (const auto& c : cases) {
         SCOPED_TRACE(c.what);
@@ -154,7 +146,7 @@ TEST(KpODE, tellsWhyItEnds)
         for (int i = 0; i < 1000 && code == 0; ++i)
             code = ode.next(point);
         EXPECT_EQ(code, c.code);
-        EXPECT_EQ(ode.status(), c.status);
+        EXPECT_EQ(ode.status(), c.checkHMin ? O::Success : c.code);
         EXPECT_EQ(std::isnan(point.x()), c.speed == &noNumber);
     }
 }
@@ -201,8 +193,7 @@ TEST(KpODE, walksAsFarAsAChordIsNear)
         ode.init(KpVec2f(1, 0), 0.1F);
         KpVec2f point, derivative;
         const int steps = ode.nextSL(point, derivative, minSteps, maxSteps, tolerance);
-        EXPECT_GE(steps, low);
-        EXPECT_LE(steps, high);
+        EXPECT_TRUE(steps >= low && steps <= high) << steps;
     }
 }
 

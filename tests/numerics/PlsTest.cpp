@@ -76,8 +76,6 @@ TEST(Pls, endsThatCoincideNeedTheLoop)
     for (const Points& few : {Points(), Points({{1, 1}}), Points({{1, 1}, {1, 1}})}) {
         KpPls::DouglasPeuckerInLoop(few, 0.5F, result);
         EXPECT_EQ(result.size(), 0);
-        KpPls::DouglasPeucker(few, 0.5F, result);
-        EXPECT_EQ(result.size(), 0);
     }
     // A spiral, where each split takes off a single point.
     Points spiral;
@@ -95,10 +93,8 @@ TEST(Pls, reumannWitkamGoesAlongStrips)
         std::vector<KpVec2f> kept;
     } cases[] = {
         {{{0, 0}, {1, 0}, {2, 0.1F}, {3, 0}, {3, 1}, {3, 2}}, 0.5F, {{0, 0}, {3, 0}, {3, 2}}},
-        {{{0, 0}, {1, 0}, {2, 0}, {3, 0}}, 0.5F, {{0, 0}, {3, 0}}},              // the strip reaches the end
-        {{{0, 0}, {0.1F, 0}, {0.1F, 3}, {0.1F, 5}}, 0.5F, {{0, 0}, {0.1F, 5}}},  // a short piece tells no direction
-        {{{0, 0}, {0.1F, 0}, {0.2F, 0}}, 5, {{0, 0}, {0.2F, 0}}},
-        {{{0, 0}, {1, 0.5F}, {2, 2}}, 0.5F, {{0, 0}, {1, 0.5F}, {2, 2}}},
+        {{{0, 0}, {1, 0}, {2, 0}, {3, 0}}, 0.5F, {{0, 0}, {3, 0}}},               // the strip reaches the end
+        {{{0, 0}, {0.1F, 0}, {0.1F, 3}, {0.1F, 5}}, 0.5F, {{0, 0}, {0.1F, 5}}},   // a short piece tells no direction
         {{{0, 0}, {1, 0}, {2, 1}, {3, 0}}, 1, {{0, 0}, {1, 0}, {2, 1}, {3, 0}}},  // just as long, just as far
         {{{3, 3}, {3, 3}}, 9, {{3, 3}, {3, 3}}},
         {{}, 9, {}},

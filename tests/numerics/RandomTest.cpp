@@ -3,8 +3,6 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <array>
-#include <cstdint>
 #include <functional>
 #include <random>
 #include <thread>
@@ -47,7 +45,7 @@ TEST(KpRandom, staysInItsRangeForAnySeed)
 
 TEST(KpRandom, servesManyThreadsFromOneGenerator)
 {
-    std::vector<std::thread> threads;
+    std::vector<std::jthread> threads;
     for (int t = 0; t < 4; ++t)
         threads.emplace_back([] {
             double sum = 0;
@@ -58,8 +56,6 @@ TEST(KpRandom, servesManyThreadsFromOneGenerator)
             }
             EXPECT_NEAR(sum / 20000, 0.5, 0.05);
         });
-    for (std::thread& thread : threads)
-        thread.join();
 }
 
 }  // namespace

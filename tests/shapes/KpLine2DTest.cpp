@@ -11,13 +11,10 @@ constexpr float nan = std::numeric_limits<float>::quiet_NaN();
 TEST(KpLine2D, distancesAreSignedAndEndless)
 {
     const KpLine2D line({1, 1}, {4, 5});  // direction (3, 4)
-    const struct {
-        KpVec2f p;
-        float distance;
-    } cases[] = {{{1, 1}, 0}, {{-3, 4}, 5}, {{5, -2}, -5}, {{7, 9}, 0}, {{3, 12}, 5}};
-    for (const auto& each : cases) {
-        EXPECT_FLOAT_EQ(line.getDistanceTo(each.p), each.distance) << each.p;
-        EXPECT_FLOAT_EQ(line.getDistance2To(each.p), each.distance * each.distance);
+    const std::pair<KpVec2f, float> cases[] = {{{-3, 4}, 5}, {{5, -2}, -5}, {{7, 9}, 0}, {{3, 12}, 5}};
+    for (const auto& [p, distance] : cases) {
+        EXPECT_FLOAT_EQ(line.getDistanceTo(p), distance) << p;
+        EXPECT_FLOAT_EQ(line.getDistance2To(p), distance * distance);
     }
     KpLine2D point;
     point.setPosDir({1, 1}, {0, 0});
@@ -31,12 +28,9 @@ TEST(KpLine2D, distancesAreSignedAndEndless)
 TEST(KpLine2D, theClosestPointMayBeKeptInTheSegment)
 {
     const KpLine2D line({1, 0}, {3, 0});
-    const struct {
-        KpVec2f p, onLine, onSegment;
-    } cases[] = {{{2, 5}, {2, 0}, {2, 0}}, {{-7, 1}, {-7, 0}, {1, 0}}, {{9, -1}, {9, 0}, {3, 0}}};
-    for (const auto& each : cases) {
-        EXPECT_EQ(line.getClosestPoint(each.p, false), each.onLine);
-        EXPECT_EQ(line.getClosestPoint(each.p, true), each.onSegment);
+    for (const auto& [x, onSegment] : {std::pair(2.0F, 2.0F), {-7.0F, 1.0F}, {9.0F, 3.0F}}) {
+        EXPECT_EQ(line.getClosestPoint({x, 5}, false), KpVec2f(x, 0));
+        EXPECT_EQ(line.getClosestPoint({x, 5}, true), KpVec2f(onSegment, 0));
     }
     KpLine2D moved({1, 1}, {4, 5});
     moved.translate(5);

