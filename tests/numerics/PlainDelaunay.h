@@ -59,7 +59,12 @@ std::optional<std::vector<Simplex>> plainDelaunay(const detail::delaunay::PointS
             stack[--alive] = slot;
         }
         for (const Face<Size>& face : rim) {
-            const int slot = stack.at(alive++);
+            if (alive == static_cast<int>(stack.size())) {  // flat sets take more slots than there are parts
+                stack.push_back(alive);
+                slots.push_back({-1});
+                circles.emplace_back();
+            }
+            const int slot = stack[alive++];
             std::copy(face.begin(), face.end(), slots[slot].begin());
             slots[slot][Size] = i;
             circles[slot] = circleThrough<Size>(set.points.data(), face, i);
