@@ -36,6 +36,10 @@ TEST(Message, valuesAreTheirBytesInMemory)
     EXPECT_EQ(wire(-2, 0x01020304U, 1.0F), "feffffff040302010000803f");
     EXPECT_EQ(wire(-2L, -3LL), "fefffffffffffffffdffffffffffffff");
     EXPECT_EQ(wire(0x0102030405060708ULL, 1.0), "0807060504030201000000000000f03f");
+    EXPECT_EQ(wire(KpVec2i(1, 2), KpVec4i(3, 4, 5, 6), KpBox3i(1, 2, 3, 4, 5, 6)),
+              wire(1, 2, 3, 4, 5, 6, 1, 2, 3, 4, 5, 6));
+    EXPECT_EQ(wire(KpColor(1, 2, 3), KpBox2f(4, 5, 6, 7), KpBox3f(1, 2, 1, 3, 1, 4), KpRotation::identity()),
+              wire(1.F, 2.F, 3.F, 4.F, 5.F, 6.F, 7.F, 1.F, 2.F, 1.F, 3.F, 1.F, 4.F, 0.F, 0.F, 0.F, 1.F));
     EXPECT_EQ(wire(KpUniqueID(1), KpTransferID(2), KpFrameID(3), KpVec3l(4, 5, 6)), wire(1L, 2L, 3L, 4L, 5L, 6L));
     EXPECT_EQ(wire(KpRemotificationID(4), TmSessionContextID(5), KpPrimType(KpPrimType::UShort)), wire(4, 5, 7));
     EXPECT_EQ(wire(KpDArray<bool>{true, false}, KpDArray<long>{-1}), "02000000010001000000ffffffffffffffff");
