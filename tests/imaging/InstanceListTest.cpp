@@ -82,7 +82,8 @@ TEST(InstanceList, theStoredHashIsTaken)
 {
     HxParamBundle bundle("B");
     EXPECT_FALSE(Utility::hasSopUIDHash(&bundle) || Utility::hasSopUIDHash(nullptr));
-    EXPECT_STREQ(Utility::sopUIDHash(&bundle), "");
+    for (const HxParamBundle* without : {&bundle, static_cast<HxParamBundle*>(nullptr)})
+        EXPECT_STREQ(Utility::sopUIDHash(without), "");
     const List list({"1.2", "2.3"});
     Utility::setSopUIDList(&bundle, list);
     const KpString hash = Utility::sopUIDHash(list);

@@ -11,7 +11,7 @@ TEST(KpColor, readsTexts)
         const char* text;
         bool ok;
         KpColor color;
-    } cases[] = {{"0.5", true, {0.5f, 0.5f, 0.5f}},
+    } cases[] = {{"1 0.5 0", true, {1, 0.5f, 0}},
                  {" \t128", true, {grey, grey, grey}},
                  {"255 0 0", true, {1, 0, 0}},
                  {"#1FF8000", true, {1, grey, 0}},

@@ -118,6 +118,7 @@ TEST(KpSocket, readsLinesAndNothingBehindThem)
     for (size_t step : {text.size(), size_t{1}, size_t{513}}) {
         Pair pair;
         KpSocket::nonBlocking(pair.mine);
+        EXPECT_TRUE(KpSocket::isNonBlocking(pair.mine));
         std::thread writer([&] {
             usleep(10000);  // so that a socket that isn't blocking would show
             put(pair.peer, text, step);
