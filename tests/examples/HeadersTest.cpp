@@ -1,7 +1,9 @@
 #include "volume-road/DicomTree.h"
 
 #include <kplib/foundation/KpDArray.h>
+#include <kplib/foundation/KpString.h>
 #include <kplib/imaging/KpWindowLevel.h>
+#include <kplib/imaging/TmgDateTime.h>
 #include <kplib/imaging/TmgImages.h>
 
 #include <dcmtk/config/osconfig.h>
@@ -10,9 +12,11 @@
 
 #include <gtest/gtest.h>
 
+#include <cctype>
 #include <filesystem>
 #include <iostream>
 #include <memory>
+#include <set>
 #include <vector>
 
 // Real headers: what the library says of a tree is held against what the DICOM toolkit says of the file.
@@ -66,17 +70,27 @@ bool textOf(Header& header, const DcmTagKey& tag, std::string& text)
     return isThere;
 }
 
-TEST(Headers, windowsAreThoseOfTheFile)
+class Headers : public testing::Test {
+protected:
+    void SetUp() override
+    {
+        if (allHeaders().empty())
+            GTEST_SKIP() << "no real headers on this machine";
+    }
+};
+
+TEST_F(Headers, windowsAreThoseOfTheFile)
 {
+    int windows = 0;
     for (const auto& header : allHeaders()) {
         SCOPED_TRACE(header->path);
         std::string center, width, explanation;
         if (!textOf(*header, DCM_WindowCenter, center) || !textOf(*header, DCM_WindowWidth, width))
             continue;
         textOf(*header, DCM_WindowCenterWidthExplanation, explanation);
-        const auto tag = [&](const char* name) { return std::string(header->root.findTag(name, "")); };
-        const auto presets =
-            KpWindowLevel::createFromTags(std::array{tag("G0028-1050"), tag("G0028-1051"), tag("G0028-1055")});
+        const auto presets = KpWindowLevel::createFromTags(
+            std::array<std::string, 3>{header->root.findTag("G0028-1050", ""), header->root.findTag("G0028-1051", ""),
+                                       header->root.findTag("G0028-1055", "")});
         const auto tags = KpWindowLevel::toTags(presets);
         EXPECT_EQ(tags.center, center);
         EXPECT_EQ(tags.width, width);
@@ -84,12 +98,38 @@ TEST(Headers, windowsAreThoseOfTheFile)
             double value = 0;
             ASSERT_TRUE(header->data().findAndGetFloat64(DCM_WindowCenter, value, i).good());
             EXPECT_EQ(presets[i].center(), static_cast<float>(value));
+            ++windows;
         }
     }
+    std::cout << windows << " windows\n";
 }
 
-TEST(Headers, numbersAreThoseOfTheFile)
+TEST_F(Headers, datesAndTimesAreFormatted)
 {
+    int dates = 0, times = 0;
+    for (const auto& header : allHeaders()) {
+        SCOPED_TRACE(header->path);
+        std::string date, time;
+        if (textOf(*header, DCM_StudyDate, date) && date.size() == 8 && std::stol(date.substr(4, 2)) >= 1) {
+            const std::string text = Tmg::dateReformat(std::stol(date));
+            EXPECT_EQ(text.substr(0, 5) + text.substr(8), date.substr(0, 4) + "--" + date.substr(6));
+            EXPECT_EQ(Tmg::dateReformat(text), std::stol(date));
+            ++dates;
+        }
+        if (textOf(*header, DCM_StudyTime, time) && (time.size() == 6 || (time.size() > 6 && time[6] == '.'))) {
+            const std::string text = Tmg::timeReformat(time.c_str());
+            EXPECT_EQ(text, time.substr(0, 2) + ':' + time.substr(2, 2) + ':' + time.substr(4, 2));
+            const std::string key = Tmg::timeString(time, true);
+            EXPECT_EQ(key.find('.'), 8U) << key;
+            ++times;
+        }
+    }
+    std::cout << dates << " dates, " << times << " times\n";
+}
+
+TEST_F(Headers, numbersAreThoseOfTheFile)
+{
+    int numbers = 0, frames = 0;
     for (const auto& header : allHeaders()) {
         SCOPED_TRACE(header->path);
         Sint32 expected = 0;
@@ -97,10 +137,65 @@ TEST(Headers, numbersAreThoseOfTheFile)
         if (header->data().findAndGetSint32(DCM_InstanceNumber, expected).good()) {
             EXPECT_TRUE(Tmg::imageNumber(header->root, 0, number));
             EXPECT_EQ(number, expected);
+            ++numbers;
         }
         const bool hasFrames = header->data().findAndGetSint32(DCM_NumberOfFrames, expected).good() && expected >= 2;
         EXPECT_EQ(Tmg::frameNumber(header->root, true, 1, number), hasFrames);
+        frames += hasFrames;
     }
+    std::cout << numbers << " instance numbers, " << frames << " objects of frames\n";
+}
+
+TEST_F(Headers, tagsOfTheVolumeAreApproximateUnlessConstant)
+{
+    for (const auto& header : allHeaders()) {
+        SCOPED_TRACE(header->path);
+        const HxParamBundle& all = *header->root.dicomAll();
+        for (const char* tag : {"G0008-0060", "G0018-0050", "G0020-0013", "G0008-0032", "G0020-1041"}) {
+            KpString value;
+            bool approximate = false;
+            const char* leaf = nullptr;
+            const bool isThere = all.findString(tag, leaf);
+            EXPECT_EQ(Tmg::imageLevelTag(header->root, 0, tag, value, approximate), isThere);
+            EXPECT_EQ(approximate, !Tmg::tagsConstantInVolume.contains(tag));
+            if (isThere && *header->root.findTag(tag, "")) {
+                EXPECT_STREQ(value, header->root.findTag(tag, ""));
+            }
+        }
+    }
+}
+
+/// The creator of the block in which a private element lies; empty without a reservation.
+std::string creatorOf(Header& header, const DcmTag& tag)
+{
+    std::string creator;
+    textOf(header, DcmTagKey(tag.getGTag(), static_cast<Uint16>(tag.getETag() >> 8)), creator);
+    return creator;
+}
+
+TEST_F(Headers, privateTagsAreFoundByTheirCreators)
+{
+    std::set<std::string> creators;
+    int found = 0;
+    for (const auto& header : allHeaders()) {
+        SCOPED_TRACE(header->path);
+        for (unsigned long i = 0; i < header->data().card(); ++i) {
+            const DcmElement& element = *header->data().getElement(i);
+            const DcmTag& tag = element.getTag();
+            if (!tag.isPrivate() || tag.isPrivateReservation() || tag.getETag() < 0x1000 || element.ident() == EVR_SQ)
+                continue;
+            const std::string creator = creatorOf(*header, tag);
+            if (creator.empty())
+                continue;
+            const KpString full(0, "G%04X-%04X", tag.getGTag(), tag.getETag());
+            const KpString inBlock(0, "G%04X-00%02X", tag.getGTag(), tag.getETag() & 255);
+            EXPECT_STREQ(header->root.findPrivateTag(creator.c_str(), inBlock, "none"),
+                         header->root.findTag(full, "none"));
+            creators.insert(creator);
+            ++found;
+        }
+    }
+    std::cout << found << " private elements of " << creators.size() << " creators\n";
 }
 
 }  // namespace
