@@ -35,7 +35,8 @@ public:
 
     bool isOutline(long x, long y) const
     {
-        return outline_.test(static_cast<unsigned long>(first() + y * volume_.dims[0] + x));
+        const auto voxel = static_cast<unsigned long>(first() + y * volume_.dims[0] + x);
+        return voxel < outline_.nBits() && outline_.test(voxel);
     }
     KpVec2f at(long x, long y) const
     {
