@@ -5,7 +5,6 @@
 #include <kplib/foundation/KpForward.h>
 
 #include <cstring>
-#include <memory>
 #include <string>
 #include <type_traits>
 
@@ -142,7 +141,7 @@ static_assert(sizeof(TmMsg) == 40);
 template <kplib::detail::WireValue T>
 TmMsg& operator<<(TmMsg& msg, const T& value)
 {
-    msg.writeRawBytes(sizeof(T), std::addressof(value));
+    msg.writeRawBytes(sizeof(T), &value);
     return msg;
 }
 
@@ -154,9 +153,9 @@ TmMsg& operator>>(TmMsg& msg, T& value)
     if constexpr (std::is_same_v<T, bool>)
         value = bytes && *static_cast<const unsigned char*>(bytes) != 0;
     else if (bytes)
-        std::memcpy(static_cast<void*>(std::addressof(value)), bytes, sizeof(T));
+        std::memcpy(static_cast<void*>(&value), bytes, sizeof(T));
     else
-        std::memset(static_cast<void*>(std::addressof(value)), 0, sizeof(T));
+        std::memset(static_cast<void*>(&value), 0, sizeof(T));
     return msg;
 }
 
