@@ -1,13 +1,4 @@
-#include <kplib/foundation/KpMemoryException.h>
-#include <kplib/geometry/KpMat4f.h>
-#include <kplib/geometry/KpPlane.h>
-#include <kplib/log/KpLogFile.h>
-#include <kplib/log/KpResult.h>
-#include <kplib/net/TmMsg.h>
-#include <kplib/rawdata/KpTypedData2D.h>
-#include <kplib/rawdata/TmDataAccess.h>
-#include <kplib/system/KpFilename.h>
-#include <kplib/volume/KpBitfield.h>
+#include <kplib/kplib.h>
 
 #include <algorithm>
 #include <array>
@@ -102,16 +93,37 @@ void readInner(TmMsg& msg)
         use(inner.dataPtr(), inner.size());
 }
 
-constexpr std::array readers = {
-    readValue<bool>,    readValue<unsigned short>,
-    readValue<double>,  readValue<KpMat4f>,
-    readValue<KpPlane>, readValue<KpResult>,
-    readArray<bool>,    readArray<int>,
-    readArray<long>,    readArray<KpPlane>,
-    readArray<KpMat4f>, readTexts,
-    readImage,          readField,
-    readVolume,         readInner,
-};
+void readResult(TmMsg& msg)
+{
+    KpResult result;
+    msg >> result;
+    use(result.data(), std::strlen(result.data()));
+}
+
+template <typename... T>
+constexpr auto valueReaders = std::array{readValue<T>...};
+template <typename... T>
+constexpr auto arrayReaders = std::array{readArray<T>...};
+
+constexpr auto values =
+    valueReaders<unsigned char, bool, unsigned short, int, unsigned int, float, double, long, long long,
+                 unsigned long long, KpVec2i, KpVec2f, KpVec3i, KpVec3f, KpVec3l, KpVec4i, KpVec4f, KpColor, KpRotation,
+                 KpPlane, KpLine, KpBox2f, KpBox3f, KpBox3i, KpMat4f, KpPrimType, KpLib::MD5, KpUniqueID, KpTransferID,
+                 KpFrameID, KpRemotificationID, TmSessionContextID>;
+constexpr auto arrays = arrayReaders<unsigned char, bool, int, float, double, long, long long, KpVec2f, KpVec3i,
+                                     KpVec3f, KpVec4f, KpPlane, KpLine, KpMat4f>;
+constexpr std::array composites = {readTexts, readResult, readImage, readField, readVolume, readInner};
+constexpr size_t readers = values.size() + arrays.size() + composites.size();
+
+void readOne(size_t kind, TmMsg& msg)
+{
+    if (kind < values.size())
+        values[kind](msg);
+    else if (kind < values.size() + arrays.size())
+        arrays[kind - values.size()](msg);
+    else
+        composites[kind - values.size() - arrays.size()](msg);
+}
 
 }  // namespace
 
@@ -124,9 +136,10 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
     TmMsg inTurn(random);
     try {
         for (size_t i = 1; i < steps; ++i)
-            readers[data[i] % readers.size()](random);
-        for (size_t i = 0; inTurn.readOffset() < inTurn.size() && i < 2 * readers.size(); ++i)
-            readers[i % readers.size()](inTurn);
+            readOne(data[i] % readers, random);
+        // As a careful caller, who asks what is left before each read.
+        for (size_t kind = 0; kind < readers && inTurn.holds(0) && inTurn.bytesAvailable() > 0; ++kind)
+            readOne(kind, inTurn);
     } catch (const KpMemoryException&) {
         return 0;  // what a message asks for may be more than there is
     }

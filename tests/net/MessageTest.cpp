@@ -42,6 +42,21 @@ TEST(Message, valuesAreTheirBytesInMemory)
               wire(1.F, 2.F, 3.F, 4.F, 5.F, 6.F, 7.F, 1.F, 2.F, 1.F, 3.F, 1.F, 4.F, 0.F, 0.F, 0.F, 1.F));
     EXPECT_EQ(wire(KpUniqueID(1), KpTransferID(2), KpFrameID(3), KpVec3l(4, 5, 6)), wire(1L, 2L, 3L, 4L, 5L, 6L));
     EXPECT_EQ(wire(KpRemotificationID(4), TmSessionContextID(5), KpPrimType(KpPrimType::UShort)), wire(4, 5, 7));
+    EXPECT_EQ(wire(KpVec3i(1, 2, 3), KpVec2f(4, 5), KpVec3f(6, 7, 8), KpVec4f(9, 1, 2, 3)),
+              wire(1, 2, 3, 4.F, 5.F, 6.F, 7.F, 8.F, 9.F, 1.F, 2.F, 3.F));
+    KpPlane plane;
+    plane.setNormal(KpVec3f(1, 2, 3));
+    plane.setDistanceFromOrigin(4);
+    KpLine line;
+    line.setPosDir(KpVec3f(1, 2, 3), KpVec3f(0, 0, 1));
+    EXPECT_EQ(wire(plane, line), wire(1.F, 2.F, 3.F, 4.F, 1.F, 2.F, 3.F, 0.F, 0.F, 1.F));
+    KpMat4f matrix;
+    matrix.makeIdentity();
+    matrix[0][1] = 2;  // lies second in memory
+    EXPECT_EQ(wire(matrix), wire(1.F, 2.F, 0.F, 0.F, 0.F, 1.F, 0.F, 0.F, 0.F, 0.F, 1.F, 0.F, 0.F, 0.F, 0.F, 1.F));
+    KpLib::MD5 digest;
+    std::iota(digest.data(), digest.data() + 16, static_cast<unsigned char>(0));
+    EXPECT_EQ(wire(digest), "000102030405060708090a0b0c0d0e0f");
     EXPECT_EQ(wire(KpDArray<bool>{true, false}, KpDArray<long>{-1}), "02000000010001000000ffffffffffffffff");
 }
 
@@ -290,6 +305,15 @@ TEST(Message, readOffsetAndBytesAreIndependent)
     msg.setRawData(4, bytes);
     msg >> number;
     EXPECT_EQ(number, 7);
+}
+
+TEST(Message, printShowsNothingOfIt)
+{
+    const LogCapture log;
+    const TmMsg msg;
+    msg.print("title");
+    msg.print(nullptr);
+    EXPECT_EQ(LogCapture::lines().size(), 5U);
 }
 
 }  // namespace
