@@ -3,7 +3,7 @@
 #include <kplib/geometry/KpMat3f.h>
 #include <kplib/geometry/KpMat4f.h>
 #include <kplib/geometry/KpRotation.h>
-#include <kplib/geometry/detail/KpMat4fKernels.h>
+#include <kplib/geometry/detail/Mat4fKernels.h>
 
 #include <Eigen/Dense>
 

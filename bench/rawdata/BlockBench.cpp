@@ -1,7 +1,7 @@
 #include "Volumes.h"
 
 #include <kplib/rawdata/KpRawData.h>
-#include <kplib/rawdata/detail/KpRawDataKernels.h>
+#include <kplib/rawdata/detail/RawDataKernels.h>
 
 // Mirroring in place against a copy of the block.
 

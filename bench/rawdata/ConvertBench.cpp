@@ -1,9 +1,9 @@
 #include "PlainConvert.h"
 #include "Volumes.h"
 
+#include <kplib/cpu/ElementConvert.h>
 #include <kplib/rawdata/KpRawData.h>
-#include <kplib/rawdata/detail/KpElementConvert.h>
-#include <kplib/rawdata/detail/KpRawDataKernels.h>
+#include <kplib/rawdata/detail/RawDataKernels.h>
 
 // Conversions against a copy of the bytes that they read and write, and in cache against the plain loop.
 

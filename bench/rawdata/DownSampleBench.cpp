@@ -1,7 +1,7 @@
 #include "Volumes.h"
 
 #include <kplib/rawdata/KpRawData.h>
-#include <kplib/rawdata/detail/KpDownSampleKernels.h>
+#include <kplib/rawdata/detail/DownSampleKernels.h>
 
 #include <algorithm>
 #include <type_traits>

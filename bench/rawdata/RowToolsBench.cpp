@@ -1,7 +1,7 @@
 #include "Volumes.h"
 
 #include <kplib/rawdata/TmSSETools.h>
-#include <kplib/rawdata/detail/TmSSEToolsKernels.h>
+#include <kplib/rawdata/detail/RowToolsKernels.h>
 
 // The rows of slices of 512 x 512 floats, 64 of them, one call a row or a slice, against memcpy called as often on as
 // many bytes.

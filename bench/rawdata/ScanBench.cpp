@@ -1,7 +1,7 @@
 #include "Volumes.h"
 
 #include <kplib/rawdata/KpRawData.h>
-#include <kplib/rawdata/detail/KpRawDataKernels.h>
+#include <kplib/rawdata/detail/RawDataKernels.h>
 
 #include <algorithm>
 

@@ -1,7 +1,7 @@
 #include "Volumes.h"
 
 #include <kplib/rawdata/KpRawData.h>
-#include <kplib/rawdata/detail/KpTransposeKernels.h>
+#include <kplib/rawdata/detail/TransposeKernels.h>
 
 // Permuting the axes in place against a copy of the block.
 

@@ -2,7 +2,7 @@
 
 #include <kplib/foundation/KpString.h>
 #include <kplib/system/KpCoder.h>
-#include <kplib/system/detail/KpCoderKernels.h>
+#include <kplib/system/detail/CoderKernels.h>
 
 #include <cstring>
 #include <openssl/evp.h>

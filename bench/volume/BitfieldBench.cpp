@@ -1,5 +1,5 @@
 #include <kplib/volume/KpBitfield.h>
-#include <kplib/volume/detail/KpBitfieldKernels.h>
+#include <kplib/volume/detail/BitfieldKernels.h>
 #include <rawdata/Volumes.h>
 
 #include <span>

@@ -1,5 +1,5 @@
 #include <kplib/volume/KpConnectedComponents.h>
-#include <kplib/volume/detail/KpLabelPlainly.h>
+#include <kplib/volume/detail/LabelPlainly.h>
 #include <rawdata/Volumes.h>
 
 #include <cmath>

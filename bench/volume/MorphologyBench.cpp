@@ -1,7 +1,7 @@
 #include <support/Bench.h>
 
 #include <kplib/volume/KpMorphology.h>
-#include <kplib/volume/detail/KpMorphologyKernels.h>
+#include <kplib/volume/detail/MorphologyKernels.h>
 
 #include <cstring>
 #include <random>

@@ -7,14 +7,14 @@
 
 #include <kplib/geometry/KpMat4f.h>
 #include <kplib/geometry/KpRotation.h>
-#include <kplib/numerics/KpAlignPointSets.h>
-#include <kplib/numerics/KpFitPlane.h>
-#include <kplib/numerics/KpPls.h>
-#include <kplib/numerics/KpRandom.h>
-#include <kplib/shapes/Angle2D.h>
-#include <kplib/shapes/Ellipse2D.h>
-#include <kplib/shapes/KpLine2D.h>
-#include <kplib/shapes/Polygon2D.h>
+#include <kplib/geometry/numerics/KpAlignPointSets.h>
+#include <kplib/geometry/numerics/KpFitPlane.h>
+#include <kplib/geometry/numerics/KpPls.h>
+#include <kplib/geometry/numerics/KpRandom.h>
+#include <kplib/geometry/shapes/Angle2D.h>
+#include <kplib/geometry/shapes/Ellipse2D.h>
+#include <kplib/geometry/shapes/KpLine2D.h>
+#include <kplib/geometry/shapes/Polygon2D.h>
 #include <kplib/threads/ProgressScope.h>
 
 #include <algorithm>

@@ -3,7 +3,7 @@
 
 #include <kplib/geometry/KpMat4fCache.h>
 #include <kplib/geometry/KpRotation.h>
-#include <kplib/geometry/detail/KpMat4fKernels.h>
+#include <kplib/geometry/detail/Mat4fKernels.h>
 
 #include <vector>
 

@@ -1,6 +1,6 @@
 #include <kplib/imaging/KpCreateUIDs.h>
 
-#include <kplib/imaging/detail/KpUIDClock.h>
+#include <kplib/imaging/detail/UIDClock.h>
 
 #include <gtest/gtest.h>
 

@@ -55,7 +55,7 @@ void eachPair(Work work)
 
 TEST(Convert, everyPathEqualsTheTableAndComputesInThePrecisionOfThePair)
 {
-    eachPair([]<typename To, typename From>(ElementTag<To>, ElementTag<From>) {
+    eachPair([]<typename To, typename From>(KpElementTag<To>, KpElementTag<From>) {
         for (long n : {0, 1, 15, 16, 17, 100, 1003}) {
             const auto values = someValues<From>(n, 1);
             const auto check = [&](auto paths, auto convert, auto... map) {
@@ -73,7 +73,7 @@ TEST(Convert, everyPathEqualsTheTableAndComputesInThePrecisionOfThePair)
 // As if it were done element by element and forward, wherever the buffers meet.
 TEST(Convert, overlappingBuffersAreWorkedForward)
 {
-    eachPair([]<typename To, typename From>(ElementTag<To>, ElementTag<From>) {
+    eachPair([]<typename To, typename From>(KpElementTag<To>, KpElementTag<From>) {
         constexpr long n = 3000, margin = 64;
         for (long distance : {-33L, -8L, 0L, 2L, 40L}) {
             if (std::is_same_v<To, From>)
@@ -142,7 +142,7 @@ TEST(Convert, equalTypesOfAnyKindAreCopiedAsBytes)
 
 TEST(KpTypedElement, computesInItsOwnType)
 {
-    eachType([]<typename T>(ElementTag<T>) {
+    eachType([]<typename T>(KpElementTag<T>) {
         const T most = std::numeric_limits<T>::max(), least = std::numeric_limits<T>::min();
         T a[] = {most, T(-3)}, b[] = {T(100), T(4)};
         KpTypedElement element(a, 2), complex({a, KpPrimType::Complex}, 1);

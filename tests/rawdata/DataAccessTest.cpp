@@ -165,7 +165,7 @@ TEST(Volume, linesEqualTheirVoxelsOneByOne)
             return static_cast<T>(std::clamp<double>(v, Limits::min(), Limits::max()));
     };
     const KpVec3l dims(18L, 19L, 20L);
-    eachType([&]<typename T>(ElementTag<T>) {
+    eachType([&]<typename T>(KpElementTag<T>) {
         for (const long gap : {0L, 1L, long{sizeof(T)}})
             for (const std::array<long, 3> at : {std::array{-1L, 3L, 2L}, {2, -1, 1}, {4, 1, 77}, {-1, -1, 0}}) {
                 const int axis = at[0] == -1 ? 0 : at[1] == -1 ? 1 : 2;

@@ -1,6 +1,6 @@
 #include "Elements.h"
 
-#include <kplib/rawdata/detail/KpDownSampleKernels.h>
+#include <kplib/rawdata/detail/DownSampleKernels.h>
 #include <kplib/threads/KpProgressInterface.h>
 
 using namespace kplib::test;
@@ -72,7 +72,7 @@ public:
 
 TEST(DownSample, everyPathEqualsTheDefinition)
 {
-    eachType([]<typename T>(ElementTag<T>) {
+    eachType([]<typename T>(KpElementTag<T>) {
         for (const Case& c : cases)
             for (bool isAtTheLimits : {false, true}) {
                 SCOPED_TRACE(std::to_string(c.dx) + " by " + std::to_string(c.fx));

@@ -1,8 +1,8 @@
 #pragma once
 
+#include <kplib/foundation/KpPrimTypeVisit.h>
 #include <kplib/rawdata/KpRawData.h>
-#include <kplib/rawdata/detail/KpPrimTypeVisit.h>
-#include <kplib/rawdata/detail/KpRawDataKernels.h>
+#include <kplib/rawdata/detail/RawDataKernels.h>
 
 #include <support/LogCapture.h>
 
@@ -18,7 +18,6 @@
 
 namespace kplib::test {
 
-using kplib::detail::ElementTag;
 using Bytes = std::vector<std::uint8_t>;
 
 template <typename T>
@@ -30,7 +29,7 @@ void eachType(Work work)
 {
     for (int type : {0, 1, 2, 3, 4, 7}) {
         const testing::ScopedTrace trace(__FILE__, __LINE__, KpPrimType(type).name());
-        kplib::detail::visitNumberType(KpPrimType(type), work);
+        kpVisitNumberType(KpPrimType(type), work);
     }
 }
 

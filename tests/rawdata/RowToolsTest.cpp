@@ -1,7 +1,7 @@
 #include "Elements.h"
 
 #include <kplib/rawdata/TmSSETools.h>
-#include <kplib/rawdata/detail/TmSSEToolsKernels.h>
+#include <kplib/rawdata/detail/RowToolsKernels.h>
 
 using namespace kplib::test;
 using namespace kplib::detail;

@@ -5,7 +5,7 @@ using namespace kplib::detail;
 
 TEST(GetRange, everyPathFollowsTheSequentialSteps)
 {
-    eachType([]<typename T>(ElementTag<T>) {
+    eachType([]<typename T>(KpElementTag<T>) {
         for (long n : {1, 2, 65, 127, 3000, 40001})
             for (unsigned seed = 0; seed < 12; ++seed) {
                 auto values = someValues<T>(n, seed);
@@ -40,7 +40,7 @@ TEST(GetRange, answersInFloats)
 
 TEST(IsConstant, everyPathFindsOneDifference)
 {
-    eachType([]<typename T>(ElementTag<T>) {
+    eachType([]<typename T>(KpElementTag<T>) {
         for (long n : {1, 2, 127, 1000})
             for (long different : {0L, 1L, n / 2, n - 1})
                 for (int step : {-1, 0, 1}) {
@@ -74,7 +74,7 @@ TEST(Memset, cutsIntegersAndRoundsReals)
         {2.5, 3}, {-2.5, -2}, {-2.51, -3}, {300.0, 300}, {70000.4, 70000}, {3e9, INT32_MIN}, {-3e9, INT32_MIN},
         {NAN, INT32_MIN}, {2147483647.4, INT32_MAX}};
     // clang-format on
-    eachType([&]<typename T>(ElementTag<T>) {
+    eachType([&]<typename T>(KpElementTag<T>) {
         const auto expectFilled = [](auto value, T expected, long n, long start) {
             const auto fill = [=](void* to) {
                 KpRawData::memset({to, typeOf<T>}, value, n);

@@ -1,6 +1,6 @@
 #include "Elements.h"
 
-#include <kplib/rawdata/detail/KpTransposeKernels.h>
+#include <kplib/rawdata/detail/TransposeKernels.h>
 
 #include <support/FailingMalloc.h>
 

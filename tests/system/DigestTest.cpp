@@ -1,5 +1,5 @@
 #include <kplib/kplib.h>
-#include <kplib/system/detail/KpCoderKernels.h>
+#include <kplib/system/detail/CoderKernels.h>
 
 #include <gtest/gtest.h>
 #include <openssl/evp.h>

@@ -1,7 +1,7 @@
 #include <kplib/foundation/KpMemoryException.h>
 #include <kplib/foundation/KpString.h>
 #include <kplib/volume/KpBitfield.h>
-#include <kplib/volume/detail/KpBitfieldKernels.h>
+#include <kplib/volume/detail/BitfieldKernels.h>
 
 #include <gtest/gtest.h>
 

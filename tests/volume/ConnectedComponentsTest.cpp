@@ -1,7 +1,7 @@
 #include <kplib/foundation/KpMemory.h>
 #include <kplib/volume/KpConnectedComponents.h>
-#include <kplib/volume/detail/KpFloatSums.h>
-#include <kplib/volume/detail/KpLabelPlainly.h>
+#include <kplib/volume/detail/FloatSums.h>
+#include <kplib/volume/detail/LabelPlainly.h>
 #include <support/LogCapture.h>
 
 #include <gtest/gtest.h>

@@ -1,5 +1,5 @@
 #include <kplib/volume/KpMorphology.h>
-#include <kplib/volume/detail/KpMorphologyKernels.h>
+#include <kplib/volume/detail/MorphologyKernels.h>
 
 #include <support/FailingMalloc.h>
 

@@ -67,6 +67,14 @@ public:
     /// Sets the size (negative counts as 0) and returns it. Storage is never given back.
     long resize(long newSize);
 
+    /// Ensures room for one more element, growing as append() does. If memory runs out, throws KpMemoryException and
+    /// leaves the array unchanged, which an insertion does not: long-lived lists call this first.
+    void reserveOne()
+    {
+        resize(size_ + 1);
+        resize(size_ - 1);
+    }
+
     /// Opens a gap of `count` raw elements at `pos`, which the caller has to fill (to construct, if managed).
     void insertMemory(long pos, long count);
 

@@ -1,7 +1,5 @@
 #include <kplib/foundation/KpEditable.h>
 
-#include <kplib/foundation/detail/ReserveOne.h>
-
 void KpEditable::startEditing(int flags)
 {
     editingFlags_ = flags;
@@ -35,7 +33,7 @@ KpEditable::~KpEditable() = default;
 
 void KpEditable::addEditingListener(KpEditingListener* listener)
 {
-    kplib::detail::reserveOne(listeners_);
+    listeners_.reserveOne();
     listeners_.append(listener);
 }
 

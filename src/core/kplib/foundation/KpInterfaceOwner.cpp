@@ -1,7 +1,5 @@
 #include <kplib/foundation/KpInterfaceOwner.h>
 
-#include <kplib/foundation/detail/ReserveOne.h>
-
 #include <utility>
 
 namespace {
@@ -37,7 +35,7 @@ void KpInterfaceOwner::notifyDelete()
 
 void KpInterfaceOwner::registerInterface(KpTypedObject* object, MemoryPolicy policy)
 {
-    kplib::detail::reserveOne(ownedInterfaces_);
+    ownedInterfaces_.reserveOne();
     registerInterfaceStaticMemory(object);
     if (policy == OwnerDeletes)
         ownedInterfaces_.append(object);
@@ -45,7 +43,7 @@ void KpInterfaceOwner::registerInterface(KpTypedObject* object, MemoryPolicy pol
 
 void KpInterfaceOwner::registerInterfaceStaticMemory(KpTypedObject* object)
 {
-    kplib::detail::reserveOne(interfaces_);
+    interfaces_.reserveOne();
     interfaces_.append(object);
 }
 
@@ -57,7 +55,7 @@ void KpInterfaceOwner::registerAttachInterfacesOnceCB(void (*callback)(void*), v
 
 void KpInterfaceOwner::addHandle(KpHandable* object)
 {
-    kplib::detail::reserveOne(handles_);
+    handles_.reserveOne();
     handles_.append(object);
 }
 

@@ -1,7 +1,30 @@
 #include <kplib/foundation/KpMutex.h>
 
 #include <kplib/foundation/detail/KpMutexPrivate.h>
-#include <kplib/log/KpLogFile.h>
+
+#include <atomic>
+#include <cstdio>
+
+namespace {
+
+void printFailure(const char* format, int errorCode)
+{
+    std::printf(format, errorCode);
+}
+
+constinit std::atomic<KpLockFailureReport> failureReport{printFailure};
+
+}  // namespace
+
+void kpSetLockFailureReport(KpLockFailureReport report)
+{
+    failureReport = report ? report : printFailure;
+}
+
+void kplib::detail::reportLockFailure(const char* format, int errorCode)
+{
+    failureReport.load()(format, errorCode);
+}
 
 KpMutex _KpSingleton_Mutex(true);  // NOLINT(bugprone-reserved-identifier)
 
@@ -39,5 +62,5 @@ bool KpMutex::tryLock()
 void KpMutex::unlock()
 {
     if (const int error = pthread_mutex_unlock(&record_->mutex))
-        getTheLogInstance().errorf("KpMutex::unlock() failed (error code: %d)\n", error);
+        kplib::detail::reportLockFailure("KpMutex::unlock() failed (error code: %d)\n", error);
 }

@@ -4,6 +4,13 @@
 
 struct KpMutexPrivate;
 
+/// Receives the failures of KpMutex and KpWaitCondition: `format` is a printf format for `errorCode`.
+using KpLockFailureReport = void (*)(const char* format, int errorCode);
+
+/// Sets the receiver; null restores the default, which prints to standard output. The log sets itself here at its first
+/// use, which comes no later than static initialisation. Set it before other threads start.
+KPLIB_API void kpSetLockFailureReport(KpLockFailureReport report);
+
 /// Mutual exclusion, recursive on request.
 ///
 /// Failures of the platform don't throw: unlock() writes them to the log, the others keep silent. The caller sees to it

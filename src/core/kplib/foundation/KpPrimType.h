@@ -21,6 +21,9 @@ public:
     };
     static constexpr int NumTypes = 10;
 
+    /// How many types are numbers in the sense of isNumber().
+    static constexpr int numNumbers = 6;
+
     /// Names ("byte", "short" ...) and sizes in bytes, indexed by the value; valid for 0 to 9 only.
     static const char* const primTypeName[NumTypes];
     static const std::int32_t primTypeSize[NumTypes];
@@ -37,6 +40,9 @@ public:
 
     /// Whether this is one of the ten types.
     constexpr bool isValid() const { return static_cast<std::uint32_t>(type_) < NumTypes; }
+
+    /// Whether the library computes with elements of this type: byte, short, int, float, double and ushort.
+    constexpr bool isNumber() const { return (type_ >= Byte && type_ <= Double) || type_ == UShort; }
 
     /// Name and size that may be asked of any value: "unknown" and 0 outside the ten types.
     const char* name() const { return isValid() ? primTypeName[type_] : "unknown"; }

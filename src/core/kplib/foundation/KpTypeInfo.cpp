@@ -1,6 +1,6 @@
 #include <kplib/foundation/KpTypeInfo.h>
 
-#include <kplib/foundation/detail/ReserveOne.h>
+#include <kplib/foundation/KpDArray.h>
 
 #include <cstring>
 
@@ -31,7 +31,7 @@ KpTypeInfo::KpTypeInfo(const char* name, Factory create, const KpTypeInfo* paren
     name_(name), factory_(create), parent1_(parent1), parent2_(parent2)
 {
     // The registry is complete before this object is, and so outlives it where both are static.
-    kplib::detail::reserveOne(allTypes());
+    allTypes().reserveOne();
     allTypes().insertSorted(this, compareNames);
 }
 

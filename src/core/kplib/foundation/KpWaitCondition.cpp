@@ -3,7 +3,6 @@
 #include <kplib/foundation/KpMutex.h>
 #include <kplib/foundation/detail/Deadline.h>
 #include <kplib/foundation/detail/KpMutexPrivate.h>
-#include <kplib/log/KpLogFile.h>
 
 #include <climits>
 
@@ -14,7 +13,7 @@ struct KpWaitConditionPrivate {
 KpWaitCondition::KpWaitCondition() : condition_(new KpWaitConditionPrivate)
 {
     if (const int error = pthread_cond_init(&condition_->condition, nullptr))
-        getTheLogInstance().errorf("KpWaitCondition::KpWaitCondition() failed (error code: %d)\n", error);
+        kplib::detail::reportLockFailure("KpWaitCondition::KpWaitCondition() failed (error code: %d)\n", error);
 }
 
 KpWaitCondition::~KpWaitCondition()
@@ -22,7 +21,7 @@ KpWaitCondition::~KpWaitCondition()
     const int error = pthread_cond_destroy(&condition_->condition);
     delete condition_;
     if (error)
-        getTheLogInstance().errorf("KpWaitCondition::~KpWaitCondition() failed (error code: %d)\n", error);
+        kplib::detail::reportLockFailure("KpWaitCondition::~KpWaitCondition() failed (error code: %d)\n", error);
 }
 
 bool KpWaitCondition::wait(KpMutex* mutex, unsigned long milliseconds)
@@ -30,7 +29,7 @@ bool KpWaitCondition::wait(KpMutex* mutex, unsigned long milliseconds)
     if (milliseconds == ULONG_MAX) {
         const int error = pthread_cond_wait(&condition_->condition, &mutex->record_->mutex);
         if (error)
-            getTheLogInstance().errorf("KpWaitCondition::wait() failed (error code: %d)\n", error);
+            kplib::detail::reportLockFailure("KpWaitCondition::wait() failed (error code: %d)\n", error);
         return error == 0;
     }
     timeval now{};
@@ -42,11 +41,11 @@ bool KpWaitCondition::wait(KpMutex* mutex, unsigned long milliseconds)
 void KpWaitCondition::wakeOne()
 {
     if (const int error = pthread_cond_signal(&condition_->condition))
-        getTheLogInstance().errorf("KpWaitCondition::wakeOne() failed (error code: %d)\n", error);
+        kplib::detail::reportLockFailure("KpWaitCondition::wakeOne() failed (error code: %d)\n", error);
 }
 
 void KpWaitCondition::wakeAll()
 {
     if (const int error = pthread_cond_broadcast(&condition_->condition))
-        getTheLogInstance().errorf("KpWaitCondition::wakeAll() failed (error code: %d)\n", error);
+        kplib::detail::reportLockFailure("KpWaitCondition::wakeAll() failed (error code: %d)\n", error);
 }

@@ -1,7 +1,7 @@
 #include <kplib/geometry/KpMat3f.h>
 
 #include <kplib/geometry/KpMat4f.h>
-#include <kplib/geometry/detail/KpMatrixElements.h>
+#include <kplib/geometry/detail/MatrixElements.h>
 
 #include <algorithm>
 #include <utility>

@@ -1,6 +1,6 @@
 #include <kplib/geometry/KpMat3f.h>
 
-#include <kplib/geometry/detail/KpJacobi.h>
+#include <kplib/geometry/detail/Jacobi.h>
 #include <kplib/log/KpLogFile.h>
 
 #include <algorithm>

@@ -1,7 +1,7 @@
 #include <kplib/geometry/KpMat4f.h>
 
 #include <kplib/geometry/KpRotation.h>
-#include <kplib/geometry/detail/KpJacobi.h>
+#include <kplib/geometry/detail/Jacobi.h>
 
 #include <algorithm>
 #include <cmath>

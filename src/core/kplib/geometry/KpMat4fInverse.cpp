@@ -1,6 +1,6 @@
 #include <kplib/geometry/KpMat4f.h>
 
-#include <kplib/geometry/detail/KpMat4fKernels.h>
+#include <kplib/geometry/detail/Mat4fKernels.h>
 
 #include <algorithm>
 #include <cmath>

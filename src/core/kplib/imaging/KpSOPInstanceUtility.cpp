@@ -1,6 +1,6 @@
 #include <kplib/imaging/KpSOPInstanceUtility.h>
 
-#include <kplib/imaging/detail/KpBundleTexts.h>
+#include <kplib/imaging/detail/BundleTexts.h>
 #include <kplib/system/KpCoder.h>
 
 #include <algorithm>

@@ -2,7 +2,7 @@
 
 #include <kplib/foundation/KpDArray.h>
 #include <kplib/foundation/KpString.h>
-#include <kplib/imaging/detail/KpBundleTexts.h>
+#include <kplib/imaging/detail/BundleTexts.h>
 
 #include <algorithm>
 #include <cstdio>

@@ -2,7 +2,7 @@
 
 #include <kplib/foundation/KpThreadLocalStorage.h>
 #include <kplib/log/KpLogFile.h>
-#include <kplib/log/detail/KpResultTexts.h>
+#include <kplib/log/detail/ResultTexts.h>
 
 #include <memory>
 #include <utility>

@@ -113,6 +113,7 @@ KpLogFile::~KpLogFile()
 
 KpLogFile* KpLogFile::createInstance()
 {
+    kpSetLockFailureReport([](const char* format, int errorCode) { getTheLogInstance().errorf(format, errorCode); });
     return new KpLogFile;
 }
 

@@ -1,12 +1,10 @@
 #include <kplib/log/KpMessageCollector.h>
 
-#include <kplib/foundation/detail/ReserveOne.h>
-
 KpMessageCollector::~KpMessageCollector() = default;
 
 long KpMessageCollector::addMessageSlot(const KpString& message)
 {
-    kplib::detail::reserveOne(slots_);
+    slots_.reserveOne();
     slots_.append(TCountedMsg(message));
     return slots_.size() - 1;
 }

@@ -1,8 +1,7 @@
 #include <kplib/log/KpResult.h>
 
-#include <kplib/foundation/detail/ReserveOne.h>
 #include <kplib/log/KpLogFile.h>
-#include <kplib/log/detail/KpResultTexts.h>
+#include <kplib/log/detail/ResultTexts.h>
 
 namespace {
 
@@ -52,7 +51,7 @@ void KpResult::notify() const
 
 void KpResult::notificationCallbackAdd(NotificationCallback callback)
 {
-    kplib::detail::reserveOne(callbacks());
+    callbacks().reserveOne();
     callbacks().append(callback);
 }
 

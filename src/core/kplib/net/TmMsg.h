@@ -226,6 +226,15 @@ KPLIB_API TmMsg& operator>>(TmMsg& msg, KpBitfield& field);
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpTypedData2D& image);
 KPLIB_API TmMsg& operator>>(TmMsg& msg, KpTypedData2D& image);
 
+/// A bool that is true for null, and nothing else; or sizes, components, type and all voxels without gaps. The voxels
+/// of an object without data are sent as 0.
+KPLIB_API TmMsg& operator<<(TmMsg& msg, TmDataAccess const* const& object);
+
+/// Makes `object` a new, contiguous object that frees with free(), with a reference count of 0; it has no data if
+/// memory runs out. Null if null was sent, if the message holds fewer bytes than announced, or if the sizes are
+/// impossible; no memory is requested then.
+KPLIB_API TmMsg& operator>>(TmMsg& msg, TmDataAccess*& object);
+
 /// Sixteen bytes that aren't looked at when they are read, and all bytes of `inner` as an array. How far `inner` was
 /// read doesn't travel: reading starts at its first byte.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const TmMsg& inner);

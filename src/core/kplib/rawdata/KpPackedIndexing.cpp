@@ -1,6 +1,6 @@
 #include <kplib/rawdata/KpPackedIndexing.h>
 
-#include <kplib/rawdata/detail/KpFlagBits.h>
+#include <kplib/cpu/FlagBits.h>
 #include <kplib/volume/KpBitfield.h>
 
 #include <algorithm>

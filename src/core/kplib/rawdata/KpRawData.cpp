@@ -1,10 +1,10 @@
 #include <kplib/rawdata/KpRawData.h>
 
+#include <kplib/cpu/Blockwise.h>
+#include <kplib/cpu/Loose.h>
+#include <kplib/foundation/KpPrimTypeVisit.h>
 #include <kplib/log/KpLogFile.h>
-#include <kplib/rawdata/detail/KpBlockwise.h>
-#include <kplib/rawdata/detail/KpLoose.h>
-#include <kplib/rawdata/detail/KpPrimTypeVisit.h>
-#include <kplib/rawdata/detail/KpRawDataKernels.h>
+#include <kplib/rawdata/detail/RawDataKernels.h>
 
 #include <cmath>
 #include <limits>
@@ -62,7 +62,7 @@ void swapWords(void* data, unsigned long n, int width)
 
 void KpRawData::memset(KpTypedPointer dst, int value, long n)
 {
-    const bool isDone = visitNumberType(dst.type, [&]<typename T>(ElementTag<T>) {
+    const bool isDone = kpVisitNumberType(dst.type, [&]<typename T>(KpElementTag<T>) {
         if (n > 0)
             fillAll(dst.data, static_cast<T>(value), n);
     });
@@ -73,7 +73,7 @@ void KpRawData::memset(KpTypedPointer dst, int value, long n)
 void KpRawData::memset(KpTypedPointer dst, double value, long n)
 {
     if (dst.type == KpPrimType::Float || dst.type == KpPrimType::Double) {
-        visitNumberType(dst.type, [&]<typename T>(ElementTag<T>) {
+        kpVisitNumberType(dst.type, [&]<typename T>(KpElementTag<T>) {
             if (n > 0)
                 fillAll(dst.data, static_cast<T>(value), n);
         });
@@ -88,7 +88,7 @@ void KpRawData::getRange(KpTypedPointer data, unsigned long n, float& min, float
 {
     static RangeLoops* const loops = best(rangePaths());
     const KpTypedPointer numbers = asNumbers(data, n);
-    visitNumberType(numbers.type, [&]<typename T>(ElementTag<T>) {
+    kpVisitNumberType(numbers.type, [&]<typename T>(KpElementTag<T>) {
         T low = *static_cast<const Loose<T>*>(numbers.data);
         T high = low;
         loops(numbers.type)(numbers.data, static_cast<long>(n), &low, &high);
@@ -102,7 +102,7 @@ bool KpRawData::isConstant(KpTypedPointer data, unsigned long n)
     static DiffersLoops* const loops = best(differsPaths());
     const KpTypedPointer numbers = asNumbers(data, n);
     bool isOneValue = false;
-    visitNumberType(numbers.type, [&]<typename T>(ElementTag<T>) {
+    kpVisitNumberType(numbers.type, [&]<typename T>(KpElementTag<T>) {
         if (n < 1) {
             isOneValue = true;
             return;

@@ -1,7 +1,7 @@
 #include <kplib/rawdata/KpRawData2D.h>
 
-#include <kplib/rawdata/detail/KpByteCount.h>
-#include <kplib/rawdata/detail/KpPlaneCopy.h>
+#include <kplib/cpu/ByteCount.h>
+#include <kplib/rawdata/detail/PlaneCopy.h>
 
 #include <cstdlib>
 

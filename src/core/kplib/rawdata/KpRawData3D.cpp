@@ -1,9 +1,9 @@
 #include <kplib/rawdata/KpRawData3D.h>
 
+#include <kplib/cpu/ByteCount.h>
 #include <kplib/foundation/KpMemory.h>
 #include <kplib/rawdata/KpRawData2D.h>
-#include <kplib/rawdata/detail/KpByteCount.h>
-#include <kplib/rawdata/detail/KpPlaneCopy.h>
+#include <kplib/rawdata/detail/PlaneCopy.h>
 
 #include <utility>
 

@@ -1,6 +1,6 @@
 #include <kplib/rawdata/KpRawData.h>
 
-#include <kplib/rawdata/detail/KpRawDataKernels.h>
+#include <kplib/rawdata/detail/RawDataKernels.h>
 
 #include <algorithm>
 #include <climits>

@@ -1,9 +1,9 @@
 #include <kplib/rawdata/KpRawData.h>
 
+#include <kplib/cpu/Blockwise.h>
+#include <kplib/foundation/KpPrimTypeVisit.h>
 #include <kplib/log/KpLogFile.h>
-#include <kplib/rawdata/detail/KpBlockwise.h>
-#include <kplib/rawdata/detail/KpPrimTypeVisit.h>
-#include <kplib/rawdata/detail/KpRawDataKernels.h>
+#include <kplib/rawdata/detail/RawDataKernels.h>
 
 namespace {
 
@@ -13,11 +13,11 @@ using namespace kplib::detail;
 /// and that is meant.
 bool areNumbers(KpPrimType to, KpPrimType from)
 {
-    if (!isNumberType(to)) {
+    if (!to.isNumber()) {
         getTheLogInstance().errorf("Unsupported data type %s in KpRawData()\n", to.name());
         return false;
     }
-    return isNumberType(from);
+    return from.isNumber();
 }
 
 void mapNumbers(KpTypedPointer dst, KpTypedPointer src, unsigned long n, double offset, double scale)

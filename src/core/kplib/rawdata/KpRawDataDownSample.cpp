@@ -1,9 +1,9 @@
 #include <kplib/rawdata/KpRawData.h>
 
+#include <kplib/cpu/Loose.h>
+#include <kplib/foundation/KpPrimTypeVisit.h>
 #include <kplib/log/KpLogFile.h>
-#include <kplib/rawdata/detail/KpDownSampleKernels.h>
-#include <kplib/rawdata/detail/KpLoose.h>
-#include <kplib/rawdata/detail/KpPrimTypeVisit.h>
+#include <kplib/rawdata/detail/DownSampleKernels.h>
 #include <kplib/threads/KpProgressInterface.h>
 #include <kplib/threads/ProgressScope.h>
 
@@ -35,7 +35,7 @@ private:
 
 bool isSupported(KpPrimType type)
 {
-    if (isNumberType(type))
+    if (type.isNumber())
         return true;
     getTheLogInstance().errorf("Unsupported data type %s in KpRawData::downSample3D\n", type.name());
     return false;

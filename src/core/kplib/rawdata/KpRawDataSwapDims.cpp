@@ -1,9 +1,9 @@
 #include <kplib/rawdata/KpRawData.h>
 
 #include <kplib/foundation/KpMemoryException.h>
+#include <kplib/foundation/KpPrimTypeVisit.h>
 #include <kplib/log/KpLogFile.h>
-#include <kplib/rawdata/detail/KpPrimTypeVisit.h>
-#include <kplib/rawdata/detail/KpTransposeKernels.h>
+#include <kplib/rawdata/detail/TransposeKernels.h>
 #include <kplib/volume/KpBitfield.h>
 
 #include <algorithm>
@@ -155,7 +155,7 @@ private:
 /// Four bytes move as an int, whatever they are.
 bool canPermute(KpPrimType type, long voxelSize)
 {
-    return voxelSize == 4 || isNumberType(type);
+    return voxelSize == 4 || type.isNumber();
 }
 
 }  // namespace

@@ -1,6 +1,6 @@
 #include <kplib/rawdata/KpSuperPackedIndexing.h>
 
-#include <kplib/rawdata/detail/KpFlagBits.h>
+#include <kplib/cpu/FlagBits.h>
 
 #include <algorithm>
 #include <bit>

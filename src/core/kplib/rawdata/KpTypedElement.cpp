@@ -1,16 +1,14 @@
 #include <kplib/rawdata/KpTypedElement.h>
 
-#include <kplib/rawdata/detail/KpLoose.h>
-#include <kplib/rawdata/detail/KpPrimTypeVisit.h>
+#include <kplib/cpu/Loose.h>
+#include <kplib/foundation/KpPrimTypeVisit.h>
 
 #include <cmath>
 #include <type_traits>
 
 namespace {
 
-using kplib::detail::ElementTag;
 using kplib::detail::Loose;
-using kplib::detail::visitNumberType;
 
 /// What arithmetic on T is done in: unsigned for integers, since that wraps where signed overflow is undefined.
 template <typename T>
@@ -26,7 +24,7 @@ struct Arithmetic<double> : std::type_identity<double> {
 template <typename Operation>
 void combine(const KpTypedElement& target, const KpTypedElement& other, Operation operation)
 {
-    visitNumberType(target.type(), [&]<typename T>(ElementTag<T>) {
+    kpVisitNumberType(target.type(), [&]<typename T>(KpElementTag<T>) {
         using Number = typename Arithmetic<T>::type;
         auto* left = static_cast<Loose<T>*>(target.data());
         auto* right = static_cast<const Loose<T>*>(other.data());
@@ -52,7 +50,7 @@ KpTypedElement& KpTypedElement::operator-=(const KpTypedElement& other)
 double KpTypedElement::length() const
 {
     double sum = 0.0;
-    visitNumberType(type_, [&]<typename T>(ElementTag<T>) {
+    kpVisitNumberType(type_, [&]<typename T>(KpElementTag<T>) {
         auto* components = static_cast<const Loose<T>*>(data_);
         for (std::int32_t i = 0; i < n_; ++i) {
             const double component = components[i].value;

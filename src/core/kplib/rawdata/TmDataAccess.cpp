@@ -1,8 +1,7 @@
 #include <kplib/rawdata/TmDataAccess.h>
 
+#include <kplib/cpu/ByteCount.h>
 #include <kplib/foundation/KpHandle.h>
-#include <kplib/rawdata/detail/KpByteCount.h>
-#include <kplib/rawdata/detail/KpVoxelRuns.h>
 #include <kplib/system/KpMD5Coder.h>
 #include <kplib/threads/KpThread.h>
 
@@ -129,7 +128,7 @@ Kp128 TmDataAccess::hash() const
 {
     KpLib::MD5Coder coder;
     coder << static_cast<int>(primType_) << nDataVar_ << dims_;
-    eachVoxelRun(*this, [&](const void* bytes, unsigned long n) { coder.append(bytes, n); });
+    eachVoxelRun([&](const void* bytes, unsigned long n) { coder.append(bytes, n); });
     const KpLib::MD5::Words words = coder.md5().words();
     return {words[0], words[1]};
 }

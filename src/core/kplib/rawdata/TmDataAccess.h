@@ -90,6 +90,11 @@ public:
     /// The blocks.
     void* const* dataPtrs() const { return dataPtrs_.data(); }
 
+    /// Calls `run(const void* address, unsigned long bytes)` for the voxels from the first to the last, in runs as long
+    /// as the layout allows; voxels of a row are assumed to be dense. Makes no call without data.
+    template <typename Run>
+    void eachVoxelRun(Run run) const;
+
     /// Makes `out` a view on the voxels of `box`, both bounds inside; null without data. The bounds are not checked,
     /// and the view doesn't keep this object alive. One slice of sliced data gives a linear view.
     void subBox(KpHandle<TmDataAccess>& out, const KpBox3i& box) const;
@@ -153,11 +158,21 @@ private:
     KpDArray<void*> dataPtrs_;  // one block, one a slice, or none
 };
 
-/// A bool that is true for null, and nothing else; or sizes, components, type and all voxels without gaps. Of an object
-/// without data the voxels are 0.
-KPLIB_API TmMsg& operator<<(TmMsg& msg, TmDataAccess const* const& object);
-
-/// Makes `object` a new, contiguous object that frees with free() and that nobody holds a reference to; without data
-/// if there is no memory. Null if null was sent, if the message holds less than was announced, or if the sizes make no
-/// sense; no memory is asked for then.
-KPLIB_API TmMsg& operator>>(TmMsg& msg, TmDataAccess*& object);
+template <typename Run>
+void TmDataAccess::eachVoxelRun(Run run) const
+{
+    if (!hasData() || size() <= 0)
+        return;
+    if (isContiguous()) {
+        run(dataPtr(0), static_cast<unsigned long>(size()));
+        return;
+    }
+    const long rowBytes = primType_.size() * dims_[0] * nDataVar_;
+    const bool isPacked = strides_[1] == rowBytes;
+    const long runs = isPacked ? 1 : dims_[1];
+    const long runBytes = isPacked ? rowBytes * dims_[1] : rowBytes;
+    for (long z = 0; z < dims_[2]; ++z) {
+        for (long y = 0; y < runs; ++y)
+            run(dataPtr(0, y, z), static_cast<unsigned long>(runBytes));
+    }
+}

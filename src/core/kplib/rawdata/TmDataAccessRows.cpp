@@ -1,9 +1,9 @@
 #include <kplib/rawdata/TmDataAccess.h>
 
-#include <kplib/rawdata/detail/KpElementConvert.h>
-#include <kplib/rawdata/detail/KpLoose.h>
-#include <kplib/rawdata/detail/KpPrimTypeVisit.h>
-#include <kplib/rawdata/detail/KpRawDataKernels.h>
+#include <kplib/cpu/ElementConvert.h>
+#include <kplib/cpu/Loose.h>
+#include <kplib/foundation/KpPrimTypeVisit.h>
+#include <kplib/rawdata/detail/RawDataKernels.h>
 
 using namespace kplib::detail;
 
@@ -54,7 +54,7 @@ KpResult TmDataAccess::row(long x, long y, long z, float* out) const
 {
     const Line line = lineAt(x, y, z, strides_);
     if (hasVoxels()) {
-        visitNumberType(primType_, [&]<typename T>(ElementTag<T>) { rowImpl<T>(line.offset, line.axis, out); });
+        kpVisitNumberType(primType_, [&]<typename T>(KpElementTag<T>) { rowImpl<T>(line.offset, line.axis, out); });
     }
     return {};
 }
@@ -63,7 +63,7 @@ KpResult TmDataAccess::putRow(long x, long y, long z, const float* in) const
 {
     const Line line = lineAt(x, y, z, strides_);
     if (hasVoxels()) {
-        visitNumberType(primType_, [&]<typename T>(ElementTag<T>) {
+        kpVisitNumberType(primType_, [&]<typename T>(KpElementTag<T>) {
             if constexpr (std::is_integral_v<T>)
                 putRowImpl<T>(line.offset, line.axis, in, RealBounds<T, float>::low, RealBounds<T, float>::high);
             else

@@ -1,6 +1,6 @@
 #include <kplib/rawdata/TmSSETools.h>
 
-#include <kplib/rawdata/detail/TmSSEToolsKernels.h>
+#include <kplib/rawdata/detail/RowToolsKernels.h>
 
 #include <algorithm>
 #include <cstring>

@@ -1,6 +1,6 @@
 #include <kplib/system/KpBuildInfo.h>
 
-#include <kplib/system/platform/Platform.h>
+#include <kplib/platform/Platform.h>
 
 #include <KpBuildValues.h>
 #include <algorithm>

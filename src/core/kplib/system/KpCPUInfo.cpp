@@ -1,7 +1,7 @@
 #include <kplib/system/KpCPUInfo.h>
 
+#include <kplib/platform/Platform.h>
 #include <kplib/system/detail/CpuCounts.h>
-#include <kplib/system/platform/Platform.h>
 
 #include <cpuid.h>
 #include <cstring>

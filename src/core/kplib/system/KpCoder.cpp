@@ -1,7 +1,7 @@
 #include <kplib/system/KpCoder.h>
 
 #include <kplib/foundation/KpString.h>
-#include <kplib/system/detail/KpCoderKernels.h>
+#include <kplib/system/detail/CoderKernels.h>
 
 using namespace kplib::detail;
 

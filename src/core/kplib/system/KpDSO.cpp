@@ -1,8 +1,8 @@
 #include <kplib/system/KpDSO.h>
 
 #include <kplib/log/KpLogFile.h>
+#include <kplib/platform/Platform.h>
 #include <kplib/system/KpFilename.h>
-#include <kplib/system/platform/Platform.h>
 
 #include <cstring>
 #include <dlfcn.h>

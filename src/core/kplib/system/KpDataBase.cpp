@@ -1,9 +1,8 @@
 #include <kplib/system/KpDataBase.h>
 
-#include <kplib/foundation/detail/ReserveOne.h>
 #include <kplib/system/KpTable.h>
-#include <kplib/system/detail/KpTableWalk.h>
 #include <kplib/system/detail/TableBytes.h>
+#include <kplib/system/detail/TableWalk.h>
 
 #include <algorithm>
 
@@ -17,7 +16,7 @@ KpDataBase::~KpDataBase()
 
 int KpDataBase::createTable()
 {
-    reserveOne(tables_);
+    tables_.reserveOne();
     tables_.append(new KpTable(nextTableId_, this));
     return nextTableId_++;
 }
@@ -45,7 +44,7 @@ void KpDataBase::clone(KpDataBase& target) const
     target.skipCheck();
     target.nextTableId_ = nextTableId_;
     for (const KpTable* source : tables_) {
-        reserveOne(target.tables_);
+        target.tables_.reserveOne();
         auto* const copy = new KpTable(source->tableId(), &target);
         target.tables_.append(copy);
         copy->skipCheck();

@@ -2,8 +2,8 @@
 
 #include <kplib/foundation/StringUtils.h>
 #include <kplib/log/KpLogFile.h>
+#include <kplib/platform/Platform.h>
 #include <kplib/system/KpFilename.h>
-#include <kplib/system/platform/Platform.h>
 
 #include <algorithm>
 #include <cerrno>

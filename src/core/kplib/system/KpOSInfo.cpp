@@ -1,6 +1,6 @@
 #include <kplib/system/KpOSInfo.h>
 
-#include <kplib/system/platform/Platform.h>
+#include <kplib/platform/Platform.h>
 
 KpString KpOSInfo::getOSName(bool /*ignored*/)
 {

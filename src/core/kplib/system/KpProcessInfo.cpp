@@ -1,7 +1,7 @@
 #include <kplib/system/KpProcessInfo.h>
 
 #include <kplib/log/KpLogFile.h>
-#include <kplib/system/platform/Platform.h>
+#include <kplib/platform/Platform.h>
 
 KpProcessInfo::KpProcessInfo(long long pid)
 {

@@ -1,6 +1,6 @@
 #include <kplib/system/KpSysInfo.h>
 
-#include <kplib/system/platform/Platform.h>
+#include <kplib/platform/Platform.h>
 
 #include <algorithm>
 #include <climits>

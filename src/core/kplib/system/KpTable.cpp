@@ -2,8 +2,8 @@
 
 #include <kplib/log/KpLogFile.h>
 #include <kplib/system/KpDataBase.h>
-#include <kplib/system/detail/KpTableCheckSkipped.h>
 #include <kplib/system/detail/TableBytes.h>
+#include <kplib/system/detail/TableCheckSkipped.h>
 
 #include <algorithm>
 

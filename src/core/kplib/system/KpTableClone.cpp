@@ -1,8 +1,8 @@
 #include <kplib/system/KpTable.h>
 
 #include <kplib/system/KpDataBase.h>
-#include <kplib/system/detail/KpTableWalk.h>
 #include <kplib/system/detail/TableBytes.h>
+#include <kplib/system/detail/TableWalk.h>
 
 #include <algorithm>
 

@@ -1,8 +1,7 @@
 #include <kplib/system/KpTable.h>
 
-#include <kplib/foundation/detail/ReserveOne.h>
-#include <kplib/system/detail/KpTableWalk.h>
 #include <kplib/system/detail/TableBytes.h>
+#include <kplib/system/detail/TableWalk.h>
 
 #include <algorithm>
 
@@ -78,7 +77,7 @@ void KpTable::relationDel(char* row, int offset, char* target)
     }
     if (!cell)
         return;
-    reserveOne(*relationFree_[offset]);
+    relationFree_[offset]->reserveOne();
     if (before)
         link(before, relationNext(cell));
     else

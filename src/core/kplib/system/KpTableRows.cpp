@@ -1,11 +1,10 @@
 #include <kplib/system/KpTable.h>
 
-#include <kplib/foundation/detail/ReserveOne.h>
 #include <kplib/log/KpLogFile.h>
 #include <kplib/system/KpDataBase.h>
-#include <kplib/system/detail/KpTableCheckSkipped.h>
-#include <kplib/system/detail/KpTableWalk.h>
 #include <kplib/system/detail/TableBytes.h>
+#include <kplib/system/detail/TableCheckSkipped.h>
+#include <kplib/system/detail/TableWalk.h>
 
 #include <algorithm>
 
@@ -62,7 +61,7 @@ bool KpTable::rowDel(char* row)
 {
     if (!row || !checkRowPointer(row) || readAt<std::uint32_t>(row) != rowInUse)
         return false;
-    reserveOne(freeRows_);
+    freeRows_.reserveOne();
     for (int column = 0; column < columnCount_; ++column) {
         if (columnType_[column] == Relation)
             relationRemoveAll(row, columnOffset_[column]);

@@ -2,7 +2,7 @@
 
 #include <kplib/foundation/KpString.h>
 #include <kplib/log/KpLogFile.h>
-#include <kplib/system/platform/Platform.h>
+#include <kplib/platform/Platform.h>
 
 #include <atomic>
 #include <cmath>

@@ -4,7 +4,7 @@
 #include <kplib/foundation/KpString.h>
 #include <kplib/foundation/KpWaitCondition.h>
 #include <kplib/log/KpLogFile.h>
-#include <kplib/system/platform/Platform.h>
+#include <kplib/platform/Platform.h>
 
 #include <algorithm>
 #include <atomic>

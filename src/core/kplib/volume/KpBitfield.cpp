@@ -1,7 +1,7 @@
 #include <kplib/volume/KpBitfield.h>
 
 #include <kplib/foundation/KpMemory.h>
-#include <kplib/volume/detail/KpBitfieldKernels.h>
+#include <kplib/volume/detail/BitfieldKernels.h>
 
 #include <algorithm>
 #include <bit>

@@ -1,6 +1,6 @@
 #include <kplib/volume/KpBitfield.h>
 
-#include <kplib/volume/detail/KpBitfieldKernels.h>
+#include <kplib/volume/detail/BitfieldKernels.h>
 
 using namespace kplib::detail;
 

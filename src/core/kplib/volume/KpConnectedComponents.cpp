@@ -1,10 +1,10 @@
 #include <kplib/volume/KpConnectedComponents.h>
 
+#include <kplib/cpu/ElementConvert.h>
 #include <kplib/foundation/KpMemory.h>
+#include <kplib/foundation/KpPrimTypeVisit.h>
 #include <kplib/log/KpLogFile.h>
-#include <kplib/rawdata/detail/KpElementConvert.h>
-#include <kplib/rawdata/detail/KpPrimTypeVisit.h>
-#include <kplib/volume/detail/KpComponentTable.h>
+#include <kplib/volume/detail/ComponentTable.h>
 
 #include <algorithm>
 #include <atomic>
@@ -233,8 +233,9 @@ int KpConnectedComponents::labelCC(KpTypedPointer data, const int* dims, int nei
     ComponentTable local;
     ComponentTable& table = components != nullptr ? *components : local;
     int result = -1;
-    const bool isNumber = kplib::detail::visitNumbers(data, [&]<typename T>(T* voxels) {
-        result = do_label(voxels, labels, table, threshold<T>(low), threshold<T>(high), dims, neighbours, 0);
+    const bool isNumber = kpVisitNumberType(data.type, [&]<typename T>(KpElementTag<T>) {
+        result = do_label(static_cast<T*>(data.data), labels, table, threshold<T>(low), threshold<T>(high), dims,
+                          neighbours, 0);
     });
     if (!isNumber)
         getTheLogInstance().errorf("Unsupported data type %s in KpRawData()\n", data.type.name());

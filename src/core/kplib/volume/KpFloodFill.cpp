@@ -1,6 +1,6 @@
 #include <kplib/log/KpLogFile.h>
 #include <kplib/volume/KpMorphology.h>
-#include <kplib/volume/detail/KpFloodGround.h>
+#include <kplib/volume/detail/FloodGround.h>
 
 #include <algorithm>
 #include <cstdint>

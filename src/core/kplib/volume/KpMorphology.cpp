@@ -1,6 +1,6 @@
 #include <kplib/volume/KpMorphology.h>
 
-#include <kplib/volume/detail/KpMorphologyKernels.h>
+#include <kplib/volume/detail/MorphologyKernels.h>
 
 #include <algorithm>
 #include <cstdlib>

@@ -3,7 +3,7 @@
 #include <kplib/foundation/KpMutex.h>
 #include <kplib/foundation/KpString.h>
 #include <kplib/log/KpLogFile.h>
-#include <kplib/log/detail/KpLogClock.h>
+#include <kplib/log/detail/LogClock.h>
 #include <kplib/system/KpFilename.h>
 
 #include <atomic>

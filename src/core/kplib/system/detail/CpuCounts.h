@@ -1,6 +1,6 @@
 #pragma once
 
-#include <kplib/system/platform/Platform.h>
+#include <kplib/platform/Platform.h>
 
 namespace kplib::detail {
 

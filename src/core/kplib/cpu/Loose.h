@@ -1,0 +1,16 @@
+#pragma once
+
+#include <kplib/cpu/KernelPath.h>
+
+namespace kplib::detail {
+
+/// An element at any address and beside any other type: buffers out of files and messages start where they start, and
+/// a conversion may write its results over its source.
+template <typename T>
+struct __attribute__((packed, may_alias)) Loose {
+    T value;
+
+    KPLIB_KERNEL_BODY operator T() const { return value; }
+};
+
+}  // namespace kplib::detail

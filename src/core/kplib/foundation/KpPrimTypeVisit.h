@@ -1,0 +1,43 @@
+#pragma once
+
+#include <kplib/foundation/KpPrimType.h>
+
+#include <cstdint>
+
+/// Stands for an element type in calls: `typename decltype(tag)::Type`.
+template <typename T>
+struct KpElementTag {
+    using Type = T;
+};
+
+/// Calls `work` once with the KpElementTag of `type` and returns true; returns false without a call if `type` is not a
+/// number, see KpPrimType::isNumber(). The loop over elements belongs inside `work`, so that the type is asked once:
+///
+///     kpVisitNumberType(data.type, [&]<typename T>(KpElementTag<T>) { sum(static_cast<const T*>(data.data), n); });
+template <typename Work>
+bool kpVisitNumberType(KpPrimType type, Work&& work)
+{
+    static_assert(KpPrimType::numNumbers == 6, "a new number type needs its case here");
+    switch (type) {
+    case KpPrimType::Byte:
+        work(KpElementTag<std::uint8_t>{});
+        return true;
+    case KpPrimType::Short:
+        work(KpElementTag<std::int16_t>{});
+        return true;
+    case KpPrimType::Int:
+        work(KpElementTag<std::int32_t>{});
+        return true;
+    case KpPrimType::Float:
+        work(KpElementTag<float>{});
+        return true;
+    case KpPrimType::Double:
+        work(KpElementTag<double>{});
+        return true;
+    case KpPrimType::UShort:
+        work(KpElementTag<std::uint16_t>{});
+        return true;
+    default:
+        return false;
+    }
+}

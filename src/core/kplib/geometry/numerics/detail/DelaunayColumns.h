@@ -1,0 +1,51 @@
+#pragma once
+
+#include <kplib/foundation/KpDArray.h>
+#include <kplib/geometry/numerics/detail/DelaunayCircle.h>
+#include <kplib/geometry/numerics/detail/DelaunayKernels.h>
+
+namespace kplib::detail::delaunay {
+
+/// Numbered circles as the scan wants them: an array for each number of a circle.
+template <int Size>
+class CircleColumns {
+public:
+    /// What is new is not set to anything.
+    void resize(long count)
+    {
+        for (KpDArray<double>& column : columns_)
+            column.resize(count);
+    }
+
+    long size() const { return columns_[0].size(); }
+
+    void set(long i, const Circle<Size>& circle)
+    {
+        for (int axis = 0; axis < Size; ++axis)
+            columns_[axis][i] = circle.center[axis];
+        columns_[Size][i] = circle.squaredRadius;
+    }
+
+    Circle<Size> operator[](long i) const
+    {
+        Circle<Size> circle;
+        for (int axis = 0; axis < Size; ++axis)
+            circle.center[axis] = columns_[axis][i];
+        circle.squaredRadius = columns_[Size][i];
+        return circle;
+    }
+
+    /// Which of the first `count` contain `point`.
+    long scan(CircleScan* run, long count, const Position<Size>& point, std::int32_t* hits) const
+    {
+        const double* columns[Size + 1];
+        for (int k = 0; k <= Size; ++k)
+            columns[k] = columns_[k].data();
+        return run(columns, count, point.data(), hits);
+    }
+
+private:
+    KpDArray<double> columns_[Size + 1];
+};
+
+}  // namespace kplib::detail::delaunay

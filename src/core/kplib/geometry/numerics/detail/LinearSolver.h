@@ -1,0 +1,63 @@
+#pragma once
+
+#include <kplib/cpu/KernelPath.h>
+
+#include <cstdlib>
+#include <memory>
+#include <span>
+
+namespace kplib::detail {
+
+struct FreeBlock {
+    void operator()(void* block) const { std::free(block); }
+};
+
+/// Room for the factors of an n by n matrix, one block a row.
+class SolverRows {
+public:
+    /// Logs it as an error when the memory is exhausted.
+    explicit SolverRows(int n);
+    SolverRows(const SolverRows&) = delete;
+    SolverRows& operator=(const SolverRows&) = delete;
+    ~SolverRows();
+
+    bool isComplete() const { return rows_ && count_ == n_; }
+    float** get() const { return rows_.get(); }
+
+private:
+    int n_;
+    int count_ = 0;  // of rows that there is memory for
+    std::unique_ptr<float*[], FreeBlock> rows_;
+};
+
+/// The work of KpDMatrix::solveLRdecomp() on the `n` by `n` matrix `a`, of which `lr` holds a copy.
+class LinearSolver {
+public:
+    /// Logs it as an error when the memory is exhausted.
+    LinearSolver(const float* a, int n, float** lr);
+
+    bool isComplete() const { return work_ && permutation_; }
+    /// False, and logged, for a singular matrix; negates `sign` at each exchange of rows.
+    bool decompose(float& sign);
+    /// Replaces `side` by the solution for it.
+    void solve(float* side);
+
+private:
+    int pivotOf(int column) const;
+    void correct();
+    double computeResidual();
+
+    const float* a_;
+    int n_;
+    float** lr_;
+    std::unique_ptr<float[], FreeBlock> work_;
+    std::unique_ptr<int[], FreeBlock> permutation_;  // the row of `a` that stands in each row of `lr`
+    float *b_ = nullptr, *residual_ = nullptr, *x_ = nullptr, *correction_ = nullptr;  // within work_
+};
+
+/// One step of the elimination: the factors of `column` in the rows below it, and what they leave of the lower right.
+using EliminateLoop = void(float* const* lr, int column, int n);
+
+std::span<const KernelPath<EliminateLoop>> eliminatePaths();
+
+}  // namespace kplib::detail

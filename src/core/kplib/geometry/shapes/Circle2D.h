@@ -1,0 +1,23 @@
+#pragma once
+
+#include <kplib/geometry/shapes/AbstractEllipse2D.h>
+
+/// A circle.
+class KPLIB_API Circle2D : public AbstractEllipse2D {
+public:
+    /// Empty, around the origin.
+    Circle2D() = default;
+    Circle2D(const KpVec2f& center, float radius) : AbstractEllipse2D(center), radius_(radius) {}
+
+    float radius() const { return radius_; }
+    void setRadius(float radius) { radius_ = radius; }
+
+    bool equals(const AbstractShape2D& other) const override;
+    float radiusX() const override { return radius_; }
+    float radiusY() const override { return radius_; }
+    float circumference() const override { return radius_ * 6.2831855F; }
+    KpVec2f projectPoint(float angle) const override { return onOutline(angle, radius_, radius_); }
+
+private:
+    float radius_ = 0;
+};
