@@ -14,8 +14,12 @@ TEST(GetRange, everyPathFollowsTheSequentialSteps)
                     if (!(values[i] * sign >= 1))
                         values[i] = seed % 2 && i < n * 3 / 4 ? sign : static_cast<T>(i % 2 ? 0.0 : -0.0);
                 std::vector<T> expected = {values[0], values[0]};
-                for (T v : values)
-                    (expected[0] > v ? expected[0] : v > expected[1] ? expected[1] : v) = v;
+                for (T v : values) {
+                    if (expected[0] > v)
+                        expected[0] = v;
+                    else if (v > expected[1])
+                        expected[1] = v;
+                }
                 expectOfEachPath(rangePaths(), expected, values, [&](auto loops, void* dst, void* src) {
                     T range[] = {values[0], values[0]};
                     loops(typeOf<T>)(src, n, &range[0], &range[1]);

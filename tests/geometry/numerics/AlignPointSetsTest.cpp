@@ -187,7 +187,8 @@ TEST(KpAlignPointSets, appliesTheInitialMatrixToWhateverThereIs)
 TEST(KpCompTransform, takesCentredMatrices)
 {
     KpDMatrix<float> a(4, 3), b(4, 3);
-    std::copy_n(std::begin({1.F, 0.F, 0.F, 0.F, 2.F, 0.F, 0.F, 0.F, 3.F, -1.F, -2.F, -3.F}), 12, a.data());
+    const float points[] = {1.F, 0.F, 0.F, 0.F, 2.F, 0.F, 0.F, 0.F, 3.F, -1.F, -2.F, -3.F};
+    std::copy_n(points, 12, a.data());
     std::transform(a.data(), a.data() + 12, b.data(), [](float v) { return 2 * v; });
     const KpMat4f expected(2, 0, 0, 0, 0, 2, 0, 0, 0, 0, 2, 0, 4 - 2, 5 - 4, 6 - 6, 1);
     KpMat4f scaled, affine;

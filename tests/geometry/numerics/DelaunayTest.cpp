@@ -183,7 +183,8 @@ void findsTheRimsOfCircles()
             double inside = x, outside = x + (side % 2 == 0 ? -2 : 2) * std::sqrt(circles[i].squaredRadius);
             for (int halvings = 0; halvings < 1100; ++halvings) {  // down to neighbours, even beside zero
                 x = (inside + outside) / 2;
-                (contains<Size>(circles[i], point) ? inside : outside) = x;
+                double& bound = contains<Size>(circles[i], point) ? inside : outside;
+                bound = x;
             }
             x = inside;
             std::int32_t hits[5000];

@@ -240,7 +240,10 @@ long KpDArray<T>::insertSorted(const T& item, int (*compare)(const T&, const T&)
         if (hi - lo < 2)
             break;
         const long mid = (lo + hi) / 2;
-        (compare(item, data_[mid]) < 0 ? hi : lo) = mid;
+        if (compare(item, data_[mid]) < 0)
+            hi = mid;
+        else
+            lo = mid;
     }
     insert(lo + 1, 1, &item);
     return lo + 1;

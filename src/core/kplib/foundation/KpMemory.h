@@ -14,6 +14,11 @@ KPLIB_API void* kprealloc(void* ptr, unsigned long size);
 /// Gives a block back; null is ignored.
 KPLIB_API void kpfree(void* ptr);
 
+/// Deleter for blocks of kpmalloc: `std::unique_ptr<char, KpFree>`.
+struct KpFree {
+    void operator()(void* block) const { kpfree(block); }
+};
+
 /// `size` bytes with the heap's own alignment (16 here) or null; `alignment` is ignored, and that is meant.
 KPLIB_API void* KpAlignedMalloc(unsigned long size, unsigned long alignment);
 

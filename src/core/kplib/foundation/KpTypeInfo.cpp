@@ -18,7 +18,10 @@ long indexOf(const char* name)
     long lo = -1, hi = types.size();
     while (hi - lo >= 2) {
         const long mid = (lo + hi) / 2;
-        (std::strcmp(name, types[mid]->name()) < 0 ? hi : lo) = mid;
+        if (std::strcmp(name, types[mid]->name()) < 0)
+            hi = mid;
+        else
+            lo = mid;
     }
     return lo >= 0 && std::strcmp(name, types[lo]->name()) == 0 ? lo : -1;
 }

@@ -61,7 +61,8 @@ KpMat3f KpMat3f::symmInverse(float det) const
 
 bool KpMat3f::LUDecomposition(int (&index)[3], float& parity)
 {
-    std::copy_n(std::begin({0, 1, 2}), 3, index);
+    for (int i = 0; i < 3; ++i)
+        index[i] = i;
     parity = 0;
     for (int column = 0; column < 2; ++column) {
         int pivot = column;

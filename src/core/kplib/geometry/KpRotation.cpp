@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <numbers>
 
 namespace {
 
@@ -93,7 +94,7 @@ void KpRotation::setValue(const KpVec3f& from1, const KpVec3f& from2, const KpVe
     const KpVec3f turned = first.multVec(from2);
     auto angle = static_cast<float>(std::acos(static_cast<double>(std::clamp(turned.dot(to2), -1.0F, 1.0F))));
     if (turned.cross(to2).dot(to1) < 0)
-        angle = 6.2831855F - angle;
+        angle = 2 * std::numbers::pi_v<float> - angle;
     *this = first * KpRotation(to1, angle);
 }
 

@@ -1,10 +1,16 @@
 #include <kplib/geometry/KpVec2f.h>
 
 #include <cmath>
+#include <numbers>
+
+float KpVec2f::hypot() const
+{
+    return static_cast<float>(std::hypot(static_cast<double>(x()), static_cast<double>(y())));
+}
 
 float KpVec2f::normalize()
 {
-    const auto length = static_cast<float>(std::hypot(static_cast<double>(x()), static_cast<double>(y())));
+    const float length = this->hypot();
     if (length != 0)
         *this /= length;
     return length;
@@ -16,7 +22,7 @@ float KpVec2f::angle(const KpVec2f& other) const
                            std::hypot(static_cast<double>(other.x()), static_cast<double>(other.y()));
     const double cosine = dot(other) / lengths;
     if (cosine < -1)
-        return 3.1415927F;
+        return std::numbers::pi_v<float>;
     if (cosine > 1)
         return 0;
     return static_cast<float>(std::acos(cosine));

@@ -14,7 +14,9 @@ public:
     {
     }
 
-    /// Makes the length 1 and gives the former one, hypot() in double rounded to float. A vector of length 0 stays, and
+    /// The length by std::hypot() in double, rounded to float; length() computes in float and may overflow.
+    float hypot() const;
+    /// Makes the length 1 and gives the former one, hypot(). A vector of length 0 stays, and
     /// 0 is given.
     float normalize();
     /// The unsigned angle between the two in radians, from 0 to pi; NaN if one of them is zero.

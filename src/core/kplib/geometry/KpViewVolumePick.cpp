@@ -2,10 +2,11 @@
 #include <kplib/geometry/KpViewVolume.h>
 
 #include <algorithm>
+#include <numbers>
 
 namespace {
 
-constexpr float halfPi = 1.5707964F;
+constexpr float halfPi = std::numbers::pi_v<float> / 2;
 
 KpVec3f fromNormalisedDevice(const KpMat4f& toWorld, float x, float y, float z)
 {
@@ -40,7 +41,8 @@ KpRotation alignTo(const KpVec3f& up, const KpVec3f& right)
 {
     KpRotation rotation(KpVec3f(0, 1, 0), up);
     const KpVec3f x = rotation.multVec(KpVec3f(1, 0, 0));
-    // Between opposite vectors the shortest turn is about any axis; this one keeps y.
+    // Between opposite vectors the shortest turn is about any axis; this one keeps y. Intentional: the angle has five
+    // digits, as in all builds so far, and picked positions depend on it.
     rotation *= x.dot(right) < -0.99999F ? KpRotation(KpVec3f(0, 1, 0), 3.14159F) : KpRotation(x, right);
     return rotation;
 }

@@ -1,10 +1,11 @@
 #include <kplib/geometry/MathUtils.h>
 
 #include <cmath>
+#include <numbers>
 
 namespace {
 
-constexpr float twoPi = 6.2831855F;
+constexpr float twoPi = 2 * std::numbers::pi_v<float>;
 
 KpVec3f normalized(KpVec3f v)
 {

@@ -17,10 +17,7 @@ static_assert(sizeof(HxParamBase) == 40 && sizeof(HxParameter) == 56 && sizeof(H
 
 namespace {
 
-struct Free {
-    void operator()(char* block) const { kpfree(block); }
-};
-using OwnedText = std::unique_ptr<char, Free>;
+using OwnedText = std::unique_ptr<char, KpFree>;
 
 /// In a block of its own, filled up with zeros for NameKey.
 OwnedText nameCopy(const char* text)

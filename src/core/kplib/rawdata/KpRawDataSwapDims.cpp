@@ -1,5 +1,6 @@
 #include <kplib/rawdata/KpRawData.h>
 
+#include <kplib/foundation/KpMemory.h>
 #include <kplib/foundation/KpMemoryException.h>
 #include <kplib/foundation/KpPrimTypeVisit.h>
 #include <kplib/log/KpLogFile.h>
@@ -20,10 +21,6 @@ using Dims = std::array<long, 3>;
 
 /// A permutation of axes: axis i of the result is axis perm[i] of the source.
 using Perm = std::array<int, 3>;
-
-struct Free {
-    void operator()(char* memory) const { std::free(memory); }
-};
 
 bool isPermutation(const int* perm)
 {
@@ -179,7 +176,7 @@ bool KpRawData::swapDims(KpTypedPointer data, int* dims, const int* perm, int nD
     Dims sorted = from;
     std::sort(sorted.begin(), sorted.end());
     const long voxelSize = static_cast<long>(data.type.size()) * nDataVar, mid = sorted[1], big = sorted[2];
-    const std::unique_ptr<char, Free> scratch(
+    const std::unique_ptr<char, KpFree> scratch(
         static_cast<char*>(std::malloc(static_cast<std::size_t>(voxelSize * big * std::max(mid, 2L)))));
     if (!scratch)
         return false;

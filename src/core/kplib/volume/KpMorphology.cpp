@@ -10,10 +10,6 @@ using namespace kplib::detail;
 
 namespace {
 
-struct Free {
-    void operator()(void* block) const { std::free(block); }
-};
-
 struct Operation {
     MorphologyReach reach;
     bool erodes;
@@ -45,7 +41,7 @@ bool byWords(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long p
 {
     MorphologyJob job{src.data(), dst.data(), dims[0], dims[1], dims[2], passes, operation.reach, operation.erodes};
     job.passes = morphologyPassesAtOnce(job);
-    const std::unique_ptr<void, Free> area(std::malloc(morphologyAreaBytes(job)));
+    const std::unique_ptr<void, KpFree> area(std::malloc(morphologyAreaBytes(job)));
     if (!area)
         return false;
     static MorphologyLoop* const run = best(morphologyPaths());

@@ -3,10 +3,11 @@
 #include <kplib/geometry/shapes/Rectangle2D.h>
 
 #include <cmath>
+#include <numbers>
 
 namespace {
 
-constexpr float pi = 3.1415927F, twoPi = 6.2831855F;
+constexpr float pi = std::numbers::pi_v<float>, twoPi = 2 * pi;
 
 float dividedUnlessZero(float value, float divisor)
 {

@@ -2,6 +2,8 @@
 
 #include <kplib/geometry/shapes/AbstractEllipse2D.h>
 
+#include <numbers>
+
 /// A circle.
 class KPLIB_API Circle2D : public AbstractEllipse2D {
 public:
@@ -15,7 +17,7 @@ public:
     bool equals(const AbstractShape2D& other) const override;
     float radiusX() const override { return radius_; }
     float radiusY() const override { return radius_; }
-    float circumference() const override { return radius_ * 6.2831855F; }
+    float circumference() const override { return radius_ * (2 * std::numbers::pi_v<float>); }
     KpVec2f projectPoint(float angle) const override { return onOutline(angle, radius_, radius_); }
 
 private:

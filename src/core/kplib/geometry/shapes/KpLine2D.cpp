@@ -1,11 +1,7 @@
 #include <kplib/geometry/shapes/KpLine2D.h>
 
-#include <kplib/geometry/shapes/detail/Length2D.h>
-
 #include <algorithm>
 #include <cmath>
-
-using kplib::detail::length2D;
 
 namespace {
 
@@ -30,8 +26,8 @@ bool KpLine2D::isEmpty() const
 
 float KpLine2D::getDistanceTo(const KpVec2f& p) const
 {
-    const float length = length2D(direction_);
-    return length == 0 ? length2D(p - position_) : crossOf(direction_, p - position_) / length;
+    const float length = direction_.hypot();
+    return length == 0 ? (p - position_).hypot() : crossOf(direction_, p - position_) / length;
 }
 
 float KpLine2D::getDistance2To(const KpVec2f& p) const

@@ -1,13 +1,10 @@
 #include <kplib/geometry/shapes/Polyline2D.h>
 
 #include <kplib/geometry/shapes/KpLine2D.h>
-#include <kplib/geometry/shapes/detail/Length2D.h>
 
 #include <algorithm>
 #include <limits>
 #include <typeinfo>
-
-using kplib::detail::length2D;
 
 void Polyline2D::setVertices(std::vector<KpVec2f> vertices)
 {
@@ -96,12 +93,12 @@ double Polyline2D::length() const
 {
     double sum = 0;
     for (size_t i = 1; i < vertices_.size(); ++i)
-        sum += static_cast<double>(length2D(vertices_[i] - vertices_[i - 1]));
+        sum += static_cast<double>((vertices_[i] - vertices_[i - 1]).hypot());
     return sum;
 }
 
 float Polyline2D::lengthOfSegment(size_t i) const
 {
     const size_t pairs = vertices_.size() / 2;
-    return i < pairs ? length2D(vertices_[2 * i + 1] - vertices_[2 * i]) : 0;
+    return i < pairs ? (vertices_[2 * i + 1] - vertices_[2 * i]).hypot() : 0;
 }

@@ -49,7 +49,10 @@ public:
             return;
         }
         --counts_[node.place.level];
-        (node.before == none ? heads_[node.place.bucket] : nodes_[node.before].next) = node.next;
+        if (node.before == none)
+            heads_[node.place.bucket] = node.next;
+        else
+            nodes_[node.before].next = node.next;
         if (node.next != none)
             nodes_[node.next].before = node.before;
     }

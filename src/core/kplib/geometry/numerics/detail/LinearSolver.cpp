@@ -48,7 +48,8 @@ void subtractProducts(RowAt rowAt, int count, const float* x, int begin, int end
             s2 -= r2[k] * x[k];
             s3 -= r3[k] * x[k];
         }
-        std::copy_n(std::begin({s0, s1, s2, s3}), together, sums);
+        const float all[together] = {s0, s1, s2, s3};
+        std::copy_n(all, together, sums);
         return;
     }
     for (int r = 0; r < count; ++r) {

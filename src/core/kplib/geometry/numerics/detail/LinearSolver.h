@@ -1,16 +1,12 @@
 #pragma once
 
 #include <kplib/cpu/KernelPath.h>
+#include <kplib/foundation/KpMemory.h>
 
-#include <cstdlib>
 #include <memory>
 #include <span>
 
 namespace kplib::detail {
-
-struct FreeBlock {
-    void operator()(void* block) const { std::free(block); }
-};
 
 /// Room for the factors of an n by n matrix, one block a row.
 class SolverRows {
@@ -27,7 +23,7 @@ public:
 private:
     int n_;
     int count_ = 0;  // of rows that there is memory for
-    std::unique_ptr<float*[], FreeBlock> rows_;
+    std::unique_ptr<float*[], KpFree> rows_;
 };
 
 /// The work of KpDMatrix::solveLRdecomp() on the `n` by `n` matrix `a`, of which `lr` holds a copy.
@@ -50,8 +46,8 @@ private:
     const float* a_;
     int n_;
     float** lr_;
-    std::unique_ptr<float[], FreeBlock> work_;
-    std::unique_ptr<int[], FreeBlock> permutation_;  // the row of `a` that stands in each row of `lr`
+    std::unique_ptr<float[], KpFree> work_;
+    std::unique_ptr<int[], KpFree> permutation_;  // the row of `a` that stands in each row of `lr`
     float *b_ = nullptr, *residual_ = nullptr, *x_ = nullptr, *correction_ = nullptr;  // within work_
 };
 
