@@ -101,17 +101,18 @@ void readResult(TmMsg& msg)
 }
 
 template <typename... T>
-constexpr auto valueReaders = std::array{readValue<T>...};
+constexpr auto valueReaders(KpTypeList<T...>)
+{
+    return std::array{readValue<T>...};
+}
 template <typename... T>
-constexpr auto arrayReaders = std::array{readArray<T>...};
+constexpr auto arrayReaders(KpTypeList<T...>)
+{
+    return std::array{readArray<T>...};
+}
 
-constexpr auto values =
-    valueReaders<unsigned char, bool, unsigned short, int, unsigned int, float, double, long, long long,
-                 unsigned long long, KpVec2i, KpVec2f, KpVec3i, KpVec3f, KpVec3l, KpVec4i, KpVec4f, KpColor, KpRotation,
-                 KpPlane, KpLine, KpBox2f, KpBox3f, KpBox3i, KpMat4f, KpPrimType, KpLib::MD5, KpUniqueID, KpTransferID,
-                 KpFrameID, KpRemotificationID, TmSessionContextID>;
-constexpr auto arrays = arrayReaders<unsigned char, bool, int, float, double, long, long long, KpVec2f, KpVec3i,
-                                     KpVec3f, KpVec4f, KpPlane, KpLine, KpMat4f>;
+constexpr auto values = valueReaders(kplib::detail::WireValues());
+constexpr auto arrays = arrayReaders(kplib::detail::WireElements());
 constexpr std::array composites = {readTexts, readResult, readImage, readField, readVolume, readInner};
 constexpr size_t readers = values.size() + arrays.size() + composites.size();
 

@@ -110,16 +110,9 @@ void goesRound()
     EXPECT_EQ(msg.bytesAvailable(), 0U);
 }
 
-template <typename... Elements>
-void allGoRound()
-{
-    (goesRound<Elements>(), ...);
-}
-
 TEST(Message, arraysAndValuesGoRound)
 {
-    allGoRound<unsigned char, bool, int, float, double, long, long long, KpVec2f, KpVec3i, KpVec3f, KpVec4f, KpPlane,
-               KpLine, KpMat4f>();
+    kplib::detail::WireElements::forEach([]<typename T>() { goesRound<T>(); });
 }
 
 TEST(Message, compositesHaveTheirForms)

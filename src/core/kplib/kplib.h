@@ -32,6 +32,7 @@
 #include <kplib/foundation/KpThreadLocalStorage.h>
 #include <kplib/foundation/KpTransferID.h>
 #include <kplib/foundation/KpTypeInfo.h>
+#include <kplib/foundation/KpTypeList.h>
 #include <kplib/foundation/KpTypedObject.h>
 #include <kplib/foundation/KpUniqueID.h>
 #include <kplib/foundation/KpWaitCondition.h>

@@ -21,9 +21,6 @@ public:
     };
     static constexpr int NumTypes = 10;
 
-    /// How many types are numbers in the sense of isNumber().
-    static constexpr int numNumbers = 6;
-
     /// Names ("byte", "short" ...) and sizes in bytes, indexed by the value; valid for 0 to 9 only.
     static const char* const primTypeName[NumTypes];
     static const std::int32_t primTypeSize[NumTypes];
@@ -42,7 +39,7 @@ public:
     constexpr bool isValid() const { return static_cast<std::uint32_t>(type_) < NumTypes; }
 
     /// Whether the library computes with elements of this type: byte, short, int, float, double and ushort.
-    constexpr bool isNumber() const { return (type_ >= Byte && type_ <= Double) || type_ == UShort; }
+    constexpr bool isNumber() const;
 
     /// Name and size that may be asked of any value: "unknown" and 0 outside the ten types.
     const char* name() const { return isValid() ? primTypeName[type_] : "unknown"; }
@@ -51,3 +48,25 @@ public:
 private:
     Type type_;
 };
+
+// Switches over the types list each of them and have no default, so that the compiler names the places that a new type
+// has to be added to.
+
+constexpr bool KpPrimType::isNumber() const
+{
+    switch (type_) {
+    case Byte:
+    case Short:
+    case Int:
+    case Float:
+    case Double:
+    case UShort:
+        return true;
+    case Complex:
+    case String:
+    case UInt:
+    case SByte:
+        break;
+    }
+    return false;
+}

@@ -3,6 +3,7 @@
 #include <kplib/foundation/KpDArray.h>
 #include <kplib/foundation/KpExport.h>
 #include <kplib/foundation/KpForward.h>
+#include <kplib/foundation/KpTypeList.h>
 
 #include <cstring>
 #include <string>
@@ -12,20 +13,17 @@ class TmMsg;
 
 namespace kplib::detail {
 
-template <typename T, typename... List>
-inline constexpr bool isOneOf = (std::is_same_v<T, List> || ...);
-
 /// The values of fixed size that a message takes: as many bytes as the value has in memory.
+using WireValues = ImageValues::With<bool, double, KpVec4i, KpColor, KpRotation, KpLine, KpBox2f, KpPrimType,
+                                     KpTransferID, KpFrameID, KpRemotificationID, TmSessionContextID>;
 template <typename T>
-concept WireValue = isOneOf<T, unsigned char, bool, unsigned short, int, unsigned int, float, double, long, long long,
-                            unsigned long long, KpVec2i, KpVec2f, KpVec3i, KpVec3f, KpVec3l, KpVec4i, KpVec4f, KpColor,
-                            KpRotation, KpPlane, KpLine, KpBox2f, KpBox3f, KpBox3i, KpMat4f, KpPrimType, KpLib::MD5,
-                            KpUniqueID, KpTransferID, KpFrameID, KpRemotificationID, TmSessionContextID>;
+concept WireValue = WireValues::contains<T>;
 
 /// The elements of the arrays that a message takes as one block.
+using WireElements = KpTypeList<unsigned char, bool, int, float, double, long, long long, KpVec2f, KpVec3i, KpVec3f,
+                                KpVec4f, KpPlane, KpLine, KpMat4f>;
 template <typename T>
-concept WireElement = isOneOf<T, unsigned char, bool, int, float, double, long, long long, KpVec2f, KpVec3i, KpVec3f,
-                              KpVec4f, KpPlane, KpLine, KpMat4f>;
+concept WireElement = WireElements::contains<T>;
 
 /// Takes `bytes` bytes of array elements at the read offset, or logs that the message doesn't hold them.
 KPLIB_API bool readElements(TmMsg& msg, void* elements, unsigned long bytes);

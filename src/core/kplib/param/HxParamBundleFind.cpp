@@ -43,9 +43,12 @@ int takers(KpPrimType type)
         return Double | Text;
     case KpPrimType::String:
         return Text;
-    default:
-        return 0;
+    case KpPrimType::Complex:
+    case KpPrimType::UInt:
+    case KpPrimType::SByte:
+        break;
     }
+    return 0;
 }
 
 /// The numbers at the start of a text; false if it ends before the last one. What is no digit, `-` or blank is never

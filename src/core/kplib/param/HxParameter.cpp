@@ -65,7 +65,7 @@ void visitNumber(KpPrimType type, const void* values, long i, Work work)
         return work(static_cast<const std::uint32_t*>(values)[i]);
     case KpPrimType::SByte:
         return work(static_cast<const std::int8_t*>(values)[i]);
-    default:
+    case KpPrimType::String:
         return;
     }
 }

@@ -52,6 +52,28 @@ KpTypedPointer asNumbers(KpTypedPointer data, unsigned long& n)
     return {data.data, KpPrimType::Float};
 }
 
+/// Bytes of the words that an element consists of, 0 for an unknown type; a complex number is two words.
+int wordSize(KpPrimType type)
+{
+    switch (type) {
+    case KpPrimType::Byte:
+    case KpPrimType::SByte:
+        return 1;
+    case KpPrimType::Short:
+    case KpPrimType::UShort:
+        return 2;
+    case KpPrimType::Int:
+    case KpPrimType::UInt:
+    case KpPrimType::Float:
+    case KpPrimType::Complex:
+    case KpPrimType::String:  // Intentional: as two words, which the callers of other builds count on.
+        return 4;
+    case KpPrimType::Double:
+        return 8;
+    }
+    return 0;
+}
+
 void swapWords(void* data, unsigned long n, int width)
 {
     static SwapLoops* const loops = best(swapPaths());
@@ -115,13 +137,11 @@ bool KpRawData::isConstant(KpTypedPointer data, unsigned long n)
 
 void KpRawData::swapBytes(KpTypedPointer data, unsigned long n)
 {
-    const int size = data.type.size();
-    if (size == 8 && data.type != KpPrimType::Double)
-        swapWords(data.data, 2 * n, 4);
-    else if (size == 2 || size == 4 || size == 8)
-        swapWords(data.data, n, size);
-    else if (size != 1)
-        getTheLogInstance().warnf("Swapping of %d-byte words not supported.", size);
+    const int width = wordSize(data.type);
+    if (width == 0)
+        getTheLogInstance().warnf("Swapping of %d-byte words not supported.", data.type.size());
+    else if (width > 1)
+        swapWords(data.data, n * static_cast<unsigned long>(data.type.size() / width), width);
 }
 
 void KpRawData::swapBytesWord2(void* data, unsigned long n)

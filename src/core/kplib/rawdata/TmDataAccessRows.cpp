@@ -73,6 +73,10 @@ KpResult TmDataAccess::putRow(long x, long y, long z, const float* in) const
     return {};
 }
 
+// A line is read and written as floats, by way of a 32-bit integer.
+template <typename T>
+constexpr bool fitsIntoLine = std::is_floating_point_v<T> || sizeof(T) <= sizeof(std::int32_t);
+
 template <typename T>
 void TmDataAccess::rowImpl(long offset, int axis, float* out) const
 {
@@ -87,6 +91,8 @@ void TmDataAccess::rowImpl(long offset, int axis, float* out) const
 template <typename T>
 void TmDataAccess::putRowImpl(long offset, int axis, const float* in, float low, float high) const
 {
+    static_assert(fitsIntoLine<T>,
+                  "integers of more than 32 bits would lose their upper bits here: convert them otherwise");
     char* const first = static_cast<char*>(dataPtrs_[0]) + offset;
     if (strides_[axis] == sizeof(T))
         convertDense(first, primType_, in, KpPrimType::Float, dims_[axis]);

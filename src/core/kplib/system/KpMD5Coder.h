@@ -2,21 +2,18 @@
 
 #include <kplib/foundation/KpExport.h>
 #include <kplib/foundation/KpForward.h>
+#include <kplib/foundation/KpTypeList.h>
 #include <kplib/system/KpCoder.h>
 #include <kplib/system/KpMD5.h>
 
-#include <concepts>
 #include <string>
 
 namespace KpLib {
 
 /// The types whose memory image MD5Coder takes as it is.
-template <typename T, typename... Types>
-concept OneOf = (std::same_as<T, Types> || ...);
+using MD5Images = kplib::detail::ImageValues::With<char, short, unsigned long, KpMat3f>;
 template <typename T>
-concept MD5Image = OneOf<T, char, unsigned char, short, unsigned short, int, unsigned int, float, long, unsigned long,
-                         long long, unsigned long long, MD5, KpUniqueID, KpVec2i, KpVec2f, KpVec3i, KpVec3f, KpVec3l,
-                         KpVec4f, KpPlane, KpBox3i, KpBox3f, KpMat3f, KpMat4f>;
+concept MD5Image = MD5Images::contains<T>;
 
 /// An MD5 over values: `MD5Coder() << dims << origin << name`, then md5().
 ///
