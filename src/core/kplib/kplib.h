@@ -4,6 +4,7 @@
 
 #include <kplib/foundation/Kp128.h>
 #include <kplib/foundation/KpAllocator.h>
+#include <kplib/foundation/KpCheck.h>
 #include <kplib/foundation/KpDArray.h>
 #include <kplib/foundation/KpEditable.h>
 #include <kplib/foundation/KpException.h>

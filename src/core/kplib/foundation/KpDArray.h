@@ -1,5 +1,6 @@
 #pragma once
 
+#include <kplib/foundation/KpCheck.h>
 #include <kplib/foundation/KpMemory.h>
 
 #include <climits>
@@ -113,8 +114,16 @@ public:
     long capacity() const noexcept { return capacity_; }
     T* data() noexcept { return data_; }
     const T* data() const noexcept { return data_; }
-    T& operator[](long i) noexcept { return data_[i]; }
-    const T& operator[](long i) const noexcept { return data_[i]; }
+    T& operator[](long i) noexcept
+    {
+        KPLIB_CHECK(i >= 0 && i < size_, "KpDArray: the index is not in [0, size())");
+        return data_[i];
+    }
+    const T& operator[](long i) const noexcept
+    {
+        KPLIB_CHECK(i >= 0 && i < size_, "KpDArray: the index is not in [0, size())");
+        return data_[i];
+    }
     T* begin() noexcept { return data_; }
     T* end() noexcept { return data_ + size_; }
     const T* begin() const noexcept { return data_; }
@@ -210,6 +219,8 @@ long KpDArray<T>::resize(long newSize)
 template <typename T>
 void KpDArray<T>::insertMemory(long pos, long count)
 {
+    KPLIB_CHECK(pos >= 0 && pos <= size_ && count >= 0,
+                "KpDArray: the position is not in [0, size()], or the count is negative");
     const long needed = sum(size_, count);
     if (needed > capacity_) {
         capacity_ = larger(grown(), needed);
@@ -252,6 +263,7 @@ long KpDArray<T>::insertSorted(const T& item, int (*compare)(const T&, const T&)
 template <typename T>
 void KpDArray<T>::remove(long pos)
 {
+    KPLIB_CHECK(pos >= 0 && pos < size_, "KpDArray: the position is not in [0, size())");
     if constexpr (isManaged)
         data_[pos].~T();
     moveElements(pos, pos + 1, size_ - pos - 1);

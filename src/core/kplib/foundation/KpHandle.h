@@ -1,5 +1,7 @@
 #pragma once
 
+#include <kplib/foundation/KpCheck.h>
+
 #include <utility>
 
 /// Smart pointer to an object that counts its handles: a T with ref() and unref(), such as a KpHandable.
@@ -49,8 +51,16 @@ public:
     void swap(KpHandle& other) noexcept { std::swap(pointer_, other.pointer_); }
 
     T* get() const noexcept { return pointer_; }
-    T* operator->() const noexcept { return pointer_; }
-    T& operator*() const noexcept { return *pointer_; }
+    T* operator->() const noexcept
+    {
+        KPLIB_CHECK(pointer_ != nullptr, "KpHandle: dereferenced while null");
+        return pointer_;
+    }
+    T& operator*() const noexcept
+    {
+        KPLIB_CHECK(pointer_ != nullptr, "KpHandle: dereferenced while null");
+        return *pointer_;
+    }
     explicit operator bool() const noexcept { return pointer_ != nullptr; }
 
     bool operator==(const KpHandle& other) const noexcept { return pointer_ == other.pointer_; }

@@ -1,5 +1,7 @@
 #include <kplib/foundation/KpString.h>
 
+#include <kplib/foundation/KpCheck.h>
+
 #include <algorithm>
 #include <cctype>
 #include <cstdio>
@@ -237,6 +239,7 @@ void KpString::replaceSubStr(const char* from, const char* to)
 
 void KpString::explode(char separator, KpDArray<KpString>& out) const
 {
+    KPLIB_CHECK(this < out.begin() || this >= out.end(), "KpString: the pieces would replace the string itself");
     out.clear();
     const std::string_view text = *this;
     for (size_t begin = 0;;) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <kplib/foundation/KpCheck.h>
 #include <kplib/geometry/KpVecBase.h>
 
 /// What the axis-aligned boxes in space share: xmin, xmax, ymin, ymax, zmin, zmax and nothing else, so that the object
@@ -26,8 +27,16 @@ public:
     constexpr value_type zmax() const { return b_[5]; }
 
     /// Bound `i` in the order above; not checked.
-    constexpr value_type& operator[](int i) { return b_[i]; }
-    constexpr value_type operator[](int i) const { return b_[i]; }
+    constexpr value_type& operator[](int i)
+    {
+        KPLIB_CHECK(i >= 0 && i < 6, "KpBox3Base: the index is not in [0, 6)");
+        return b_[i];
+    }
+    constexpr value_type operator[](int i) const
+    {
+        KPLIB_CHECK(i >= 0 && i < 6, "KpBox3Base: the index is not in [0, 6)");
+        return b_[i];
+    }
     constexpr const value_type* data() const { return b_; }
 
     constexpr Vector min() const { return {b_[0], b_[2], b_[4]}; }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <kplib/foundation/KpCheck.h>
 #include <kplib/foundation/KpExport.h>
 #include <kplib/geometry/KpVec3f.h>
 
@@ -41,8 +42,16 @@ public:
     KpMat3f& operator=(const float (&rows)[3][3]);
 
     /// The three floats of a row; m[row][column].
-    constexpr float* operator[](int row) { return m_[row]; }
-    constexpr const float* operator[](int row) const { return m_[row]; }
+    constexpr float* operator[](int row)
+    {
+        KPLIB_CHECK(row >= 0 && row < 3, "KpMat3f: the row is not in [0, 3)");
+        return m_[row];
+    }
+    constexpr const float* operator[](int row) const
+    {
+        KPLIB_CHECK(row >= 0 && row < 3, "KpMat3f: the row is not in [0, 3)");
+        return m_[row];
+    }
     /// The nine floats, row by row.
     constexpr const float* data() const { return m_[0]; }
 

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <kplib/foundation/KpCheck.h>
 #include <kplib/foundation/KpExport.h>
 #include <kplib/geometry/KpVec3f.h>
 #include <kplib/geometry/KpVec4f.h>
@@ -57,8 +58,16 @@ public:
     void setRotate(const KpRotation& rotation);
 
     /// The four floats of a row; m[row][column].
-    constexpr float* operator[](int row) { return m_[row]; }
-    constexpr const float* operator[](int row) const { return m_[row]; }
+    constexpr float* operator[](int row)
+    {
+        KPLIB_CHECK(row >= 0 && row < 4, "KpMat4f: the row is not in [0, 4)");
+        return m_[row];
+    }
+    constexpr const float* operator[](int row) const
+    {
+        KPLIB_CHECK(row >= 0 && row < 4, "KpMat4f: the row is not in [0, 4)");
+        return m_[row];
+    }
     /// The sixteen floats, row by row.
     constexpr const float* data() const { return m_[0]; }
 

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <kplib/foundation/KpCheck.h>
+
 #include <concepts>
 #include <cstdint>
 #include <iosfwd>
@@ -16,8 +18,16 @@ public:
     static constexpr int size() { return Size; }
 
     /// Component `i`, from 0; not checked.
-    constexpr Component& operator[](int i) { return v_[i]; }
-    constexpr Component operator[](int i) const { return v_[i]; }
+    constexpr Component& operator[](int i)
+    {
+        KPLIB_CHECK(i >= 0 && i < Size, "KpVecBase: the index is not in [0, size())");
+        return v_[i];
+    }
+    constexpr Component operator[](int i) const
+    {
+        KPLIB_CHECK(i >= 0 && i < Size, "KpVecBase: the index is not in [0, size())");
+        return v_[i];
+    }
     /// The components one after the other, x first.
     constexpr Component* data() { return v_; }
     constexpr const Component* data() const { return v_; }

@@ -1,5 +1,6 @@
 #include <kplib/param/HxParameter.h>
 
+#include <kplib/foundation/KpCheck.h>
 #include <kplib/foundation/KpMemory.h>
 #include <kplib/foundation/KpString.h>
 #include <kplib/param/HxParamBundle.h>
@@ -46,6 +47,7 @@ void* newValue(int n, KpPrimType type, const void* data)
 template <typename Work>
 void visitNumber(KpPrimType type, const void* values, long i, Work work)
 {
+    KPLIB_CHECK(values != nullptr && i >= 0, "HxParameter: the index is not in [0, dimension())");
     switch (type) {
     case KpPrimType::Byte:
         return work(static_cast<const std::uint8_t*>(values)[i]);

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <kplib/foundation/KpCheck.h>
 #include <kplib/foundation/KpDArray.h>
 #include <kplib/foundation/KpExport.h>
 #include <kplib/foundation/KpForward.h>
@@ -18,7 +19,11 @@ public:
     explicit KpPackedIndexing(const KpBitfield& bits);
 
     /// The dense number of position `i`, which has to be a flagged one.
-    int index(long i) const { return blockBase_[i / blockSize] + offsets_[i]; }
+    int index(long i) const
+    {
+        KPLIB_CHECK(i >= 0 && i < offsets_.size(), "KpPackedIndexing: the position lies outside");
+        return blockBase_[i / blockSize] + offsets_[i];
+    }
 
     /// For each block the number that its first flagged position has, if it has one.
     const KpDArray<int>& blockBase() const { return blockBase_; }

@@ -2,6 +2,7 @@
 
 #include <kplib/foundation/Kp128.h>
 #include <kplib/foundation/KpAllocator.h>
+#include <kplib/foundation/KpCheck.h>
 #include <kplib/foundation/KpDArray.h>
 #include <kplib/foundation/KpExport.h>
 #include <kplib/foundation/KpForward.h>
@@ -80,6 +81,7 @@ public:
     /// Slice `z`.
     void* dataPtr(long z) const
     {
+        KPLIB_CHECK(hasData(), "TmDataAccess: dataPtr() without data");
         return isLinear() ? static_cast<char*>(dataPtrs_[0]) + strides_[2] * z : dataPtrs_[z];
     }
     /// Voxel (`x`, `y`, `z`).

@@ -1,5 +1,6 @@
 #include <kplib/volume/KpBitfield.h>
 
+#include <kplib/foundation/KpCheck.h>
 #include <kplib/foundation/KpMemory.h>
 #include <kplib/volume/detail/BitfieldKernels.h>
 
@@ -95,6 +96,7 @@ void KpBitfield::setRange(unsigned long from, unsigned long to)
 {
     if (from > to)
         return;
+    KPLIB_CHECK(to < nBits_, "KpBitfield: the range ends outside [0, nBits())");
     const unsigned long first = from >> 5, last = to >> 5;
     const BitWord head = ~lowBits(from), tail = ~BitWord{0} >> (31 - (to & 31));
     if (first == last) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <kplib/foundation/KpCheck.h>
 #include <kplib/foundation/KpExport.h>
 
 #include <cstdint>
@@ -53,9 +54,21 @@ public:
     std::uint32_t* data() { return bits_; }
     const std::uint32_t* data() const { return bits_; }
 
-    void set(unsigned long i) { bits_[i >> 5] |= 1U << (i & 31); }
-    void unset(unsigned long i) { bits_[i >> 5] &= ~(1U << (i & 31)); }
-    bool test(unsigned long i) const { return (bits_[i >> 5] >> (i & 31) & 1) != 0; }
+    void set(unsigned long i)
+    {
+        KPLIB_CHECK(i < nBits_, "KpBitfield: the bit is not in [0, nBits())");
+        bits_[i >> 5] |= 1U << (i & 31);
+    }
+    void unset(unsigned long i)
+    {
+        KPLIB_CHECK(i < nBits_, "KpBitfield: the bit is not in [0, nBits())");
+        bits_[i >> 5] &= ~(1U << (i & 31));
+    }
+    bool test(unsigned long i) const
+    {
+        KPLIB_CHECK(i < nBits_, "KpBitfield: the bit is not in [0, nBits())");
+        return (bits_[i >> 5] >> (i & 31) & 1) != 0;
+    }
 
     /// Keeps the bits below both sizes. Added words, and the added bits of a last word that was in use, become what
     /// `init` says. A spare word without bits keeps what it holds, also when it comes into use; that is meant.

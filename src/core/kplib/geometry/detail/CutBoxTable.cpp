@@ -1,7 +1,9 @@
 #include <kplib/geometry/detail/CutBox.h>
 
-// Sets that no plane divides the corners into are empty, or hold what is never looked at.
-const std::uint8_t kplib::detail::cuts[128][7] = {
+#include <bit>
+
+// Sets that no plane divides the corners into are empty, or hold several polygons in a row, which are never used.
+constexpr std::uint8_t kplib::detail::cuts[128][7] = {
     {0},
     {3, 0x20, 0x40, 0x10},
     {3, 0x31, 0x51, 0x10},
@@ -131,3 +133,38 @@ const std::uint8_t kplib::detail::cuts[128][7] = {
     {6, 0x73, 0x75, 0x76, 0x40, 0x20, 0x10},
     {3, 0x76, 0x75, 0x73},
 };
+
+namespace {
+
+// Whether a row names each edge between a corner of the set and one outside at most once, and nothing else; all of them
+// unless it is empty. That they are in order around the polygon depends on which sets a plane can divide: the tests cut
+// boxes until all of those have been seen.
+constexpr bool holdsDividedEdges(unsigned set)
+{
+    const std::uint8_t* const row = kplib::detail::cuts[set];
+    const unsigned divided = std::popcount((set ^ set >> 1) & 0x55) + std::popcount((set ^ set >> 2) & 0x33) +
+                             std::popcount((set ^ set >> 4) & 0x0F);
+    for (int i = 1; i <= row[0]; ++i) {
+        const unsigned a = row[i] >> 4, b = row[i] & 15;
+        if (std::popcount(a ^ b) != 1 || (set >> a & 1) == (set >> b & 1))
+            return false;
+        for (int j = 1; j < i; ++j) {
+            if (row[i] == row[j])
+                return false;
+        }
+    }
+    return row[0] == 0 || row[0] == divided;
+}
+
+constexpr bool allHoldDividedEdges()
+{
+    for (unsigned set = 0; set < 128; ++set) {
+        if (!holdsDividedEdges(set))
+            return false;
+    }
+    return true;
+}
+
+static_assert(allHoldDividedEdges(), "a row of the table of cuts is not the outline of its set of corners");
+
+}  // namespace

@@ -1,5 +1,6 @@
 #include <kplib/geometry/numerics/KpDMatrix.h>
 
+#include <kplib/foundation/KpCheck.h>
 #include <kplib/foundation/KpMemory.h>
 #include <kplib/geometry/numerics/detail/LinearSolver.h>
 #include <kplib/geometry/numerics/detail/SingularValues.h>
@@ -35,6 +36,7 @@ void KpDMatrix<T>::swap(KpDMatrix& other) noexcept
 template <typename T>
 void KpDMatrix<T>::resize(int rows, int cols)
 {
+    KPLIB_CHECK(rows >= 0 && cols >= 0, "KpDMatrix: a count of rows or columns is negative");
     if (rows == rows_ && cols == cols_)
         return;
     const std::size_t count = static_cast<std::size_t>(rows) * static_cast<std::size_t>(cols);
@@ -85,6 +87,7 @@ KpDMatrix<T>& KpDMatrix<T>::operator*=(const KpDMatrix& other)
 template <typename T>
 bool KpDMatrix<T>::SVD(KpDMatrix& U, T* w, KpDMatrix& V, int maxIterations) const
 {
+    KPLIB_CHECK(&U != this && &V != this && &U != &V, "KpDMatrix: SVD needs three different matrices");
     U = *this;
     V.resize(cols_, cols_);
     return kplib::detail::computeSingularValues(U, w, V, maxIterations);

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <kplib/foundation/KpCheck.h>
 #include <kplib/foundation/KpExport.h>
 
 #include <cstddef>
@@ -39,8 +40,16 @@ public:
     T* data() noexcept { return data_; }
     const T* data() const noexcept { return data_; }
     /// The elements of a row; m[row][column], not checked.
-    T* operator[](int row) noexcept { return data_ + place(row); }
-    const T* operator[](int row) const noexcept { return data_ + place(row); }
+    T* operator[](int row) noexcept
+    {
+        KPLIB_CHECK(row >= 0 && row < rows_, "KpDMatrix: the row is not in [0, rows())");
+        return data_ + place(row);
+    }
+    const T* operator[](int row) const noexcept
+    {
+        KPLIB_CHECK(row >= 0 && row < rows_, "KpDMatrix: the row is not in [0, rows())");
+        return data_ + place(row);
+    }
 
     /// Exchanges rows and columns, by way of a new block.
     void transpose();
