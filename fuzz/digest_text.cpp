@@ -1,23 +1,17 @@
+#include "Fuzz.h"
+
 #include <kplib/foundation/KpString.h>
 #include <kplib/system/KpCoder.h>
 #include <kplib/system/KpMD5.h>
 #include <kplib/system/KpUUID.h>
 
 #include <cctype>
-#include <cstdlib>
-#include <string>
 #include <string_view>
 #include <vector>
 
 // Digests, UUIDs and digits from any text: what is read is written again the same way.
 
 namespace {
-
-void check(bool holds)
-{
-    if (!holds)
-        std::abort();
-}
 
 void readsDigits(const KpString& text)
 {

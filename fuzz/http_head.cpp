@@ -1,22 +1,15 @@
 // Heads of HTTP responses: the same from one piece as from many, and what a plain reader of lines finds in them.
 
+#include "Fuzz.h"
+
 #include <kplib/net/detail/HttpHead.h>
 
 #include <cctype>
-#include <cstdint>
-#include <cstdlib>
-#include <string>
 #include <strings.h>
 
 using kplib::detail::HttpHead;
 
 namespace {
-
-void check(bool holds)
-{
-    if (!holds)
-        std::abort();
-}
 
 struct Plain {
     HttpHead::State state = HttpHead::State::Open;

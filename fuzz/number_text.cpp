@@ -1,21 +1,13 @@
 // The checked number conversions: they take what the standard stream of the whole text takes, and nothing else.
 
+#include "Fuzz.h"
+
 #include <kplib/foundation/KpString.h>
 #include <kplib/foundation/StringUtils.h>
 
 #include <cmath>
-#include <cstddef>
-#include <cstdint>
-#include <cstdlib>
-#include <string>
 
 namespace {
-
-void check(bool holds)
-{
-    if (!holds)
-        std::abort();
-}
 
 template <typename Number>
 void defaultsTellFailures(Number (*convert)(const char*, Number, bool*), const char* text)

@@ -1,21 +1,13 @@
 // What KpFilename makes of texts: pack() against its definition written with positions, and the others for what holds
 // of their results.
 
+#include "Fuzz.h"
+
 #include <kplib/system/KpFilename.h>
 
 #include <algorithm>
-#include <cstddef>
-#include <cstdint>
-#include <cstdlib>
-#include <string>
 
 namespace {
-
-void check(bool holds)
-{
-    if (!holds)
-        std::abort();
-}
 
 std::string replacedOnce(const std::string& text, const std::string& from)
 {

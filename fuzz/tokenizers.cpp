@@ -1,22 +1,13 @@
 // Both tokenizers and KpString::protect: nothing is read outside the text, and what protect() writes comes back as one
 // token.
 
+#include "Fuzz.h"
+
 #include <kplib/foundation/KpStdStringTokenizer.h>
 #include <kplib/foundation/KpString.h>
 #include <kplib/foundation/KpStringTokenizer.h>
 
-#include <cstddef>
-#include <cstdint>
-#include <cstdlib>
-#include <string>
-
 namespace {
-
-void check(bool holds)
-{
-    if (!holds)
-        std::abort();
-}
 
 void splitAtWhiteSpace(const std::string& text)
 {

@@ -1,22 +1,14 @@
 // Version numbers in text: of digits and dots exactly the numbers that stand there, of anything else a value that its
 // own text gives again.
 
+#include "Fuzz.h"
+
 #include <kplib/system/KpVersion.h>
 
 #include <array>
 #include <charconv>
-#include <cstddef>
-#include <cstdint>
-#include <cstdlib>
-#include <string>
 
 namespace {
-
-void check(bool holds)
-{
-    if (!holds)
-        std::abort();
-}
 
 /// What a text without blanks and signs means.
 KpVersion plainVersion(const std::string& text)
