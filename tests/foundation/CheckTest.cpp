@@ -15,7 +15,7 @@ TEST(Checks, abortWithFileLineAndDuty)
     EXPECT_DEATH(array[2] = 0, R"(KpDArray\.h:[0-9]+: KpDArray: the index)");
     EXPECT_DEATH(array.remove(-1), "KpDArray: the position");
     EXPECT_DEATH(array.insert(3, 1, array.data()), "KpDArray: the position");
-    EXPECT_DEATH(bits.set(5), "KpBitfield: the bit");
+    EXPECT_DEATH(bits.set(32), "KpBitfield: the bit");
     EXPECT_DEATH(bits.setRange(0, 5), "KpBitfield: the range");
     EXPECT_DEATH(matrix[2], "KpDMatrix: the row");
     EXPECT_DEATH(KpVec3f(1, 2, 3)[3], "KpVecBase: the index");

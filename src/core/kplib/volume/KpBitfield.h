@@ -56,17 +56,17 @@ public:
 
     void set(unsigned long i)
     {
-        KPLIB_CHECK(i < nBits_, "KpBitfield: the bit is not in [0, nBits())");
+        KPLIB_CHECK(i >> 5 < nWords_, "KpBitfield: the bit lies outside the words of the field");
         bits_[i >> 5] |= 1U << (i & 31);
     }
     void unset(unsigned long i)
     {
-        KPLIB_CHECK(i < nBits_, "KpBitfield: the bit is not in [0, nBits())");
+        KPLIB_CHECK(i >> 5 < nWords_, "KpBitfield: the bit lies outside the words of the field");
         bits_[i >> 5] &= ~(1U << (i & 31));
     }
     bool test(unsigned long i) const
     {
-        KPLIB_CHECK(i < nBits_, "KpBitfield: the bit is not in [0, nBits())");
+        KPLIB_CHECK(i >> 5 < nWords_, "KpBitfield: the bit lies outside the words of the field");
         return (bits_[i >> 5] >> (i & 31) & 1) != 0;
     }
 
