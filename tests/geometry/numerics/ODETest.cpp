@@ -79,29 +79,54 @@ int half(const KpVec2f& x, KpVec2f& derivative, void* code)
     return x.x() <= 2 ? 0 : *static_cast<int*>(code);
 }
 
-TEST(KpODE, staysAtTheEndOfItsCurveOrGoesOnAlongTheLastCubic)
+TEST(KpODE, endsAtItsLastPointThenRepeatsTheSampleOrGoesOnAlongTheLastCubic)
 {
     int code = 77;
     KpODE2 ode;
     ode.setRightHandSide(half, &code);
     ode.setHMinMax(0.1F, 0.5F);
-    ode.setHSampling(0.25F);
+    ode.setHSampling(0.3F);
     ode.init(KpVec2f(0, 1), 0.5F);
     KpVec2f point;
-    for (int i = 1; i <= 8; ++i) {
+    for (int i = 1; i <= 6; ++i) {
         ASSERT_EQ(ode.next(point), 0);
-        EXPECT_NEAR(point.x(), 0.25F * static_cast<float>(i), 1e-5F);
+        EXPECT_NEAR(point.x(), 0.3F * static_cast<float>(i), 1e-5F);
     }
     KpODE2 flagged = ode;
-    for (int i = 0; i < 2; ++i)
-        EXPECT_TRUE(ode.next(point) == code && point == KpVec2f(2, 1) && ode.status() == code);
+    const KpVec2f sample = point;
+    EXPECT_TRUE(ode.next(point) == code && point == KpVec2f(2, 1) && ode.status() == code);
     EXPECT_FLOAT_EQ(ode.h(), 0.5F / 16);  // quartered twice
+    EXPECT_TRUE(ode.next(point) == code && point == sample);
     for (int i = 1; i <= 3; ++i) {
         EXPECT_EQ(flagged.next(point, 1), code);
-        EXPECT_NEAR(point.x(), 2 + 0.25F * static_cast<float>(i), 1e-5F);
+        EXPECT_NEAR(point.x(), 1.8F + 0.3F * static_cast<float>(i), 1e-5F);
     }
+    const KpVec2f beyond = point;
     flagged.freeze(KpVec2f(5, 6));
-    EXPECT_TRUE(flagged.next(point) == KpODE2::Frozen && point == KpVec2f(5, 6));
+    EXPECT_TRUE(flagged.next(point) == KpODE2::Frozen && point == beyond);
+}
+
+// Circles, and a wall at x = 0 whose code is the user data.
+int walled(const KpVec2f& x, KpVec2f& derivative, void* code)
+{
+    derivative = KpVec2f(-x.y(), x.x());
+    return x.x() > 0 ? 0 : *static_cast<int*>(code);
+}
+
+TEST(KpODE, passesOnTheCodeOfAWallHoweverTheStepsEnd)
+{
+    int code = 7;
+    for (int i = 0; i < 500; ++i) {
+        KpODE2 ode;
+        ode.setMethod(i % 5);
+        ode.setHMinMax(i % 3 == 0 ? 0 : 0.1F, 10);
+        ode.setRightHandSide(walled, &code);
+        ode.init(KpVec2f(1 + 0.01F * static_cast<float>(i), 0.5F));
+        KpVec2f point;
+        for (int samples = 0; samples < 100 && ode.next(point) == 0; ++samples) {
+        }
+        EXPECT_EQ(ode.status(), code) << i;
+    }
 }
 
 /// The same everywhere, as the user data has it.

@@ -7,6 +7,37 @@
 #include <algorithm>
 #include <cmath>
 
+// Plan
+//
+// Steps: nextRK() repeats attempts of the method until one is accepted. An attempt that leaves the field is repeated
+// with a quarter of the step, at most twice in a row. With err the length of the error vector of an attempt that
+// succeeds,
+//
+//     factor = (0.8 tolerance / err) ^ exponent[method]
+//
+//     err <= tolerance: accepted, then h = min(h * min(factor, 2), hMax)
+//     err >  tolerance: rejected, then h = h * max(factor, 0.5), or the end if h < hMin
+//
+// Samples: each accepted step from (y0, k0) to (y1, k1) over the parameters start to start + dt is a segment of the
+// curve, a Hermite cubic in u = (parameter - start) / dt:
+//
+//     d0 = dt k0, d1 = dt k1
+//     a = 2 y0 - 2 y1 + d0 + d1
+//     b = 3 y1 - 3 y0 - 2 d0 - d1
+//     p(u) = ((a u + b) u + d0) u + y0
+//
+// The first sample of a segment evaluates p, p' and p'' and their forward differences for du = hSampling / dt; each
+// further one costs six additions of vectors:
+//
+//     sample:   0      1      2          3                     (parameter / hSampling)
+//     segment:  |---------------|-----------|---- ...          (steps of their own sizes)
+//               init  cubic  differences  cubic
+//
+// A field that ends at a wall makes the steps smaller and smaller: an attempt across the wall fails, a quarter of it is
+// accepted short of the wall, the size doubles, and the next attempt fails again. So the third failure in a row may
+// never come before the step is too small to advance; hence lastFailure, which keeps the code of the field for that
+// end.
+
 namespace {
 
 float lengthOf(const KpVec2f& v)
@@ -77,7 +108,7 @@ void KpODEBase<Vector>::init(const Vector& start, float h0)
     std::fill(std::begin(s.secondDerivatives), std::end(s.secondDerivatives), Vector{});
     s.points[0] = start;  // what samples go on from where there never was a segment
     s.derivatives[0] = derivative;
-    s.status = Success;
+    s.status = s.lastFailure = Success;
     if (h0 > 0) {
         s.h = h0;
         return;
@@ -170,12 +201,15 @@ int KpODEBase<Vector>::attempt(Vector& y, Vector& f, Vector& error) const
 template <typename Vector>
 int KpODEBase<Vector>::attemptWithSmallerSteps(Vector& y, Vector& f, Vector& error)
 {
-    int code = attempt(y, f, error);
-    for (int retry = 0; retry < 2 && code != Success; ++retry) {
+    for (int retry = 0;; ++retry) {
+        const int code = attempt(y, f, error);
+        if (code == Success)
+            return code;
+        state_.lastFailure = code;
+        if (retry == 2)
+            return code;
         state_.h *= 0.25F;
-        code = attempt(y, f, error);
     }
-    return code;
 }
 
 template <typename Vector>
@@ -183,6 +217,13 @@ double KpODEBase<Vector>::stepFactor(float error) const
 {
     const float ratio = static_cast<float>(static_cast<double>(state_.tolerance) * 0.8 / static_cast<double>(error));
     return std::pow(static_cast<double>(ratio), static_cast<double>(exponent[state_.method]));
+}
+
+/// The code for a step that cannot go on: that of the field where the field made it small.
+template <typename Vector>
+int KpODEBase<Vector>::stepTooSmall() const
+{
+    return state_.lastFailure != Success ? state_.lastFailure : static_cast<int>(StepTooSmall);
 }
 
 template <typename Vector>
@@ -204,7 +245,7 @@ int KpODEBase<Vector>::nextRK(Vector& y, Vector& f, float& hUsed)
             return Success;
         }
         if (state_.h < state_.hMin || state_.h == 0)  // a step of 0 cannot shrink
-            return StepTooSmall;
+            return stepTooSmall();
         const double factor = err == 0 ? 0.5 : std::max(0.5, stepFactor(err));  // a NaN counts as 0.5
         state_.h = static_cast<float>(static_cast<double>(state_.h) * factor);
     }
@@ -227,38 +268,39 @@ int KpODEBase<Vector>::next(Vector& point, Vector& derivative, int flag)
 template <typename Vector>
 int KpODEBase<Vector>::next(Vector& point, Vector& derivative, Vector& secondDerivative, int flag)
 {
-    const int code = state_.status == Success ? advanceToSample() : state_.status;
-    if (code != Success && state_.status == Success)
-        return code;  // of setCheckHMin(): there is no sample yet
-    const bool isEnd = code != Success && !flag;
-    if (code != Success && flag)
+    State& s = state_;
+    const Phase phase = s.status == Success ? advanceToSample() : Phase::Ended;
+    if (phase == Phase::ShortStep)
+        return StepTooSmall;
+    if (phase != Phase::Running && flag)
         advanceDifferences();
-    point = isEnd ? state_.currentPoint : state_.points[0];
-    derivative = isEnd ? state_.currentDerivative : state_.derivatives[0];
-    secondDerivative = state_.secondDerivatives[0];
-    return code;
+    const bool isEndOfCurve = phase == Phase::Ending && !flag;
+    point = isEndOfCurve ? s.lastPoint : s.points[0];
+    derivative = isEndOfCurve ? s.lastDerivative : s.derivatives[0];
+    secondDerivative = s.secondDerivatives[0];
+    return s.status;
 }
 
-/// Goes on by one sample, over as many steps as that takes.
+/// Advances the tables by one sample, over as many steps as that takes.
 template <typename Vector>
-int KpODEBase<Vector>::advanceToSample()
+auto KpODEBase<Vector>::advanceToSample() -> Phase
 {
     State& s = state_;
     s.sample += s.hSampling;
     if (!(s.sample > s.segmentEnd)) {
         advanceDifferences();
-        return Success;
+        return Phase::Running;
     }
     while (s.sample > s.segmentEnd) {
-        if (const int code = nextSegment())
-            return code;
+        if (const Phase phase = nextSegment(); phase != Phase::Running)
+            return phase;
     }
     setCubic();
-    return Success;
+    return Phase::Running;
 }
 
 template <typename Vector>
-int KpODEBase<Vector>::nextSegment()
+auto KpODEBase<Vector>::nextSegment() -> Phase
 {
     State& s = state_;
     s.lastPoint = s.currentPoint;
@@ -268,13 +310,13 @@ int KpODEBase<Vector>::nextSegment()
     float hUsed = 0;
     s.status = nextRK(y, f, hUsed);
     if (s.status != Success)
-        return s.status;
+        return Phase::Ending;
     if (s.checkHMin && hUsed < s.hMin)
-        return StepTooSmall;  // the status stays: this is for the caller to judge
+        return Phase::ShortStep;
     s.segmentEnd += hUsed;
     if (!(s.segmentEnd > s.segmentStart))
-        s.status = StepTooSmall;
-    return s.status;
+        s.status = stepTooSmall();
+    return s.status == Success ? Phase::Running : Phase::Ending;
 }
 
 /// The Hermite cubic of the segment at the sample, with the differences for a sampling distance.

@@ -63,10 +63,15 @@ public:
     /// Starts a curve, with a first step of `h0`; if that isn't above 0, with one derived from the tolerance.
     void init(const Vector& start, float h0 = 0);
 
-    /// The next sample, with its derivatives by the parameter of its own segment, which runs from 0 to 1. Gives
-    /// status(), or what setCheckHMin() asks for. When the integration has ended, the samples stay at the end of the
-    /// curve, or with `flag` go on along the last cubic. Ends with StepTooSmall, too, where a step no longer advances
-    /// the parameter.
+    /// The next sample, with its derivatives by the parameter of its own segment, which runs from 0 to 1. Returns
+    /// status(), or StepTooSmall without a sample if setCheckHMin() asks for that.
+    ///
+    /// Without `flag`, the call that ends the integration sets the end of the curve: the last accepted point. Each
+    /// later call, and each call after freeze(), repeats the last regular sample (the start, if there was none). With
+    /// `flag`, all these calls go on along the last cubic.
+    ///
+    /// A step that can no longer advance ends the integration too: with the last code other than 0 that the field gave
+    /// since init(), and with StepTooSmall if it gave none.
     int next(Vector& point, int flag = 0);
     int next(Vector& point, Vector& derivative, int flag = 0);
     int next(Vector& point, Vector& derivative, Vector& secondDerivative, int flag = 0);
@@ -94,7 +99,8 @@ public:
     /// sample that it stopped at, `maxSteps` if it went through, and 0 for none.
     int nextSL(Vector& point, Vector& derivative, int minSteps, int maxSteps, float tolerance);
 
-    /// Stops at `point`, a boundary for instance: the current point, with the status Frozen.
+    /// Stops the integration, for instance at a boundary: makes `point` the current point and sets the status to
+    /// Frozen. The samples of next() do not change.
     void freeze(const Vector& point);
 
     float h() const { return state_.h; }
@@ -112,24 +118,35 @@ public:
     RightHandSide rightHandSide() const { return state_.rightHandSide; }
 
 private:
+    /// What a call of next() meets.
+    enum class Phase {
+        Running,    // the tables hold the next sample
+        ShortStep,  // setCheckHMin() refuses the step: no sample, and the status stays 0
+        Ending,     // the integration ended in this call
+        Ended,      // it ended in an earlier call or by freeze()
+    };
+
     struct State {
-        float h = 1;
-        float hMin = 0.1F;
-        float hMax = 10;
-        float hSampling = 1;
-        float tolerance = 0.02F;
-        float orientation = 1;
-        int checkHMin = 0;
-        int status = 0;
-        int normalization = 1;
-        int method = RK43;
+        float h = 1;              // size of the next attempt
+        float hMin = 0.1F;        // a rejected step below this size is not tried smaller
+        float hMax = 10;          // bound of the size that follows an accepted step
+        float hSampling = 1;      // distance of two samples by the parameter
+        float tolerance = 0.02F;  // bound of the length of the error of an accepted step
+        float orientation = 1;    // factor on the field
+        int checkHMin = 0;        // not 0: next() refuses accepted steps below hMin
+        int status = Success;     // a Code or a code of the field; Success while the integration runs
+        int normalization = 1;    // not 0: the field is scaled to the length `orientation`
+        int method = RK43;        // a Method; any other value ends the integration at its first step
         void* userData = nullptr;
-        float segmentStart = 0, segmentEnd = 0, sample = 0;
-        Vector lastPoint{}, lastDerivative{};
-        Vector currentPoint{}, currentDerivative{};
-        // A value and its forward differences: of the point, and of its first and second derivative.
+        float segmentStart = 0, segmentEnd = 0;      // parameters of the ends of the current segment
+        float sample = 0;                            // parameter of the last sample asked for
+        Vector lastPoint{}, lastDerivative{};        // at the start of the segment, the field scaled
+        Vector currentPoint{}, currentDerivative{};  // at its end, where the next step starts
+        // [0] is the sample that next() returns, the others are its forward differences for a step of hSampling: of
+        // the point (a cubic), of its first derivative and of its second derivative by the parameter of the segment.
         Vector points[4]{}, derivatives[3]{}, secondDerivatives[2]{};
         RightHandSide rightHandSide = defaultRightHandSide;
+        int lastFailure = Success;  // code of the last failed attempt since init(); Success if none failed
     };
 
     template <typename Tableau>
@@ -142,8 +159,9 @@ private:
     int evaluate(const Vector& x, Vector& derivative) const;
     bool orient(Vector& derivative) const;
 
-    int advanceToSample();
-    int nextSegment();
+    Phase advanceToSample();
+    Phase nextSegment();
+    int stepTooSmall() const;
     void setCubic();
     void advanceDifferences();
 
