@@ -4,6 +4,7 @@
 #include <kplib/system/KpTmpDir.h>
 
 #include <support/ExhaustedMemory.h>
+#include <support/LogCapture.h>
 #include <support/TempFolder.h>
 
 #include <gtest/gtest.h>
@@ -175,6 +176,15 @@ TEST_F(LogFilesTest, theOldestFilesGo)
         EXPECT_EQ(namesIn(folder), expected) << old << ' ' << limit;
         EXPECT_EQ(std::regex_match(path(), std::regex(folder + "/\\d{4}/\\d\\d/\\d\\d/[-\\d]+\\.log")), dated);
     }
+}
+
+TEST_F(LogFilesTest, onlyCleanUpLogsAMissingFolder)
+{
+    const kplib::test::LogCapture capture;
+    log->cleanUp();
+    EXPECT_EQ(capture.lines(), kplib::test::Lines{"E [] Can't open dir " + folder + "\n"});
+    EXPECT_TRUE(log->open(false) && !log->append((temp / "no/file").c_str()));
+    EXPECT_EQ(capture.lines().size(), 1U);
 }
 
 TEST_F(LogFilesTest, theFileOfTheSameSecondStays)

@@ -182,6 +182,27 @@ TEST(KpAlignPointSets, appliesTheInitialMatrixToWhateverThereIs)
         kpAlignPointSets(result, p, p, 3, 3, with);
         EXPECT_EQ(result, with ? before * initial : before);
     }
+    KpMat4f result = initial;
+    kpAlignPointSets(result, p, p, 0, 0, &result);
+    EXPECT_EQ(result, initial);
+}
+
+TEST(KpAlignPointSets, keepsItsAccuracyOverManyDistantPairs)
+{
+    Points points2 = cloud(1000000, KpVec3f(50, 60, 70));
+    for (KpVec3f& p : points2)
+        p += KpVec3f(2000, 0, 0);
+    KpMat4f motion;
+    motion.setTransform(KpVec3f(-9, 4, 7), KpRotation(0.1F, -0.2F, 0.05F, 0.97F), KpVec3f(1, 1, 1), KpRotation());
+    const Points points1 = moved(points2, motion);
+    for (const int mode : {0, 1, 2}) {
+        KpMat4f result;
+        kpAlignPointSets(result, points1.data(), points2.data(), static_cast<int>(points1.size()), mode);
+        float furthest = 0;
+        for (std::size_t i = 0; i < 1000; ++i)
+            furthest = std::max(furthest, (result.multVecMatrix(points2[i]) - points1[i]).length());
+        EXPECT_LT(furthest, 0.01F) << mode;
+    }
 }
 
 TEST(KpCompTransform, takesCentredMatrices)

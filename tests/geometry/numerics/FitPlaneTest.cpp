@@ -33,6 +33,20 @@ TEST(KpFitPlane, findsThePlaneOfNoisyPoints)
     }
 }
 
+TEST(KpFitPlane, keepsItsAccuracyOverManyDistantPoints)
+{
+    std::mt19937 random(1);
+    std::uniform_real_distribution<float> number(-50, 50);
+    KpVec3f normal(1, 2, 3);
+    normal.normalize();
+    const KpVec3f u = KpVec3f(3, 0, -1) / std::sqrt(10.0F), v = normal.cross(u);
+    KpFitPlane plane;
+    for (int i = 0; i < 100000; ++i)
+        plane.points().append(KpVec3f(1e5F, 0, 0) + u * number(random) + v * number(random));
+    plane.fit();
+    EXPECT_LT(plane.normal().cross(normal).length(), std::sin(0.1F * 3.14159F / 180));
+}
+
 TEST(KpFitPlane, needsThreePointsOrOne)
 {
     KpFitPlane plane;

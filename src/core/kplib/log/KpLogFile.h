@@ -125,7 +125,8 @@ public:
     bool chunkIsFull() const;
     /// Goes on in a new file; if that can't be had, in the old one.
     void chunkTryOpenNext();
-    /// Removes the oldest files; no-op with date folders or no limit.
+    /// Removes the oldest files; no-op with date folders or no limit. A base folder that cannot be read is one error in
+    /// the log of the process.
     void cleanUp();
 
     /// Whether standard output and standard error go into the file; changing it starts a new file. Switched off, they

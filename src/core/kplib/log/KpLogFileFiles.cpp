@@ -81,11 +81,11 @@ void KpLogFilePrivate::closeFile()
     file = nullptr;
 }
 
-/// Names sort by time. That one more is removed than would do is meant: it is the place of the file being opened.
-/// `kept` is the name of a file that stays in any case.
+/// Removes the oldest files: names sort by time. Intentional: one more than the excess goes, since open() counts the
+/// file that it opens. `kept` is the name of a file that stays in any case.
 void KpLogFilePrivate::cleanUp(std::string_view kept) const
 {
-    if (maxNumLogFiles == 0 || dateFoldersEnabled || !KpDirectory::isDirectory(baseFolder.c_str()))
+    if (maxNumLogFiles == 0 || dateFoldersEnabled)
         return;
     KpDArray<KpString> names;
     KpDirectory::scanSortedByName(baseFolder.c_str(), names, "*.log");
@@ -111,7 +111,10 @@ bool KpLogFile::open(bool force)
         return false;
     std::fclose(test);
     const bool isContinued = path == record_->filePath;
-    record_->cleanUp(isContinued ? path.basename() : "");  // first, as it may run out of memory
+    // First, as it may run out of memory. A folder that cannot be read would be logged, into a file that may be full
+    // and calls this function again for each line.
+    if (KpDirectory::isDirectory(record_->baseFolder.c_str()))
+        record_->cleanUp(isContinued ? path.basename() : "");
     record_->closeFile();
     return record_->openFile(std::move(path));
 }

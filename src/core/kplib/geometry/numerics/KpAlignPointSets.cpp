@@ -81,19 +81,29 @@ KpMat3f rotationFor(const KpMat3f& h)
     return timesTransposed(u, v);
 }
 
+struct ScaleSums {
+    float products, squares;
+
+    ScaleSums& operator+=(const ScaleSums& other)
+    {
+        products += other.products;
+        squares += other.squares;
+        return *this;
+    }
+};
+
 template <typename Rows>
 float scaleFor(const Rows& rows, const KpMat3f& rotation)
 {
     Row4 r[3];
     for (int i = 0; i < 3; ++i)
         r[i] = Row4{rotation[i][0], rotation[i][1], rotation[i][2], 0};
-    float products = 0, squares = 0;
-    rows.forEach([&](Row4 a, Row4 b) {
+    const auto sums = rows.template sum<ScaleSums>([&](ScaleSums& s, Row4 a, Row4 b) {
         const Row4 t = a[0] * r[0] + a[1] * r[1] + a[2] * r[2], product = b * t, square = t * t;
-        products += product[0] + product[1] + product[2];
-        squares += square[0] + square[1] + square[2];
+        s.products += product[0] + product[1] + product[2];
+        s.squares += square[0] + square[1] + square[2];
     });
-    return products / squares;
+    return sums.products / sums.squares;
 }
 
 /// The points of the two lists, of which the rows hold the differences from their centroids.
@@ -122,6 +132,20 @@ KpMat4f fitAffine(const Rows& rows, const Centroids& centroids)
     return between(centroids.list2, sides.transpose(), centroids.list1);
 }
 
+struct CentroidSums {
+    Row4 points1, points2;  // times their weights
+    float weights1, weights2;
+
+    CentroidSums& operator+=(const CentroidSums& other)
+    {
+        points1 += other.points1;
+        points2 += other.points2;
+        weights1 += other.weights1;
+        weights2 += other.weights2;
+        return *this;
+    }
+};
+
 template <bool isIndexed, Weights kind>
 class Alignment {
 public:
@@ -132,6 +156,7 @@ public:
 
     void run(KpMat4f& result, int mode, const KpMat4f* initial)
     {
+        const KpMat4f last = initial ? *initial : KpMat4f();  // a copy, as it may be `result`
         if (!computeCentroids())
             result.makeIdentity();
         else if (mode == Affine)
@@ -139,7 +164,7 @@ public:
         else if (mode == Rigid || mode == RigidWithScale)
             result = fitRigid(rows_, centroids(), mode == RigidWithScale);
         if (initial)
-            result *= *initial;
+            result *= last;
     }
 
 private:
@@ -148,21 +173,18 @@ private:
     /// False if there is nothing to divide by.
     bool computeCentroids()
     {
-        Row4 points1 = {}, points2 = {};
-        float sum1 = 0, sum2 = 0;
-        kplib::detail::forEachPair(rows_.list1, rows_.list2, rows_.n, [&](long i, Row4 p1, Row4 p2) {
-            const float weight1 = rows_.list1.weight(i), weight2 = rows_.list2.weight(i);
-            points1 += weight1 * p1;
-            points2 += weight2 * p2;
-            sum1 += weight1;
-            sum2 += weight2;
-        });
-        if constexpr (kind == Weights::None)
-            sum1 = static_cast<float>(rows_.n);
-        if constexpr (kind != Weights::Own)
-            sum2 = sum1;
-        rows_.centre1 = kplib::detail::toVector(points1 / sum1);
-        rows_.centre2 = kplib::detail::toVector(points2 / sum2);
+        const auto sums = kplib::detail::sumOfPairs<CentroidSums>(
+            rows_.list1, rows_.list2, rows_.n, [this](CentroidSums& s, long i, Row4 p1, Row4 p2) {
+                const float weight1 = rows_.list1.weight(i), weight2 = rows_.list2.weight(i);
+                s.points1 += weight1 * p1;
+                s.points2 += weight2 * p2;
+                s.weights1 += weight1;
+                s.weights2 += weight2;
+            });
+        const float sum1 = kind == Weights::None ? static_cast<float>(rows_.n) : sums.weights1;
+        const float sum2 = kind == Weights::Own ? sums.weights2 : sum1;
+        rows_.centre1 = kplib::detail::toVector(sums.points1 / sum1);
+        rows_.centre2 = kplib::detail::toVector(sums.points2 / sum2);
         return sum1 != 0 && sum2 != 0;
     }
 

@@ -1,23 +1,44 @@
 #include <kplib/geometry/numerics/KpFitPlane.h>
 
 #include <kplib/geometry/KpMat3f.h>
+#include <kplib/geometry/numerics/detail/PairwiseSum.h>
 
 namespace {
+
+KpVec3f sumOf(const KpDArray<KpVec3f>& points)
+{
+    return kplib::detail::pairwiseSum<KpVec3f>(points.size(), [&](KpVec3f& sum, long i, long end) {
+        for (; i < end; ++i)
+            sum += points[i];
+    });
+}
+
+struct ScatterSums {
+    float xx, xy, xz, yy, yz, zz;
+
+    ScatterSums& operator+=(const ScatterSums& other)
+    {
+        xx += other.xx;
+        xy += other.xy;
+        xz += other.xz;
+        yy += other.yy;
+        yz += other.yz;
+        zz += other.zz;
+        return *this;
+    }
+};
 
 /// The sum of transpose(d) * d over the differences from `centroid`.
 KpMat3f scatterMatrix(const KpDArray<KpVec3f>& points, const KpVec3f& centroid)
 {
-    float xx = 0, xy = 0, xz = 0, yy = 0, yz = 0, zz = 0;
-    for (const KpVec3f& point : points) {
-        const KpVec3f d = point - centroid;
-        xx += d.x() * d.x();
-        xy += d.x() * d.y();
-        xz += d.x() * d.z();
-        yy += d.y() * d.y();
-        yz += d.y() * d.z();
-        zz += d.z() * d.z();
-    }
-    return {xx, xy, xz, xy, yy, yz, xz, yz, zz};
+    const auto s = kplib::detail::pairwiseSum<ScatterSums>(points.size(), [&](ScatterSums& sums, long i, long end) {
+        for (; i < end; ++i) {
+            const KpVec3f d = points[i] - centroid;
+            sums +=
+                ScatterSums{d.x() * d.x(), d.x() * d.y(), d.x() * d.z(), d.y() * d.y(), d.y() * d.z(), d.z() * d.z()};
+        }
+    });
+    return {s.xx, s.xy, s.xz, s.xy, s.yy, s.yz, s.xz, s.yz, s.zz};
 }
 
 KpMat4f columnTranslation(const KpVec3f& translation)
@@ -41,10 +62,7 @@ float KpFitPlane::orthogonalPlaneFit()
 {
     if (points_.size() == 0)
         return 0;
-    KpVec3f sum(0, 0, 0);
-    for (const KpVec3f& point : points_)
-        sum += point;
-    centroid_ = sum / static_cast<float>(points_.size());
+    centroid_ = sumOf(points_) / static_cast<float>(points_.size());
 
     float evalues[3];
     KpVec3f evectors[3] = {normal_, normal_, normal_};  // stays when the eigenvectors can't be found

@@ -2,6 +2,7 @@
 
 #include <kplib/geometry/KpMat3f.h>
 #include <kplib/geometry/KpVec3f.h>
+#include <kplib/geometry/numerics/detail/PairwiseSum.h>
 
 #include <cstring>
 
@@ -57,21 +58,23 @@ struct PointList {
     }
 };
 
-/// Calls work(i, list1's point, list2's point) for all `n` pairs in order; the fourth numbers mean nothing.
-template <typename List1, typename List2, typename Work>
-void forEachPair(const List1& list1, const List2& list2, long n, Work&& work)
+/// The sum over all `n` pairs, to which work(sums, i, list1's point, list2's point) adds one; the fourth numbers of the
+/// points are undefined.
+template <typename Sums, typename List1, typename List2, typename Work>
+Sums sumOfPairs(const List1& list1, const List2& list2, long n, Work work)
 {
-    long i = 0;
-    if constexpr (!List1::isIndexed && !List2::isIndexed) {
-        for (; i < n - 1; ++i)
-            work(i, list1.pointWithNext(i), list2.pointWithNext(i));
-    }
-    for (; i < n; ++i)
-        work(i, list1.point(i), list2.point(i));
+    return pairwiseSum<Sums>(n, [&](Sums& sums, long i, long end) {
+        if constexpr (!List1::isIndexed && !List2::isIndexed) {
+            for (const long last = std::min(end, n - 1); i < last; ++i)
+                work(sums, i, list1.pointWithNext(i), list2.pointWithNext(i));
+        }
+        for (; i < end; ++i)
+            work(sums, i, list1.point(i), list2.point(i));
+    });
 }
 
 /// The rows of the two matrices of a fit, made where they are needed: `a` from list 2, `b` from list 1, both less their
-/// centres and times the point's weight; `b` only where `weightsB` tells so.
+/// centres and times the point's weight; `b` is weighted only with `weightsB`.
 template <typename List1, typename List2, bool weightsB>
 struct CentredRows {
     List1 list1;
@@ -79,19 +82,31 @@ struct CentredRows {
     KpVec3f centre1, centre2;
     long n;
 
-    /// Calls work(a, b) for all rows in order.
-    template <typename Work>
-    void forEach(Work&& work) const
+    /// The sum over all rows, to which work(sums, a, b) adds one.
+    template <typename Sums, typename Work>
+    Sums sum(Work work) const
     {
         const Row4 c1 = toRow(centre1), c2 = toRow(centre2);
-        forEachPair(list1, list2, n, [&](long i, Row4 p1, Row4 p2) {
+        return sumOfPairs<Sums>(list1, list2, n, [&](Sums& sums, long i, Row4 p1, Row4 p2) {
             Row4 a = p2 - c2, b = p1 - c1;
             if constexpr (List2::isWeighted)
                 a *= list2.weight(i);
             if constexpr (weightsB)
                 b *= list1.weight(i);
-            work(a, b);
+            work(sums, a, b);
         });
+    }
+};
+
+/// A 3 by 3 matrix of sums, the fourth column of which is undefined.
+struct MatrixSums {
+    Row4 rows[3];
+
+    MatrixSums& operator+=(const MatrixSums& other)
+    {
+        for (int i = 0; i < 3; ++i)
+            rows[i] += other.rows[i];
+        return *this;
     }
 };
 
@@ -99,12 +114,11 @@ struct CentredRows {
 template <typename Rows, typename Right>
 KpMat3f sumOfProducts(const Rows& rows, Right right)
 {
-    Row4 sums[3] = {};
-    rows.forEach([&](Row4 a, Row4 b) {
+    const auto sums = rows.template sum<MatrixSums>([&](MatrixSums& s, Row4 a, Row4 b) {
         for (int j = 0; j < 3; ++j)
-            sums[j] += a[j] * right(a, b);
+            s.rows[j] += a[j] * right(a, b);
     });
-    return KpMat3f(toVector(sums[0]), toVector(sums[1]), toVector(sums[2])).transpose();  // from columns
+    return KpMat3f(toVector(sums.rows[0]), toVector(sums.rows[1]), toVector(sums.rows[2])).transpose();  // from columns
 }
 
 }  // namespace kplib::detail
