@@ -59,6 +59,18 @@ TEST(KpRotation, survivesOtherForms)
     EXPECT_TRUE(axis == z && angle == 0) << "nearly no turn";
     KpRotation(x, 2.1e-5F).getValue(axis, angle);
     EXPECT_TRUE(axis == x && std::isnan(KpRotation(0, 0, 0, 0)[0]));
+
+    int beyond = 0;  // products of small turns with a w above 1
+    for (float a = 1e-5F; a < 3e-3F; a += 1e-5F) {
+        for (float b = 1e-5F; b < 3e-3F; b += 1e-5F) {
+            const KpRotation q =
+                KpRotation(x, a) * KpRotation(x, b) * KpRotation(x, -0.9F * a) * KpRotation(x, -0.8F * b);
+            q.getValue(axis, angle);
+            beyond += q[3] > 1 && angle == 0 && axis == x;
+            ASSERT_FALSE(std::isnan(angle)) << a << ' ' << b;
+        }
+    }
+    EXPECT_GT(beyond, 0);
 }
 
 TEST(KpRotation, comparesQuaternionsAndRotations)

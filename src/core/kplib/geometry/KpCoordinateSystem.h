@@ -95,7 +95,11 @@ public:
     KpMat4f transformationTo(const KpAbstractCoordinateSystem& other) const;
     KpMat4f transformationFrom(const KpAbstractCoordinateSystem& other) const;
     /// The lowest system that is above both or one of the two; null if there is none, which may be so for compatible
-    /// ones too. What comes back is held by a handle, so it has to live on the heap, as parents do.
+    /// ones too.
+    ///
+    /// The result is held by a handle, which deletes the object with the last handle to it. Do not call this for a
+    /// system on the stack or in a member that may be the result itself, such as in s.commonAncestor(s): the handle
+    /// would delete it. Parents live on the heap anyway.
     KpHandle<const KpAbstractCoordinateSystem> commonAncestor(const KpAbstractCoordinateSystem& other) const;
 
     /// A new system in the same place whose parent is the parent's parent; a copy if there is no parent.

@@ -112,7 +112,8 @@ void KpRotation::getValue(KpVec3f& axis, float& angle) const
     const float length = vector.length();
     const bool turns = length > 1e-5;
     axis = turns ? vector / length : KpVec3f(0, 0, 1);
-    angle = turns ? static_cast<float>(2 * std::acos(static_cast<double>(q_[3]))) : 0;
+    const float cosine = std::clamp(q_[3], -1.0F, 1.0F);  // a product of small turns may be slightly greater than 1
+    angle = turns ? static_cast<float>(2 * std::acos(static_cast<double>(cosine))) : 0;
 }
 
 void KpRotation::getValue(KpMat4f& matrix) const

@@ -37,8 +37,11 @@ public:
     /// rotation with quaternion curves", 1985.
     void setValue(const KpMat4f& matrix);
     void setValue(const KpMat3f& matrix);
-    /// The smallest turn that takes the direction `from` to the direction `to`; opposite ones have an axis chosen for
-    /// them.
+    /// The smallest turn that takes the direction `from` to the direction `to`.
+    ///
+    /// Exactly opposite directions give a half turn about some axis at a right angle to them, if the dot product of the
+    /// normalised directions is -1. Rounding makes it greater for about a third of all directions: these give the
+    /// quaternion (0, 0, 0, w) with w below 0.001, whose matrix is the identity. Check for opposite directions first.
     void setValue(const KpVec3f& from, const KpVec3f& to);
     /// The turn that takes `from1` to `to1`, and `from2` as near to `to2` as can be where each pair is at a right
     /// angle. All four are of length 1.
