@@ -47,6 +47,14 @@ TEST(ParamName, ofABundleLeavesTheRestToTheTitle)
     shadowed.setName("B B C");
     ASSERT_EQ(shadowed.size(), 2) << "no lookup finds a uint";
     EXPECT_STREQ(static_cast<HxParameter*>(shadowed[1])->getString(), "B C");
+    HxParamBundle stale("A");
+    for (const char* name : {"a", "b", "c", "d"})
+        stale.set(name, 5);
+    stale.sortParameters();
+    stale[3]->setName("x");
+    stale[0]->setName("name");  // the sort does not know
+    stale.setName("B of heart");
+    EXPECT_EQ(textOf(stale), "B {\n    name \"5\"\n    b 5\n    c 5\n    x 5\n    Name \"of heart\"\n}\n");
 }
 
 TEST(ParamName, isGeneratedFromTwoCounters)

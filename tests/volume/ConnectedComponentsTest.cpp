@@ -2,6 +2,7 @@
 #include <kplib/volume/KpConnectedComponents.h>
 #include <kplib/volume/detail/FloatSums.h>
 #include <kplib/volume/detail/LabelPlainly.h>
+#include <support/FailingMalloc.h>
 #include <support/LogCapture.h>
 
 #include <gtest/gtest.h>
@@ -80,7 +81,7 @@ void expectNoiseAsDefined()
 {
     unsigned seed = 0;
     for (Dims dims :
-         {Dims{{1, 1, 1}}, {{1, 7, 3}}, {{2, 2, 2}}, {{9, 1, 5}}, {{70, 2, 1}}, {{64, 5, 4}}, {{131, 9, 6}}})
+         {Dims{{1, 1, 1}}, {{1, 7, 3}}, {{31, 3, 2}}, {{32, 1, 5}}, {{70, 2, 1}}, {{64, 5, 4}}, {{131, 9, 6}}})
         for (double density : {0.001, 0.1, 0.5, 0.9, 0.999})
             for (int run : {1, 12})
                 for (int neighbours : {4, 5, 6, 8, 10, 18, 26})
@@ -150,6 +151,22 @@ TEST(KpConnectedComponents, cleansUpAtTheLimitAndFailsWithoutRoom)
     EXPECT_EQ((expectAsDefined<unsigned char, int>(board, dims, 1, 1, 6, 0)), 210000);
     // Few of the many aliases of noise are left at the end of its clean-ups.
     expectAsDefined<unsigned char>(noise<unsigned char>({{1300, 700, 1}}, 0.5, 1, 3), {{1300, 700, 1}}, 1, 1, 4, 0);
+}
+
+TEST(KpConnectedComponents, startsFromZeroAndKeepsScratchSmall)
+{
+    ComponentTable table{Component{5, 5, 5, {5, 5, 5}}};
+    table.resize(0);
+    table.resize(1);
+    EXPECT_TRUE(table[0].id == 0 && table[0].nVoxels == 0 && table[0].nSeeds == 0 && table[0].sum[2] == 0);
+    for (const int width : {1, 31, 32}) {
+        const int dims[] = {width, 100, 1};
+        std::vector<unsigned char> data(static_cast<std::size_t>(width) * 100);
+        std::vector<unsigned short> labels(data.size());
+        const kplib::test::FailingMalloc counting(-1);
+        CC::do_label<unsigned char>(data.data(), labels.data(), table, 1, 1, dims, 26, 0);
+        EXPECT_EQ(counting.count(), width < 32 ? 1 : 2) << "the clean-up, and the bits of rows";
+    }
 }
 
 TEST(KpConnectedComponents, joinsByNeighbourhood)

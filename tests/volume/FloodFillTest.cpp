@@ -129,19 +129,24 @@ TEST(FloodFill, equalsTheWalkBitByBit)
 TEST(FloodFill, refusesWhatItCannotWorkOn)
 {
     const kplib::test::LogCapture log;
-    const Field src(32768, Field::INIT_SET);
+    const Field src(32769, Field::INIT_SET), most16(32768, Field::INIT_SET);
     Field dst;
     int box[6] = {1, 2, 3, 4, 5, 6};
     const int most = std::numeric_limits<int>::max();
     for (const auto& dims :
-         {std::array{32768, 1, 1}, {1, 32768, 1}, {1, 1, 32768}, {32767, 1, 1}, {0, 1, 1}, {most, most, most}})
+         {std::array{32769, 1, 1}, {1, 32769, 1}, {1, 1, 32769}, {32767, 1, 1}, {0, 1, 1}, {most, most, most}})
         EXPECT_EQ(KpMorphology::floodfill(src, dst, {{0, 0, 0}}, true, dims.data(), box), 0UL);
-    EXPECT_EQ(log.lines().size(), 3U) << "the others are of another size, which isn't told";
+    EXPECT_EQ(log.lines().size(), 3U) << "the others are of another size, which is not logged";
     EXPECT_EQ(dst.nBits(), 0UL);
     const int dims[] = {2, 16384, 1};
-    EXPECT_EQ(KpMorphology::floodfill(src, dst, {}, true, dims, box), 0UL);
+    EXPECT_EQ(KpMorphology::floodfill(most16, dst, {}, true, dims, box), 0UL);
     EXPECT_TRUE(dst.nBits() == 32768 && box[0] == 1 && box[5] == 6);
-    EXPECT_EQ(KpMorphology::floodfill(src, dst, {{1, 16383, 0}}, true, dims, box), 32768UL);
+    EXPECT_EQ(KpMorphology::floodfill(most16, dst, {{1, 16383, 0}}, true, dims, box), 32768UL);
+    for (const auto& longest : {std::array{32768, 1, 1}, {1, 32768, 1}, {1, 1, 32768}}) {
+        Field fresh;
+        EXPECT_EQ(KpMorphology::floodfill(most16, fresh, {{0, 0, 0}}, true, longest.data(), box), 32768UL);
+        EXPECT_EQ(std::max({box[1], box[3], box[5]}), 32767);
+    }
 }
 
 }  // namespace

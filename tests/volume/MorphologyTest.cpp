@@ -161,6 +161,24 @@ TEST(Morphology, planesAreOnePass)
         }
 }
 
+TEST(Morphology, leavesTheSpareBitsOfAReusedField)
+{
+    for (const int width : {40, 64})  // within the last word, and all of the spare one
+        for (const int passes : {1, 2, 3})
+            for (const bool fast : {true, false})
+                for (const auto run : {KpMorphology::dilation3D_26, KpMorphology::dilation3D}) {
+                    const KpVec3i dims(width, 5, 1);
+                    const Field src(static_cast<unsigned long>(width) * 5, Field::INIT_UNSET);
+                    Field dst = src;
+                    dst.setAll();
+                    const auto before = dst.data()[dst.nWords() - 1];
+                    run(src, dst, dims, static_cast<unsigned>(passes), fast);
+                    const auto spare = ~0U << dst.nBits() % 32;
+                    EXPECT_EQ(dst.data()[dst.nWords() - 1] & spare, before & spare) << width << ' ' << passes << fast;
+                    EXPECT_FALSE(dst.isAnyBitSet());
+                }
+}
+
 TEST(Morphology, nothingToDo)
 {
     const Field src(40, Field::INIT_SET);

@@ -174,13 +174,13 @@ void HxParamBase::adoptName(char* fresh)
 void HxParamBase::retitle(const char* name, const char* rest)
 {
     auto& bundle = static_cast<HxParamBundle&>(*this);
+    if (rest && bundle.isShadowed("Name")) {
+        bundle.set("Name", rest);  // adds a parameter; what is found below may be another one of that name, or none
+        rest = nullptr;
+    }
     const char* title = rest;
     if (!rest && !bundle.findString("Name", title))
         return;
-    if (rest && bundle.isShadowed("Name")) {  // no lookup would see the new title, so it isn't cleared either
-        bundle.set("Name", rest);
-        return;
-    }
     KpString others;
     const bool any = tokensOtherThan(name, title, others);
     if (rest || any)

@@ -3,6 +3,7 @@
 #include <kplib/param/HxParameter.h>
 #include <kplib/param/detail/ParamLookup.h>
 
+#include <algorithm>
 #include <cstdlib>
 #include <thread>
 
@@ -117,11 +118,13 @@ HxParameter* HxParamBundle::find(const char* name, int dimension, int typeMask)
     return const_cast<HxParameter*>(std::as_const(*this).find(name, dimension, typeMask));
 }
 
-/// Whether a parameter of that name is there that find() never gives.
+/// Whether there is a parameter of that name that find() does not return: one of a type without a text, or one that was
+/// renamed after the parameters were sorted.
 bool HxParamBundle::isShadowed(const char* name) const
 {
-    const HxParameter* const found = parameter(NameKey(name));
-    return found && takers(found->primType()) == 0;
+    const NameKey key(name);
+    const auto matches = [&](const HxParamBase* child) { return key.matches(*child); };
+    return !find(key, 0, 255) && std::any_of(children_.begin() + nBundles(), children_.end(), matches);
 }
 
 /// Whether the key is one of the first 16 words of the title.

@@ -14,14 +14,15 @@
 /// numbers.
 ///
 /// Everything runs on the calling thread; threads may label different images at once. The table grows as the regions
-/// do, and there is scratch of two bits for each voxel of a slice; exhausted memory is a KpMemoryException.
+/// do. Scratch is two bits for each voxel of a slice, with rows rounded up to 64 voxels; rows below 32 voxels need
+/// none. Exhausted memory is a KpMemoryException.
 class KPLIB_API KpConnectedComponents {
 public:
     struct KPLIB_API Component {
-        int id;  ///< its own index, or that of the entry it is an alias of
-        unsigned nVoxels;
-        unsigned nSeeds;  ///< voxels at or above the upper threshold; of labels, the value of the region
-        float sum[3];     ///< of the voxels' x, y and z, one added after the other; over nVoxels: the centre
+        int id = 0;  ///< its own index, or that of the entry it is an alias of
+        unsigned nVoxels = 0;
+        unsigned nSeeds = 0;       ///< voxels at or above the upper threshold; of labels, the value of the region
+        float sum[3] = {0, 0, 0};  ///< of the voxels' x, y and z, one added after the other; over nVoxels: the centre
 
         /// Absorbs the statistics of `other` (its seeds only if `labelMode` is 0), zeroes them there and gives `other`
         /// the id of this one, which need not be the index of this one.
@@ -75,4 +76,11 @@ public:
     static int dbg_add;    ///< new components
     static int dbg_merge;  ///< always 0
     static int dbg_clean;  ///< clean-ups
+};
+
+/// Components are made by their constructor, so that an array has no uninitialised ones.
+template <>
+struct KpElementTraits<KpConnectedComponents::Component> {
+    static constexpr KpElementKind kind = KpElementKind::Managed;
+    static constexpr bool movesAsBytes = true;
 };

@@ -170,7 +170,8 @@ unsigned long KpMorphology::floodfill(const KpBitfield& src, KpBitfield& dst, co
     const auto size = [dims](int axis) { return static_cast<unsigned long>(dims[axis]); };  // unsigned: may overflow
     if (src.nBits() != size(0) * size(1) * size(2))
         return 0;
-    if (*std::max_element(dims, dims + 3) > INT16_MAX) {
+    constexpr int largest = INT16_MAX + 1;  // coordinates are counted from 0
+    if (*std::max_element(dims, dims + 3) > largest) {
         getTheLogInstance().errorf("KpMorphology::floodfill(), volume of %d x %d x %d is too large\n", dims[0], dims[1],
                                    dims[2]);
         return 0;

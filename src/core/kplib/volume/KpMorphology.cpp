@@ -26,13 +26,13 @@ unsigned long voxels(const KpVec3i& dims)
 
 void byVoxel(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long passes, const Operation& operation)
 {
-    morphologyByVoxel(src, dst, dims, operation.reach, operation.erodes);
-    if (passes == 1)
-        return;
-    KpBitfield next(dst.nBits(), KpBitfield::INIT_UNSET);
-    for (long pass = 1; pass < passes; ++pass) {
-        morphologyByVoxel(dst, next, dims, operation.reach, operation.erodes);
-        dst.swap(next);
+    KpBitfield other(passes > 1 ? dst.nBits() : 0, KpBitfield::INIT_UNSET);
+    const KpBitfield* from = &src;
+    for (long left = passes; left > 0;
+         --left) {  // alternates so that the last pass writes dst, which keeps its spare bits
+        KpBitfield& to = left % 2 != 0 ? dst : other;
+        morphologyByVoxel(*from, to, dims, operation.reach, operation.erodes);
+        from = &to;
     }
 }
 

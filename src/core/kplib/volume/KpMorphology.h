@@ -14,13 +14,13 @@
 ///
 /// One pass of dilation sets a voxel if it or a neighbour is set in `src`; one of erosion keeps a set voxel if all its
 /// neighbours are set. Outside the volume dilation sees background and erosion foreground, so neither acts from there.
-/// `dst`, another object than `src`, is brought to the size of the volume; bits beyond are of no meaning. Volumes of
-/// size 0 or less have no voxels.
+/// `dst`, another object than `src`, is brought to the size of the volume. If it has that size already, its spare bits,
+/// which a digest may contain, stay as they are. Volumes of size 0 or less have no voxels.
 ///
 /// `fast` works on words, many voxels at a time, otherwise each voxel looks at its neighbours; the results are the
-/// same. Work areas are a few slices. Where one that is needed can't be had, all bits of `dst` are set and nothing is
-/// told: rows of a multiple of 32 voxels do without for 6, 4 and 8 neighbours, rows of less than 32 for any. Other
-/// exhausted memory is a KpMemoryException. Any number of threads may work at once on fields of their own.
+/// same. Work areas are a few slices. If one that is needed cannot be allocated, all bits of `dst` are set and nothing is
+/// logged. Rows of a multiple of 32 voxels need none for 6, 4 and 8 neighbours, rows of less than 32 need none at all.
+/// Other exhausted memory is a KpMemoryException. Any number of threads may work at once on fields of their own.
 class KPLIB_API KpMorphology {
 public:
     /// `iterations` passes; none copies.
@@ -50,7 +50,7 @@ public:
     /// that is entered where `dst` is clear is filled as a rule from end to end, and visited voxels in it count again.
     /// `box`, if not null, becomes xmin, xmax, ymin, ymax, zmin, zmax of what was filled and of all seeds, also those
     /// outside or on a wrong value; without seeds it stays. If `src` isn't of the size that `dims` tell, or a size is
-    /// above 32767 (one error in the log), the result is 0 and nothing changes. Time grows with the number of runs.
+    /// above 32768 (one error in the log), the result is 0 and nothing changes. Time grows with the number of runs.
     static unsigned long floodfill(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpVec3i>& seeds, bool value,
                                    const int* dims, int* box);
 

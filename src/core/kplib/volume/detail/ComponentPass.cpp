@@ -1,5 +1,6 @@
 #include <kplib/volume/detail/ComponentTable.h>
 #include <kplib/volume/detail/FloatSums.h>
+#include <kplib/volume/detail/LabelPlainly.h>
 #include <kplib/volume/detail/RowBits.h>
 
 #include <limits>
@@ -39,9 +40,10 @@ public:
     {
         int offsets[13];
         KpConnectedComponents::mknbtableprev(neighbours, dims, nSteps_, offsets, deltas_);
-        // For a row: foreground, seeds (of labels: changes of value), ends of stretches; for two slices: changes of
-        // label.
-        bits_.resize(nWords_ * (3 + 2 * dims_[1]));
+        // For a row: foreground, seeds (of labels: changes of value), ends of stretches, each with a word of zeros
+        // behind. For this slice and the one before: changes of label, rows without a gap. Bit 0 of a row is never set,
+        // so the first word of the next row does as zeros behind; one word more is behind the last row.
+        bits_.resize(nWords_ * 3 + nRowWords() * dims_[1] * std::min(dims_[2], 2L) + 1);
         std::fill(bits_.begin(), bits_.end(), RowBits{0});
     }
 
@@ -60,13 +62,17 @@ private:
     RowBits* foreground() { return bits_.data(); }
     RowBits* seeds() { return bits_.data() + nWords_; }
     RowBits* ends() { return bits_.data() + 2 * nWords_; }
-    RowBits* labelChanges(long y, long z) { return bits_.data() + (3 + (z % 2) * dims_[1] + y) * nWords_; }
+    long nRowWords() const { return nWords_ - 1; }
+    RowBits* labelChanges(long y, long z)
+    {
+        return bits_.data() + 3 * nWords_ + ((z % 2) * dims_[1] + y) * nRowWords();
+    }
 
     bool labelRow()
     {
         const T* row = data_ + start_;
         changes_ = labelChanges(y_, z_);
-        std::fill_n(changes_, nWords_, RowBits{0});
+        std::fill_n(changes_, nRowWords(), RowBits{0});
         if (!fillBits(foreground(), dims_[0], [=, low = low_](long i) { return !(row[i] < low); })) {
             std::fill_n(labels_ + start_, dims_[0], L{0});
             return true;
@@ -122,7 +128,7 @@ private:
     {
         const T* row = data_ + start_;
         RowBits* const ends = this->ends();
-        const long n = nWords_ - 1;
+        const long n = nRowWords();
         if (isLabelMode_) {
             const RowBits* changes = seeds();
             fillBits(seeds(), dims_[0] - 1, [=](long i) { return row[i + 1] != row[i]; });
@@ -216,7 +222,7 @@ private:
         const Component* components = components_.data();
         for (int i = 0; i < steps.n; ++i) {
             const long other = at + steps.offsets[i];
-            ids[i] = components[labels_[other]].id;  // one step only, and that is meant
+            ids[i] = components[labels_[other]].id;  // intentional: one step only
             if constexpr (isLabelMode)
                 ids[i] = data_[other] == data_[at] ? ids[i] : 0;
             lowest = std::min(lowest, static_cast<unsigned>(ids[i]) - 1);
@@ -276,6 +282,8 @@ int KpConnectedComponents::do_label(T* data, L* labels, KpDArray<Component>& com
                                     int neighbours, int labelMode)
 {
     using namespace kplib::detail;
+    if (dims[0] < 32)  // the bits of a row pay from there on
+        return PlainLabelling<T, L>(data, labels, components, low, high, dims, neighbours, labelMode).run();
     startComponents(components);
     const long nVoxels = nVoxelsOf(dims);
     if (nVoxels > 0 && !RowLabelling<T, L>(data, labels, components, low, high, dims, neighbours, labelMode != 0).run())

@@ -6,8 +6,8 @@
 
 namespace kplib::detail {
 
-/// The definition of KpConnectedComponents::do_label(), voxel by voxel: what the fast pass must equal to the bit, and
-/// what benchmarks hold it against.
+/// The definition of KpConnectedComponents::do_label(), voxel by voxel: the fast pass equals it to the bit. Narrow
+/// images are labelled by it too.
 template <typename T, typename L>
 class PlainLabelling {
 public:
@@ -16,7 +16,12 @@ public:
         data_(data),
         labels_(labels), components_(components), low_(low), high_(high), dims_(dims), labelMode_(labelMode)
     {
-        KpConnectedComponents::mknbtableprev(neighbours, dims, n_, offsets_, deltas_);
+        int offsets[13];  // too small for large slices
+        KpConnectedComponents::mknbtableprev(neighbours, dims, n_, offsets, deltas_);
+        for (int i = 0; i < n_; ++i) {
+            const auto& [dx, dy, dz] = deltas_[i];
+            offsets_[i] = dx + static_cast<long>(dims[0]) * (dy + static_cast<long>(dims[1]) * dz);
+        }
     }
 
     int run()
@@ -72,7 +77,7 @@ private:
                 continue;
             const long other = i + offsets_[k];
             if ((labelMode_ == 0 || data_[other] == data_[i]) && labels_[other] != 0)
-                ids_[nIds_++] = components_[labels_[other]].id;  // one step only, and that is meant
+                ids_[nIds_++] = components_[labels_[other]].id;  // intentional: one step only
         }
     }
 
@@ -98,7 +103,7 @@ private:
     const int* dims_;
     int labelMode_;
     int n_ = 0;
-    int offsets_[13];
+    long offsets_[13];
     int deltas_[13][3];
     int nIds_ = 0;
     int ids_[13];
