@@ -300,6 +300,46 @@ TEST(Message, readOffsetAndBytesAreIndependent)
     EXPECT_EQ(number, 7);
 }
 
+TEST(Message, textsOfItsOwnAreWrittenAsTheyWere)
+{
+    TmMsg msg;
+    for (int i = 0; i < 100; ++i) {  // past several growths
+        msg.reset(0);
+        msg.reset(0, i);
+        msg << "hello world"
+            << ""
+            << "x";
+        KpDArray<char*> texts, copies;
+        for (int k = 0; k < 3; ++k) {
+            char* text = nullptr;
+            msg >> text;
+            texts.append(text);
+        }
+        msg << texts;
+        char* text = nullptr;
+        msg >> copies;
+        ASSERT_EQ(copies.size(), 3);
+        msg << copies[0];
+        msg >> text;
+        ASSERT_STREQ(text, "hello world");
+    }
+}
+
+TEST(Message, anInnerOneThatIsCutIsZeros)
+{
+    const LogCapture log(KpLogError);
+    TmMsg msg, inner;
+    inner << 0x01010101 << 0x01010101;
+    for (int i = 0; i < 4; ++i)
+        msg << 0x6677;
+    msg << 8U << 7;
+    msg >> inner;
+    EXPECT_EQ(hex(inner), "0000000000000000");
+    inner << 1;  // and can grow
+    EXPECT_EQ(inner.size(), 12U);
+    EXPECT_EQ(LogCapture::lines().size(), 1U);
+}
+
 TEST(Message, printShowsNothingOfIt)
 {
     const LogCapture log;

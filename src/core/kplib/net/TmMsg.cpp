@@ -1,6 +1,9 @@
 #include <kplib/net/TmMsg.h>
 
+#include <kplib/foundation/KpMemoryException.h>
 #include <kplib/log/KpLogFile.h>
+
+#include <cstdlib>
 
 TmMsg::TmMsg(const TmMsg& other) : readOffset_(other.readOffset_), buffer_(other.buffer_), marks_(other.marks_) {}
 
@@ -75,6 +78,17 @@ void TmMsg::writeGrowing(unsigned long count, const void* data)
     const long size = buffer_.size();
     buffer_.resize(count > static_cast<unsigned long>(LONG_MAX - size) ? LONG_MAX : size + static_cast<long>(count));
     std::memcpy(buffer_.data() + size, isOwn ? buffer_.data() + index : from, count);
+}
+
+/// Becomes `size` bytes of 0. Large storage is fresh pages, so that an announced size takes memory only where it is
+/// read.
+void TmMsg::becomeZeros(unsigned long size)
+{
+    auto* const zeros = static_cast<unsigned char*>(std::calloc(size, 1));  // kpfree() takes it
+    if (!zeros)
+        throw KpMemoryException(size);
+    reset(0, 0);
+    buffer_.setStorage(zeros, static_cast<long>(size), static_cast<long>(size));
 }
 
 /// Storage of somebody else is never reallocated: it is copied before it has to grow.

@@ -10,6 +10,7 @@
 #include <type_traits>
 
 class TmMsg;
+KPLIB_API TmMsg& operator>>(TmMsg& msg, TmMsg& inner);
 
 namespace kplib::detail {
 
@@ -121,6 +122,8 @@ private:
         void forget() { setStorage(nullptr, 0, 0); }
     };
 
+    friend TmMsg& operator>>(TmMsg& msg, TmMsg& inner);
+    void becomeZeros(unsigned long size);
     void writeGrowing(unsigned long count, const void* data);
     void own();
     void disown();
@@ -188,7 +191,7 @@ requires(std::is_arithmetic_v<T> && !kplib::detail::WireValue<T>) TmMsg& operato
                                                                                     const T& value) = delete;
 
 /// The length with the NUL in 32 bits (0 for null), and the bytes with the NUL. Reads as an address in the message
-/// itself, or null; valid until the message is written to.
+/// itself, or null; valid until the message is written to. A text of the message itself may be written to it, too.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const char* text);
 KPLIB_API TmMsg& operator>>(TmMsg& msg, char*& text);
 
@@ -234,6 +237,7 @@ KPLIB_API TmMsg& operator<<(TmMsg& msg, TmDataAccess const* const& object);
 KPLIB_API TmMsg& operator>>(TmMsg& msg, TmDataAccess*& object);
 
 /// Sixteen bytes that aren't looked at when they are read, and all bytes of `inner` as an array. How far `inner` was
-/// read doesn't travel: reading starts at its first byte.
+/// read doesn't travel: reading starts at its first byte. If the message holds fewer bytes than announced, that is one
+/// error line in the log, and `inner` has the announced size with bytes of 0.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const TmMsg& inner);
 KPLIB_API TmMsg& operator>>(TmMsg& msg, TmMsg& inner);

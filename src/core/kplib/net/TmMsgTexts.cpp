@@ -2,6 +2,9 @@
 
 #include <kplib/system/KpFilename.h>
 
+#include <algorithm>
+#include <functional>
+
 namespace {
 
 /// The text at the read offset: up to the first NUL or, without one, to the end of the message. Moves past the NUL.
@@ -16,6 +19,13 @@ std::string_view readToNul(TmMsg& msg)
     return {text, length};
 }
 
+/// Whether the text is one that was read from the message: it moves with the bytes if these have to grow.
+bool isInside(const TmMsg& msg, const char* text)
+{
+    const auto* const bytes = reinterpret_cast<const unsigned char*>(text);
+    return std::less_equal<>()(msg.dataPtr(), bytes) && std::less<>()(bytes, msg.dataPtr() + msg.size());
+}
+
 }  // namespace
 
 TmMsg& operator<<(TmMsg& msg, const char* text)
@@ -23,8 +33,10 @@ TmMsg& operator<<(TmMsg& msg, const char* text)
     if (!text)
         return msg << 0U;
     const unsigned long length = std::strlen(text) + 1;
+    const bool isOwn = isInside(msg, text);
+    const long at = isOwn ? reinterpret_cast<const unsigned char*>(text) - msg.dataPtr() : 0;
     msg << static_cast<unsigned int>(length);
-    msg.writeRawBytes(length, text);
+    msg.writeRawBytes(length, isOwn ? static_cast<const void*>(msg.dataPtr() + at) : text);
     return msg;
 }
 
@@ -84,9 +96,13 @@ TmMsg& operator>>(TmMsg& msg, KpFilename& name)
 
 TmMsg& operator<<(TmMsg& msg, const KpDArray<char*>& texts)
 {
-    msg << static_cast<int>(texts.size());
+    const bool anyOwn = std::any_of(texts.begin(), texts.end(), [&](const char* text) { return isInside(msg, text); });
+    TmMsg aside;  // if some of the texts would move while they are written
+    TmMsg& to = anyOwn ? aside : msg;
+    to << static_cast<int>(texts.size());
     for (const char* text : texts)
-        msg << text;
+        to << text;
+    msg.writeRawBytes(aside.size(), aside.dataPtr());
     return msg;
 }
 

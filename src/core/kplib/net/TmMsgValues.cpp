@@ -140,7 +140,10 @@ TmMsg& operator>>(TmMsg& msg, TmMsg& inner)
     unsigned int count = 0;
     msg >> count;
     inner = TmMsg();  // lets go of storage of somebody else; its own stays
-    inner.reset(count);
+    if (msg.holds(count))
+        inner.reset(count);
+    else
+        inner.becomeZeros(count);
     kplib::detail::readElements(msg, inner.dataPtr(), count);
     return msg;
 }
