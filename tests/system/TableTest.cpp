@@ -1,6 +1,8 @@
 #include <kplib/system/KpDataBase.h>
 #include <kplib/system/KpTable.h>
 
+#include <support/FailingMalloc.h>
+
 #include <gtest/gtest.h>
 
 #include <malloc.h>
@@ -218,6 +220,28 @@ TEST(KpTable, clonesAreEqualAndIndependent)
     EXPECT_NO_FATAL_FAILURE(pair.expectHolds(pair.database));
     std::memset(copy.table(400)->rowNext(nullptr) + 4, 0, 4);
     EXPECT_FALSE(copy.check());
+}
+
+TEST(KpTable, aRelationWithoutMemoryLeavesNothingThatAClonePutsRight)
+{
+    for (long n = 0;; ++n) {
+        KpDataBase database, copies;
+        KpTable& table = *database.table(database.createTable());
+        table.columnAdd(1, KpTable::Plain, 16, nullptr);
+        table.rowAdd();
+        try {
+            const kplib::test::FailingMalloc failing(n, 1);
+            table.columnAdd(2, KpTable::Relation, 0, &table);
+            break;
+        } catch (...) {
+        }
+        table.columnAdd(3, KpTable::Plain, 16, nullptr);
+        char* const row = table.rowNext(nullptr);
+        std::memset(row + table.columnOffset(3), 1, 16);
+        database.clone(copies);
+        const char* const copy = copies.table(table.tableId())->rowNext(nullptr);
+        EXPECT_EQ(std::memcmp(row, copy, static_cast<std::size_t>(table.rowSize())), 0) << n;
+    }
 }
 
 TEST(KpTable, movesOnlyWhenThereIsNoRoomLeft)

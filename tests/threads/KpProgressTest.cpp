@@ -9,6 +9,7 @@
 
 #include <memory>
 #include <string>
+#include <thread>
 #include <utility>
 
 namespace {
@@ -74,6 +75,28 @@ TEST(KpProgress, cancelEndsAllWorkForGood)
     EXPECT_EQ(gui.take(), "\"a\" m4 c11") << "and no more values";
     progress.startWorking(4, "a");
     EXPECT_TRUE(progress.isCanceled() && !progress.isWorking());
+}
+
+TEST(KpProgressThreads, aWorkerPollsWhatAnotherThreadCancels)
+{
+    KpProgressInterface progress;
+    progress.startWorking(10, "");
+    std::thread worker([&] {
+        while (!progress.isCanceled())
+            std::this_thread::yield();
+    });
+    progress.cancel();
+    worker.join();
+    EXPECT_FALSE(progress.isWorking());
+}
+
+TEST(KpProgress, aFailureWithoutATextHasAnEmptyOne)
+{
+    const kplib::test::LogCapture log(KpLogError);
+    KpProgressInterface progress;
+    progress.setFailed(KpResult(KpResult::Interrupted, "", ""), nullptr);
+    EXPECT_EQ(log.lines(), kplib::test::Lines{"E [] Operation failed: ''"});
+    EXPECT_STREQ(progress.result().text(), "");
 }
 
 TEST(KpProgressGui, isDetachedByWhicheverGoesFirst)

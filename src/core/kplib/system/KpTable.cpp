@@ -45,12 +45,18 @@ int KpTable::columnAdd(int columnId, ColumnType type, int size, KpTable* target)
     const int index = columnCount_;
     const int offset = index == 0 ? 0 : columnOffset_[index - 1] + columnSize_[index - 1];
     const int bytes = sizeOf(type, size);
-    if (type == Relation)
-        addPool(offset);
-    if (rowSize_ != 0 && rows_.capacity() > 0)
-        expand(static_cast<int>(capacityInRows()), bytes);
-    else
-        rowSize_ += bytes;
+    try {
+        if (type == Relation)
+            addPool(offset);
+        if (rowSize_ != 0 && rows_.capacity() > 0)
+            expand(static_cast<int>(capacityInRows()), bytes);
+        else
+            rowSize_ += bytes;
+    } catch (...) {
+        if (type == Relation)
+            dropPool(offset);  // without its column it would make clone() shift the bytes of another one
+        throw;
+    }
     columnType_[index] = type;
     columnSize_[index] = bytes;
     columnOffset_[index] = offset;

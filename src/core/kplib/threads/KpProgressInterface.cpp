@@ -95,6 +95,8 @@ bool KpProgressInterface::isCanceled() const
 
 void KpProgressInterface::setFailed(const KpResult& failure, const char* message)
 {
+    if (!message)
+        message = "";
     getTheLogInstance().errorf("Operation failed: '%s'", message);
     result_ = KpResult(failure.code(), message, "");
     terminate();

@@ -4,6 +4,7 @@
 #include <kplib/foundation/KpForward.h>
 #include <kplib/log/KpResult.h>
 
+#include <atomic>
 #include <cstddef>
 #include <string>
 #include <vector>
@@ -15,8 +16,11 @@
 /// Open scopes through a ProgressScope, so that they are closed whatever way the computation leaves.
 ///
 /// Cancelling closes all scopes; the computation polls isCanceled(). An object that was canceled stays so and ignores
-/// further work: new work takes a new object. One thread at a time: cancel() belongs to the thread of the work too, or
-/// its caller orders the two. Scales beyond an int are not guarded against.
+/// further work: new work takes a new object. Scales beyond an int are not guarded against.
+///
+/// Threads: any thread may poll isCanceled() and canCancel(). All else belongs to one thread at a time. cancel() also
+/// closes the scopes, which are not guarded: call it on the thread of the work, or while the work opens and closes none
+/// and makes no step.
 class KPLIB_API KpProgressInterface {
 public:
     KpProgressInterface() = default;
@@ -38,7 +42,7 @@ public:
     virtual void cancel();
     virtual bool isCanceled() const;
 
-    /// Ends the work with a failure of that code and text, which is also an error in the log.
+    /// Ends the work with a failure of that code and text, which is also an error in the log. Null is an empty text.
     virtual void setFailed(const KpResult& failure, const char* message);
 
     /// Detaches the user interface.
@@ -85,8 +89,8 @@ private:
 
     KpProgressGuiInterface* gui_ = nullptr;
     bool working_ = false;
-    bool cancelable_ = true;
-    bool canceled_ = false;
+    std::atomic<bool> cancelable_ = true;
+    std::atomic<bool> canceled_ = false;  // what cancel() of another thread writes and the computation polls
     int value_ = 0;
     KpResult result_;
     std::vector<Step> steps_;   // the open scopes, innermost last
