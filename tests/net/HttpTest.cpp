@@ -7,6 +7,7 @@
 #include <climits>
 #include <cstring>
 #include <gtest/gtest.h>
+#include <sys/syscall.h>
 #include <vector>
 
 using namespace kplib::test;
@@ -174,6 +175,29 @@ TEST(KpHttpGet, readsRangesFromNginx)
     EXPECT_EQ(get.bytesRead(), nginx.size);
     EXPECT_TRUE(get.request(nginx.url().c_str(), nginx.size, nginx.size + 1) && get.contentLength() > 0);
     EXPECT_EQ(get.status(), 416);
+}
+
+static void (*beforeConnecting)() = nullptr;
+
+extern "C" int connect(int socket, const sockaddr* address, socklen_t length)
+{
+    if (beforeConnecting)
+        beforeConnecting();
+    return static_cast<int>(syscall(SYS_connect, socket, address, length));
+}
+
+TEST(KpHttpGetThreads, cancelIsRememberedWhileConnecting)
+{
+    static KpHttpGet get;
+    ScriptedServer server([](int peer) { ScriptedServer::requestOf(peer); });
+    for (const std::string& url : {server.url(), std::string("http://127.0.0.1:1/")}) {
+        beforeConnecting = [] { std::thread([] { get.cancel(); }).join(); };
+        EXPECT_FALSE(get.request(url.c_str()));
+        EXPECT_EQ(get.state(), KpHttpGet::NotConnected);
+        beforeConnecting = nullptr;
+    }
+    EXPECT_TRUE(get.request(server.url().c_str()));
+    get.cancel();
 }
 
 TEST(KpHttpGetThreads, cancelEndsAReadThatWaitsAndMixesNoResponses)

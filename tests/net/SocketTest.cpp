@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <chrono>
 #include <csignal>
 #include <cstring>
 #include <gtest/gtest.h>
@@ -191,6 +192,19 @@ TEST(KpSocket, goesOnThroughSignalsAndStillTimesOut)
     EXPECT_EQ(line, "part");
     for (int socket : {first, second, pair.peer})
         KpSocket::close(socket);
+}
+
+TEST(KpSocket, waitsOneTimeoutForTheRest)
+{
+    Pair pair;
+    char received[20];
+    KpSocket::setTimeout(pair.mine, 300);
+    put(pair.peer, "part");
+    const auto start = std::chrono::steady_clock::now();
+    EXPECT_EQ(KpSocket::receive(pair.mine, received, 20, 0), -1);
+    const std::chrono::duration<double> waited = std::chrono::steady_clock::now() - start;
+    EXPECT_TRUE(waited.count() > 0.25 && waited.count() < 0.5) << waited.count();
+    KpSocket::close(pair.peer);
 }
 
 TEST(KpSocket, sendsAllToASlowPeerAndSurvivesOneThatHasGone)

@@ -69,7 +69,7 @@ bool KpHttpGet::setURL(const char* url)
     constexpr std::string_view scheme = "http://";
     const std::string_view text(url ? url : "");
     if (!text.starts_with(scheme)) {
-        cancel();
+        closeConnection(NotConnected);
         host_.clear();
         return false;
     }
@@ -80,7 +80,7 @@ bool KpHttpGet::setURL(const char* url)
     const int port = colon == std::string_view::npos ? 80 : std::atoi(rest.data() + colon + 1);
     path_ = slash == std::string_view::npos ? "/" : rest.substr(slash);
     if (port != port_ || host != host_) {
-        cancel();
+        closeConnection(NotConnected);
         port_ = port;
         host_ = host;
     }
@@ -95,36 +95,58 @@ bool KpHttpGet::request(const char* url)
 bool KpHttpGet::request(const char* url, unsigned long first, unsigned long last)
 {
     const KpScopedWatch timing(watch_, true);
+    {
+        const KpScopedLockT<KpMutex> lock(&closing_);
+        canceled_ = false;
+    }
     status_ = 0;
     bytesReadSoFar_ = contentLength_ = 0;
     if (!setURL(url))
         return false;
     if (state_ == RequestSent || state_ == ReadingBody)
-        cancel();  // the rest of that response would stand before this one
+        closeConnection(NotConnected);  // the rest of that response would stand before this one
     if (socket_ < 0 && !connect())
         return false;
     const std::string text = requestText(host_, path_, first, last);
     const SocketInUse socket(*this);
-    if (KpSocket::safeSend(socket, text.data(), static_cast<int>(text.size())) < 1) {
-        setError(nullptr);
-        return false;
+    const bool isSent = KpSocket::safeSend(socket, text.data(), static_cast<int>(text.size())) > 0;
+    const KpString cause = isSent ? KpString() : KpSocket::lastError();
+    {
+        const KpScopedLockT<KpMutex> lock(&closing_);
+        if (canceled_)
+            return false;
+        if (isSent) {
+            state_ = RequestSent;
+            return true;
+        }
     }
-    state_ = RequestSent;
-    return true;
+    setError(cause.c_str());
+    return false;
+}
+
+bool KpHttpGet::isCanceled()
+{
+    const KpScopedLockT<KpMutex> lock(&closing_);
+    return canceled_;
 }
 
 bool KpHttpGet::connect()
 {
     const int socket = KpSocket::connect(host_.c_str(), port_, 0, bufferSize, bufferSize);
     if (socket < 0) {
-        setError(nullptr);
+        const KpString cause = KpSocket::lastError();
+        if (!isCanceled())
+            setError(cause.c_str());
         return false;
     }
     KpSocket::blocking(socket);
     KpSocket::setNoDelay(socket, true);
     const KpScopedLockT<KpMutex> lock(&closing_);
-    socket_ = socket;
-    return true;
+    if (canceled_)
+        KpSocket::close(socket);
+    else
+        socket_ = socket;
+    return !canceled_;
 }
 
 bool KpHttpGet::readResponse()
@@ -209,7 +231,9 @@ long long KpHttpGet::contentLength()
 
 void KpHttpGet::cancel()
 {
-    closeConnection(NotConnected);
+    const KpScopedLockT<KpMutex> lock(&closing_);
+    canceled_ = true;
+    closeLocked(NotConnected);
 }
 
 void KpHttpGet::setError(const char* text)
@@ -222,6 +246,11 @@ void KpHttpGet::setError(const char* text)
 void KpHttpGet::closeConnection(State next)
 {
     const KpScopedLockT<KpMutex> lock(&closing_);
+    closeLocked(next);
+}
+
+void KpHttpGet::closeLocked(State next)
+{
     const int socket = socket_.exchange(-1);
     status_ = 0;
     state_ = next;

@@ -55,7 +55,9 @@ public:
     /// Bytes of the body delivered so far.
     long long bytesRead() const { return bytesReadSoFar_; }
 
-    /// Closes the connection. From another thread this ends a read() that waits, which then fails.
+    /// Closes the connection. From another thread this ends a read() that waits, which then fails, and a request(),
+    /// which then returns false in the state NotConnected. A request() that is connecting ends when the system has
+    /// connected.
     void cancel();
 
     /// Waits for the head of the response. False in any state but RequestSent, or on failure. read() calls this.
@@ -79,8 +81,10 @@ private:
     class SocketInUse;
 
     bool connect();
+    bool isCanceled();
     bool receiveHead(kplib::detail::HttpHead& head);
     void closeConnection(State next);
+    void closeLocked(State next);
 
     int port_ = 0;
     std::string host_, path_, errorText_;
@@ -90,5 +94,6 @@ private:
     std::atomic<int> socket_ = -1;
     KpWatch watch_{true};
     KpMutex closing_{false};    // held by who opens, closes or begins to use the connection
-    bool socketInUse_ = false;  // guarded by it
+    bool socketInUse_ = false;  // guarded by it, as the next
+    bool canceled_ = false;     // cancel() was called since request() began
 };

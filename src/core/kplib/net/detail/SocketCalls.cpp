@@ -47,10 +47,15 @@ long kplib::detail::receiveSome(int socket, char* buffer, long size, int flags)
 long kplib::detail::receiveAll(int socket, char* buffer, long size, long& received)
 {
     long n = 0;
+    int flags = 0;
     for (received = 0; received < size; received += n) {
-        n = receiveSome(socket, buffer + received, size - received, MSG_WAITALL);
+        n = receiveSome(socket, buffer + received, size - received, flags);
         if (n < 1)
             break;
+        // A call that waits for all bytes returns some of them at the end of a time-out; the next one would wait for
+        // the whole time-out again.
+        if (received == 0 && n < size && secondsOfTimeout(socket) == 0)
+            flags = MSG_WAITALL;
     }
     return n;
 }
