@@ -104,19 +104,23 @@ TEST_F(KpDirectoryTest, treesAreCopied)
 {
     const std::string copy = temp / "copy", nested = copy + "/tree";
     chmod((temp / "tree/sub").c_str(), 0700);
+    ASSERT_EQ(mkfifo((temp / "tree/pipe").c_str(), 0600), 0);
     ASSERT_EQ(KpDirectory::copy(tree.c_str(), copy.c_str()), 0);
+    EXPECT_EQ(LogCapture::lines(),
+              kplib::test::Lines{"E [] Can't copy " + tree + "/pipe: not a file, folder or link\n"});
     ASSERT_EQ(KpDirectory::copy(tree.c_str(), copy.c_str()), 0);
     EXPECT_EQ(KpDirectory::copy(tree.c_str(), copy.c_str()), -1);  // nested already
     for (const std::string& made : {copy, nested}) {
         std::set<std::string> expected = namesIn(tree);
-        expected.erase("to nowhere");
+        expected.erase("pipe");
         if (made == copy)
             expected.insert("tree");
         EXPECT_EQ(namesIn(made), expected);
         for (const char* const file : {"b", "new\nline", "sub/deep/f", "sub/g"})
             EXPECT_EQ(contentOf(made + "/" + file), file);
         EXPECT_EQ(KpFilename((made + "/sub").c_str()).getMode(), S_IFDIR | 0700);
-        EXPECT_FALSE(std::filesystem::exists(made + "/link/kept"));  // links to folders aren't entered
+        EXPECT_EQ(std::filesystem::read_symlink(made + "/link"), "../outside");
+        EXPECT_EQ(std::filesystem::read_symlink(made + "/to nowhere"), "nowhere");
     }
     ASSERT_EQ(KpDirectory::copy(tree.c_str(), (temp / "tree/sub/inside").c_str()), 0);
     EXPECT_EQ(namesIn(temp / "tree/sub/inside/sub"), (std::set<std::string>{"deep", "g"}));
@@ -131,6 +135,20 @@ TEST_F(KpDirectoryTest, treesAreRemovedButNotWhatLinksLeadTo)
     EXPECT_EQ(remove_dir((tree + "/").c_str()), 0);
     EXPECT_EQ(namesIn(temp.path), std::set<std::string>{"outside"});
     EXPECT_EQ(namesIn(temp / "outside"), std::set<std::string>{"kept"});
+    temp.folder("closed/within/sub");
+    const bool isRoot = geteuid() == 0;  // may read everything
+    for (const char* const folder : {".", "closed", "closed/within"}) {
+        EXPECT_TRUE(!isRoot || chown((temp / folder).c_str(), 65534, 65534) == 0);
+    }
+    chmod((temp / "closed/within").c_str(), 0);
+    EXPECT_TRUE(!isRoot || seteuid(65534) == 0);
+    EXPECT_EQ(remove_dir((temp / "closed").c_str()), -1);
+    EXPECT_TRUE(!isRoot || seteuid(0) == 0);
+    const std::string cannot = "E [] Can't delete " + temp / "closed";
+    EXPECT_EQ(LogCapture::lines(),
+              (kplib::test::Lines{cannot + "/within:\nPermission denied\n", cannot + ":\nDirectory not empty\n"}));
+    chmod((temp / "closed/within").c_str(), 0700);
+    LogCapture::lines().clear();
     EXPECT_NE(remove_dir("/proc/self/fdinfo"), 0);  // where nothing can be deleted
     EXPECT_EQ(LogCapture::lines().front(), "E [] Can't delete /proc/self/fdinfo/0:\nOperation not permitted\n");
 }
@@ -156,6 +174,11 @@ TEST_F(KpDirectoryTest, theCollectorGoesDownFromTheLastName)
     KpFilenameCollector::collect(found, nullptr, tree.c_str());
     KpFilenameCollector::collect(found, "*", (tree + "/b").c_str());
     EXPECT_TRUE(joined(found) == expected && LogCapture::lines().empty()) << joined(found);
+    for (const char* const loop : {"outside/1", "outside/2"})
+        std::filesystem::create_directory_symlink(".", temp / loop);
+    found.clear();
+    KpFilenameCollector::collect(found, "k*", (temp / "outside").c_str());
+    EXPECT_EQ(joined(found), temp / "outside/kept" + "|");
 }
 
 TEST_F(KpDirectoryTest, temporaryFoldersAreUniqueAndGo)

@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <climits>
 #include <cstring>
 #include <dirent.h>
 #include <memory>
@@ -61,6 +62,23 @@ unsigned long long since1601(std::time_t seconds)
     return static_cast<unsigned long long>(seconds) * unitsPerSecond + from1601To1970;
 }
 
+/// Copies a file, or a link as a link. To open a pipe or a device might block for ever.
+void copyEntry(const KpString& source, const KpString& target)
+{
+    struct stat status {};
+    if (lstat(source, &status) != 0)
+        return;
+    if (S_ISREG(status.st_mode)) {
+        KpFilename(source).copy(target);
+    } else if (S_ISLNK(status.st_mode)) {
+        char text[PATH_MAX] = "";
+        if (readlink(source, text, sizeof(text) - 1) > 0)
+            static_cast<void>(symlink(text, target) == 0);  // as with files, nothing says that one entry failed
+    } else {
+        getTheLogInstance().errorf("Can't copy %s: not a file, folder or link\n", source.c_str());
+    }
+}
+
 /// Copies what is in `source` to the folder `target`, which it makes; `newFolder`, the outermost such one, is no part
 /// of what is copied where it lies within the source.
 int copyTree(const char* source, const char* target, const struct stat* newFolder)
@@ -74,7 +92,7 @@ int copyTree(const char* source, const char* target, const struct stat* newFolde
     if (!newFolder && stat(target, &made) == 0)
         newFolder = &made;
     for (const KpString& name : files)
-        KpFilename(pathOf(source, name)).copy(pathOf(target, name));
+        copyEntry(pathOf(source, name), pathOf(target, name));
     for (const KpString& name : folders) {
         struct stat status {};
         const KpString path = pathOf(source, name);
@@ -95,7 +113,7 @@ bool isLink(const char* path)
     return lstat(bare, &status) == 0 && S_ISLNK(status.st_mode);
 }
 
-/// Tells of what can't be deleted, and passes the result on.
+/// Logs what cannot be deleted, and passes the result on.
 int deleted(int result, const char* path)
 {
     if (result != 0)
@@ -192,8 +210,13 @@ int remove_dir(const char* path)
         return -1;
     KpDArray<KpString> files, folders;
     KpDirectory::scanSortedByName(path, files, folders);
-    for (const KpString& name : folders)
-        remove_dir(pathOf(path, name));
+    for (const KpString& name : folders) {
+        const KpString folder = pathOf(path, name);
+        if (KpDirectory::isDirectory(folder))
+            remove_dir(folder);
+        else
+            deleted(-1, folder);
+    }
     for (const KpString& name : files) {
         const KpString file = pathOf(path, name);
         deleted(unlink(file), file);

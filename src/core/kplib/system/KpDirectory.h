@@ -36,12 +36,14 @@ public:
     /// Whether it can be opened as a folder, also by way of a link.
     static bool isDirectory(const char* path);
     /// Copies the folder `source` with all that is in it: as `target`, or into `target` where that is a folder. Links
-    /// are copied as the files they lead to. 0, also if single entries fail, or -1 if the new folder can't be made.
+    /// are copied as links. Pipes, sockets and devices are left out, with one error in the log each. 0, also if single
+    /// entries fail, or -1 if the new folder cannot be made.
     static int copy(const char* source, const char* target);
     /// Bytes that a user can write where the file `path` lies (its folder is asked); -1 if unknown.
     static long long freeSpace(const char* path);
 };
 
-/// Deletes a folder with all that is in it; links are deleted, not followed. 0, or -1 if something stays, which is a
-/// line in the log unless `path` is no folder.
+/// Deletes a folder with all that is in it; links are deleted, not followed. 0, or -1 if something stays: each entry
+/// that cannot be deleted and each folder within that cannot be read is an error in the log. A `path` that is no folder
+/// that can be read is -1 without one.
 KPLIB_API int remove_dir(const char* path);

@@ -2,9 +2,20 @@
 
 #include <kplib/system/KpDirectory.h>
 
-void KpFilenameCollector::collect(KpDArray<KpString>& out, const char* pattern, const char* dir)
+#include <set>
+#include <sys/stat.h>
+#include <utility>
+
+namespace {
+
+using Visited = std::set<std::pair<dev_t, ino_t>>;
+
+void collectInto(KpDArray<KpString>& out, const char* pattern, const char* dir, Visited& visited)
 {
-    if (!pattern || !dir || !KpDirectory::isDirectory(dir))
+    struct stat status {};
+    if (!KpDirectory::isDirectory(dir) || stat(dir, &status) != 0)
+        return;
+    if (!visited.emplace(status.st_dev, status.st_ino).second)
         return;
     const auto pathOf = [dir](const KpString& name) { return KpString(0, "%s/%s", dir, name.c_str()); };
     KpDArray<KpString> names;
@@ -16,6 +27,15 @@ void KpFilenameCollector::collect(KpDArray<KpString>& out, const char* pattern, 
     for (long i = names.size() - 1; i >= 0; --i) {
         const KpString path = pathOf(names[i]);
         if (KpDirectory::isDirectory(path))
-            collect(out, pattern, path);
+            collectInto(out, pattern, path, visited);
     }
+}
+
+}  // namespace
+
+void KpFilenameCollector::collect(KpDArray<KpString>& out, const char* pattern, const char* dir)
+{
+    Visited visited;
+    if (pattern && dir)
+        collectInto(out, pattern, dir, visited);
 }
