@@ -18,6 +18,9 @@ endif()
 add_compile_options(-fno-math-errno -ffp-contract=off -fno-semantic-interposition -Wall -Wextra -Wpedantic -Wshadow
                     -Wnon-virtual-dtor -Woverloaded-virtual -Wcast-align -Wundef -Werror)
 
+# What users may turn on for their own code, and so for the public headers.
+set(KPLIB_HEADER_WARNINGS -Wconversion -Wsign-conversion -Wdouble-promotion -Wold-style-cast)
+
 if(KPLIB_SANITIZE)
     set(CMAKE_CXX_FLAGS_RELEASE "-O1 -DNDEBUG")  # half the time to build, and another level for results to hold on
     add_compile_options(-fsanitize=${KPLIB_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer -g1)

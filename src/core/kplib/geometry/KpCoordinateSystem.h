@@ -39,7 +39,7 @@ public:
     /// Null makes it float. That no system is above itself is the caller's duty.
     void setParent(const KpAbstractCoordinateSystem* parent) { parent_ = parent; }
     void setOrigin(const KpVec3f& origin) { origin_ = origin; }
-    void setAxis(int axis, const KpVec3f& value) { axes_[axis] = value; }
+    void setAxis(int axis, const KpVec3f& value) { axes_[static_cast<std::size_t>(axis)] = value; }
     void setAxes(const std::array<KpVec3f, 3>& axes) { axes_ = axes; }
     /// Right-handed unit axes at right angles, with z along `zAxis` and x as near to `xHint` as can be; any x if
     /// `xHint` is zero. An `xHint` along `zAxis` leaves x and y zero.
@@ -56,7 +56,7 @@ public:
     void setSystemByPlane(const KpPlane& plane);
 
     const KpVec3f& origin() const { return origin_; }
-    const KpVec3f& axis(int axis) const { return axes_[axis]; }
+    const KpVec3f& axis(int axis) const { return axes_[static_cast<std::size_t>(axis)]; }
     /// No number is NaN, and the determinant of the axes is not 0.
     bool isValid() const;
     /// Each two axes have a dot product within 1e-6 of 0; their lengths count.

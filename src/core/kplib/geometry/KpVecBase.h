@@ -3,6 +3,7 @@
 #include <kplib/foundation/KpCheck.h>
 
 #include <concepts>
+#include <cstddef>
 #include <cstdint>
 #include <iosfwd>
 
@@ -167,7 +168,7 @@ protected:
 private:
     constexpr Vector& self() { return static_cast<Vector&>(*this); }
 
-    Component v_[Size];
+    Component v_[static_cast<std::size_t>(Size)];
 };
 
 /// A hash of the lowest 5 bits of each component, x in the highest place, as those of KpHash.h.
