@@ -9,6 +9,17 @@ set(CMAKE_POSITION_INDEPENDENT_CODE ON)
 # -O3 alone: results are to the bit, so nothing that lets the compiler reorder or contract floating-point work.
 set(CMAKE_CXX_FLAGS_RELEASE "-O3 -DNDEBUG")
 
+if(NOT CMAKE_SIZEOF_VOID_P EQUAL 8 OR NOT CMAKE_CXX_BYTE_ORDER STREQUAL "LITTLE_ENDIAN")
+    message(FATAL_ERROR "kplib needs a little-endian 64-bit target: messages and voxel files hold its words as they are")
+endif()
+
+# The family of processors. Sources for one family end in its name: <Name>X86.cpp instead of <Name>Any.cpp, or beside
+# <Name>.cpp with further rows for its kernels.
+set(KPLIB_PROCESSOR Any)
+if(CMAKE_SYSTEM_PROCESSOR MATCHES "^(x86_64|AMD64|amd64)$")
+    set(KPLIB_PROCESSOR X86)
+endif()
+
 find_program(KPLIB_CCACHE ccache)
 if(KPLIB_CCACHE)
     set(CMAKE_CXX_COMPILER_LAUNCHER ${KPLIB_CCACHE})

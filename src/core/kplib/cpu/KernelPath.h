@@ -1,20 +1,30 @@
 #pragma once
 
+#include <cstddef>
+#include <initializer_list>
 #include <span>
 
-/// Compiles a function for processors that have `features`; it may be called only where they were found.
-#define KPLIB_TARGET(features) [[gnu::target(features)]]
-#define KPLIB_TARGET_AVX2 KPLIB_TARGET("avx2")
-#if defined(__clang__)
-#define KPLIB_TARGET_AVX512 KPLIB_TARGET("avx512f,avx512bw,avx512dq,avx512vl,avx512vbmi")
-#else
-#define KPLIB_TARGET_AVX512 KPLIB_TARGET("avx512f,avx512bw,avx512dq,avx512vl,avx512vbmi,prefer-vector-width=512")
-// gcc 12 takes the placeholders in its own header of vector instructions for values that somebody forgot to set.
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
-#endif
-
-/// The body that target-marked functions share: inlined at every level, so that it is compiled for their processor.
+/// A body shared by functions that are compiled for different processors: inlined at every level, so that it is
+/// compiled for the processor of its caller.
 #define KPLIB_KERNEL_BODY [[gnu::always_inline]] inline
+
+// The only place in the sources that distinguishes processors; else CMake chooses between files.
+//
+// KPLIB_X86_ROWS declares `name()`, the rows that a kernel's table has on x86-64 only; the kernel's *X86.cpp defines
+// it. There are none on other processors. KPLIB_PROCESSOR_HEADER is the header of inline code that each family of
+// processors has its own of.
+#if defined(__x86_64__)
+#define KPLIB_PROCESSOR_HEADER(name) <kplib/cpu/name##X86.h>
+#define KPLIB_X86_ROWS(Function, name) std::span<const kplib::detail::KernelPath<Function>> name()
+#else
+#define KPLIB_PROCESSOR_HEADER(name) <kplib/cpu/name##Any.h>
+#define KPLIB_X86_ROWS(Function, name)                                                                                 \
+    inline std::span<const kplib::detail::KernelPath<Function>> name()                                                 \
+    {                                                                                                                  \
+        return {};                                                                                                     \
+    }                                                                                                                  \
+    static_assert(true)
+#endif
 
 namespace kplib::detail {
 
@@ -24,6 +34,26 @@ struct KernelPath {
     const char* name;  ///< for tests and benchmarks: "plain", "avx2" ...
     bool usable;       ///< on this processor
     Function* run;
+};
+
+/// All paths of a kernel: those that any processor has, of which the first is the plain loop, then those of this family
+/// of processors.
+template <typename Function>
+class KernelTable {
+public:
+    KernelTable(std::initializer_list<KernelPath<Function>> portable, std::span<const KernelPath<Function>> own)
+    {
+        for (const KernelPath<Function>& path : portable)
+            paths_[size_++] = path;
+        for (const KernelPath<Function>& path : own)
+            paths_[size_++] = path;
+    }
+
+    operator std::span<const KernelPath<Function>>() const { return {paths_, size_}; }
+
+private:
+    KernelPath<Function> paths_[6] = {};  // the longest table has four
+    std::size_t size_ = 0;
 };
 
 /// The last usable path of a table; the first, the plain loop, is usable anywhere.
@@ -38,9 +68,8 @@ Function* best(std::span<const KernelPath<Function>> paths)
     return chosen;
 }
 
-// Compile one body for one kind of processor each: `Loop* loop = ForAvx2::run<Body>` is Body::run, which has to be a
-// KPLIB_KERNEL_BODY of the signature Loop.
-
+/// Compiles one body for any processor: `Loop* loop = ForAny::run<Body>` is Body::run, which has to be a
+/// KPLIB_KERNEL_BODY of the signature Loop. Families of processors have the like in a header of their own.
 struct ForAny {
     template <typename Body, typename... Args>
     [[gnu::noinline]] static auto run(Args... args) -> decltype(Body::run(args...))
@@ -48,34 +77,5 @@ struct ForAny {
         return Body::run(args...);
     }
 };
-
-struct ForAvx2 {
-    template <typename Body, typename... Args>
-    KPLIB_TARGET_AVX2 [[gnu::noinline]] static auto run(Args... args) -> decltype(Body::run(args...))
-    {
-        return Body::run(args...);
-    }
-};
-
-struct ForAvx512 {
-    template <typename Body, typename... Args>
-    KPLIB_TARGET_AVX512 [[gnu::noinline]] static auto run(Args... args) -> decltype(Body::run(args...))
-    {
-        return Body::run(args...);
-    }
-};
-
-inline bool hasAvx2()
-{
-    return __builtin_cpu_supports("avx2");
-}
-
-/// What KPLIB_TARGET_AVX512 names: the instructions on bytes and their permutation too.
-inline bool hasAvx512()
-{
-    return __builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512bw") &&
-           __builtin_cpu_supports("avx512dq") && __builtin_cpu_supports("avx512vl") &&
-           __builtin_cpu_supports("avx512vbmi");
-}
 
 }  // namespace kplib::detail

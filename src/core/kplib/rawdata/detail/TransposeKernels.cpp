@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cstdint>
 #include <cstring>
-#include <emmintrin.h>
+#include <utility>
 
 namespace kplib::detail {
 namespace {
@@ -48,87 +48,38 @@ void transposePlain(const void* from, void* to, long rows, long columns)
     });
 }
 
-__m128i load(const void* place)
+/// A tile of as many rows as 16 bytes have elements, a row a vector. Each round pairs rows that are half the tile
+/// apart; after as many rounds as there are halvings a row holds what was a column. Written out, since compilers gather
+/// the elements of a column one by one.
+template <typename T, int... I>
+void transposeTile(const Tile<T>& tile, long row, long column, std::integer_sequence<int, I...>)
 {
-    return _mm_loadu_si128(static_cast<const __m128i*>(place));
-}
-
-void store(void* place, __m128i value)
-{
-    _mm_storeu_si128(static_cast<__m128i*>(place), value);
-}
-
-// By hand: compilers gather the elements of a column one by one. Each round pairs rows that are half the tile apart;
-// after as many rounds as there are halvings a row holds what was a column.
-
-/// 8 x 8 elements of 2 bytes, a row a register.
-void transposeTile(const Tile<std::uint16_t>& tile, long i, long j)
-{
-    __m128i rows[8], next[8];
-    for (int k = 0; k < 8; ++k)
-        rows[k] = load(tile.source(i + k, j));
-    for (int round = 0; round < 3; ++round) {
-        for (int k = 0; k < 4; ++k) {
-            next[2 * k] = _mm_unpacklo_epi16(rows[k], rows[k + 4]);
-            next[2 * k + 1] = _mm_unpackhi_epi16(rows[k], rows[k + 4]);
+    typedef T Row __attribute__((vector_size(16)));
+    constexpr int side = sizeof...(I);
+    Row rows[side], next[side];
+    for (int k = 0; k < side; ++k)
+        std::memcpy(&rows[k], tile.source(row + k, column), sizeof(Row));
+    for (int round = 1; round < side; round *= 2) {
+        for (int k = 0; k < side / 2; ++k) {
+            next[2 * k] = __builtin_shufflevector(rows[k], rows[k + side / 2], (I / 2 + I % 2 * side)...);
+            next[2 * k + 1] =
+                __builtin_shufflevector(rows[k], rows[k + side / 2], (side / 2 + I / 2 + I % 2 * side)...);
         }
-        std::copy_n(next, 8, rows);
+        std::copy_n(next, side, rows);
     }
-    for (int k = 0; k < 8; ++k)
-        store(tile.target(i, j + k), rows[k]);
-}
-
-/// 16 x 16 bytes.
-void transposeTile(const Tile<std::uint8_t>& tile, long i, long j)
-{
-    __m128i rows[16], next[16];
-    for (int k = 0; k < 16; ++k)
-        rows[k] = load(tile.source(i + k, j));
-    for (int round = 0; round < 4; ++round) {
-        for (int k = 0; k < 8; ++k) {
-            next[2 * k] = _mm_unpacklo_epi8(rows[k], rows[k + 8]);
-            next[2 * k + 1] = _mm_unpackhi_epi8(rows[k], rows[k + 8]);
-        }
-        std::copy_n(next, 16, rows);
-    }
-    for (int k = 0; k < 16; ++k)
-        store(tile.target(i, j + k), rows[k]);
-}
-
-/// 4 x 4 elements of 4 bytes.
-void transposeTile(const Tile<std::uint32_t>& tile, long i, long j)
-{
-    __m128i rows[4], next[4];
-    for (int k = 0; k < 4; ++k)
-        rows[k] = load(tile.source(i + k, j));
-    for (int round = 0; round < 2; ++round) {
-        for (int k = 0; k < 2; ++k) {
-            next[2 * k] = _mm_unpacklo_epi32(rows[k], rows[k + 2]);
-            next[2 * k + 1] = _mm_unpackhi_epi32(rows[k], rows[k + 2]);
-        }
-        std::copy_n(next, 4, rows);
-    }
-    for (int k = 0; k < 4; ++k)
-        store(tile.target(i, j + k), rows[k]);
-}
-
-/// 2 x 2 elements of 8 bytes.
-void transposeTile(const Tile<std::uint64_t>& tile, long i, long j)
-{
-    const __m128i first = load(tile.source(i, j)), second = load(tile.source(i + 1, j));
-    store(tile.target(i, j), _mm_unpacklo_epi64(first, second));
-    store(tile.target(i, j + 1), _mm_unpackhi_epi64(first, second));
+    for (int k = 0; k < side; ++k)
+        std::memcpy(tile.target(row, column + k), &rows[k], sizeof(Row));
 }
 
 template <typename T>
-void transposeSse2(const void* from, void* to, long rows, long columns)
+void transposeTiles(const void* from, void* to, long rows, long columns)
 {
-    constexpr long side = 16 / sizeof(T);
+    constexpr int side = 16 / sizeof(T);
     blockwise<T>(from, to, rows, columns, [](const Tile<T>& tile, long i, long iEnd, long j, long jEnd) {
         const long iWhole = i + (iEnd - i) / side * side, jWhole = j + (jEnd - j) / side * side;
         for (long jj = j; jj < jWhole; jj += side) {
             for (long ii = i; ii < iWhole; ii += side)
-                transposeTile(tile, ii, jj);
+                transposeTile(tile, ii, jj, std::make_integer_sequence<int, side>());
         }
         tile.transposePlain(iWhole, iEnd, j, jEnd);
         tile.transposePlain(i, iWhole, jWhole, jEnd);
@@ -138,7 +89,8 @@ void transposeSse2(const void* from, void* to, long rows, long columns)
 template <typename T>
 std::span<const KernelPath<Transpose>> pathsOf()
 {
-    static const KernelPath<Transpose> paths[] = {{"plain", true, transposePlain<T>}, {"sse2", true, transposeSse2<T>}};
+    static const KernelPath<Transpose> paths[] = {{"plain", true, transposePlain<T>},
+                                                  {"tiles", true, transposeTiles<T>}};
     return paths;
 }
 

@@ -1,187 +1,14 @@
 #include <kplib/volume/detail/MorphologyKernels.h>
-#include <kplib/volume/detail/MorphologyLayout.h>
-#include <kplib/volume/detail/MorphologyLoops.h>
 
-#include <algorithm>
-#include <cstring>
-#include <memory>
-
-// Slices pass, one after the other, through a row of stages, one a pass of the operation. A slice is one string of
-// bits that starts at a word: steps along y are shifts of the string, steps along x are shifts by one with the ends of
-// the rows masked. So rows need no alignment, and all loops are long. Erosion is the dilation of what is not set.
-//
-// Any of the neighbourhoods is made of two figures in the plane: what a voxel reaches in its own slice (near), and what
-// it reaches in the slices before and behind (far). A stage keeps what the slices that have come so far contribute.
+#include <kplib/volume/detail/MorphologyPasses.h>
 
 namespace kplib::detail {
-namespace {
 
 using namespace morphology;
-using Stage = MorphologyStage;
-using Layout = MorphologyLayout;
+
+namespace {
+
 constexpr unsigned long cacheBytes = 768UL << 10;  // most of the second cache
-
-struct Passes {
-    const MorphologyJob& job;
-    const Layout layout{job};
-    Word* const area;
-    const Word flip = job.erodes ? ~Word{0} : 0;
-
-    KPLIB_KERNEL_BODY Word* slice(long i) const { return area + layout.slice(i); }
-    KPLIB_KERNEL_BODY Word* input(long stage) const { return slice(stage % 2); }
-    KPLIB_KERNEL_BODY Word* between() const { return slice(2); }
-    KPLIB_KERNEL_BODY Word* near(const Stage& stage) const { return slice(stage.slices); }
-    KPLIB_KERNEL_BODY Word* far(const Stage& stage, long z) const
-    {
-        return slice(stage.slices + 1 + z % (2 * stage.step));
-    }
-    KPLIB_KERNEL_BODY Word* notFirst(const Stage& stage) const { return area + layout.masks + stage.masks; }
-    KPLIB_KERNEL_BODY Word* notLast(const Stage& stage) const { return notFirst(stage) + layout.maskWords; }
-
-    KPLIB_KERNEL_BODY void clear() const
-    {
-        std::memset(area, 0, static_cast<std::size_t>(layout.masks) * sizeof(Word));
-        for (long i = 0; i < layout.count; ++i)
-            makeMasks(layout.stages[i]);
-    }
-    /// Of the voxels with one `step` before, or behind, them in their row.
-    KPLIB_KERNEL_BODY void makeMasks(const Stage& stage) const
-    {
-        const auto bits = static_cast<unsigned long>(layout.maskWords * wordBits);
-        std::fill_n(notFirst(stage), 2 * layout.maskWords, ~Word{0});
-        const auto nx = static_cast<unsigned long>(job.nx), ends = std::min(static_cast<unsigned long>(stage.step), nx);
-        for (unsigned long first = 0; first < bits; first += nx)
-            for (unsigned long i = 0; i < ends; ++i) {
-                unset(notFirst(stage), first + i, bits);
-                unset(notLast(stage), first + nx - 1 - i, bits);
-            }
-    }
-    KPLIB_KERNEL_BODY static void unset(Word* mask, unsigned long i, unsigned long bits)
-    {
-        if (i < bits)
-            mask[i / 64] &= ~(Word{1} << i % 64);
-    }
-
-    /// Zeros behind the last voxel.
-    KPLIB_KERNEL_BODY void clearTail(Word* bits) const
-    {
-        const long last = layout.sliceBits / wordBits;
-        if (last < layout.words)
-            bits[last] &= (Word{1} << layout.sliceBits % wordBits) - 1;
-        for (long i = last + 1; i < layout.words; ++i)
-            bits[i] = 0;
-    }
-
-    /// Slice z, and what it reaches along x.
-    KPLIB_KERNEL_BODY void load(long z, Word* to) const
-    {
-        const long from = z * layout.sliceBits, used = (layout.sliceBits + wordBits - 1) / wordBits;
-        long whole = std::max(used - 2, 0L) & -block;  // whose source lies in the field
-        if (from == 0)
-            whole = 0;
-        const long base = from % 32 == 0 ? from - 32 : from / 32 * 32;
-        const auto* const words = reinterpret_cast<const LooseWord*>(job.src + base / 32);
-        for (long i = 0; i < whole; i += layout.maskWords)
-            realignAlongX(to + i, between() + i, words + i, notFirst(layout.stages[0]), notLast(layout.stages[0]),
-                          std::min(whole - i, layout.maskWords), from - base, flip);
-        for (long i = whole; i < used; ++i)
-            to[i] = bitsAt(job.src, from + i * wordBits, std::min(layout.sliceBits - i * wordBits, wordBits)) ^ flip;
-        clearTail(to);
-        widen(layout.stages[0], to, whole);
-    }
-
-    /// What a slice reaches along x, from a word on.
-    KPLIB_KERNEL_BODY void widen(const Stage& stage, const Word* bits, long start) const
-    {
-        while (start < layout.words) {
-            const long k = start % layout.maskWords, n = std::min(layout.words - start, layout.maskWords - k);
-            alongX(between() + start, bits + start, notFirst(stage) + k, notLast(stage) + k, n, stage.step);
-            start += n;
-        }
-    }
-
-    /// Whether slices can be written in place.
-    KPLIB_KERNEL_BODY bool isInBlocks() const { return layout.sliceBits == layout.words * wordBits; }
-    KPLIB_KERNEL_BODY Word* target(long z) const
-    {
-        return reinterpret_cast<Word*>(job.dst + z * layout.sliceBits / 32);
-    }
-    /// Slices share words with the ones beside them.
-    KPLIB_KERNEL_BODY void store(long z, const Word* bits) const
-    {
-        const long to = z * layout.sliceBits, by = to % 32, base = to - by, end = layout.sliceBits + by;
-        putBits(job.dst, to, std::min(wordBits - by, layout.sliceBits), bits[0] ^ flip);
-        const long whole = end / wordBits;
-        unalign(reinterpret_cast<LooseWord*>(job.dst + base / 32), bits, whole, by, flip);
-        if (whole > 0)
-            putBits(job.dst, base + whole * wordBits, end % wordBits,
-                    shiftedUp(bits[whole - 1], bits[whole], by) ^ flip);
-    }
-
-    /// Slice z comes to a stage; the one `step` before it is complete then, and goes out.
-    template <MorphologyReach reach>
-    KPLIB_KERNEL_BODY void step(const Stage& stage, const Word* in, long z, Word* out, Word flipOut) const
-    {
-        const long rowBits = stage.step * job.nx;
-        Word *const oldest = far(stage, z), *const middle = far(stage, z + stage.step);
-        if (rowBits % wordBits == 0)
-            Combine<reach, true>::run(out, near(stage), oldest, middle, in, between(), layout.words, rowBits, flipOut);
-        else
-            Combine<reach, false>::run(out, near(stage), oldest, middle, in, between(), layout.words, rowBits, flipOut);
-    }
-};
-
-/// A slice is read before any that is written at the time, so dst may be src.
-template <MorphologyReach reach>
-struct AllPasses {
-    KPLIB_KERNEL_BODY static void run(const MorphologyJob* job, Word* area)
-    {
-        const Passes passes{.job = *job, .area = area};
-        passes.clear();
-        for (long t = 0; t < job->nz + passes.layout.passes; ++t) {
-            if (t < job->nz)
-                passes.load(t, passes.input(0));
-            for (long i = 0; i < passes.layout.count; ++i)
-                toStage(passes, i, t - passes.layout.stages[i].delay);
-        }
-    }
-
-    KPLIB_KERNEL_BODY static void toStage(const Passes& passes, long i, long z)
-    {
-        const Stage& stage = passes.layout.stages[i];
-        const long nz = passes.job.nz, done = z - stage.step;
-        if (z < 0 || done >= nz)
-            return;
-        Word* const in = passes.input(i);
-        if (z >= nz)
-            std::fill_n(in, passes.layout.words, 0);
-        if (i > 0 || z >= nz)
-            passes.widen(stage, in, 0);
-        const bool isResult = i == passes.layout.count - 1 && done >= 0;
-        if (isResult && passes.isInBlocks()) {
-            passes.template step<reach>(stage, in, z, passes.target(done), passes.flip);
-            return;
-        }
-        Word* const out = passes.input(i + 1);
-        passes.template step<reach>(stage, in, z, out, 0);
-        passes.clearTail(out);
-        if (isResult)
-            passes.store(done, out);
-    }
-};
-
-template <typename Path>
-void runPasses(const MorphologyJob& job, void* area)
-{
-    using Run = void(const MorphologyJob*, Word*);
-    static constexpr Run* runs[] = {Path::template run<AllPasses<MorphologyReach::Faces>>,
-                                    Path::template run<AllPasses<MorphologyReach::Edges>>,
-                                    Path::template run<AllPasses<MorphologyReach::Corners>>};
-    constexpr std::size_t alignment = block * sizeof(Word);
-    std::size_t space = morphologyAreaBytes(job);
-    runs[static_cast<int>(job.reach) - 1](&job,
-                                          static_cast<Word*>(std::align(alignment, space - alignment, area, space)));
-}
 
 }  // namespace
 
@@ -205,9 +32,7 @@ long morphologyPassesAtOnce(const MorphologyJob& job)
 
 std::span<const KernelPath<MorphologyLoop>> morphologyPaths()
 {
-    static const KernelPath<MorphologyLoop> paths[] = {{"plain", true, runPasses<ForAny>},
-                                                       {"avx2", hasAvx2(), runPasses<ForAvx2>},
-                                                       {"avx512", hasAvx512(), runPasses<ForAvx512>}};
+    static const KernelTable<MorphologyLoop> paths({{"plain", true, runPasses<ForAny>}}, morphologyX86());
     return paths;
 }
 

@@ -1,13 +1,11 @@
 #pragma once
 
-#include <kplib/cpu/FlagBits.h>
+#include <kplib/cpu/KernelPath.h>
+#include KPLIB_PROCESSOR_HEADER(FlagMask)
 
 #include <algorithm>
 #include <bit>
 #include <cstdint>
-#if defined(__SSE2__)
-#include <emmintrin.h>
-#endif
 
 namespace kplib::detail {
 
@@ -17,21 +15,6 @@ using RowBits = std::uint64_t;
 inline long wordsOf(long n)
 {
     return (n + 63) / 64 + 1;
-}
-
-inline RowBits bitsOf64Flags(const unsigned char* flags)
-{
-#if defined(__SSE2__)
-    RowBits bits = 0;
-    for (int i = 0; i < 4; ++i) {
-        const __m128i sixteen = _mm_loadu_si128(reinterpret_cast<const __m128i*>(flags) + i);
-        const int mask = _mm_movemask_epi8(_mm_cmpgt_epi8(sixteen, _mm_setzero_si128()));
-        bits |= static_cast<RowBits>(static_cast<unsigned>(mask)) << 16 * i;
-    }
-    return bits;
-#else
-    return bitsOfFlags(flags, 64);
-#endif
 }
 
 /// 64 of `isSet(i)` from `start` on: a loop of fixed length, so that it becomes vector instructions.

@@ -1,5 +1,6 @@
 #include <kplib/geometry/numerics/detail/LinearSolver.h>
 
+#include <kplib/geometry/numerics/detail/EliminateLoop.h>
 #include <kplib/log/KpLogFile.h>
 
 #include <algorithm>
@@ -58,30 +59,11 @@ void subtractProducts(RowAt rowAt, int count, const float* x, int begin, int end
     }
 }
 
-struct Eliminate {
-    KPLIB_KERNEL_BODY static void run(float* const* lr, int column, int n)
-    {
-        const float* const pivotRow = lr[column];
-        const float reciprocal = 1 / pivotRow[column];
-        for (int i = column + 1; i < n; ++i) {
-            float* __restrict const row = lr[i];
-            const float factor = row[column] * reciprocal;
-            row[column] = factor;
-            for (int k = column + 1; k < n; ++k)
-                row[k] -= factor * pivotRow[k];
-        }
-    }
-};
-
 }  // namespace
 
 std::span<const KernelPath<EliminateLoop>> eliminatePaths()
 {
-    static const KernelPath<EliminateLoop> paths[] = {
-        {"plain", true, ForAny::run<Eliminate>},
-        {"avx2", hasAvx2(), ForAvx2::run<Eliminate>},
-        {"avx512", hasAvx512(), ForAvx512::run<Eliminate>},
-    };
+    static const KernelTable<EliminateLoop> paths({{"plain", true, ForAny::run<Eliminate>}}, eliminateX86());
     return paths;
 }
 
