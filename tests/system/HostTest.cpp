@@ -47,8 +47,10 @@ TEST(KpCPUInfo, dividesTheTotalsThatDoNotContradictEachOther)
 TEST(KpCPUInfo, agreesWithTheKernel)
 {
     const KpCPUInfo& info = KpCPUInfo::instance();
-    EXPECT_EQ(info.vendor(), told("vendor_id"));
-    EXPECT_EQ(std::to_string(info.getMaxCPUIDFunc()), told("cpuid level"));
+    if (info.hasCPUID()) {
+        EXPECT_EQ(info.vendor(), told("vendor_id"));
+        EXPECT_EQ(std::to_string(info.getMaxCPUIDFunc()), told("cpuid level"));
+    }
     if (info.cpuInfoSucceed() && !told("cpu cores").empty()) {
         EXPECT_EQ(info.getCoreCount(), std::stoi(told("cpu cores")));
         EXPECT_EQ(info.getLPUCount() * info.getCoreCount(), std::stoi(told("siblings")));
@@ -61,7 +63,7 @@ TEST(KpCPUInfo, agreesWithTheKernel)
     unsigned expected = 0;
     for (const auto& [bit, flag] : features)
         expected |= flags.count(flag) ? bit : 0;
-    EXPECT_EQ(info.detectCPUFeatures(), expected);
+    EXPECT_EQ(info.detectCPUFeatures(), info.hasCPUID() ? expected : 0);
 }
 
 TEST(KpSysInfo, knowsTheMemory)

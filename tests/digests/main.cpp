@@ -1,0 +1,8 @@
+#include "Digest.h"
+
+int main()
+{
+    kplib::test::digestsOfKernels();
+    kplib::test::digestsOfGeometry();
+    kplib::test::digestsOfNumerics();
+}
