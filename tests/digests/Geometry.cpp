@@ -24,14 +24,15 @@ Object some(Random& random)
 
 KpRotation turned(Random& random)
 {
-    return KpRotation(some<KpVec3f>(random), number(random));
+    const auto axis = some<KpVec3f>(random);
+    return KpRotation(axis, number(random));
 }
 
 KpViewVolume view(Random& random)
 {
     KpViewVolume volume;
     if (random() % 2)
-        volume.perspective(0.9F + number(random) / 4, 1.2F, 1.5F, 6 + number(random));
+        volume.perspective(0.9F + number(random) / 4, 1.2F, 1.5F, 6);
     else
         volume.ortho(-1, 2, -1.5F, 1, 0.5F, 5 + number(random));
     volume.translateCamera(some<KpVec3f>(random));
@@ -56,7 +57,9 @@ void matrices()
         const auto u = some<KpVec3f>(random), v = some<KpVec3f>(random);
         KpVec3f unit = u;
         KpVec2f flat(u.x(), v.y());
-        const auto big = KpVec3l(random() >> 1, random() >> 2, random() >> 3);
+        KpVec3l big(0, 0, 0);
+        for (std::int64_t& component : big)
+            component = static_cast<std::int64_t>(random() >> 2);
         digest.take(unit.normalize(), unit, u.dot(v), u.cross(v), u + 2.0F * (u - v) / v.x(), flat.normalize(), flat);
         digest.take(big.length(), KpVec3i(30000, static_cast<int>(random() % 30000), 5).length(),
                     static_cast<float>(KpVec3d(u).length()));
@@ -95,7 +98,8 @@ void matrices()
         KpRotation scaled = p;
         scaled.scaleAngle(0.3F);
         p.getValue(axis, angle);
-        digest.take(p, p * q, p.inverse(), p.toMat3f(), KpRotation(p.toMat3f()), axis, angle, p * v, scaled);
+        digest.take(MathUtils::angleBetweenVectors(v, w, {0.3F, -1, 0.2F}), p, p * q, p.inverse(), p.toMat3f(),
+                    KpRotation(p.toMat3f()), axis, angle, p * v, scaled);
         digest.take(KpRotation(v, w), KpRotation(v, w, w, v), KpRotation::slerp(p, q, 0.3F));
     });
 }
@@ -146,7 +150,8 @@ void space()
     });
     repeated("cutBoxes", [](Digest& digest, Random& random) {
         const KpBox3f box(-1, 1, -0.5F, 1.5F, -1, 2), other(0, 1, 0, 1, 0, 1);
-        const KpPlane plane(some<KpVec3f>(random), some<KpVec3f>(random));
+        const auto normal = some<KpVec3f>(random), point = some<KpVec3f>(random);
+        const KpPlane plane(normal, point);
         KpVec3f vertices[6], seconds[6];
         const int n = KpCutBoxPlane::cutPlane(box, other, plane, vertices, seconds);
         const auto count = static_cast<std::size_t>(n);
@@ -154,14 +159,15 @@ void space()
         digest.take(KpCutBoxPlane::cutPlane(box, plane));
     });
     repeated("coordinateSystems", [](Digest& digest, Random& random) {
-        KpCoordinateSystem system(some<KpVec3f>(random),
-                                  {some<KpVec3f>(random), some<KpVec3f>(random), some<KpVec3f>(random)});
+        const auto a = some<KpVec3f>(random), b = some<KpVec3f>(random), c = some<KpVec3f>(random);
+        const auto origin = some<KpVec3f>(random);
+        KpCoordinateSystem system(origin, {a, b, c});
         digest.take(system.asTransformation(), system.isValid(), system.isRightHanded());
         system.makePerpendicular(static_cast<int>(random() % 3), true);
         digest.take(system.asTransformation());
-        system.setAxes(some<KpVec3f>(random), some<KpVec3f>(random));
+        system.setAxes(a, b);
         digest.take(system.asTransformation(), system.orientationAsQuaternion());
-        system.setSystemByPlane(KpPlane(some<KpVec3f>(random), some<KpVec3f>(random)));
+        system.setSystemByPlane(KpPlane(b, c));
         digest.take(system.asTransformation());
     });
 }

@@ -276,7 +276,7 @@ void digestsOfKernels()
     volumeTables();
     table("crc", crcPaths(), [](auto* run, Digest& digest, Random& random) {
         for (const long n : lengths)
-            digest.take(run(random(), noise<unsigned char>(random, n).data(), n));
+            digest.take(run(0x12345678, noise<unsigned char>(random, n).data(), n));
     });
     table("hex", hexPaths(), [](auto* run, Digest& digest, Random& random) {
         for (const char a : {'a', 'A'}) {

@@ -35,8 +35,10 @@ void ode(Digest& digest, Random& random)
         curve.setHSampling(0.07F);
         curve.setHMinMax(1e-4F, 0.5F);
         curve.init(points<KpVec3f>(random, 1)[0], 0.1F);
-        for (int i = 0; i < 200; ++i)
-            digest.take(curve.next(point, derivative), point, derivative, curve.h());
+        for (int i = 0; i < 200; ++i) {
+            const int code = curve.next(point, derivative);
+            digest.take(code, point, derivative, curve.h());
+        }
     }
 }
 
@@ -63,7 +65,8 @@ void fit(Digest& digest, Random& random)
         KpFitPlane plane;
         for (const KpVec3f& point : points<KpVec3f>(random, 4 + i))
             plane.points().append(point);
-        digest.take(plane.orthogonalPlaneFit(), plane.createPlane(), plane.centroid(), plane.normal());
+        const float error = plane.orthogonalPlaneFit();
+        digest.take(error, plane.createPlane(), plane.centroid(), plane.normal());
     }
 }
 

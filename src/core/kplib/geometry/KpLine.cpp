@@ -73,7 +73,8 @@ bool KpLine::intersect(float angle, const KpBox3f& box) const
 {
     if (box.isEmpty())
         return false;
-    const float radius = angle < 0 ? -angle : greatestDistance(position_, box) * std::tan(angle);
+    const auto slope = static_cast<float>(std::tan(static_cast<double>(angle)));
+    const float radius = angle < 0 ? -angle : greatestDistance(position_, box) * slope;
     KpVec3f enter, exit;
     return intersect(grown(box, radius), enter, exit, 1e-6F);
 }

@@ -36,7 +36,7 @@ KpRotation KpSphereSheetProjector::getRotation(const KpVec3f& from, const KpVec3
         return KpRotation::identity();
     KpVec3f axis = (from - planePoint_).cross(to - planePoint_);
     axis.normalize();
-    return KpRotation(axis, 2 * std::asin(halfChord));
+    return KpRotation(axis, 2 * static_cast<float>(std::asin(static_cast<double>(halfChord))));
 }
 
 void KpSphereSheetProjector::setupPlane(const KpLine* line)

@@ -19,7 +19,9 @@ float MathUtils::angleBetweenVectors(const KpVec3f& a, const KpVec3f& b, const K
 {
     const KpVec3f from = normalized(a);
     const KpVec3f to = normalized(b);
-    float angle = std::atan2(from.cross(to).dot(normalized(reference)), from.dot(to));
+    // In double: the C library's functions of float differ in their last bit between processors.
+    const double sine = from.cross(to).dot(normalized(reference)), cosine = from.dot(to);
+    auto angle = static_cast<float>(std::atan2(sine, cosine));
     if (angle < 0)
         angle += twoPi;
     return angle == twoPi ? 0 : angle;
