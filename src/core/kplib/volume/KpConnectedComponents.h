@@ -14,8 +14,8 @@
 /// numbers.
 ///
 /// Everything runs on the calling thread; threads may label different images at once. The table grows as the regions
-/// do. Scratch is two bits for each voxel of a slice, with rows rounded up to 64 voxels; rows below 32 voxels need
-/// none. Exhausted memory is a KpMemoryException.
+/// do. Scratch is two bits for each voxel of a slice, one if there is a single slice, with rows rounded up to 8, 16, 32
+/// or a multiple of 64 voxels; rows below 8 voxels need none. Exhausted memory is a KpMemoryException.
 class KPLIB_API KpConnectedComponents {
 public:
     struct KPLIB_API Component {

@@ -3,6 +3,7 @@
 #include <kplib/volume/detail/LabelPlainly.h>
 #include <kplib/volume/detail/RowBits.h>
 
+#include <cstring>
 #include <limits>
 
 namespace kplib::detail {
@@ -36,14 +37,15 @@ public:
                  bool isLabelMode) :
         data_(data),
         labels_(labels), components_(components), low_(low), high_(high), dims_{dims[0], dims[1], dims[2]},
-        isLabelMode_(isLabelMode), nWords_(wordsOf(dims[0]))
+        isLabelMode_(isLabelMode), nWords_(wordsOf(dims[0])), rowBytes_(bytesOfRow(dims[0]))
     {
         int offsets[13];
         KpConnectedComponents::mknbtableprev(neighbours, dims, nSteps_, offsets, deltas_);
         // For a row: foreground, seeds (of labels: changes of value), ends of stretches, each with a word of zeros
         // behind. For this slice and the one before: changes of label, rows without a gap. Bit 0 of a row is never set,
         // so the first word of the next row does as zeros behind; one word more is behind the last row.
-        bits_.resize(nWords_ * 3 + nRowWords() * dims_[1] * std::min(dims_[2], 2L) + 1);
+        const long changeBytes = rowBytes_ * dims_[1] * std::min(dims_[2], 2L);
+        bits_.resize(nWords_ * 3 + (changeBytes + 7) / 8 + 1);
         std::fill(bits_.begin(), bits_.end(), RowBits{0});
     }
 
@@ -62,17 +64,30 @@ private:
     RowBits* foreground() { return bits_.data(); }
     RowBits* seeds() { return bits_.data() + nWords_; }
     RowBits* ends() { return bits_.data() + 2 * nWords_; }
-    long nRowWords() const { return nWords_ - 1; }
-    RowBits* labelChanges(long y, long z)
+    unsigned char* labelChanges(long y, long z)
     {
-        return bits_.data() + 3 * nWords_ + ((z % 2) * dims_[1] + y) * nRowWords();
+        return reinterpret_cast<unsigned char*>(bits_.data() + 3 * nWords_) + ((z % 2) * dims_[1] + y) * rowBytes_;
     }
+
+    /// Bytes for the changes of label of a row: narrow rows share words, so that they take no more for a voxel.
+    static long bytesOfRow(long n) { return n <= 8 ? 1 : n <= 16 ? 2 : n <= 32 ? 4 : (wordsOf(n) - 1) * 8; }
+    bool isNarrow() const { return rowBytes_ < 8; }
 
     bool labelRow()
     {
+        unsigned char* const stored = labelChanges(y_, z_);
+        RowBits narrow = 0;
+        changes_ = isNarrow() ? &narrow : reinterpret_cast<RowBits*>(stored);
+        const bool isDone = labelRuns();
+        if (isNarrow())
+            std::memcpy(stored, &narrow, static_cast<std::size_t>(rowBytes_));  // the lowest bits: first in memory
+        return isDone;
+    }
+
+    bool labelRuns()
+    {
         const T* row = data_ + start_;
-        changes_ = labelChanges(y_, z_);
-        std::fill_n(changes_, nRowWords(), RowBits{0});
+        std::fill_n(changes_, nWords_ - 1, RowBits{0});
         if (!fillBits(foreground(), dims_[0], [=, low = low_](long i) { return !(row[i] < low); })) {
             std::fill_n(labels_ + start_, dims_[0], L{0});
             return true;
@@ -128,7 +143,7 @@ private:
     {
         const T* row = data_ + start_;
         RowBits* const ends = this->ends();
-        const long n = nRowWords();
+        const long n = nWords_ - 1;
         if (isLabelMode_) {
             const RowBits* changes = seeds();
             fillBits(seeds(), dims_[0] - 1, [=](long i) { return row[i + 1] != row[i]; });
@@ -139,8 +154,15 @@ private:
             std::fill_n(ends, n, RowBits{0});
         }
         for (int r = 0; r < nRows_; ++r) {
-            const RowBits* before = labelChanges(y_ + rows_[r].dy, z_ - rows_[r].dz);
+            const unsigned char* const stored = labelChanges(y_ + rows_[r].dy, z_ - rows_[r].dz);
             const bool isWide = rows_[r].isWide;
+            if (isNarrow()) {
+                RowBits word = 0;
+                std::memcpy(&word, stored, static_cast<std::size_t>(rowBytes_));
+                ends[0] |= isWide ? word >> 1 : word;
+                continue;
+            }
+            const auto* const before = reinterpret_cast<const RowBits*>(stored);
             for (long i = 0; i < n; ++i)
                 ends[i] |= isWide ? before[i] >> 1 | before[i + 1] << 63 : before[i];
         }
@@ -260,7 +282,8 @@ private:
     bool isLabelMode_;
     int nSteps_ = 0;
     int deltas_[13][3];
-    long nWords_;
+    long nWords_;    // in a row of bits, with the zeros behind
+    long rowBytes_;  // of the changes of label
     KpDArray<RowBits> bits_;
 
     // Of the row at hand.
@@ -282,7 +305,7 @@ int KpConnectedComponents::do_label(T* data, L* labels, KpDArray<Component>& com
                                     int neighbours, int labelMode)
 {
     using namespace kplib::detail;
-    if (dims[0] < 32)  // the bits of a row pay from there on
+    if (dims[0] < 8)  // bits of a row pay from there on
         return PlainLabelling<T, L>(data, labels, components, low, high, dims, neighbours, labelMode).run();
     startComponents(components);
     const long nVoxels = nVoxelsOf(dims);
