@@ -10,8 +10,8 @@
 // whose first child is `NumImageNumbers` and whose others are a text for each image, `ImageNr00001` ... in the order of
 // the images. A text holds fields separated by commas, named by the tags in the parameter `ImageLevelTags`; its first
 // field is the image number. Images are found by their position: such a list must never be sorted, which a caller's
-// HxParamBundle::findSorted() on it does. A sort puts `NumImageNumbers` after all texts and so shifts every image by one;
-// with names of more than five digits it changes their order too. Nothing here sorts it.
+// HxParamBundle::findSorted() on it does. A sort puts `NumImageNumbers` after all texts and so shifts every image by
+// one; with names of more than five digits it changes their order too. Nothing here sorts it.
 //
 // Failure is false. Threads as with HxParamBundle.
 

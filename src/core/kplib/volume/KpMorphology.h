@@ -18,9 +18,9 @@
 /// which a digest may contain, stay as they are. Volumes of size 0 or less have no voxels.
 ///
 /// `fast` works on words, many voxels at a time, otherwise each voxel looks at its neighbours; the results are the
-/// same. Work areas are a few slices. If one that is needed cannot be allocated, all bits of `dst` are set and nothing is
-/// logged. Rows of a multiple of 32 voxels need none for 6, 4 and 8 neighbours, rows of less than 32 need none at all.
-/// Other exhausted memory is a KpMemoryException. Any number of threads may work at once on fields of their own.
+/// same. Work areas are a few slices. If one that is needed cannot be allocated, all bits of `dst` are set and nothing
+/// is logged. Rows of a multiple of 32 voxels need none for 6, 4 and 8 neighbours, rows of less than 32 need none at
+/// all. Other exhausted memory is a KpMemoryException. Any number of threads may work at once on fields of their own.
 class KPLIB_API KpMorphology {
 public:
     /// `iterations` passes; none copies.
