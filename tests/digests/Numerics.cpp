@@ -2,7 +2,8 @@
 
 #include <kplib/kplib.h>
 
-#include <array>
+#include <algorithm>
+#include <iterator>
 
 namespace kplib::test {
 namespace {
@@ -126,10 +127,30 @@ void polylines(Digest& digest, Random& random)
     }
 }
 
+void colours(Digest& digest, Random& random)
+{
+    for (int i = 0; i < 20000; ++i) {
+        float rgb[3], xyz[3], lab[3], back[3];
+        for (float& part : rgb)
+            part = static_cast<float>(random() % 256) / 255;
+        rgb2XYZ(rgb, xyz);
+        if (i % 2) {  // greys have differences of nearly equal roots
+            const float part = static_cast<float>(random()) * 0x1p-32F;
+            std::copy_n(std::begin({95.047F * part, 100 * part, 108.883F * part}), 3, xyz);
+        }
+        XYZ2CIELab(xyz, lab);
+        digest.take(xyz, lab);
+        CIELab2XYZ(lab, xyz);
+        const bool isOutside = XYZ2rgb(xyz, back);
+        digest.take(xyz, back, isOutside);
+    }
+}
+
 }  // namespace
 
 void digestsOfNumerics()
 {
+    family("colours", colours);
     family("ode", ode);
     family("alignment", alignment);
     family("fit", fit);

@@ -170,6 +170,15 @@ void multiply(const Matrix& rows, const double* in, double* out)
         out[i] = rows[i][0] * in[0] + rows[i][1] * in[1] + rows[i][2] * in[2];
 }
 
+/// Correctly rounded: the C library's root differs in its last bit between processors, and differences of roots show
+/// it. One step of Newton from there, with the residual t - root^3 exact but for its own rounding.
+double cubeRoot(double t)
+{
+    const double root = std::cbrt(t), square = root * root, rest = std::fma(root, root, -square);
+    const double residual = std::fma(-square, root, t) - rest * root;
+    return root + residual / (3 * square);
+}
+
 }  // namespace
 
 void rgb2XYZ(float* rgb, float* xyz)
@@ -189,7 +198,7 @@ void XYZ2CIELab(float* xyz, float* lab)
     double terms[3];
     for (int i = 0; i < 3; ++i) {
         const double t = std::clamp(xyz[i] / white[i], 0.0, 1.0);
-        terms[i] = t > 0.008856 ? std::cbrt(t) : 7.787 * t + 0.13793103;
+        terms[i] = t > 0.008856 ? cubeRoot(t) : 7.787 * t + 0.13793103;
     }
     lab[0] = static_cast<float>(116 * terms[1] - 16);
     lab[1] = static_cast<float>(500 * (terms[0] - terms[1]));
