@@ -2,10 +2,11 @@
 #include <kplib/foundation/KpHandableThreaded.h>
 #include <kplib/foundation/KpHandle.h>
 
+#include <support/JoiningThread.h>
+
 #include <gtest/gtest.h>
 
 #include <atomic>
-#include <thread>
 #include <utility>
 
 namespace {
@@ -68,9 +69,9 @@ TEST(KpHandableThreads, lastOfManyThreadsDeletesOnceAndSeesTheirWork)
     constexpr int rounds = 2000;
     for (int round = 0; round < rounds; ++round) {
         KpHandle<Shared> handle(new Shared);
-        std::jthread threads[3];
+        kplib::test::JoiningThread threads[3];
         for (int i = 0; i < 3; ++i) {
-            threads[i] = std::jthread([copy = handle, i]() mutable {
+            threads[i] = kplib::test::JoiningThread([copy = handle, i]() mutable {
                 for (int k = 0; k < 10; ++k)
                     KpHandle<Shared>(copy)->isVirgin();
                 copy->cells[i] = 1;

@@ -3,6 +3,7 @@
 #include <kplib/foundation/KpWaitCondition.h>
 #include <kplib/foundation/detail/Deadline.h>
 
+#include <support/JoiningThread.h>
 #include <support/LogCapture.h>
 
 #include <gtest/gtest.h>
@@ -60,7 +61,7 @@ TEST(KpWaitConditionThreads, wakesThoseWhoWait)
             EXPECT_TRUE(condition.wait(&mutex, milliseconds));
         --go;
     };
-    const std::jthread one(waitWith, ULONG_MAX), two(waitWith, ULONG_MAX), three(waitWith, 60000);
+    const kplib::test::JoiningThread one(waitWith, ULONG_MAX), two(waitWith, ULONG_MAX), three(waitWith, 60000);
     for (int howMany : {1, 2}) {
         for (bool ready = false; !ready; std::this_thread::yield()) {
             const Lock lock(&mutex);

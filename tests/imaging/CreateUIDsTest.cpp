@@ -2,6 +2,8 @@
 
 #include <kplib/imaging/detail/UIDClock.h>
 
+#include <support/JoiningThread.h>
+
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -11,7 +13,6 @@
 #include <ctime>
 #include <set>
 #include <string>
-#include <thread>
 #include <vector>
 
 #include <unistd.h>
@@ -106,7 +107,7 @@ TEST_F(CreateUIDs, ThreadsNeverGetTheSame)
 #endif
     std::vector<std::vector<long long>> taken(8);
     {
-        std::vector<std::jthread> threads;
+        std::vector<kplib::test::JoiningThread> threads;
         for (auto& mine : taken) {
             threads.emplace_back([&mine] {
                 KpCreateUIDs creator;

@@ -5,6 +5,7 @@
 #include <kplib/log/detail/KpLogFilePrivate.h>
 
 #include <support/ExhaustedMemory.h>
+#include <support/JoiningThread.h>
 
 #include <gtest/gtest.h>
 
@@ -148,8 +149,8 @@ TEST_F(KpLogFileTest, exhaustedMemoryLeavesNoLockBehind)
 using KpLogFileThreads = KpLogFileTest;
 TEST_F(KpLogFileThreads, linesOfManyThreadsDontInterleave)
 {
-    for (std::jthread threads[3]; std::jthread & thread : threads) {
-        thread = std::jthread([&] {
+    for (kplib::test::JoiningThread threads[3]; kplib::test::JoiningThread & thread : threads) {
+        thread = kplib::test::JoiningThread([&] {
             for (int k = 0; k < 200; ++k) {
                 log->errorf("%0500d", 0);
                 log->setDefaultModule(k % 2 ? "a" : "b");

@@ -4,6 +4,7 @@
 #include <kplib/system/KpTmpDir.h>
 
 #include <support/ExhaustedMemory.h>
+#include <support/JoiningThread.h>
 #include <support/LogCapture.h>
 #include <support/TempFolder.h>
 
@@ -313,7 +314,7 @@ TEST_F(LogFilesThreads, everyLineOfEveryThreadIsThereOnceAndInOrder)
     log->setMaxLogFileSizeInBytes(2000);
     log->setWriteCallback([](KpLogLevel, const KpString&) { ++received; }, KpLogError);
     ASSERT_TRUE(log->open(false));
-    std::vector<std::jthread> threads;
+    std::vector<kplib::test::JoiningThread> threads;
     for (int t = 0; t < 8; ++t)
         threads.emplace_back([&, t] {
             for (int i = 0; i < lines; ++i) {

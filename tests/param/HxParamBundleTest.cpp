@@ -2,6 +2,8 @@
 
 #include <kplib/param/HxParameter.h>
 
+#include <support/JoiningThread.h>
+
 #include <gtest/gtest.h>
 
 #include <cmath>
@@ -9,7 +11,6 @@
 #include <map>
 #include <random>
 #include <string>
-#include <thread>
 #include <vector>
 
 TEST(HxParamBundle, agreesWithAMapThroughRandomChanges)
@@ -211,9 +212,9 @@ TEST(HxParamBundleThreads, lookUpAndSortSideBySide)
         HxParamBundle bundle("b");
         for (int i = 199; i >= 0; --i)
             bundle.set(std::to_string(-1000 - i).c_str(), i);
-        std::jthread threads[4];
-        for (std::jthread& thread : threads) {
-            thread = std::jthread([&bundle] {
+        kplib::test::JoiningThread threads[4];
+        for (kplib::test::JoiningThread& thread : threads) {
+            thread = kplib::test::JoiningThread([&bundle] {
                 for (int i = 0; i < 200; ++i)
                     ASSERT_EQ(bundle.findSorted(std::to_string(-1000 - i).c_str())->getNum(0), i);
             });

@@ -1,11 +1,12 @@
 #include <kplib/geometry/numerics/KpRandom.h>
 
+#include <support/JoiningThread.h>
+
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <functional>
 #include <random>
-#include <thread>
 #include <vector>
 
 namespace {
@@ -45,7 +46,7 @@ TEST(KpRandom, staysInItsRangeForAnySeed)
 
 TEST(KpRandom, servesManyThreadsFromOneGenerator)
 {
-    std::vector<std::jthread> threads;
+    std::vector<kplib::test::JoiningThread> threads;
     for (int t = 0; t < 4; ++t)
         threads.emplace_back([] {
             double sum = 0;

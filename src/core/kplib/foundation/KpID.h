@@ -61,7 +61,8 @@ public:
     /// The first word decides, then the second, both unsigned and in the machine's byte order.
     friend constexpr std::strong_ordering operator<=>(const KpID_C& a, const KpID_C& b)
     {
-        return a.words() <=> b.words();
+        const Words left = a.words(), right = b.words();  // libc++ 14 does not order arrays
+        return left[0] != right[0] ? left[0] <=> right[0] : left[1] <=> right[1];
     }
 
 private:

@@ -7,7 +7,6 @@
 #include <kplib/volume/detail/ComponentTable.h>
 
 #include <algorithm>
-#include <atomic>
 #include <cmath>
 #include <cstdint>
 #include <cstring>
@@ -58,8 +57,8 @@ Neighbours previousNeighbours(int neighbours)
 /// lock of an exact count.
 void countUp(int& counter)
 {
-    const std::atomic_ref<int> shared(counter);
-    shared.store(shared.load(std::memory_order_relaxed) + 1, std::memory_order_relaxed);
+    // std::atomic_ref is missing from libc++ 14.
+    __atomic_store_n(&counter, __atomic_load_n(&counter, __ATOMIC_RELAXED) + 1, __ATOMIC_RELAXED);
 }
 
 /// Rounded half up, cut to 32 bits as the processor does (all that doesn't fit is the smallest int), then to the type.
@@ -151,7 +150,7 @@ void startComponents(ComponentTable& components)
 {
     for (auto* counter :
          {&KpConnectedComponents::dbg_add, &KpConnectedComponents::dbg_merge, &KpConnectedComponents::dbg_clean})
-        std::atomic_ref<int>(*counter).store(0, std::memory_order_relaxed);
+        __atomic_store_n(counter, 0, __ATOMIC_RELAXED);
     components.resize(1);
     components[0] = Component{};
 }

@@ -4,8 +4,9 @@
 #include <climits>
 #include <cmath>
 #include <cstddef>
+#include <functional>
 #include <limits>
-#include <memory_resource>
+#include <new>
 #include <numeric>
 #include <vector>
 
@@ -36,6 +37,44 @@ int clampedTo(double value, int low, int high)
 {
     return !(value > low) ? low : value < high ? static_cast<int>(value) : high;
 }
+
+/// Memory that a scan takes and gives back at its end: from a buffer, and from the heap once that is used up. As
+/// std::pmr's, which is missing from libc++ 14.
+class Arena {
+public:
+    void* take(std::size_t bytes)
+    {
+        bytes = (bytes + alignof(std::max_align_t) - 1) / alignof(std::max_align_t) * alignof(std::max_align_t);
+        if (bytes > sizeof buffer_ - used_)
+            return ::operator new(bytes);
+        used_ += bytes;
+        return buffer_ + used_ - bytes;
+    }
+    void give(void* memory)
+    {
+        if (std::less<>()(memory, buffer_) || !std::less<>()(memory, buffer_ + sizeof buffer_))
+            ::operator delete(memory);
+    }
+
+private:
+    std::size_t used_ = 0;
+    alignas(std::max_align_t) std::byte buffer_[16384];
+};
+
+template <typename T>
+struct ArenaAllocator {
+    using value_type = T;
+    Arena* arena;
+
+    ArenaAllocator(Arena* a) : arena(a) {}
+    template <typename Other>
+    ArenaAllocator(const ArenaAllocator<Other>& other) : arena(other.arena)
+    {
+    }
+    T* allocate(std::size_t n) { return static_cast<T*>(arena->take(n * sizeof(T))); }
+    void deallocate(T* memory, std::size_t) { arena->give(memory); }
+    bool operator==(const ArenaAllocator&) const = default;
+};
 
 class Scan {
 public:
@@ -123,10 +162,9 @@ private:
     const KpVec2f* points_;
     const int* window_;
     int next_ = 0;  // of order_: the first vertex above the scanline
-    std::byte buffer_[16384];
-    std::pmr::monotonic_buffer_resource memory_{buffer_, sizeof buffer_};
-    std::pmr::vector<int> order_;  // the vertices by y
-    std::pmr::vector<Active> active_;
+    Arena memory_;
+    std::vector<int, ArenaAllocator<int>> order_;  // the vertices by y
+    std::vector<Active, ArenaAllocator<Active>> active_;
 };
 
 }  // namespace

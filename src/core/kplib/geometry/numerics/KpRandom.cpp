@@ -1,7 +1,6 @@
 #include <kplib/geometry/numerics/KpRandom.h>
 
 #include <algorithm>
-#include <atomic>
 #include <ctime>
 #include <iterator>
 
@@ -10,16 +9,16 @@ namespace {
 constexpr std::int64_t modulus = 2147483647;  // every state is below it, whatever the seed, after six steps
 constexpr std::int64_t entryWidth = 67108864;
 
-// Threads may share a generator without a lock. A lost step is harmless noise, but it has to be defined behaviour; on
-// this processor these are plain loads and stores.
+// Threads may share a generator without a lock. A lost step is harmless noise, but it has to be defined behaviour.
+// These compile to plain loads and stores; std::atomic_ref is missing from libc++ 14.
 std::int64_t get(std::int64_t& word)
 {
-    return std::atomic_ref(word).load(std::memory_order_relaxed);
+    return __atomic_load_n(&word, __ATOMIC_RELAXED);
 }
 
 void put(std::int64_t& word, std::int64_t value)
 {
-    std::atomic_ref(word).store(value, std::memory_order_relaxed);
+    __atomic_store_n(&word, value, __ATOMIC_RELAXED);
 }
 
 }  // namespace
