@@ -30,8 +30,16 @@ TYPED_TEST(Identifier, knowsItsEmptyValueAndTheOrderOfSignedNumbers)
     EXPECT_EQ(id.value(), emptyOf(id));
     id.valueSet(5);
     other.valueSet(-7);
-    EXPECT_TRUE(TypeParam().isEmpty() && !TypeParam().isNotEmpty() && id.isNotEmpty() && !id.isEmpty());
-    EXPECT_TRUE(other < id && other <= id && id > other && id >= other && id != other && !(id == other));
+    EXPECT_TRUE(TypeParam().isEmpty());
+    EXPECT_FALSE(TypeParam().isNotEmpty());
+    EXPECT_TRUE(id.isNotEmpty());
+    EXPECT_FALSE(id.isEmpty());
+    EXPECT_LT(other, id);
+    EXPECT_LE(other, id);
+    EXPECT_GT(id, other);
+    EXPECT_GE(id, other);
+    EXPECT_NE(id, other);
+    EXPECT_FALSE(id == other);
     EXPECT_EQ(kp_hash(other), 0xFFFFFFF9U);
     EXPECT_EQ((std::unordered_set<TypeParam>{id, other, TypeParam(5)}).size(), 2U);
     id.makeEmpty();
@@ -52,7 +60,11 @@ TEST(IdentifierOfTwoWords, isOrderedByTheFirstWordThenTheSecond)
     ID last;
     EXPECT_FALSE(last.isValid());
     for (const ID next : {ID({0, 1}), ID({0, ~0ULL}), ID({1, 0}), ID({~0ULL, 0})}) {
-        EXPECT_TRUE(next.isValid() && last < next && next >= last && last != next && !(next <= last));
+        EXPECT_TRUE(next.isValid());
+        EXPECT_LT(last, next);
+        EXPECT_GE(next, last);
+        EXPECT_NE(last, next);
+        EXPECT_FALSE(next <= last);
         last = next;
     }
     EXPECT_EQ(kp_hash(ID({0x123456789ULL, 7})), 0x23456789U);
@@ -71,7 +83,8 @@ TEST(KpRemotificationID, namesTheSingletons)
 {
     using ID = KpRemotificationID;
     const auto name = [](int value) { return ID(value).singletonClassName(); };
-    EXPECT_TRUE(!name(0) && !name(8));
+    EXPECT_FALSE(name(0));
+    EXPECT_FALSE(name(8));
     EXPECT_STREQ(name(ID::RS_MAX), "TmPowerScribeCtrl");
 }
 

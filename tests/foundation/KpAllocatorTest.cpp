@@ -12,7 +12,10 @@ TEST(KpAllocator, asksForMemoryToBeFreedOnceBeforeItGivesUp)
     KpAllocator::setFreeUnusedUncompressedDataCB([&] { ++called; });
     const KpAllocator second([](unsigned long n) { return ++attempts == 2 ? std::malloc(n) : nullptr; }, std::free);
     void* const block = second.allocate(10);
-    EXPECT_TRUE(block && !second.allocate(10) && attempts == 4 && called == 2);
+    EXPECT_TRUE(block);
+    EXPECT_FALSE(second.allocate(10));
+    EXPECT_EQ(attempts, 4);
+    EXPECT_EQ(called, 2);
     second.deallocate(block);
     KpAllocator::setFreeUnusedUncompressedDataCB(nullptr);
     EXPECT_EQ(KpAllocator(KpAllocator::AllocatorNew).allocate(ULONG_MAX / 4), nullptr) << "without an exception";

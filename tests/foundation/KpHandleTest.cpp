@@ -37,17 +37,22 @@ void checkCounts()
     EXPECT_EQ(a->refCount(), 3);
     a = std::move(b);
     c = nullptr;
-    EXPECT_TRUE(!b && a->refCount() == 1 && deaths == 0);
+    EXPECT_FALSE(b);
+    EXPECT_EQ(a->refCount(), 1);
+    EXPECT_EQ(deaths, 0);
     a->next = new Node<Base>(&later);
     a = a->next;  // only the old head holds it
-    EXPECT_TRUE(deaths == 1 && later == 0 && a->refCount() == 1);
+    EXPECT_EQ(deaths, 1);
+    EXPECT_EQ(later, 0);
+    EXPECT_EQ(a->refCount(), 1);
     a = b;
     EXPECT_EQ(later, 1);
 
     const KpHandle<Base> first(new Base), second = first;
     const Base copy(*first);
     *first = copy;
-    EXPECT_TRUE(copy.refCount() == 0 && first->refCount() == 2) << "the count is no part of the value";
+    EXPECT_EQ(copy.refCount(), 0) << "the count is no part of the value";
+    EXPECT_EQ(first->refCount(), 2) << "the count is no part of the value";
 }
 
 }  // namespace

@@ -45,7 +45,8 @@ TEST(KpMutex, platformFailuresAreLoggedAndDontThrow)
 TEST(KpWaitCondition, deadlineIsOnTheMillisecond)
 {
     const timespec carried = kplib::detail::deadlineAfter({1000, 700000}, 1500);
-    EXPECT_TRUE(carried.tv_sec == 1002 && carried.tv_nsec == 200000000);
+    EXPECT_EQ(carried.tv_sec, 1002);
+    EXPECT_EQ(carried.tv_nsec, 200000000);
     EXPECT_EQ(kplib::detail::deadlineAfter({1000, 999999}, 1).tv_nsec, 0);
 }
 
@@ -82,5 +83,6 @@ TEST(KpThreadLocalStorageThreads, eachThreadHasItsValueAndItsEnd)
         EXPECT_EQ(storage.get(), nullptr);
         storage.set(&other);
     }).join();
-    EXPECT_TRUE(destroyed == 2 && storage.get() == &mine) << "the last value only";
+    EXPECT_EQ(destroyed, 2) << "the last value only";
+    EXPECT_EQ(storage.get(), &mine) << "the last value only";
 }

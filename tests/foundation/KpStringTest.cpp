@@ -27,10 +27,13 @@ static Tokens tokensOf(Tokenizer tokenizer)
 TEST(KpString, keepsItsCapacityRules)
 {
     KpString text, added = "123456789012345", joined = added + "";  // the second fills its 16
-    EXPECT_TRUE(text.capacity() == 16 && KpString(text).capacity() == 1 && KpString("abcdef", 1, 3).capacity() == 4);
+    EXPECT_EQ(text.capacity(), 16);
+    EXPECT_EQ(KpString(text).capacity(), 1);
+    EXPECT_EQ(KpString("abcdef", 1, 3).capacity(), 4);
     for (const auto& [length, capacity] : {std::pair(63, 64), std::pair(64, 65), std::pair(1, 65)}) {
         text.printf("%0*d", length, 7);
-        EXPECT_TRUE(text.length() == length && text.capacity() == capacity) << length;
+        EXPECT_EQ(text.length(), length) << length;
+        EXPECT_EQ(text.capacity(), capacity) << length;
     }
     added += 'x';
     EXPECT_EQ(added.capacity(), 24);
@@ -44,7 +47,8 @@ TEST(KpString, takesTextFromItself)
     for (int i = 0; i < 4; ++i)
         text += text;
     text += text.c_str() + 48;
-    EXPECT_TRUE(text.length() == 48 && text.substr(45, 47) == "abc");
+    EXPECT_EQ(text.length(), 48);
+    EXPECT_EQ(text.substr(45, 47), "abc");
     text = text.c_str() + 45;
     EXPECT_EQ(text + 'd' + "e", "abcde");
 }
@@ -53,19 +57,29 @@ TEST(KpString, comparesWithTextAndNull)
 {
     const char* const null = nullptr;
     const KpString text = "abc", empty = null;
-    EXPECT_TRUE(text == KpString("abc") && text == "abc" && "abc" == text && text != "abd" && text != "ab");
+    EXPECT_EQ(text, KpString("abc"));
+    EXPECT_EQ(text, "abc");
+    EXPECT_EQ("abc", text);
+    EXPECT_NE(text, "abd");
+    EXPECT_NE(text, "ab");
     EXPECT_FALSE(text != null || empty != nullptr) << "a null pointer differs from no proper string";
-    EXPECT_TRUE(text > empty && text <= "abc" && "abd" > text && KpString("B") < KpString("a"));
+    EXPECT_GT(text, empty);
+    EXPECT_LE(text, "abc");
+    EXPECT_GT("abd", text);
+    EXPECT_LT(KpString("B"), KpString("a"));
     KpString moved = text;
     const KpString target = std::move(moved);
-    EXPECT_TRUE(moved != null && moved != "");  // NOLINT(bugprone-use-after-move): a string without its NUL
+    EXPECT_NE(moved, null);
+    EXPECT_NE(moved, "");  // NOLINT(bugprone-use-after-move): a string without its NUL
     moved += 'x';
     EXPECT_EQ(moved + "y", "xy");
 }
 
 TEST(KpString, inspectsAndRewrites)
 {
-    EXPECT_TRUE(KpString().isAlnum() && KpString("aZ").isAlpha() && KpString("09").isDigit());
+    EXPECT_TRUE(KpString().isAlnum());
+    EXPECT_TRUE(KpString("aZ").isAlpha());
+    EXPECT_TRUE(KpString("09").isDigit());
     EXPECT_FALSE(KpString("\xe4").isAlpha() || KpString("a1").isDigit() || KpString("a ").isAlnum());
     const char* const replacements[][4] = {
         {"aaa", "aa", "a", "aa"}, {"abab", "ab", "abab", "abababab"}, {"abc", "", "x", "abc"}, {"abc", "b", "", "ac"}};
@@ -113,11 +127,13 @@ TEST(KpStringTokenizer, joinsQuotedRunsAndEscapesThatProtectMakes)
     KpStringTokenizer again("a");
     for (const auto& [bytes, tokens] : cases) {
         const KpString text(bytes);
-        EXPECT_TRUE(tokensOf(KpStringTokenizer(text)) == tokens && tokensOf(again = text) == tokens) << text;
+        EXPECT_EQ(tokensOf(KpStringTokenizer(text)), tokens) << text;
+        EXPECT_EQ(tokensOf(again = text), tokens) << text;
     }
     for (const char* text : {"abc", "a\tb", "\"a\\b\"\\", "\\\"", ""})
         EXPECT_EQ(tokensOf(KpStringTokenizer(KpString(text).protect().c_str())), Tokens{text});
-    EXPECT_TRUE(KpString("abc").protect() == "abc" && KpString("a\"b").protect(true) == "\"a\\\"b\"");
+    EXPECT_EQ(KpString("abc").protect(), "abc");
+    EXPECT_EQ(KpString("a\"b").protect(true), "\"a\\\"b\"");
 }
 
 TEST(KpStringTokenizerGeneral, splitsAtTheBytesOfItsSet)
@@ -153,7 +169,8 @@ TEST(KpStdStringTokenizer, splitsAtAnyOfASet)
         Tokens tokens(tokenizer.countTokens());
         for (std::string& token : tokens)
             tokenizer.nextToken(token);
-        EXPECT_TRUE(tokens == (Tokens{"a", "b"}) && !tokenizer.hasMoreTokens()) << text;
+        EXPECT_EQ(tokens, (Tokens{"a", "b"})) << text;
+        EXPECT_FALSE(tokenizer.hasMoreTokens()) << text;
     }
 }
 
@@ -164,7 +181,8 @@ TEST(StringUtils, convertsTheWholeTextOrNothing)
     for (const auto& [text, expected] : cases) {
         bool ok = expected == 7;
         EXPECT_EQ(StringUtils::toLong(text, 7, &ok), expected);
-        EXPECT_TRUE(ok == (expected != 7) && ok == (StringUtils::toDouble(text, 7) != 7)) << text;
+        EXPECT_EQ(ok, (expected != 7)) << text;
+        EXPECT_EQ(ok, (StringUtils::toDouble(text, 7) != 7)) << text;
     }
 }
 

@@ -15,8 +15,10 @@ TEST(KpTypeInfo, registryFindsTheNewestOfANameThatIsAlive)
     std::vector<std::unique_ptr<KpTypeInfo>> types;
     for (const char* name : {"c", "a", "b", "b", "aa", "Z", "b"})
         types.push_back(std::make_unique<KpTypeInfo>(name, nullptr, types.empty() ? nullptr : types[0].get(), nullptr));
-    EXPECT_TRUE(types[6]->isOfType(types[0].get()) && !types[6]->isOfType(types[2].get())) << "identity, not name";
-    EXPECT_TRUE(KpTypeInfo::fromName("a") == types[1].get() && KpTypeInfo::fromName("b") == types[6].get());
+    EXPECT_TRUE(types[6]->isOfType(types[0].get())) << "identity, not name";
+    EXPECT_TRUE(!types[6]->isOfType(types[2].get())) << "identity, not name";
+    EXPECT_EQ(KpTypeInfo::fromName("a"), types[1].get());
+    EXPECT_EQ(KpTypeInfo::fromName("b"), types[6].get());
     KpTypeInfo::removeType("b");
     types[2].reset();
     EXPECT_EQ(KpTypeInfo::fromName("b"), types[3].get()) << "what is left is found by identity, not by name";
@@ -45,9 +47,14 @@ TEST(KpInterfaceOwner, attachesOnceFindsTheNewestAndEndsWhatItOwns)
     EXPECT_EQ(owner->getInterface(KpInterface::getClassTypeId()), second);
     KpDArray<KpTypedObject*> all{&plain};
     owner->getAllInterfaces(all);
-    EXPECT_TRUE(all.size() == 5 && all[0] == second && all[1] == first && all[3] == &plain && all[4] == owner.get());
+    EXPECT_EQ(all.size(), 5);
+    EXPECT_EQ(all[0], second);
+    EXPECT_EQ(all[1], first);
+    EXPECT_EQ(all[3], &plain);
+    EXPECT_EQ(all[4], owner.get());
     owner = nullptr;
-    EXPECT_TRUE(ends == "ba" && calls == 1);
+    EXPECT_EQ(ends, "ba");
+    EXPECT_EQ(calls, 1);
 }
 
 TEST(KpEditable, announcesItsChanges)
@@ -65,7 +72,10 @@ TEST(KpEditable, announcesItsChanges)
     object.startEditing(4);
     object.removeEditingListener(&a);
     object.startEditing(3);
-    EXPECT_TRUE(object.isEdited(6) && object.isAllEdited(2) && !object.isEdited(4) && !object.isAllEdited(6));
+    EXPECT_TRUE(object.isEdited(6));
+    EXPECT_TRUE(object.isAllEdited(2));
+    EXPECT_FALSE(object.isEdited(4));
+    EXPECT_FALSE(object.isAllEdited(6));
     object.finishEditing();
     EXPECT_EQ(heard + std::to_string(object.getEditingFlags()), "4a4b4a3b3aba0");
 }

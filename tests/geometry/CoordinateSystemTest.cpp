@@ -51,8 +51,10 @@ TEST(KpCoordinateSystem, makesAxesFromDirections)
         system.setAxis(round % 3, -system.axis(round % 3));  // left-handed
         const KpCoordinateSystem before = system;
         system.makePerpendicular(1, true);
-        EXPECT_TRUE(system.axis(1) == before.axis(1) && !system.isRightHanded());
-        EXPECT_TRUE(system.axis(0).dot(before.axis(0)) > 0 && system.axis(2).dot(before.axis(2)) > 0);
+        EXPECT_EQ(system.axis(1), before.axis(1));
+        EXPECT_FALSE(system.isRightHanded());
+        EXPECT_GT(system.axis(0).dot(before.axis(0)), 0);
+        EXPECT_GT(system.axis(2).dot(before.axis(2)), 0);
         system.makePerpendicular(1, false);
         system.normalizeAxes();
         expectRightHandedUnitAxes(system, system.axis(2));
@@ -62,17 +64,22 @@ TEST(KpCoordinateSystem, makesAxesFromDirections)
 TEST(KpCoordinateSystem, tellsWhatItsAxesAre)
 {
     const KpCoordinateSystem flat(z, {x, x, z}), unit;
-    EXPECT_TRUE(!flat.isValid() && isNaN(flat.origin()) && isNaN(flat.axis(2)));
+    EXPECT_FALSE(flat.isValid());
+    EXPECT_TRUE(isNaN(flat.origin()));
+    EXPECT_TRUE(isNaN(flat.axis(2)));
     KpCoordinateSystem system;
     system.setSystemByPlane(KpPlane::emptyPlane(), x);
-    EXPECT_TRUE(!system.isValid() && system.equalsAxis(unit)) << "only the place is lost";
+    EXPECT_FALSE(system.isValid()) << "only the place is lost";
+    EXPECT_TRUE(system.equalsAxis(unit)) << "only the place is lost";
     system.setSystemByPlane(KpPlane(z, 3.0F));
-    EXPECT_TRUE(system.isValid() && system.equals(KpCoordinateSystem(z * 3, {y, -x, z}), 1e-6F));
+    EXPECT_TRUE(system.isValid());
+    EXPECT_TRUE(system.equals(KpCoordinateSystem(z * 3, {y, -x, z}), 1e-6F));
     EXPECT_FALSE(system.equals(KpCoordinateSystem(z * 2, {y, -x, z}), 1)) << "the limit is outside";
     for (const auto& [axis, matches] :
          {std::pair{KpVec3f(0.99995F, 0.01F, 0), true}, {{0.9998F, 0.02F, 0}, false}, {x * 2, false}}) {
         system.setAxes({axis, y, z});
-        EXPECT_TRUE(unit.equalsAxis(system) == matches && system.equalsAxis(system)) << axis;
+        EXPECT_EQ(unit.equalsAxis(system), matches) << axis;
+        EXPECT_TRUE(system.equalsAxis(system)) << axis;
     }
 }
 
@@ -93,12 +100,15 @@ TEST(KpCoordinateSystem, relatesSystemsOfOneFrame)
         expectNear(inRoot(right, p), inRoot(left, left->transformationFrom(*right).multVecMatrix(p)));
         EXPECT_EQ(right->asTransformationUpTo(*middle), right->asTransformation() * middle->asTransformation());
         const KpMat4f all = right->asTransformationUpTo(*middle) * top->asTransformation();
-        EXPECT_TRUE(right->asTransformationToFrameOfReference() == all && right->asTransformationUpTo(*left) == all);
+        EXPECT_EQ(right->asTransformationToFrameOfReference(), all);
+        EXPECT_EQ(right->asTransformationUpTo(*left), all);
 
         const System merged = right->mergedWithParent(), moved = left->asChildOf(*right);
-        EXPECT_TRUE(merged->parent() == top.get() && moved->parent() == right.get());
+        EXPECT_EQ(merged->parent(), top.get());
+        EXPECT_EQ(moved->parent(), right.get());
         expectNear(inRoot(merged, p) + inRoot(moved, p), inRoot(right, p) + inRoot(left, p));
-        EXPECT_TRUE(left->commonAncestor(*right) == top.get() && right->commonAncestor(*middle) == middle.get());
+        EXPECT_EQ(left->commonAncestor(*right), top.get());
+        EXPECT_EQ(right->commonAncestor(*middle), middle.get());
     }
     EXPECT_EQ(frame->refCount(), 1) << "all children are gone";
 }
@@ -108,18 +118,22 @@ TEST(KpCoordinateSystem, keepsApartWhatDoesNotMeet)
     const Frame a(new KpFrameOfReference("a")), again(new KpFrameOfReference("a")), b(new KpFrameOfReference("b"));
     const System inA = a->createChildSystem(), inAgain = again->createChildSystem(), inB = b->createChildSystem();
     const System floating(new KpCoordinateSystem), onFloating = floating->createChildSystem();
-    EXPECT_TRUE(inA->isCompatibleWith(*inAgain) && !inA->commonAncestor(*inAgain));
+    EXPECT_TRUE(inA->isCompatibleWith(*inAgain));
+    EXPECT_FALSE(inA->commonAncestor(*inAgain));
     for (const System& other : {inB, floating, onFloating}) {
         KpMat4f unwritten = KpMat4f::identity();
         EXPECT_FALSE(inA->isCompatibleWith(*other) || other->isCompatibleWith(*inA) || inA->commonAncestor(*other));
         EXPECT_FALSE(inA->transformationTo(*other, unwritten) || inA->transformationFrom(*other, unwritten));
-        EXPECT_TRUE(unwritten.isIdentity() && !inA->transformationTo(*other).isNumber());
+        EXPECT_TRUE(unwritten.isIdentity());
+        EXPECT_FALSE(inA->transformationTo(*other).isNumber());
         EXPECT_FALSE(inA->asChildOf(*other)->parent() || other->isCompatibleWith(*floating));
     }
     KpCoordinateSystem system;  // on the stack it outlives what is asked of it
     system.setParent(a.get());
-    EXPECT_TRUE(system.transformationTo(*again).isIdentity() && !system.commonAncestor(*again));
-    EXPECT_TRUE(system.transformationTo(system).isIdentity() && system.refCount() == 0);
+    EXPECT_TRUE(system.transformationTo(*again).isIdentity());
+    EXPECT_FALSE(system.commonAncestor(*again));
+    EXPECT_TRUE(system.transformationTo(system).isIdentity());
+    EXPECT_EQ(system.refCount(), 0);
     EXPECT_TRUE(system.dump().starts_with(R"("KpCoordinateSystem":{"origin":{"x":"0.000000","y":"0.0000)"));
     EXPECT_TRUE(system.dump().ends_with(R"("},"parent": {"FrameOfReference":{"id":"a","parent": {}}}})"));
 }

@@ -96,7 +96,8 @@ TEST(KpCutBoxPlane, countsCornersInThePlaneAsAbove)
     KpVec3f vertices[6];
     KpVec3d inDouble[6];
     EXPECT_EQ(KpCutBoxPlane().cutPlane(0.5F), KpCutBoxPlane::cutPlane(unit, KpPlane(x, 0.5F)));
-    EXPECT_TRUE(KpCutBoxPlaneDouble().cutPlane(0.5, inDouble) == 4 && inDouble[1].x() == 0.5);
+    EXPECT_EQ(KpCutBoxPlaneDouble().cutPlane(0.5, inDouble), 4);
+    EXPECT_EQ(inDouble[1].x(), 0.5);
     ASSERT_EQ(KpCutBoxPlane(KpBox3f(0, 8e-9F, 0, 1, 0, 1), x).cutPlane(1e-9F, vertices, nullptr), 4);
     EXPECT_EQ(vertices[0].x(), 4e-9F) << "edges too short to divide by are cut in the middle";
 }

@@ -17,9 +17,12 @@ double determinant(const KpVec3d& a, const KpVec3d& b, const KpVec3d& c)
 TEST(KpLine, withoutLengthIsNaNOrKeepsItsZero)
 {
     KpLine line(x, x);
-    EXPECT_TRUE(isNaN(line.position()) && isNaN(line.direction()));
-    EXPECT_TRUE(line.setPosDir(x, origin) == 0 && line.direction() == origin);
-    EXPECT_TRUE(line.setPosDir(x, x * 4) == 4 && line == KpLine(x, x * 2));
+    EXPECT_TRUE(isNaN(line.position()));
+    EXPECT_TRUE(isNaN(line.direction()));
+    EXPECT_EQ(line.setPosDir(x, origin), 0);
+    EXPECT_EQ(line.direction(), origin);
+    EXPECT_EQ(line.setPosDir(x, x * 4), 4);
+    EXPECT_EQ(line, KpLine(x, x * 2));
 }
 
 TEST(KpLine, hasClosestPoints)
@@ -39,7 +42,8 @@ TEST(KpLine, hasClosestPoints)
         EXPECT_LE((onThis - a.getClosestPoint(onOther)).length(), bound);
     }
     EXPECT_FALSE(alongX.getClosestPoints(KpLine(y, y - x), onThis, onOther));
-    EXPECT_TRUE(isNaN(onThis) && isNaN(onOther));
+    EXPECT_TRUE(isNaN(onThis));
+    EXPECT_TRUE(isNaN(onOther));
 }
 
 TEST(KpLine, goesThroughBoxes)

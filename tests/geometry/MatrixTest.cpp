@@ -82,7 +82,8 @@ TEST(KpMat3f, decomposesByTheFirstPivotThatIsNotZero)
         int index[3];
         float parity;
         EXPECT_EQ(lu.LUDecomposition(index, parity), c.succeeds);
-        EXPECT_TRUE(std::equal(index, index + 3, c.index) && parity == c.parity);
+        EXPECT_TRUE(std::equal(index, index + 3, c.index));
+        EXPECT_EQ(parity, c.parity);
         const KpMat3f l(1, 0, 0, lu[1][0], 1, 0, lu[2][0], lu[2][1], 1);
         const KpMat3f rebuilt = l * KpMat3f(lu[0][0], lu[0][1], lu[0][2], 0, lu[1][1], lu[1][2], 0, 0, lu[2][2]);
         for (int i = 0; c.succeeds && i < 9; ++i)
@@ -111,7 +112,8 @@ TEST(KpMat4f, multipliesAsAPlainLoopDoes)
     }
     KpMat4f odd = KpMat4f::identity();
     odd[2][1] = NaN;
-    EXPECT_TRUE(!odd.isNumber() && odd.equals(KpMat4f::identity(), 0)) << "NaN is no difference";
+    EXPECT_FALSE(odd.isNumber()) << "NaN is no difference";
+    EXPECT_TRUE(odd.equals(KpMat4f::identity(), 0)) << "NaN is no difference";
 }
 
 TEST(KpMat4f, transformsManyPointsAsItDoesOne)
@@ -165,10 +167,12 @@ TEST(KpMat4f, leavesWhatIsNotAffineToDecomposition)
     EXPECT_FALSE(KpMat4f::affine_inverse(twice, kept));
     EXPECT_EQ(twice.inverse()[3][3], 0.5F);
     const KpMat4f rank3(2, 0, 0, 0, 0, 2, 0, 0, 0, 0, 2, 2, 0, 0, 2, 2);
-    EXPECT_TRUE(rank3.inverse().isNumber() && std::abs(rank3.inverse()[2][2]) > 1e19F);
+    EXPECT_TRUE(rank3.inverse().isNumber());
+    EXPECT_GT(std::abs(rank3.inverse()[2][2]), 1e19F);
     nothing.setScale(0);
     nothing[3][3] = 0;
-    EXPECT_TRUE(nothing.inverse().isNumber() && nothing.inverse()[0][0] == 1 / 1e-6F);
+    EXPECT_TRUE(nothing.inverse().isNumber());
+    EXPECT_EQ(nothing.inverse()[0][0], 1 / 1e-6F);
 
     std::mt19937 random(8);
     for (int i = 0; i < 500; ++i) {
@@ -200,10 +204,12 @@ TEST(KpMat4f, measuresPivotsByTheirRowsAndPrefersTheLater)
     int index[4];
     float sign;
     m.LUDecomposition(index, sign);
-    EXPECT_TRUE(index[0] == 2 && m[3][3] == 1e-6F);
+    EXPECT_EQ(index[0], 2);
+    EXPECT_EQ(m[3][3], 1e-6F);
     m = KpMat4f(0, 1, 100, 0, 0, 0.5F, 0, 1, 1, 0, 0, 0, 0, 0, 0, 1);  // the first row keeps its measure as it moves
     m.LUDecomposition(index, sign);
-    EXPECT_TRUE(index[0] == 2 && index[1] == 1);
+    EXPECT_EQ(index[0], 2);
+    EXPECT_EQ(index[1], 1);
 }
 
 // The eigenvectors are the columns of `v`: A v = v diag(evalues), and v is orthogonal.
@@ -233,7 +239,10 @@ TEST(Jacobi, findsEigenvectorsOfSymmetricMatrices)
     }
     const KpMat3f quarter(2, 1, 0, 1, 2, 0, 0, 0, 5), bad = quarter * NaN;
     quarter.jacobi(evalues, evectors, rotations);
-    EXPECT_TRUE(rotations == 1 && evalues[0] == 1 && evalues[1] == 3 && evalues[2] == 5);
+    EXPECT_EQ(rotations, 1);
+    EXPECT_EQ(evalues[0], 1);
+    EXPECT_EQ(evalues[1], 3);
+    EXPECT_EQ(evalues[2], 5);
     KpMat4f(quarter).jacobi3(evalues, columns, rotations);
     EXPECT_EQ(rotations, 3);
 
@@ -244,8 +253,8 @@ TEST(Jacobi, findsEigenvectorsOfSymmetricMatrices)
     KpMat4f(bad).jacobi3(evalues, columns, rotations);
     EXPECT_EQ(rotations, 150);
     ASSERT_EQ(log.lines().size(), 1U);
-    EXPECT_TRUE(log.lines()[0][0] == 'W' &&
-                log.lines()[0].find("Too many iterations in routine jacobi") != std::string::npos);
+    EXPECT_EQ(log.lines()[0][0], 'W');
+    EXPECT_NE(log.lines()[0].find("Too many iterations in routine jacobi"), std::string::npos);
 }
 
 TEST(KpMat4f, factorRebuildsItsInput)
@@ -263,13 +272,18 @@ TEST(KpMat4f, factorRebuildsItsInput)
         EXPECT_TRUE((r * scale * r.transpose() * u * move).equals(m, 2e-4F)) << m.dump();
         EXPECT_TRUE((u * u.transpose()).equals(KpMat4f::identity(), 2e-3F));
         EXPECT_EQ(s[0] < 0, m.det3() < 0);
-        EXPECT_TRUE(u.det3() > 0 && proj.isIdentity());
+        EXPECT_GT(u.det3(), 0);
+        EXPECT_TRUE(proj.isIdentity());
     }
     m.setScale(-1);
-    EXPECT_TRUE(m.factor(r, s, u, t, proj) && s == -ones && u.isIdentity());
+    EXPECT_TRUE(m.factor(r, s, u, t, proj));
+    EXPECT_EQ(s, -ones);
+    EXPECT_TRUE(u.isIdentity());
     m.setValue(origin, y, z, untouched);
     EXPECT_FALSE(m.factor(r, s, u, t, proj));
-    EXPECT_TRUE(t == untouched && u.isIdentity() && s == -ones);
+    EXPECT_EQ(t, untouched);
+    EXPECT_TRUE(u.isIdentity());
+    EXPECT_EQ(s, -ones);
 }
 
 TEST(KpMat4f, setTransformAppliesItsPartsInOrder)
@@ -297,7 +311,9 @@ TEST(KpMat4f, setTransformAppliesItsPartsInOrder)
     m.setScale(0);
     s = untouched;
     m.getTransform(t, r, s, so);
-    EXPECT_TRUE(r == KpRotation::identity() && so == KpRotation::identity() && s == untouched) << "singular";
+    EXPECT_EQ(r, KpRotation::identity()) << "singular";
+    EXPECT_EQ(so, KpRotation::identity()) << "singular";
+    EXPECT_EQ(s, untouched) << "singular";
 }
 
 TEST(KpMat4f, printsRowsInTwoLines)

@@ -60,9 +60,11 @@ TEST(KpPlane, meetsLinesAndPlanes)
 {
     KpVec3f out;
     float t = 5;
-    EXPECT_TRUE(KpPlane(z, 2).intersect(KpLine({1, 1, 4}, {1, 1, 5}), out, &t) && out == KpVec3f(1, 1, 2));
+    EXPECT_TRUE(KpPlane(z, 2).intersect(KpLine({1, 1, 4}, {1, 1, 5}), out, &t));
+    EXPECT_EQ(out, KpVec3f(1, 1, 2));
     EXPECT_FALSE(KpPlane(z, 2).intersect(KpLine(z * 2, z * 2 + x), out, &t)) << "in the plane";
-    EXPECT_TRUE(isNaN(out) && t == -2);
+    EXPECT_TRUE(isNaN(out));
+    EXPECT_EQ(t, -2);
     KpLine line;
     std::mt19937 random(1);
     for (int i = 0; i < 3000; ++i) {
@@ -78,9 +80,11 @@ TEST(KpPlane, meetsLinesAndPlanes)
         const KpVec3f d = line.direction() * line.direction();
         EXPECT_EQ(line.position()[static_cast<int>(std::max_element(d.begin(), d.end()) - d.begin())], 0);
     }
-    EXPECT_TRUE(KpPlane({1, -1, 0}, 1.0F).intersect(KpPlane(z, 1), line) && line.position().x() == 0) << "of equals";
+    EXPECT_TRUE(KpPlane({1, -1, 0}, 1.0F).intersect(KpPlane(z, 1), line)) << "of equals";
+    EXPECT_EQ(line.position().x(), 0) << "of equals";
     EXPECT_FALSE(KpPlane(z, 1).intersect(KpPlane({1e-6F, 0, 1}, 1.0F), line));
-    EXPECT_TRUE(isNaN(line.position()) && isNaN(line.direction()));
+    EXPECT_TRUE(isNaN(line.position()));
+    EXPECT_TRUE(isNaN(line.direction()));
 }
 
 TEST(KpPlane, movesWithMatrices)
@@ -105,7 +109,8 @@ TEST(KpPlane, movesWithMatrices)
     expectNear(skewed.normal() * std::sqrt(5.0F), {1, 0, 2}, 1e-6F);
     flat.transform(scale);
     flatInv.transformInv(scale);
-    EXPECT_TRUE(flat == KpPlane::emptyPlane() && flatInv == KpPlane::emptyPlane());
+    EXPECT_EQ(flat, KpPlane::emptyPlane());
+    EXPECT_EQ(flatInv, KpPlane::emptyPlane());
 }
 
 TEST(KpPlane, tellsParallelAndNearlyEqualOnes)
@@ -113,13 +118,16 @@ TEST(KpPlane, tellsParallelAndNearlyEqualOnes)
     const KpPlane plane(z, 2);
     EXPECT_EQ(plane.getDistance(KpPlane(-z, -5)), std::pair(true, 3.0F));
     const KpVec3f tilted(0.01F, 0, 1), skew(0.02F, 0, 1);  // cosines 0.99995 and 0.9998
-    EXPECT_TRUE(plane.isParallel(KpPlane(-tilted, 1)) && !plane.isParallel(KpPlane(skew, 1)));
-    EXPECT_TRUE(plane.isNearEqualNormal(tilted * 7, true) && plane.isNearEqualNormal(-z, false));
+    EXPECT_TRUE(plane.isParallel(KpPlane(-tilted, 1)));
+    EXPECT_FALSE(plane.isParallel(KpPlane(skew, 1)));
+    EXPECT_TRUE(plane.isNearEqualNormal(tilted * 7, true));
+    EXPECT_TRUE(plane.isNearEqualNormal(-z, false));
     EXPECT_FALSE(plane.isNearEqualNormal(skew, false) || plane.isNearEqualNormal(-z, true));
     const auto isNear = [&](const KpPlane& other, bool orientationMatters) {
         return plane.isNearEqualInROI(other, {1e9F, 0, 0}, 0, 0.5F, orientationMatters);
     };
-    EXPECT_TRUE(isNear({tilted, 2.5F}, true) && isNear({-z, -1.5F}, false));
+    EXPECT_TRUE(isNear({tilted, 2.5F}, true));
+    EXPECT_TRUE(isNear({-z, -1.5F}, false));
     EXPECT_FALSE(isNear({z, 2.6F}, true) || isNear({-z, -1.4F}, false) || isNear({-z, -2.0F}, true));
 }
 

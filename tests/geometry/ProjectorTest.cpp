@@ -77,7 +77,8 @@ TEST(KpSphereSheetProjector, worksInItsOwnSpace)
         for (float d = -3; d < 3; d += 0.25F) {
             const KpVec3f point = inSpace.project(screen(d, 1)), world = inWorld.project(screen(d, 1));
             expectNear(place.multVecMatrix(point), world);
-            EXPECT_TRUE(inSpace.isPointInFront(point) && !inSpace.isPointInFront(-point));
+            EXPECT_TRUE(inSpace.isPointInFront(point));
+            EXPECT_FALSE(inSpace.isPointInFront(-point));
         }
     }
 }

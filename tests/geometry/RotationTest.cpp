@@ -50,15 +50,18 @@ TEST(KpRotation, survivesOtherForms)
     KpMat4f larger;  // the corner of a matrix counts
     larger.setScale(4);
     larger[3][3] = 4;
-    EXPECT_TRUE(KpRotation(larger).norm() == 4 && KpRotation(larger).inverse()[3] == 0.5F);
+    EXPECT_EQ(KpRotation(larger).norm(), 4);
+    EXPECT_EQ(KpRotation(larger).inverse()[3], 0.5F);
     KpRotation quarter(z, pi / 2);
     quarter.scaleAngle(2);
     EXPECT_TRUE(quarter.equals(KpRotation(0, 0, 1, 0), tight));
 
     KpRotation(x, 1.9e-5F).getValue(axis, angle);
-    EXPECT_TRUE(axis == z && angle == 0) << "nearly no turn";
+    EXPECT_EQ(axis, z) << "nearly no turn";
+    EXPECT_EQ(angle, 0) << "nearly no turn";
     KpRotation(x, 2.1e-5F).getValue(axis, angle);
-    EXPECT_TRUE(axis == x && std::isnan(KpRotation(0, 0, 0, 0)[0]));
+    EXPECT_EQ(axis, x);
+    EXPECT_TRUE(std::isnan(KpRotation(0, 0, 0, 0)[0]));
 
     int beyond = 0;  // products of small turns with a w above 1
     for (float a = 1e-5F; a < 3e-3F; a += 1e-5F) {

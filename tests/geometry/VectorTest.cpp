@@ -16,11 +16,13 @@ TEST(KpVec, normalizesByItsOwnKindOfLength)
     KpVec3f v(2, -3, 6), tiny(1e-30F, 0, 0);
     EXPECT_EQ(v.normalize(), 7);
     EXPECT_EQ(v, KpVec3f(2.0F / 7, -3.0F / 7, 6.0F / 7));
-    EXPECT_TRUE(tiny.normalize() == 0 && tiny.x() == 1e-30F) << "its squares vanish";
+    EXPECT_EQ(tiny.normalize(), 0) << "its squares vanish";
+    EXPECT_EQ(tiny.x(), 1e-30F) << "its squares vanish";
     KpVec2f large(3e30F, -4e30F), zero(0, 0);
     EXPECT_FLOAT_EQ(large.normalize(), 5e30F) << "its squares would not fit in a float";
     EXPECT_FLOAT_EQ(large.y(), -0.8F);
-    EXPECT_TRUE(zero.normalize() == 0 && zero == KpVec2f(0, 0));
+    EXPECT_EQ(zero.normalize(), 0);
+    EXPECT_EQ(zero, KpVec2f(0, 0));
     EXPECT_EQ(KpVec3f(1e8F, 1, -1e8F).dot(KpVec3f(1, 1, 1)), 0) << "x and y first, in float";
 }
 
@@ -74,14 +76,17 @@ TEST(KpBox, growsFromNothing)
 
 TEST(KpFuzzyCompare, measuresBySmallerOperand)
 {
-    EXPECT_TRUE(kpFuzzyCompare(10000.0F, 10001.0F) && kpFuzzyCompare(0.0F, 0.0F));
+    EXPECT_TRUE(kpFuzzyCompare(10000.0F, 10001.0F));
+    EXPECT_TRUE(kpFuzzyCompare(0.0F, 0.0F));
     EXPECT_FALSE(kpFuzzyCompare(10000.0F, 10001.5F) || kpFuzzyCompare(0.0F, 1e-30F));
     EXPECT_FALSE(kpFuzzyCompare(NaN, NaN, infinity));
 
     const KpVec3f far(3000, 4000, 0);
-    EXPECT_TRUE(kpFuzzyCompare(origin, y * 1e-7F) && kpFuzzyCompare(far, far + z * 0.5F));
+    EXPECT_TRUE(kpFuzzyCompare(origin, y * 1e-7F));
+    EXPECT_TRUE(kpFuzzyCompare(far, far + z * 0.5F));
     EXPECT_FALSE(kpFuzzyCompare(origin, y * 2e-6F) || kpFuzzyCompare(far, far + (x + y) * 0.375F));
-    EXPECT_TRUE(kpFuzzyCompare(origin, {3, 4, 0}, 5) && !kpFuzzyCompare(origin, {3, 4, 0.01F}, 5));
+    EXPECT_TRUE(kpFuzzyCompare(origin, {3, 4, 0}, 5));
+    EXPECT_FALSE(kpFuzzyCompare(origin, {3, 4, 0.01F}, 5));
 
     const KpPlane plane(z, 2);
     EXPECT_TRUE(kpFuzzyCompare(plane, {-z, -2.5F}, 0.5F));
@@ -91,7 +96,8 @@ TEST(KpFuzzyCompare, measuresBySmallerOperand)
 
 TEST(MathUtils, answersAtItsBounds)
 {
-    EXPECT_TRUE(MathUtils::areParallel(x, x * -5, 1e-6F) && MathUtils::areParallel(origin, y, 1e-6F));
+    EXPECT_TRUE(MathUtils::areParallel(x, x * -5, 1e-6F));
+    EXPECT_TRUE(MathUtils::areParallel(origin, y, 1e-6F));
     EXPECT_FALSE(MathUtils::areParallel(x, x, 0) || MathUtils::areParallel(x, x * 100 + y, 0.009F));
     EXPECT_TRUE(MathUtils::areLinearlyIndependent(x, x + y, z * 1e-10F));
     EXPECT_FALSE(MathUtils::areLinearlyIndependent(x, y, x * 2 - y));

@@ -61,7 +61,8 @@ TEST_F(CreateUIDs, theTextIsMadeOfItsParts)
     EXPECT_EQ(std::strlen(pieces[8].c_str()), 18U);
     EXPECT_EQ(std::atoi(pieces[9].c_str()), kplib::detail::uidProcessPart(getpid()));
 
-    EXPECT_TRUE(creator.setRootUID("1.2") && creator.setVersion("9"));
+    EXPECT_TRUE(creator.setRootUID("1.2"));
+    EXPECT_TRUE(creator.setVersion("9"));
     EXPECT_FALSE(creator.setRootUID(""));
     EXPECT_STREQ(creator.lastError(), "[setRootUID] Got empty root UID.");
     EXPECT_FALSE(creator.setVersion(""));

@@ -53,7 +53,8 @@ TEST(InstanceList, isStoredBehindItsCommonPrefix)
         ASSERT_TRUE(Utility::sopUIDList(&bundle, read));
         EXPECT_EQ(asVector(read), asVector(each.list));
         KpDArray<KpString> texts = strings({"old"});
-        EXPECT_TRUE(Utility::sopUIDList(&bundle, texts) && texts.size() == read.size());
+        EXPECT_TRUE(Utility::sopUIDList(&bundle, texts));
+        EXPECT_EQ(texts.size(), read.size());
         EXPECT_EQ(stored(bundle, "MD5Hash"), Utility::sopUIDHash(each.list).c_str());
         EXPECT_FALSE(Utility::sopUIDList(&bundle, read));  // not empty any more
     }
@@ -119,7 +120,8 @@ TEST(InstanceList, aListOutOfOrderIsNone)
         Utility::setSopUIDList(&bundle, List({"1.2", "2.3", "3.4"}));
         bundle.remove(missing);
         KpDArray<KpString> untouched = strings({"x"});
-        EXPECT_TRUE(!Utility::sopUIDList(&bundle, untouched) && untouched.size() == 1) << missing;
+        EXPECT_FALSE(Utility::sopUIDList(&bundle, untouched)) << missing;
+        EXPECT_EQ(untouched.size(), 1) << missing;
         Utility::setSopUIDList(&bundle, List());
         EXPECT_EQ(bundle.size(), 0);
     }
@@ -140,7 +142,8 @@ TEST(InstanceList, referencesAreExpandedToFrames)
     EXPECT_EQ(Utility::getReferencedSOPUIDsAndFrameNumbers(object, true, nullptr)[1].frame, -1);
     object.setTag("G0028-0008", "2");
     const auto expanded = Utility::getReferencedSOPUIDsAndFrameNumbers(object, true, nullptr);
-    EXPECT_TRUE(expanded.size() == 6 && expanded[1] == (Utility::SopUIDAndFrame{"1.2.0", 1}));
+    EXPECT_EQ(expanded.size(), 6);
+    EXPECT_EQ(expanded[1], (Utility::SopUIDAndFrame{"1.2.0", 1}));
     EXPECT_EQ(Utility::getReferencedSOPUIDsAndFrameNumbers(object, false, &ok), (Entries{{"1.2", 0}, {"1.2", 1}}));
 }
 

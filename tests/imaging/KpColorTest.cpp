@@ -30,9 +30,11 @@ TEST(KpColor, readsTexts)
     EXPECT_TRUE(color.setValue(3, words));
     EXPECT_EQ(color, KpColor(0.5f, 0.25f, 1));
     color.setValue(0xFF8001);
-    EXPECT_TRUE(color.equals(KpColor(1, grey, 1 / 255.0f), 1e-6f) && !color.equals(KpColor(1, grey, 0), 1e-6f));
+    EXPECT_TRUE(color.equals(KpColor(1, grey, 1 / 255.0f), 1e-6f));
+    EXPECT_FALSE(color.equals(KpColor(1, grey, 0), 1e-6f));
     KpColor::getColorFromName = [](float* red, float*, float*, const char* name) { *red = name[0] == 'r' ? 0.5f : 0; };
-    EXPECT_TRUE(color.setValue("  red") && color.red() == 0.5f);
+    EXPECT_TRUE(color.setValue("  red"));
+    EXPECT_EQ(color.red(), 0.5f);
     KpColor::getColorFromName = nullptr;
 }
 
@@ -82,5 +84,6 @@ TEST(KpColor, tellsOfClampedBlueOnly)
     EXPECT_TRUE(XYZ2rgb(black, rgb));
     EXPECT_TRUE(XYZ2rgb(blue, rgb));
     EXPECT_FALSE(XYZ2rgb(redOnly, rgb)) << "red far above 1, green below 0, blue within";
-    EXPECT_TRUE(rgb[0] == 1 && rgb[1] == 0);
+    EXPECT_EQ(rgb[0], 1);
+    EXPECT_EQ(rgb[1], 0);
 }

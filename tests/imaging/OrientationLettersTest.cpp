@@ -49,9 +49,12 @@ TEST(KpOrientationLetters, readsStrings)
                  {"l", "P", "///", false, "acs"},          {"L", "", "///", false, "acs"}};
     for (const auto& c : cases) {
         const Letters l(c.right, c.bottom);
-        EXPECT_TRUE(l.join('/') == c.edges && l.isValid() == c.isValid) << l.join('/') << " not " << c.edges;
+        EXPECT_EQ(l.join('/'), c.edges) << l.join('/') << " not " << c.edges;
+        EXPECT_EQ(l.isValid(), c.isValid) << l.join('/') << " not " << c.edges;
         const auto is = [&](char slice) { return c.slices.find(slice) != std::string::npos; };
-        EXPECT_TRUE(l.isAxial() == is('a') && l.isCoronal() == is('c') && l.isSagittal() == is('s')) << c.edges;
+        EXPECT_EQ(l.isAxial(), is('a')) << c.edges;
+        EXPECT_EQ(l.isCoronal(), is('c')) << c.edges;
+        EXPECT_EQ(l.isSagittal(), is('s')) << c.edges;
     }
 }
 
@@ -77,8 +80,11 @@ TEST(KpOrientationLetters, givesViewAndUp)
         EXPECT_TRUE(letters.getViewDirection(view, up, c.matrix, false));
         EXPECT_LT((view - c.view).length() + (up - c.up).length(), 1e-6F) << letters.join('/') << view << up;
         EXPECT_TRUE(letters.getViewDirection(view, up, c.matrix, true));
-        EXPECT_TRUE(view == c.snappedView && up == c.snappedUp) << letters.join('/') << view << up;
+        EXPECT_EQ(view, c.snappedView) << letters.join('/') << view << up;
+        EXPECT_EQ(up, c.snappedUp) << letters.join('/') << view << up;
     }
     KpVec3f view(1, 2, 3), up = view;
-    EXPECT_TRUE(!Letters("L", "R").getViewDirection(view, up, one, true) && view == KpVec3f(1, 2, 3) && up == view);
+    EXPECT_FALSE(Letters("L", "R").getViewDirection(view, up, one, true));
+    EXPECT_EQ(view, KpVec3f(1, 2, 3));
+    EXPECT_EQ(up, view);
 }

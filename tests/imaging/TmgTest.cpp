@@ -90,13 +90,15 @@ TEST(TmgText, patternsMatchAsTriedOneByOne)
         const bool expected = plainMatch(pattern.c_str(), subject.c_str(), '%', '_');
         ASSERT_EQ(Tmg::match(pattern.c_str(), subject.c_str(), '%', '_'), expected) << pattern << ' ' << subject;
     }
-    EXPECT_TRUE(Tmg::match("a?b", "ab", '*', '?') && Tmg::match("a?b", "axb", '*', '?'));
+    EXPECT_TRUE(Tmg::match("a?b", "ab", '*', '?'));
+    EXPECT_TRUE(Tmg::match("a?b", "axb", '*', '?'));
     EXPECT_FALSE(Tmg::match(std::string(2000, '*').append("b").c_str(), std::string(2000, 'a').c_str(), '*', '?'));
 }
 
 TEST(TmgText, setsAndValuesAreLists)
 {
-    EXPECT_TRUE(Tmg::matchSet("mr\\c*", "ct", "\\") && Tmg::matchSet("A", "b a", " "));
+    EXPECT_TRUE(Tmg::matchSet("mr\\c*", "ct", "\\"));
+    EXPECT_TRUE(Tmg::matchSet("A", "b a", " "));
     EXPECT_FALSE(Tmg::matchSet("mr", "ct", "\\") || Tmg::matchSet(nullptr, "a", " ") || Tmg::matchSet("a", "", " "));
     const struct {
         const char *target, *additions, *separators, *result;
@@ -168,13 +170,15 @@ TEST(TmgImages, tagsOfAnImageAreItsOwnOrTheVolumes)
     };
     EXPECT_FALSE(ask(0, "G0018-0050") || approximate);  // constant in a volume
     object.dicomAllCreate()->set("G0008-0032", "Acquisition Time: 0815");
-    EXPECT_TRUE(ask(0, "G0008-0032") && approximate);
+    EXPECT_TRUE(ask(0, "G0008-0032"));
+    EXPECT_TRUE(approximate);
     EXPECT_STREQ(value, "0815");
 
     HxParamBundle* list = object.bundle("ImageNumberList", 1);
     Tmg::setImageTagList(list, KpDArray<KpString>({"1,10.5,", "2"}));
     object.set("ImageLevelTags", "G0020-0013,G0020-1041,G0018-1041");
-    EXPECT_TRUE(ask(0, "G0020-1041") && !approximate);
+    EXPECT_TRUE(ask(0, "G0020-1041"));
+    EXPECT_FALSE(approximate);
     EXPECT_STREQ(value, "10.5");
     EXPECT_FALSE(ask(1, "G0020-1041") || approximate);
     EXPECT_STREQ(value, "10.5");  // no such field: stays
@@ -182,9 +186,11 @@ TEST(TmgImages, tagsOfAnImageAreItsOwnOrTheVolumes)
     EXPECT_STREQ(value, "");  // an empty field
     EXPECT_FALSE(ask(2, "G0020-0013") || approximate);
     EXPECT_FALSE(ask(0, "1041") || approximate);  // part of a name
-    EXPECT_TRUE(ask(0, "G0008-0032") && approximate);
+    EXPECT_TRUE(ask(0, "G0008-0032"));
+    EXPECT_TRUE(approximate);
     object.bundle("SOPInstanceUIDs", 1)->set("NumInputImages", 1);
-    EXPECT_TRUE(ask(0, "G0008-0032") && !approximate);
+    EXPECT_TRUE(ask(0, "G0008-0032"));
+    EXPECT_FALSE(approximate);
 }
 
 TEST(TmgSeries, imagesBelongToWhoHoldsThem)

@@ -135,7 +135,9 @@ TEST(KpLogFileCompanions, restoreWhatTheyFound)
         const KpLogFileScopedWriteCallbackDisabler scoped;
         EXPECT_FALSE(log.writeCallback());
     }
-    EXPECT_TRUE(!log.defaultModule() && log.writeCallback() == receive && log.writeCallbackLogLevel() == KpLogWarning);
+    EXPECT_FALSE(log.defaultModule());
+    EXPECT_EQ(log.writeCallback(), receive);
+    EXPECT_EQ(log.writeCallbackLogLevel(), KpLogWarning);
     log.setWriteCallback(nullptr, KpLogOff);
 }
 

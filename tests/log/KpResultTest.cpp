@@ -38,9 +38,14 @@ TEST(KpResult, recordsAFailureOnceAndNoSuccess)
     static_assert(sizeof(KpResult) == sizeof(void*));
     const LogCapture log;
     const KpResult ok(KpResult::Ok, 7, "f", "t", "d"), result(5000, 12, "f.cpp", "text", "data"), shared = result;
-    EXPECT_TRUE(ok.isOk() && std::string(ok.text()) + ok.file() + ok.data() == "" && ok.line() == 0);
+    EXPECT_TRUE(ok.isOk());
+    EXPECT_EQ(std::string(ok.text()) + ok.file() + ok.data(), "");
+    EXPECT_EQ(ok.line(), 0);
     EXPECT_EQ(log.lines(), Lines{"D [KpResult::Error] code: 1388 file: f.cpp line: 12 message: text data: data"});
-    EXPECT_TRUE(shared.isBad() && shared.code() == 5000 && shared.line() == 12 && shared.text() == result.text());
+    EXPECT_TRUE(shared.isBad());
+    EXPECT_EQ(shared.code(), 5000);
+    EXPECT_EQ(shared.line(), 12);
+    EXPECT_EQ(shared.text(), result.text());
 }
 
 TEST_F(TmTest, codesHaveTheirOwnTexts)
@@ -99,8 +104,10 @@ TEST_F(TmTest, tmErrorTellsThePlace)
                  "more\nin_function=fn\ndate=d\ntime=t");
     EXPECT_TRUE(Tm::lastError(true).isOk()) << "which was not to be set";
     const KpResult here = KP_ERROR_DATA(KpResult::OutOfRange, "index");
-    EXPECT_TRUE(here.line() == __LINE__ - 1 && Tm::lastError(true).text() == here.text());
-    EXPECT_TRUE(KP_ERROR(KpResult::Ok).isOk() && Tm::lastError(true).isOk()) << "a success clears it";
+    EXPECT_EQ(here.line(), __LINE__ - 1);
+    EXPECT_EQ(Tm::lastError(true).text(), here.text());
+    EXPECT_TRUE(KP_ERROR(KpResult::Ok).isOk()) << "a success clears it";
+    EXPECT_TRUE(Tm::lastError(true).isOk()) << "a success clears it";
 }
 
 TEST(TmThreads, eachThreadHasItsLastError)

@@ -100,14 +100,16 @@ TEST_F(LogFilesTest, theLineThatCrossesTheLimitStays)
     log->writeLine(KpLogError, line.c_str());
     EXPECT_FALSE(log->chunkIsFull());  // at the limit
     log->writeCharBuffer("y");
-    EXPECT_TRUE(path() == first && log->chunkIsFull());
+    EXPECT_EQ(path(), first);
+    EXPECT_TRUE(log->chunkIsFull());
     log->writeLine(KpLogError, line.c_str());
     EXPECT_NE(path(), first);
     EXPECT_EQ(contentOf(first), line + "\ny");
     EXPECT_EQ(contentOf(path()), continues + first + "\n" + line + "\n");
     log->setMaxLogFileSizeInBytes(0);
     EXPECT_FALSE(log->chunkIsFull());
-    EXPECT_TRUE(log->open(true) && contentOf(path()).empty());
+    EXPECT_TRUE(log->open(true));
+    EXPECT_TRUE(contentOf(path()).empty());
     log->close();
     EXPECT_FALSE(log->isOpen() || log->chunkIsFull() || path().empty());
 }
@@ -121,7 +123,8 @@ TEST_F(LogFilesTest, whatCantBeOpenedLeavesTheLogUsable)
     std::filesystem::rename(folder, temp / "moved");
     temp.file("logs");  // a file in place of the folder
     EXPECT_FALSE(log->open(true));
-    EXPECT_TRUE(path() == first && log->isOpen());
+    EXPECT_EQ(path(), first);
+    EXPECT_TRUE(log->isOpen());
     log->error(nullptr, "2");
     std::filesystem::remove(folder);
     log->error(nullptr, "3");  // the folder is made again
@@ -144,7 +147,9 @@ TEST_F(LogFilesTest, appendGoesOnWhereAFileEnds)
 {
     const std::string file = temp.file("file", std::string(1000, 'x'));
     log->setMaxLogFileSizeInBytes(1000);
-    EXPECT_TRUE(log->append(file.c_str()) && log->isOpen() && !log->chunkIsFull());
+    EXPECT_TRUE(log->append(file.c_str()));
+    EXPECT_TRUE(log->isOpen());
+    EXPECT_FALSE(log->chunkIsFull());
     log->setMaxLogFileSizeInBytes(999);
     EXPECT_TRUE(log->chunkIsFull());
     log->writeCharBuffer("y");
@@ -184,7 +189,8 @@ TEST_F(LogFilesTest, onlyCleanUpLogsAMissingFolder)
     const kplib::test::LogCapture capture;
     log->cleanUp();
     EXPECT_EQ(capture.lines(), kplib::test::Lines{"E [] Can't open dir " + folder + "\n"});
-    EXPECT_TRUE(log->open(false) && !log->append((temp / "no/file").c_str()));
+    EXPECT_TRUE(log->open(false));
+    EXPECT_FALSE(log->append((temp / "no/file").c_str()));
     EXPECT_EQ(capture.lines().size(), 1U);
 }
 
@@ -200,12 +206,14 @@ TEST_F(LogFilesTest, theFileOfTheSameSecondStays)
 
 TEST_F(LogFilesTest, theEnvironmentSetsLimits)
 {
-    EXPECT_TRUE(log->maxNumLogFiles() == 40 && log->logLevel() == KpLogInfo);
+    EXPECT_EQ(log->maxNumLogFiles(), 40);
+    EXPECT_EQ(log->logLevel(), KpLogInfo);
     for (const auto& [files, debug] : {std::pair("7", "1"), {"x", "0"}}) {
         setenv("TAMRIN_MAXNUMLOGFILES", files, 1);
         setenv("TAMRIN_DEBUG_LOG", debug, 1);
         const std::unique_ptr<KpLogFile> made(KpLogFile::createInstance());
-        EXPECT_TRUE(made->maxNumLogFiles() == std::atoi(files) && made->debugEnabled() == (*debug == '1'));
+        EXPECT_EQ(made->maxNumLogFiles(), std::atoi(files));
+        EXPECT_EQ(made->debugEnabled(), (*debug == '1'));
     }
     unsetenv("TAMRIN_MAXNUMLOGFILES");
     unsetenv("TAMRIN_DEBUG_LOG");
@@ -218,7 +226,8 @@ TEST_F(LogFilesTest, theConsoleGoesToTheFileAndBack)
     for (const int i : {0, 1, 2, 3}) {
         const bool hasTerminal = i % 2, hasConsole = i / 2;
         const int master = posix_openpt(O_RDWR | O_NOCTTY);
-        ASSERT_TRUE(grantpt(master) == 0 && unlockpt(master) == 0);
+        ASSERT_EQ(grantpt(master), 0);
+        ASSERT_EQ(unlockpt(master), 0);
         const int terminal = open(ptsname(master), O_RDWR | O_NOCTTY);
         EXPECT_TRUE(inOwnSession([&] {
             EXPECT_TRUE(!hasTerminal || ioctl(terminal, TIOCSCTTY, 0) == 0);
@@ -230,7 +239,8 @@ TEST_F(LogFilesTest, theConsoleGoesToTheFileAndBack)
             const std::string first = path();
             log->setConsoleToLogEnabled(true);
             const std::string second = path();
-            EXPECT_TRUE(second != first && log->isOpen());
+            EXPECT_NE(second, first);
+            EXPECT_TRUE(log->isOpen());
             say("raw\n");
             log->error(nullptr, "line");
             log->writeCharBuffer("text\n");

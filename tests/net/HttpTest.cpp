@@ -25,11 +25,17 @@ TEST(KpHttpGet, takesUrlsApart)
         {"http://h/a:b", "h/a", 0, "/"}, {"http://h/a:7/b:c", "h/a", 7, "/b:c"},
     };
     KpHttpGet get;
-    for (const auto& c : cases)
-        EXPECT_TRUE(get.setURL(c.url) && get.host() == c.host && get.port() == c.port && get.path() == c.path) << c.url;
+    for (const auto& c : cases) {
+        EXPECT_TRUE(get.setURL(c.url)) << c.url;
+        EXPECT_EQ(get.host(), c.host) << c.url;
+        EXPECT_EQ(get.port(), c.port) << c.url;
+        EXPECT_EQ(get.path(), c.path) << c.url;
+    }
     for (const char* url : {"ftp://h/p", "HTTP://h/p", "", static_cast<const char*>(nullptr)}) {
         EXPECT_TRUE(get.setURL("http://h"));
-        EXPECT_TRUE(!get.request(url) && get.host().empty() && get.state() == KpHttpGet::NotConnected);
+        EXPECT_FALSE(get.request(url));
+        EXPECT_TRUE(get.host().empty());
+        EXPECT_EQ(get.state(), KpHttpGet::NotConnected);
     }
 }
 
@@ -49,19 +55,28 @@ TEST(KpHttpGet, sendsOneRequestAConnectionUnlessAllWasRead)
         EXPECT_EQ(get.read(buffer, 4), -1);
         EXPECT_EQ(get.errorText(), "Not connected");
         const auto all = [&] { return get.read(buffer, 3) == 3 && get.read(buffer + 3, 5) == 1; };
-        EXPECT_TRUE(get.request(url.c_str()) && all());
+        EXPECT_TRUE(get.request(url.c_str()));
+        EXPECT_TRUE(all());
         EXPECT_STREQ(buffer, "body");
-        EXPECT_TRUE(get.request(url.c_str(), 0, 99) && all());
-        EXPECT_TRUE(get.request(url.c_str(), 5, 5) && get.read(buffer, 2) == 2 && get.status() == 200);
+        EXPECT_TRUE(get.request(url.c_str(), 0, 99));
+        EXPECT_TRUE(all());
+        EXPECT_TRUE(get.request(url.c_str(), 5, 5));
+        EXPECT_EQ(get.read(buffer, 2), 2);
+        EXPECT_EQ(get.status(), 200);
         EXPECT_EQ(server.connections, 1);
         EXPECT_TRUE(get.request(url.c_str()));  // after a part of a body
-        EXPECT_TRUE(get.contentLength() == 4 && get.state() == KpHttpGet::ReadingBody);
-        EXPECT_TRUE(get.request(url.c_str()) && get.status() == 0);            // after a head
-        EXPECT_TRUE(get.request(url.c_str(), ULONG_MAX, ULONG_MAX) && all());  // after neither
+        EXPECT_EQ(get.contentLength(), 4);
+        EXPECT_EQ(get.state(), KpHttpGet::ReadingBody);
+        EXPECT_TRUE(get.request(url.c_str()));
+        EXPECT_EQ(get.status(), 0);  // after a head
+        EXPECT_TRUE(get.request(url.c_str(), ULONG_MAX, ULONG_MAX));
+        EXPECT_TRUE(all());  // after neither
         EXPECT_EQ(server.connections, 4);
-        EXPECT_TRUE(get.bytesRead() == 4 && get.elapsedTime() > 0);
+        EXPECT_EQ(get.bytesRead(), 4);
+        EXPECT_GT(get.elapsedTime(), 0);
         get.cancel();
-        EXPECT_TRUE(get.state() == KpHttpGet::NotConnected && get.status() == 0);
+        EXPECT_EQ(get.state(), KpHttpGet::NotConnected);
+        EXPECT_EQ(get.status(), 0);
     }
     requests.erase(std::remove(requests.begin(), requests.end(), head + "\r\n"), requests.end());
     ASSERT_GE(requests.size(), 3U);
@@ -166,14 +181,16 @@ TEST(KpHttpGet, readsRangesFromNginx)
         const auto first = static_cast<unsigned long>(spot);
         const long wanted = std::min(nginx.size - spot, static_cast<long>(buffer.size()));
         ASSERT_TRUE(get.request(nginx.url().c_str(), first, first + buffer.size() - 1));
-        EXPECT_TRUE(get.read(buffer.data(), ULONG_MAX) == wanted && get.status() == 206);
+        EXPECT_EQ(get.read(buffer.data(), ULONG_MAX), wanted);
+        EXPECT_EQ(get.status(), 206);
         EXPECT_EQ(std::memcmp(buffer.data(), &spot, sizeof(spot)), 0);
     }
     ASSERT_TRUE(get.request(nginx.url().c_str()));
     while (get.read(buffer.data(), buffer.size()) > 0) {
     }
     EXPECT_EQ(get.bytesRead(), nginx.size);
-    EXPECT_TRUE(get.request(nginx.url().c_str(), nginx.size, nginx.size + 1) && get.contentLength() > 0);
+    EXPECT_TRUE(get.request(nginx.url().c_str(), nginx.size, nginx.size + 1));
+    EXPECT_GT(get.contentLength(), 0);
     EXPECT_EQ(get.status(), 416);
 }
 

@@ -82,12 +82,14 @@ TEST(Message, theFourTextFormsDiffer)
     EXPECT_EQ(text, reinterpret_cast<char*>(msg.dataPtr()) + 4);  // no copy
     EXPECT_EQ(null, nullptr);
     EXPECT_EQ(bytes, std::string("a\0b", 3));
-    EXPECT_TRUE(string == "k" && name == "/f");
+    EXPECT_EQ(string, "k");
+    EXPECT_EQ(name, "/f");
     ASSERT_EQ(texts.size(), 2);
     EXPECT_STREQ(texts[0], "ab");
     EXPECT_EQ(texts[1], nullptr);
     msg >> texts;  // a count below 1
-    EXPECT_TRUE(texts.size() == 0 && msg.bytesAvailable() == 0);
+    EXPECT_EQ(texts.size(), 0);
+    EXPECT_EQ(msg.bytesAvailable(), 0);
 }
 
 template <typename T>
@@ -137,7 +139,8 @@ TEST(Message, compositesHaveTheirForms)
         EXPECT_EQ(msg.size(), 4 + (bits ? bits / 32 + 1 : 0) * 4);
         KpBitfield copy(7, KpBitfield::INIT_SET);
         msg >> copy;
-        EXPECT_TRUE(copy == field && copy.nWords() == field.nWords());
+        EXPECT_EQ(copy, field);
+        EXPECT_EQ(copy.nWords(), field.nWords());
     }
 
     unsigned char foreign[8] = {};
@@ -151,7 +154,9 @@ TEST(Message, compositesHaveTheirForms)
     back >> skipped;
     outer >> back >> after;
     back >> content;
-    EXPECT_TRUE(content == 5 && after == 6 && foreign[0] == 0);
+    EXPECT_EQ(content, 5);
+    EXPECT_EQ(after, 6);
+    EXPECT_EQ(foreign[0], 0);
     inner << inner;
     EXPECT_EQ(hex(inner), "05000000" + marks + five);
 }
@@ -165,7 +170,9 @@ TEST(Message, imagesLoseTheirGaps)
     msg << image << KpTypedData2D();
     KpTypedData2D copy, none(2, 2, KpPrimType::Byte, 1);
     msg >> copy >> none;
-    EXPECT_TRUE(copy.isContiguous() && copy.dims()[0] == 2 && copy.dims()[1] == 2);
+    EXPECT_TRUE(copy.isContiguous());
+    EXPECT_EQ(copy.dims()[0], 2);
+    EXPECT_EQ(copy.dims()[1], 2);
     EXPECT_EQ(std::memcmp(copy.data(), "\1\2\3\4", 4), 0);
     EXPECT_EQ(none.data(), nullptr);
     EXPECT_EQ(none.dims()[0], 0);
@@ -178,7 +185,9 @@ TEST(Message, anArrayThatIsNotThereIsOneErrorLine)
     msg << 100U << 7;
     KpDArray<int> array{42};
     msg >> array;
-    EXPECT_TRUE(array.size() == 100 && array[0] == 42 && msg.readOffset() == 404);
+    EXPECT_EQ(array.size(), 100);
+    EXPECT_EQ(array[0], 42);
+    EXPECT_EQ(msg.readOffset(), 404);
     EXPECT_EQ(LogCapture::lines(),
               Lines{"E [] Buffer overrun in TmMsg::readKpDArray(), offset=4, numBytes=400, size=8"});
 }
@@ -208,7 +217,9 @@ TEST(Message, nothingIsReadBeyondTheEnd)
         msg << 2 << 0 << width << height << 0;
         KpTypedData2D image(1, 1, KpPrimType::Byte, 1);
         msg >> image;
-        EXPECT_TRUE(!image.data() && image.dims()[0] == 0 && image.dims()[1] == 0);
+        EXPECT_FALSE(image.data());
+        EXPECT_EQ(image.dims()[0], 0);
+        EXPECT_EQ(image.dims()[1], 0);
     }
     unsigned char endless[] = {1, 0, 0, 0, 'x', 'y'};
     TmMsg msg(5, endless);  // texts without a NUL
@@ -219,12 +230,15 @@ TEST(Message, nothingIsReadBeyondTheEnd)
     KpString text("old"), none("old");
     int number = 5;
     msg >> text >> none >> number;
-    EXPECT_TRUE(text == "x" && none == "" && number == 0);
+    EXPECT_EQ(text, "x");
+    EXPECT_EQ(none, "");
+    EXPECT_EQ(number, 0);
     TmMsg odd;
     odd << KpDArray<unsigned char>{2, 0};
     KpDArray<bool> bools;
     odd >> bools;  // a byte of 2 is a true like others
-    EXPECT_TRUE(bools[0] == true && bools[1] == false);
+    EXPECT_EQ(bools[0], true);
+    EXPECT_EQ(bools[1], false);
 }
 
 TEST(Message, bytesOfOthersAreNeitherFreedNorWritten)
@@ -238,7 +252,10 @@ TEST(Message, bytesOfOthersAreNeitherFreedNorWritten)
     msg >> number;
     EXPECT_EQ(number, 1);
     const TmMsg copy(msg);
-    EXPECT_TRUE(copy == msg && copy.isMarked(1) && !copy.isMarked(0) && copy.dataPtr() != bytes);
+    EXPECT_EQ(copy, msg);
+    EXPECT_TRUE(copy.isMarked(1));
+    EXPECT_FALSE(copy.isMarked(0));
+    EXPECT_NE(copy.dataPtr(), bytes);
 
     // What appending follows, and what is left of the message before it.
     const std::pair<const char*, void (*)(TmMsg&)> writers[] = {
@@ -275,16 +292,24 @@ TEST(Message, readOffsetAndBytesAreIndependent)
     msg >> number;
     const unsigned char* const storage = msg.dataPtr();
     msg.take(other);  // reads on at its old offset
-    EXPECT_TRUE(other.dataPtr() == storage && other.readOffset() == 0 && msg.readOffset() == 4);
+    EXPECT_EQ(other.dataPtr(), storage);
+    EXPECT_EQ(other.readOffset(), 0);
+    EXPECT_EQ(msg.readOffset(), 4);
     msg = other;
-    EXPECT_TRUE(hex(msg) == hex(other) && msg.readOffset() == 4 && !(msg == other));
+    EXPECT_EQ(hex(msg), hex(other));
+    EXPECT_EQ(msg.readOffset(), 4);
+    EXPECT_FALSE(msg == other);
     other >> number;
-    EXPECT_TRUE(number == 1 && msg == other);
+    EXPECT_EQ(number, 1);
+    EXPECT_EQ(msg, other);
 
     other.reset(0);
-    EXPECT_TRUE(other.size() == 0 && other.readOffset() == 0 && other.dataPtr() == storage);
+    EXPECT_EQ(other.size(), 0);
+    EXPECT_EQ(other.readOffset(), 0);
+    EXPECT_EQ(other.dataPtr(), storage);
     msg.reset(4, 100);
-    EXPECT_TRUE(hex(msg) == "01000000" && msg.readOffset() == 0);
+    EXPECT_EQ(hex(msg), "01000000");
+    EXPECT_EQ(msg.readOffset(), 0);
     for (int i = 0; i < 10; ++i)  // its own bytes, also where they move with a growth
         other.writeRawBytes(i ? other.size() : 4, i ? other.dataPtr() : msg.dataPtr());
     EXPECT_EQ(other.size(), 2048U);

@@ -84,7 +84,8 @@ TEST(KpSocket, connectsByAddressByNameAndToThisMachine)
         EXPECT_FALSE(KpSocket::isNonBlocking(socket));
         KpSocket::setTimeout(socket, 2500);
         const timeval timeout = option<timeval>(socket, SOL_SOCKET, SO_RCVTIMEO);
-        EXPECT_TRUE(timeout.tv_sec == 2 && timeout.tv_usec == 500000);
+        EXPECT_EQ(timeout.tv_sec, 2);
+        EXPECT_EQ(timeout.tv_usec, 500000);
         KpSocket::setNoDelay(socket, true);
         EXPECT_EQ(option(socket, IPPROTO_TCP, TCP_NODELAY), 1);
         EXPECT_EQ(KpSocket::close(socket), 0);
@@ -203,7 +204,8 @@ TEST(KpSocket, waitsOneTimeoutForTheRest)
     const auto start = std::chrono::steady_clock::now();
     EXPECT_EQ(KpSocket::receive(pair.mine, received, 20, 0), -1);
     const std::chrono::duration<double> waited = std::chrono::steady_clock::now() - start;
-    EXPECT_TRUE(waited.count() > 0.25 && waited.count() < 0.5) << waited.count();
+    EXPECT_GT(waited.count(), 0.25) << waited.count();
+    EXPECT_LT(waited.count(), 0.5) << waited.count();
     KpSocket::close(pair.peer);
 }
 

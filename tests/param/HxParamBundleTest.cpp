@@ -57,10 +57,13 @@ TEST(HxParamBundle, keepsBundlesFirstAndReplacesInPlace)
     fresh->touch(1);
     bundle.untouchAll(255);
     bundle.insert(fresh, 1);
-    EXPECT_TRUE(bundle.index(fresh) == 2 && fresh->flags() == HxParamBase::FlagHidden && fresh->touched() == 17);
+    EXPECT_EQ(bundle.index(fresh), 2);
+    EXPECT_EQ(fresh->flags(), HxParamBase::FlagHidden);
+    EXPECT_EQ(fresh->touched(), 17);
     EXPECT_EQ(bundle.touched(), HxParamBase::TouchValue | HxParamBase::TouchAny);
     bundle.insert(new HxParamBundle("SUB"), 1);
-    EXPECT_TRUE(bundle.isSorted() && bundle.index(bundle.bundle("Sub")) == 0);
+    EXPECT_TRUE(bundle.isSorted());
+    EXPECT_EQ(bundle.index(bundle.bundle("Sub")), 0);
     bundle.insert(new HxParamBundle("Third"), 1);
     EXPECT_FALSE(bundle.isSorted() || bundle.bundle(3) || bundle.bundle(-1));
     fresh->setFlag(HxParamBase::FlagNoDelete, 1);
@@ -78,13 +81,15 @@ TEST(HxParamBundle, isFoundByNameAndTitle)
     EXPECT_EQ(root.bundle("Left lung", 1), lung) << "found again, not replaced";
     EXPECT_EQ(root.findBase("lung"), lung);
     EXPECT_FALSE(root.bundle("lun") || root.bundle("lung left") || root.bundle(nullptr));
-    EXPECT_TRUE(root.bundle("3D", 1) && root.bundle("3D") == root.bundle("_3d"));
+    EXPECT_TRUE(root.bundle("3D", 1));
+    EXPECT_EQ(root.bundle("3D"), root.bundle("_3d"));
     lung->set("Name", " 1 2  3 4 5 6 7 8 9 10 11 12 13 14 15 _16 _17");
     EXPECT_EQ(root.bundle("16"), lung) << "a digit asked for has the _ of names";
     EXPECT_EQ(root.bundle("17"), nullptr) << "the 17th word";
     EXPECT_EQ(root.boundaryIds(1)->flags(), 36);
     root.bundle("Materials", 1)->set("x", 1);
-    EXPECT_TRUE(root.materials(0)->flags() == 52 && (*root.materials(0))[0]->flags() == 4);
+    EXPECT_EQ(root.materials(0)->flags(), 52);
+    EXPECT_EQ((*root.materials(0))[0]->flags(), 4);
 }
 
 TEST(HxParamBundle, answersByDimensionAndType)
@@ -110,14 +115,23 @@ TEST(HxParamBundle, readsNumbers)
     bundle.set("text", "1 2");
     bundle.set("real", "1.5 7");
     int n[3] = {9, 9, 9};
-    EXPECT_TRUE(!bundle.findNum("text", 3, n) && n[0] == 1 && n[1] == 2 && n[2] == 9);
-    EXPECT_TRUE(bundle.findNum("real", 3, n) && n[0] == 1 && n[1] == 0 && n[2] == 0)
-        << "nothing passes the point: .5 is read as 0 again and again";
-    EXPECT_TRUE(bundle.findNum("pair", 2, n) && n[1] == -5);
-    EXPECT_TRUE(!bundle.findNum("pair", 0, n) && bundle.findNum("text", 0, n));
+    EXPECT_FALSE(bundle.findNum("text", 3, n));
+    EXPECT_EQ(n[0], 1);
+    EXPECT_EQ(n[1], 2);
+    EXPECT_EQ(n[2], 9);
+    EXPECT_TRUE(bundle.findNum("real", 3, n)) << "nothing passes the point: .5 is read as 0 again and again";
+    EXPECT_EQ(n[0], 1) << "nothing passes the point: .5 is read as 0 again and again";
+    EXPECT_EQ(n[1], 0) << "nothing passes the point: .5 is read as 0 again and again";
+    EXPECT_EQ(n[2], 0) << "nothing passes the point: .5 is read as 0 again and again";
+    EXPECT_TRUE(bundle.findNum("pair", 2, n));
+    EXPECT_EQ(n[1], -5);
+    EXPECT_FALSE(bundle.findNum("pair", 0, n));
+    EXPECT_TRUE(bundle.findNum("text", 0, n));
     double d[3] = {};
     float f[3] = {};
-    EXPECT_TRUE(bundle.findReal("pair", 2, d) && bundle.findReal("pair", 2, f) && d[1] + f[1] == -10);
+    EXPECT_TRUE(bundle.findReal("pair", 2, d));
+    EXPECT_TRUE(bundle.findReal("pair", 2, f));
+    EXPECT_EQ(d[1] + f[1], -10);
     EXPECT_FALSE(bundle.findReal("text", 2, d));
     bundle.setAsString("s", 2, pair);
     bundle.setAsString("none", 0, pair);
@@ -125,7 +139,8 @@ TEST(HxParamBundle, readsNumbers)
     bundle.set("Color", "255 128 0");
     EXPECT_TRUE(bundle.findColor(f));
     bundle.setColor(f);
-    EXPECT_TRUE(bundle.findColor(f) && std::abs(f[1] - 128 / 255.0f) < 1e-7f);
+    EXPECT_TRUE(bundle.findColor(f));
+    EXPECT_LT(std::abs(f[1] - 128 / 255.0f), 1e-7f);
 }
 
 TEST(HxParamBundle, copiesAndMerges)
@@ -156,7 +171,8 @@ TEST(HxParamBundle, copiesAndMerges)
     target.remove("secret");
     target.sortParameters();
     fresh = target;
-    EXPECT_TRUE(fresh.isSorted() && textOf(fresh) == textOf(target));
+    EXPECT_TRUE(fresh.isSorted());
+    EXPECT_EQ(textOf(fresh), textOf(target));
     fresh = *fresh.bundle("sub");
     EXPECT_EQ(textOf(fresh), "SUB {\n    own 5\n    inner 3\n}\n") << "from one of its own children";
 }
@@ -168,7 +184,9 @@ TEST(HxParamBundle, moves)
     source.bundle("sub", 1)->bundle("deep", 1);
     source.sortParameters();
     HxParamBundle moved(std::move(source)), other("other");
-    EXPECT_TRUE(moved.bundle("sub")->parent() == &moved && moved.isSorted() && source.size() == 0);
+    EXPECT_EQ(moved.bundle("sub")->parent(), &moved);
+    EXPECT_TRUE(moved.isSorted());
+    EXPECT_EQ(source.size(), 0);
     other.set("A", 2);
     other.set("b", 3);
     other.move(moved);

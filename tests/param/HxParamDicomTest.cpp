@@ -35,7 +35,8 @@ TEST(DicomTags, areFoundByTheirText)
     float real = 7;
     EXPECT_TRUE(root.dicomAll()->findTagInAll("G0020-0013", number));
     EXPECT_FALSE(root.dicomAll()->findTagInAll("G0008-0060", number) || number != 12);
-    EXPECT_TRUE(root.findTag("G0028-0030", real) && real == 0.5f);
+    EXPECT_TRUE(root.findTag("G0028-0030", real));
+    EXPECT_EQ(real, 0.5f);
     EXPECT_FALSE(root.findTag("G0008-0060", real) || !std::isnan(real));
 }
 

@@ -34,7 +34,8 @@ TEST(ParamName, ofABundleLeavesTheRestToTheTitle)
 {
     HxParamBundle bundle("Materials of heart");
     EXPECT_EQ(valueOf(bundle, "Name"), "of heart");
-    EXPECT_TRUE(bundle.touched() == 27 && bundle[0]->touched() == 18) << "a title is set twice";
+    EXPECT_EQ(bundle.touched(), 27) << "a title is set twice";
+    EXPECT_EQ(bundle[0]->touched(), 18) << "a title is set twice";
     bundle.setName("of");
     EXPECT_EQ(valueOf(bundle, "Name"), "heart") << "a title doesn't repeat the name";
     bundle.setName("heart heart");
@@ -113,7 +114,9 @@ TEST(ParamNode, asksTheNearestEditCheck)
     HxParamBundle* const child = root.bundle("child", 1);
     HxParamEditCheck& check = *child->editCheck();
     root.setEditCheck(&never);
-    EXPECT_TRUE(child->editCheck() == &never && HxParamBundle(root).editCheck() == &check);
+    EXPECT_EQ(child->editCheck(), &never);
+    EXPECT_EQ(HxParamBundle(root).editCheck(), &check);
     child->setFlag(HxParamBase::FlagNoInsertParam, 1);
-    EXPECT_TRUE(!check.checkInsertParam(child, "x") && check.checkInsertBundle(child, "x"));
+    EXPECT_FALSE(check.checkInsertParam(child, "x"));
+    EXPECT_TRUE(check.checkInsertBundle(child, "x"));
 }

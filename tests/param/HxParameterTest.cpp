@@ -71,7 +71,9 @@ TEST(HxParameter, countsEachSetAsAChangeButThatOfItsOwnBlock)
     EXPECT_STREQ(text.getString(), "");
     const int number = 5;
     text.set(0, &number);
-    EXPECT_TRUE(text.dimension() == 0 && text.value() && !HxParameter("x", 0, &number).value());
+    EXPECT_EQ(text.dimension(), 0);
+    EXPECT_TRUE(text.value());
+    EXPECT_FALSE(HxParameter("x", 0, &number).value());
 }
 
 TEST(HxParameter, isEqualOnlyInBytes)
@@ -98,7 +100,8 @@ TEST(HxParameter, assignmentLeavesItsMarkAboveOnly)
     target = source;
     EXPECT_EQ(target.touched(), 0);
     EXPECT_EQ(parent.touched(), HxParamBase::TouchChildValue | HxParamBase::TouchAny);
-    EXPECT_TRUE(target.flags() == HxParamBase::FlagHidden && target.getReal(0) == 2.5);
+    EXPECT_EQ(target.flags(), HxParamBase::FlagHidden);
+    EXPECT_EQ(target.getReal(0), 2.5);
     target = HxParameter("y", 1, KpPrimType::String, nullptr);
     EXPECT_EQ(target.touched(), HxParamBase::TouchName | HxParamBase::TouchAny);
 }

@@ -126,6 +126,8 @@ TEST(Crop, refusalsLeaveAllAsItWas)
         Sizes dims = c.dims;
         const FailingMalloc failing(c.failing ? 0 : -1);
         EXPECT_EQ(KpRawData::crop(data, 1, dims.data(), c.min.data(), c.max.data(), nullptr), c.done);
-        EXPECT_TRUE(data == block.data() && dims == c.dims && block == before);
+        EXPECT_EQ(data, block.data());
+        EXPECT_EQ(dims, c.dims);
+        EXPECT_EQ(block, before);
     }
 }

@@ -147,7 +147,8 @@ TEST(KpTypedElement, computesInItsOwnType)
         T a[] = {most, T(-3)}, b[] = {T(100), T(4)};
         KpTypedElement element(a, 2), complex({a, KpPrimType::Complex}, 1);
         EXPECT_TRUE(&(element += KpTypedElement(b, 2)) == &element);
-        EXPECT_TRUE(a[0] == (std::is_integral_v<T> ? T(least + 99) : most) && a[1] == T(1));
+        EXPECT_EQ(a[0], (std::is_integral_v<T> ? T(least + 99) : most));
+        EXPECT_EQ(a[1], T(1));
         element -= KpTypedElement(b, 2);
         complex += complex;
         EXPECT_EQ(a[1], T(-3));

@@ -91,9 +91,12 @@ TEST(Volume, worksOutStrides)
         SCOPED_TRACE(what);
         const Handle volume = isSliced ? new TmDataAccess(dims, given, slices, KpPrimType::Short, 3, none)
                                        : new TmDataAccess(dims, given, nullptr, KpPrimType::Short, 3, none);
-        EXPECT_TRUE(volume->strides() == strides && volume->isLinear() == (strides[2] > 0));
-        EXPECT_TRUE(volume->isValid() == valid && volume->isContiguous() == contiguous);
-        EXPECT_TRUE(volume->hasData() == isSliced && (!isSliced || volume->dataPtrs()[0] == &block[0]));
+        EXPECT_EQ(volume->strides(), strides);
+        EXPECT_EQ(volume->isLinear(), (strides[2] > 0));
+        EXPECT_EQ(volume->isValid(), valid);
+        EXPECT_EQ(volume->isContiguous(), contiguous);
+        EXPECT_EQ(volume->hasData(), isSliced);
+        EXPECT_TRUE((!isSliced || volume->dataPtrs()[0] == &block[0]));
     }
 }
 
@@ -106,7 +109,8 @@ TEST(Volume, givesItsMemoryBack)
         KpAllocator::setFreeUnusedUncompressedDataCB([] { ++callbacks; });
         Handle volume = new TmDataAccess(size543, KpPrimType::Int, 1, counting), view;
         KpAllocator::setFreeUnusedUncompressedDataCB({});
-        EXPECT_TRUE(volume->hasData() == (fails < 2) && callbacks == (fails > 0));
+        EXPECT_EQ(volume->hasData(), (fails < 2));
+        EXPECT_EQ(callbacks, (fails > 0));
         int seen = 0;
         volume->setDeleteCallback(
             [](TmDataAccess* object, void* data) { *static_cast<int*>(data) = object->hasData() ? 1 : 2; }, &seen);
@@ -117,7 +121,8 @@ TEST(Volume, givesItsMemoryBack)
         if (fails == 1)
             volume->dataRelease();
         volume = nullptr;
-        EXPECT_TRUE(freed == (fails < 2) && seen == (fails == 0 ? 1 : 2));
+        EXPECT_EQ(freed, (fails < 2));
+        EXPECT_EQ(seen, (fails == 0 ? 1 : 2));
     }
     void* const slices[] = {std::malloc(1), std::malloc(1)};
     TmDataAccess({1L, 1L, 2L}, dense, slices, KpPrimType::Byte, 1, counting).dataRelease();
@@ -131,16 +136,19 @@ TEST(Volume, subBoxLooksOnAndCloneCopies)
             Handle view;
             volume->subBox(view, box);
             EXPECT_EQ(view->dims(), KpVec3l(box.size()) + KpVec3l(1L, 1L, 1L));
-            EXPECT_TRUE(view->isValid() && view->isLinear() == (!layout.isSliced || view->dims()[2] == 1));
+            EXPECT_TRUE(view->isValid());
+            EXPECT_EQ(view->isLinear(), (!layout.isSliced || view->dims()[2] == 1));
             for (long z = 0; z < view->dims()[2]; ++z)
                 EXPECT_EQ(view->dataPtr(1, 1, z), volume->dataPtr(box.xmin() + 1, box.ymin() + 1, box.zmin() + z));
         }
         const Bytes expected = voxels(*volume);
         const KpResult result = volume->clone(volume, none);  // the object is held by the result alone
-        EXPECT_TRUE(result.codeValue() == (&layout != layouts) && (result.line() > 0) == result.isBad());
+        EXPECT_EQ(result.codeValue(), (&layout != layouts));
+        EXPECT_EQ((result.line() > 0), result.isBad());
         ASSERT_EQ(volume.get() != nullptr, result.isOk());
         if (volume) {
-            EXPECT_TRUE(voxels(*volume) == expected && volume->allocator() == KpAllocator::AllocatorMalloc);
+            EXPECT_EQ(voxels(*volume), expected);
+            EXPECT_EQ(volume->allocator(), KpAllocator::AllocatorMalloc);
             volume->subBox(volume, {0, 0, 0, 0, 0, 0});
             EXPECT_EQ(volume->dims(), KpVec3l(1L, 1L, 1L));
         }
@@ -148,7 +156,8 @@ TEST(Volume, subBoxLooksOnAndCloneCopies)
     Handle copy;
     for (const long n : {0L, 5L, 1L << 31}) {  // an object without data is copied if there is memory
         const TmDataAccess source({n, n, n}, dense, nullptr, KpPrimType::Int, 1, none);
-        EXPECT_TRUE(source.clone(copy, none).isOk() == (n < 6) && copy->hasData() == (n < 6));
+        EXPECT_EQ(source.clone(copy, none).isOk(), (n < 6));
+        EXPECT_EQ(copy->hasData(), (n < 6));
     }
 }
 
@@ -183,16 +192,20 @@ TEST(Volume, linesEqualTheirVoxelsOneByOne)
                     std::memcpy(&expected[origin + ((on[2] * 19 + on[1]) * 18 + on[0]) * voxel], &value, sizeof value);
                     values[i] = static_cast<float>(value);
                 }
-                EXPECT_TRUE(volume.putRow(at[0], at[1], at[2], in.data()).isOk() && memory == expected);
-                EXPECT_TRUE(volume.row(at[0], at[1], at[2], out.data()).isOk() && areSame(out, values));
+                EXPECT_TRUE(volume.putRow(at[0], at[1], at[2], in.data()).isOk());
+                EXPECT_EQ(memory, expected);
+                EXPECT_TRUE(volume.row(at[0], at[1], at[2], out.data()).isOk());
+                EXPECT_TRUE(areSame(out, values));
             }
     });
     for (int type : {5, 6, 8, 9, 10, -1, 0}) {  // not numbers, and bytes without data
         Bytes memory(480, 9);
         float untouched = 5;
         const TmDataAccess volume(size543, dense, type == 0 ? nullptr : &memory[0], KpPrimType(type), 1, none);
-        EXPECT_TRUE(volume.putRow(-1, 0, 0, &untouched).isOk() && volume.row(-1, 0, 0, &untouched).isOk());
-        EXPECT_TRUE(untouched == 5 && memory == Bytes(480, 9));
+        EXPECT_TRUE(volume.putRow(-1, 0, 0, &untouched).isOk());
+        EXPECT_TRUE(volume.row(-1, 0, 0, &untouched).isOk());
+        EXPECT_EQ(untouched, 5);
+        EXPECT_EQ(memory, Bytes(480, 9));
     }
 }
 
@@ -222,9 +235,13 @@ TEST(Volume, digestAndMessageHoldTheVoxels)
             TmDataAccess* read = nullptr;
             int next = 0;
             msg >> read >> next;
-            ASSERT_TRUE(next == 4711 && read && read->refCount() == 0);
+            ASSERT_EQ(next, 4711);
+            ASSERT_TRUE(read);
+            ASSERT_EQ(read->refCount(), 0);
             const Handle handle(read);
-            EXPECT_TRUE(read->isContiguous() && read->primType() == type && voxels(*read) == sent);
+            EXPECT_TRUE(read->isContiguous());
+            EXPECT_EQ(read->primType(), type);
+            EXPECT_EQ(voxels(*read), sent);
             volume->dataRelease();
         }
     });
@@ -262,14 +279,18 @@ TEST(Volume, doubtfulMessages)
                 float line[3] = {5};
                 const auto words = (KpLib::MD5Coder() << type << nDataVar << dims).md5().words();
                 EXPECT_EQ(object->hash() == (Kp128{words[0], words[1]}), come == 0 || fails == 2);
-                EXPECT_TRUE(object->hasData() == (fails == 3) && object->size() == come && !msg.holds(1));
-                EXPECT_TRUE(object->row(-1, 0, 0, line).isOk() && line[0] == (come > 0 && fails == 3 ? 7 : 5));
+                EXPECT_EQ(object->hasData(), (fails == 3));
+                EXPECT_EQ(object->size(), come);
+                EXPECT_FALSE(msg.holds(1));
+                EXPECT_TRUE(object->row(-1, 0, 0, line).isOk());
+                EXPECT_EQ(line[0], (come > 0 && fails == 3 ? 7 : 5));
             }
         }
     TmMsg msg;
     TmDataAccess below({-3L, 2L, 1L}, dense, nullptr, KpPrimType::Byte, 1, none), *object = &below;
     msg << static_cast<TmDataAccess*>(nullptr) << object;
-    EXPECT_TRUE(msg.size() == 34 && *msg.dataPtr() == 1);  // one byte for null, and of nothing the sizes alone
+    EXPECT_EQ(msg.size(), 34);
+    EXPECT_EQ(*msg.dataPtr(), 1);  // one byte for null, and of nothing the sizes alone
     msg >> object;
     EXPECT_EQ(object, nullptr);
 }

@@ -38,7 +38,8 @@ TEST(PackedIndexing, numbersFlaggedPositions)
                 flags[i] ? bits.set(i) : bits.unset(i);
             const KpPackedIndexing fromFlags(flags.data(), static_cast<int>(n)), fromBits(bits);
             for (const auto* indexing : {&fromFlags, &fromBits}) {
-                ASSERT_TRUE(indexing->blockBase().size() == (n + 255) / 256 && indexing->offsets().size() == n);
+                ASSERT_EQ(indexing->blockBase().size(), (n + 255) / 256);
+                ASSERT_EQ(indexing->offsets().size(), n);
                 int count = 0, base = 0;
                 for (long i = 0; i < n; ++i) {
                     base = i % 256 == 0 ? count : base;
@@ -75,15 +76,19 @@ TEST(SuperPackedIndexing, growsAsIfByOnePositionAtATime)
             for (long i = 0; i < 2000; i += piece)
                 indexing.appendIndexSpace(flags.data() + i, std::min(piece, 2000 - i));
             indexing.appendIndexSpace(nullptr, -5);
-            EXPECT_TRUE(std::ranges::equal(indexing.runs(), runs) && indexing.currentValue() == value);
+            EXPECT_TRUE(std::ranges::equal(indexing.runs(), runs));
+            EXPECT_EQ(indexing.currentValue(), value);
             EXPECT_TRUE(std::ranges::equal(indexing.blockCounts(), counts));
             EXPECT_TRUE(std::ranges::equal(indexing.blockStarts(), starts));
             long number = 0;
             for (long i = 0; i < 2000; ++i)
                 ASSERT_EQ(indexing.index(i), flags[i] ? number++ : -1) << i;
-            EXPECT_TRUE(indexing.nFlagged() == number && indexing.nPositions() == 2000);
-            EXPECT_TRUE(indexing.index(-1) == -1 && indexing.index(2000) == -1);
+            EXPECT_EQ(indexing.nFlagged(), number);
+            EXPECT_EQ(indexing.nPositions(), 2000);
+            EXPECT_EQ(indexing.index(-1), -1);
+            EXPECT_EQ(indexing.index(2000), -1);
         }
     }
-    EXPECT_TRUE(KpSuperPackedIndexing().currentValue() == 1 && KpSuperPackedIndexing().index(0) == -1);
+    EXPECT_EQ(KpSuperPackedIndexing().currentValue(), 1);
+    EXPECT_EQ(KpSuperPackedIndexing().index(0), -1);
 }

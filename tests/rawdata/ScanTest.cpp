@@ -34,12 +34,15 @@ TEST(GetRange, answersInFloats)
     float values[] = {1, 5, -2, 3}, min = -7, max = -7;
     std::int32_t large[] = {16777217, -16777217};
     KpRawData::getRange({values, KpPrimType::Complex}, 2, min, max);
-    EXPECT_TRUE(min == -2 && max == 5) << "parts of complex numbers share one range";
+    EXPECT_EQ(min, -2) << "parts of complex numbers share one range";
+    EXPECT_EQ(max, 5) << "parts of complex numbers share one range";
     KpRawData::getRange(values + 1, 0, min, max);
-    EXPECT_TRUE(min == 5 && max == 5) << "the first is always read";
+    EXPECT_EQ(min, 5) << "the first is always read";
+    EXPECT_EQ(max, 5) << "the first is always read";
     KpRawData::getRange(large, 2, min, max);
     KpRawData::getRange({values, KpPrimType::String}, 1, min, max);
-    EXPECT_TRUE(min == -16777216 && max == 16777216) << "left as it was";
+    EXPECT_EQ(min, -16777216) << "left as it was";
+    EXPECT_EQ(max, 16777216) << "left as it was";
 }
 
 TEST(IsConstant, everyPathFindsOneDifference)

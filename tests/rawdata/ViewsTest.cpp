@@ -49,7 +49,9 @@ TEST(Image, copiesBetweenStridesOfAnyKind)
                 expectPixels(Bytes(15 * n));
                 EXPECT_EQ(local.isContiguous(), &from == kinds);
                 local.makeLocal();
-                EXPECT_TRUE(local.isContiguous() && local.ownedData() == local.data() && pixels(local) == pixels(src));
+                EXPECT_TRUE(local.isContiguous());
+                EXPECT_EQ(local.ownedData(), local.data());
+                EXPECT_EQ(pixels(local), pixels(src));
             }
     }
     for (const auto& [w, h, n] : {std::array{3, 3, 4}, {2, 4, 4}, {2, 3, 2}})
@@ -61,20 +63,24 @@ TEST(Image, ownsOrLooksOn)
     Bytes memory = someValues<std::uint8_t>(24, 3);
     KpRawData2D image(5, 5, 5);  // its block goes with the assignment
     image = KpRawData2D(2, 3, 4, memory.data());
-    EXPECT_TRUE(image.data() == memory.data() && !image.ownedData());
+    EXPECT_EQ(image.data(), memory.data());
+    EXPECT_FALSE(image.ownedData());
     image.makeLocal();
     void* const block = image.data();
     image.makeLocal();
     image = std::as_const(image);
     EXPECT_EQ(image.ownedData(), block);
     const KpRawData2D copy(image);
-    EXPECT_TRUE(copy.data() != block && copy.ownedData() == copy.data() && pixels(copy) == memory);
+    EXPECT_NE(copy.data(), block);
+    EXPECT_EQ(copy.ownedData(), copy.data());
+    EXPECT_EQ(pixels(copy), memory);
 
     void* const other = kpmalloc(6);
     image.commit(3, 2, 1, other);
     EXPECT_EQ(image.ownedData(), other);
     image.init(0, 3, 4);
-    EXPECT_TRUE(image.data() == other && !image.ownedData());  // no size, no change
+    EXPECT_EQ(image.data(), other);
+    EXPECT_FALSE(image.ownedData());  // no size, no change
 }
 
 TEST(Image, withoutMemoryHoldsNull)
@@ -88,7 +94,8 @@ TEST(Image, withoutMemoryHoldsNull)
         view.makeLocal();
     }
     for (KpRawData2D* image : {&view, &huge, &made, &copy}) {
-        EXPECT_TRUE(!image->data() && !image->ownedData());
+        EXPECT_FALSE(image->data());
+        EXPECT_FALSE(image->ownedData());
         image->clear();
         EXPECT_TRUE(image->copyData(*image));
     }
@@ -106,7 +113,9 @@ TEST(Slice, equalsVoxelsOneByOne)
             KpRawData3D block(5, 4, 3, voxel, memory.data());
             int dims[3], strides[2];
             block.getDims(dims, orientation);
-            EXPECT_TRUE(dims[0] == size[row] && dims[1] == size[column] && dims[2] == size[across]);
+            EXPECT_EQ(dims[0], size[row]);
+            EXPECT_EQ(dims[1], size[column]);
+            EXPECT_EQ(dims[2], size[across]);
             for (int k = 0; k < size[across]; ++k) {
                 Bytes expected, copied(dims[0] * dims[1] * voxel), noise = someValues<std::uint8_t>(copied.size(), k);
                 KpRawData2D view, copy(1, 1, 1, copied.data());
@@ -139,15 +148,18 @@ TEST(Block, ownsOrLooksOn)
     void* mine = kpmalloc(9);
     void* const expected = mine;
     block.swapDataPtr(mine);
-    EXPECT_TRUE(block.data() == expected && block.ownedData() == expected);
+    EXPECT_EQ(block.data(), expected);
+    EXPECT_EQ(block.ownedData(), expected);
     block.swapDataPtr(mine);
-    EXPECT_TRUE(mine == expected && block.ownedData() == block.data());
+    EXPECT_EQ(mine, expected);
+    EXPECT_EQ(block.ownedData(), block.data());
     block.commit(1, 1, 9, 1, mine);
     block.init(0, 0, 0, 0);  // memory even for nothing
     EXPECT_NE(block.ownedData(), nullptr);
     for (int n : {1 << 20, INT_MAX}) {
         EXPECT_THROW(block.init(n, n, n, n), KpMemoryException);
-        EXPECT_TRUE(!block.data() && !block.ownedData());
+        EXPECT_FALSE(block.data());
+        EXPECT_FALSE(block.ownedData());
     }
 }
 
@@ -160,10 +172,15 @@ TEST(TypedViews, sizeOfPixelsFollowsTheType)
         const KpTypedPointer p(memory.data(), type);
         KpTypedData2D slice;
         KpTypedData3D(dims, type, 2).getSlice(3, 2, slice, 0);
-        EXPECT_TRUE(slice.nDataVar() == 2 && slice.primType() == type && !slice.dims()[0]);  // these alone
+        EXPECT_EQ(slice.nDataVar(), 2);
+        EXPECT_EQ(slice.primType(), type);
+        EXPECT_FALSE(slice.dims()[0]);  // these alone
         KpTypedData3D(dims, p, 2).getSlice(1, 2, slice, 0);
         EXPECT_EQ(slice.rowStride(), 12 * type.size());
-        for (const KpTypedData2D& image : {slice, {2, 4, type, 2}, {dims, p, 2}, {2, 4, 99, 70, p, 2}})
-            EXPECT_TRUE(image.primType() == type && image.nDataVar() == 2 && image.pixelStride() == 2 * type.size());
+        for (const KpTypedData2D& image : {slice, {2, 4, type, 2}, {dims, p, 2}, {2, 4, 99, 70, p, 2}}) {
+            EXPECT_EQ(image.primType(), type);
+            EXPECT_EQ(image.nDataVar(), 2);
+            EXPECT_EQ(image.pixelStride(), 2 * type.size());
+        }
     }
 }

@@ -198,8 +198,8 @@ TEST(MD5List, hashesFromTheBackWhatItHoldsNow)
         inOrder.insert(ascending[i]);
         asGiven.insert(ascending[i]);
         backwards.insert(0, image(ascending[i]));
-        EXPECT_TRUE(asGiven.hash() == reference(backwards) &&
-                    asGiven.hash() == reference(backwards));  // the cached one
+        EXPECT_EQ(asGiven.hash(), reference(backwards));
+        EXPECT_EQ(asGiven.hash(), reference(backwards));  // the cached one
     }
     EXPECT_TRUE(std::equal(ascending.begin(), ascending.end(), inOrder.items().begin()));
     EXPECT_NE(inOrder.hash(), asGiven.hash());

@@ -77,7 +77,8 @@ TEST_F(KpDirectoryTest, timesCountFrom1601)
     KpDArray<unsigned long long> created;
     names.append(KpString("old"));
     EXPECT_EQ(KpDirectory::scanSortedByCreationTime(tree.c_str(), names, &created, nullptr, false), 8);
-    ASSERT_TRUE(names.size() == 8 && created.size() == 8);
+    ASSERT_EQ(names.size(), 8);
+    ASSERT_EQ(created.size(), 8);
     EXPECT_TRUE(std::is_sorted(created.begin(), created.end()));
 }
 
@@ -97,7 +98,8 @@ TEST_F(KpDirectoryTest, whatIsNoFolderIsOneLine)
         EXPECT_TRUE(infos.empty());
         EXPECT_EQ(LogCapture::lines(), kplib::test::Lines(4, "E [] Can't open dir " + path + "\n"));
     }
-    EXPECT_TRUE(KpDirectory::isDirectory((temp / "tree/link").c_str()) && !KpDirectory::isDirectory(nullptr));
+    EXPECT_TRUE(KpDirectory::isDirectory((temp / "tree/link").c_str()));
+    EXPECT_FALSE(KpDirectory::isDirectory(nullptr));
 }
 
 TEST_F(KpDirectoryTest, treesAreCopied)
@@ -173,7 +175,8 @@ TEST_F(KpDirectoryTest, theCollectorGoesDownFromTheLastName)
         expected += tree + "/" + path + "|";
     KpFilenameCollector::collect(found, nullptr, tree.c_str());
     KpFilenameCollector::collect(found, "*", (tree + "/b").c_str());
-    EXPECT_TRUE(joined(found) == expected && LogCapture::lines().empty()) << joined(found);
+    EXPECT_EQ(joined(found), expected) << joined(found);
+    EXPECT_TRUE(LogCapture::lines().empty()) << joined(found);
     for (const char* const loop : {"outside/1", "outside/2"})
         std::filesystem::create_directory_symlink(".", temp / loop);
     found.clear();
@@ -199,7 +202,10 @@ TEST_F(KpDirectoryTest, temporaryFoldersAreUniqueAndGo)
         KpTmpDir dir("gone", true, true), kept("kept", true, false);
         temp.file("tmp/gone/file");
         EXPECT_FALSE(dir.create(0700));  // is there
-        EXPECT_TRUE(dir.doesExist() && kept.doesExist() && kept.remove() == 0 && !kept.doesExist());
+        EXPECT_TRUE(dir.doesExist());
+        EXPECT_TRUE(kept.doesExist());
+        EXPECT_EQ(kept.remove(), 0);
+        EXPECT_FALSE(kept.doesExist());
     }
     EXPECT_EQ(namesIn(tmp), (std::set<std::string>{"x", "tmp", "tmp.2"}));
     setenv("TEMP", "/temp", 1);

@@ -161,18 +161,26 @@ TEST(KpFilename, filesOfAnyNameAreCopiedAndRenamed)
                                     std::string("new\nline\t\x01"), std::string("%s%n"), std::string(255, 'n')}) {
         KpFilename name((temp / text).c_str());
         const KpFilename other((temp / "other").c_str());
-        EXPECT_TRUE(!name.doesExist() && name.create(0640) && name.isReadable() && name.isWriteable());
+        EXPECT_FALSE(name.doesExist());
+        EXPECT_TRUE(name.create(0640));
+        EXPECT_TRUE(name.isReadable());
+        EXPECT_TRUE(name.isWriteable());
         EXPECT_EQ(name.getMode(), S_IFREG | 0640);
         for (const int size : {0, 1, 4095, 4096, 4097, 100000}) {
             const std::string content = repeated("xyz", size / 3) + std::string(static_cast<size_t>(size % 3), '\0');
             std::ofstream(name.c_str()) << content;
-            EXPECT_TRUE(name.setMode(0600) && name.copy(other) && name.copy(name));
+            EXPECT_TRUE(name.setMode(0600));
+            EXPECT_TRUE(name.copy(other));
+            EXPECT_TRUE(name.copy(name));
             EXPECT_EQ(contentOf(other.c_str()), content);
             EXPECT_EQ(name.fileSize(), content.size());
             EXPECT_EQ(other.getMode(), S_IFREG | 0600);
         }
-        EXPECT_TRUE(name.rename(other) && name == other && !KpFilename((temp / text).c_str()).doesExist());
-        EXPECT_TRUE(name.unlink() && !name.unlink());
+        EXPECT_TRUE(name.rename(other));
+        EXPECT_EQ(name, other);
+        EXPECT_FALSE(KpFilename((temp / text).c_str()).doesExist());
+        EXPECT_TRUE(name.unlink());
+        EXPECT_FALSE(name.unlink());
     }
     umask(mask);
 }
@@ -188,13 +196,18 @@ TEST(KpFilename, whatCantBeHadIsFalseOrNothing)
             name = (temp / std::string(5000, 'n')).c_str();
         EXPECT_FALSE(name.doesExist() || name.isReadable() || name.isWriteable() || name.isDirectory()) << text;
         EXPECT_FALSE(name.setMode(0600) || name.copy((temp / "target").c_str())) << text;
-        EXPECT_TRUE(name.getModTime() == 0 && name.getAccessTime() == 0 && name.getCreateTime() == 0) << text;
-        EXPECT_TRUE(name.fileSize() == ~0ULL && name.getMode() == 0) << text;
+        EXPECT_EQ(name.getModTime(), 0) << text;
+        EXPECT_EQ(name.getAccessTime(), 0) << text;
+        EXPECT_EQ(name.getCreateTime(), 0) << text;
+        EXPECT_EQ(name.fileSize(), ~0ULL) << text;
+        EXPECT_EQ(name.getMode(), 0) << text;
         EXPECT_FALSE(name.rename("/taken/anyway"));
         EXPECT_STREQ(name, "/taken/anyway");
     }
     const KpFilename file((temp / "file").c_str()), folder(temp.path.c_str());
-    EXPECT_TRUE(folder.isWriteable() && folder.isDirectory() && !file.isDirectory());
+    EXPECT_TRUE(folder.isWriteable());
+    EXPECT_TRUE(folder.isDirectory());
+    EXPECT_FALSE(file.isDirectory());
     EXPECT_FALSE(folder.unlink() || folder.create(0600) || file.copy(folder) || file.copy((temp / "no/x").c_str()));
     const timespec times[] = {{111, 0}, {222, 999999999}};
     utimensat(AT_FDCWD, file, times, 0);

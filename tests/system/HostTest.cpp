@@ -72,7 +72,8 @@ TEST(KpSysInfo, knowsTheMemory)
     EXPECT_EQ(KpSysInfo::physmem_total(), total);
     std::uint64_t available = 0;
     ASSERT_TRUE(kplib::platform::availableMemory(available));
-    EXPECT_TRUE(available > 1 << 20 && available < total) << available;
+    EXPECT_GT(available, 1 << 20) << available;
+    EXPECT_LT(available, total) << available;
     EXPECT_NEAR(KpSysInfo::physmem_available(), static_cast<double>(std::min(available, 0xFFFFFFFFUL)), 1e8);
 }
 
@@ -95,7 +96,8 @@ TEST(KpSysInfo, listsTheProcesses)
     setrlimit(RLIMIT_NOFILE, &none);
     const bool isListed = KpSysInfo::process_list(list);
     setrlimit(RLIMIT_NOFILE, &files);
-    EXPECT_TRUE(!isListed && list.size() == 0);
+    EXPECT_FALSE(isListed);
+    EXPECT_EQ(list.size(), 0);
 }
 
 TEST(KpOSInfo, namesTheSystemAndItsVersion)

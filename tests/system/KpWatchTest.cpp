@@ -17,7 +17,9 @@ TEST(KpWatch, addsUpItsRuns)
     pauseALittle();
     const double first = watch.stop2();
     pauseALittle();
-    EXPECT_TRUE(first >= 0.01 && !watch.isRunning() && watch.getTime2() == first);
+    EXPECT_GE(first, 0.01);
+    EXPECT_FALSE(watch.isRunning());
+    EXPECT_EQ(watch.getTime2(), first);
     watch.cont();
     pauseALittle();
     EXPECT_GE(watch.stop2(), first + 0.01);
@@ -45,6 +47,7 @@ TEST(KpScopedWatch, leavesARunningWatchRunning)
         KpWatch watch(true);
         pauseALittle();
         KpScopedWatch(watch, reset);
-        EXPECT_TRUE(watch.isRunning() == !reset && (watch.getTime2() < 0.01) == reset);
+        EXPECT_EQ(watch.isRunning(), !reset);
+        EXPECT_EQ((watch.getTime2() < 0.01), reset);
     }
 }

@@ -103,7 +103,8 @@ public:
             ASSERT_EQ(table.rowCount(), static_cast<long>(models[t].size()));
             for (const auto& [key, model] : models[t]) {
                 char* const row = isClone ? table.rowFind(lateColumn, *model.row + lateAt) : *model.row;
-                ASSERT_TRUE(row && table.checkRowPointer(row));
+                ASSERT_TRUE(row);
+                ASSERT_TRUE(table.checkRowPointer(row));
                 const char* const partner = KpTable::pointer(row, pointerAt);
                 ASSERT_TRUE(held.table(401 - t)->checkRowPointer(partner));
                 std::vector<long> found{valueOf(row), valueOf(row, lateAt), partner ? valueOf(partner) : -1};

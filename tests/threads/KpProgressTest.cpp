@@ -51,7 +51,9 @@ TEST(KpProgress, nestedScopesShareOneScaleToTheirEnd)
     progress.setProgressInfo("c");
     progress.stopWorking();
     EXPECT_EQ(gui.take(), "\"c\" c0");
-    EXPECT_TRUE(progress.currentProgressValue() == 10 && progress.globalMaximum() == 1 && !progress.isWorking());
+    EXPECT_EQ(progress.currentProgressValue(), 10);
+    EXPECT_EQ(progress.globalMaximum(), 1);
+    EXPECT_FALSE(progress.isWorking());
     progress.startWorking(1, "a");
     gui.take();
     progress.setFailed(KpResult(5000, "inner", "inner"), "bad");
@@ -74,7 +76,8 @@ TEST(KpProgress, cancelEndsAllWorkForGood)
     gui.cancelCallback();
     EXPECT_EQ(gui.take(), "\"a\" m4 c11") << "and no more values";
     progress.startWorking(4, "a");
-    EXPECT_TRUE(progress.isCanceled() && !progress.isWorking());
+    EXPECT_TRUE(progress.isCanceled());
+    EXPECT_FALSE(progress.isWorking());
 }
 
 TEST(KpProgressThreads, aWorkerPollsWhatAnotherThreadCancels)

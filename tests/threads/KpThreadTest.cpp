@@ -56,14 +56,20 @@ TEST(KpThreadThreads, runsAgainAfterItsEnd)
         --running;
         ++runs;
     });
-    EXPECT_TRUE(!thread.finished() && !thread.running() && thread.wait());
+    EXPECT_FALSE(thread.finished());
+    EXPECT_FALSE(thread.running());
+    EXPECT_TRUE(thread.wait());
     for (int i = 1; i <= 3; ++i) {
         thread.start();
         begun.acquire();
-        EXPECT_TRUE(thread.running() && !thread.finished() && !thread.wait(0));
+        EXPECT_TRUE(thread.running());
+        EXPECT_FALSE(thread.finished());
+        EXPECT_FALSE(thread.wait(0));
         go.release();
         if (i != 2) {  // 3 begins with the start that has to wait
-            EXPECT_TRUE(thread.wait() && thread.finished() && !thread.running());
+            EXPECT_TRUE(thread.wait());
+            EXPECT_TRUE(thread.finished());
+            EXPECT_FALSE(thread.running());
             EXPECT_EQ(runs, i);
         }
     }
@@ -84,7 +90,8 @@ TEST(KpThreadThreads, aThreadThatCannotBeMadeIsLoggedAndCountsAsRunning)
     kplib::test::noNewThreads = true;
     thread.start();
     kplib::test::noNewThreads = false;
-    EXPECT_TRUE(thread.running() && !thread.wait(1));
+    EXPECT_TRUE(thread.running());
+    EXPECT_FALSE(thread.wait(1));
     EXPECT_EQ(log.lines(), kplib::test::Lines{"W [] KpThread::~KpThread() failed (error code: 11)\n"});
 }
 

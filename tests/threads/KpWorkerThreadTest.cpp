@@ -113,7 +113,8 @@ TEST(KpWorkerThreadThreads, followsTheTableOfStates)
             EXPECT_EQ(timedOut, event < 4 || result) << "a wait here never sees the end of a pass";
             EXPECT_EQ(puppet.state(), to);
             puppet.go.release(9);
-            EXPECT_TRUE(!puppet.terminate() && puppet.state() == State::NotStarted);
+            EXPECT_FALSE(puppet.terminate());
+            EXPECT_EQ(puppet.state(), State::NotStarted);
             EXPECT_EQ(std::count(puppet.journal.begin(), puppet.journal.end(), 'C'),
                       (from != Not) + (event == 0 && result));
             EXPECT_TRUE(puppet.journal.empty() || puppet.journal.back() == ')');
@@ -205,7 +206,9 @@ void driveAtRandom(unsigned seed)
         } else {
             worker.terminate();
             canceled = false;
-            ASSERT_TRUE(worker.state() == State::NotStarted && worker.lives == 0 && worker.passes == accepted);
+            ASSERT_EQ(worker.state(), State::NotStarted);
+            ASSERT_EQ(worker.lives, 0);
+            ASSERT_EQ(worker.passes, accepted);
         }
     }
 }

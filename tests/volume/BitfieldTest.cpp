@@ -63,7 +63,9 @@ TEST(KpBitfield, resizingFillsWhatIsAddedButForASpareWord)
                 std::fill_n(field.data(), field.nWords(), before);
                 const unsigned long oldEnd = field.nWords() * 32, words = now == 0 ? 0 : now / 32 + 1;
                 field.resize(now, init);
-                ASSERT_TRUE(field.nBits() == now && field.nWords() == words && (now != 0 || !field.data()));
+                ASSERT_EQ(field.nBits(), now);
+                ASSERT_EQ(field.nWords(), words);
+                ASSERT_TRUE((now != 0 || !field.data()));
                 const bool fills = init != KpBitfield::INIT_NONE, fillsLast = fills && old % 32 != 0 && now > old;
                 for (unsigned long i = 0; i < (fills ? words * 32 : std::min(now, oldEnd)); ++i) {
                     const bool isAdded = i >= oldEnd || (i >= old && fillsLast);
@@ -101,8 +103,10 @@ TEST(KpBitfield, answersByItsBitsAndIgnoresWhatLiesBehind)
             ASSERT_EQ(text.c_str(), bits);
             const unsigned long first = std::min(bits.find('1'), n), firstUnset = std::min(bits.find('0'), n);
             EXPECT_EQ(field.nSetBits(), static_cast<unsigned long>(std::count(bits.begin(), bits.end(), '1')));
-            EXPECT_TRUE(field.firstSetBit() == first && field.isAnyBitSet() == (first < n)) << bits;
-            EXPECT_TRUE(field.firstUnsetBit() == firstUnset && field.isAnyBitUnset() == (firstUnset < n)) << bits;
+            EXPECT_EQ(field.firstSetBit(), first) << bits;
+            EXPECT_EQ(field.isAnyBitSet(), (first < n)) << bits;
+            EXPECT_EQ(field.firstUnsetBit(), firstUnset) << bits;
+            EXPECT_EQ(field.isAnyBitUnset(), (firstUnset < n)) << bits;
             EXPECT_EQ(field.lastSetBit(), std::min(bits.rfind('1'), n)) << bits;
         }
 }
@@ -120,14 +124,17 @@ TEST(KpBitfield, joinsTheWordsAndComparesTheBitsThatBothHave)
                     isContained = isContained && (b.test(i) || !a.test(i));
                     meets = meets || (a.test(i) && b.test(i));
                 }
-                ASSERT_TRUE(a.isSuperset(b) == contains && a.isSubset(b) == isContained);
-                ASSERT_TRUE(a.hasIntersection(b) == meets && (a == b) == (n == nB && contains && isContained));
+                ASSERT_EQ(a.isSuperset(b), contains);
+                ASSERT_EQ(a.isSubset(b), isContained);
+                ASSERT_EQ(a.hasIntersection(b), meets);
+                ASSERT_EQ((a == b), (n == nB && contains && isContained));
                 KpBitfield both = a, either = a, one = a;
                 both &= b, either |= b, one ^= b;
                 for (unsigned long i = 0; i < a.nWords(); ++i) {
                     const BitWord x = a.data()[i], y = i < b.nWords() ? b.data()[i] : 0;
                     ASSERT_EQ(both.data()[i], i < b.nWords() ? x & y : x);
-                    ASSERT_TRUE(either.data()[i] == (x | y) && one.data()[i] == (x ^ y));
+                    ASSERT_EQ(either.data()[i], (x | y));
+                    ASSERT_EQ(one.data()[i], (x ^ y));
                 }
             }
 }
@@ -212,7 +219,8 @@ TEST(KpBitfield, mergesIntoLabelsByPolicy)
         field.toLabels(40, labels.data(), 3, KpBitfield::InsertPolicy(unknown));
     EXPECT_EQ(labels, Labels(41, 7));
     field.toLabels(39, labels.data(), 3, KpBitfield::INSERT_SET);
-    EXPECT_TRUE(labels[38] == 3 && labels[39] == 7);
+    EXPECT_EQ(labels[38], 3);
+    EXPECT_EQ(labels[39], 7);
 }
 
 TEST(KpBitfield, filesHoldTheBytesOfTheBits)
@@ -221,8 +229,10 @@ TEST(KpBitfield, filesHoldTheBytesOfTheBits)
     for (unsigned long n : {0, 1, 8, 9, 100}) {
         const KpBitfield field = someField(n, 4);
         KpBitfield loaded(300, KpBitfield::INIT_SET);
-        ASSERT_TRUE(field.save(path.c_str()) && loaded.load(path.c_str(), n));
-        EXPECT_TRUE(loaded == field && std::filesystem::file_size(path) == (n + 7) / 8);
+        ASSERT_TRUE(field.save(path.c_str()));
+        ASSERT_TRUE(loaded.load(path.c_str(), n));
+        EXPECT_EQ(loaded, field);
+        EXPECT_EQ(std::filesystem::file_size(path), (n + 7) / 8);
     }
     KpBitfield field(300, KpBitfield::INIT_SET), expected(150, KpBitfield::INIT_UNSET);
     std::ofstream(path) << "\xFF\x01";
@@ -230,7 +240,8 @@ TEST(KpBitfield, filesHoldTheBytesOfTheBits)
     EXPECT_FALSE(field.load(path.c_str(), 150)) << "too short";
     EXPECT_EQ(wordsOf(field), wordsOf(expected));
     std::filesystem::remove(path);
-    EXPECT_TRUE(!field.load(path.c_str(), 96) && wordsOf(field) == Words(4, 0));
+    EXPECT_FALSE(field.load(path.c_str(), 96));
+    EXPECT_EQ(wordsOf(field), Words(4, 0));
     EXPECT_FALSE(field.save("/no/such/folder/bitfield"));
     EXPECT_FALSE(KpBitfield(1 << 20, KpBitfield::INIT_SET).save("/dev/full"));
 }

@@ -34,9 +34,11 @@ int expectAsDefined(std::vector<T> data, Dims dims, T low, T high, int neighbour
     const int added = CC::dbg_add, cleaned = CC::dbg_clean;
     EXPECT_EQ(CC::do_label(data.data(), labels.data(), table, low, high, dims.of, neighbours, labelMode), count);
     EXPECT_TRUE(labels == expected);
-    EXPECT_TRUE(CC::dbg_add == added && CC::dbg_clean == cleaned && CC::dbg_merge == 0);
-    EXPECT_TRUE(table.size() == expectedTable.size() &&
-                std::memcmp(table.data(), expectedTable.data(), sizeof(Component) * table.size()) == 0);
+    EXPECT_EQ(CC::dbg_add, added);
+    EXPECT_EQ(CC::dbg_clean, cleaned);
+    EXPECT_EQ(CC::dbg_merge, 0);
+    EXPECT_EQ(table.size(), expectedTable.size());
+    EXPECT_EQ(std::memcmp(table.data(), expectedTable.data(), sizeof(Component) * table.size()), 0);
     if constexpr (std::is_same_v<T, L>) {
         if (labelMode == 0) {  // labels in place of the values
             EXPECT_EQ(CC::do_label(data.data(), data.data(), table, low, high, dims.of, neighbours, 0), count);
@@ -165,7 +167,10 @@ TEST(KpConnectedComponents, startsFromZeroAndKeepsScratchSmall)
     ComponentTable table{Component{5, 5, 5, {5, 5, 5}}};
     table.resize(0);
     table.resize(1);
-    EXPECT_TRUE(table[0].id == 0 && table[0].nVoxels == 0 && table[0].nSeeds == 0 && table[0].sum[2] == 0);
+    EXPECT_EQ(table[0].id, 0);
+    EXPECT_EQ(table[0].nVoxels, 0);
+    EXPECT_EQ(table[0].nSeeds, 0);
+    EXPECT_EQ(table[0].sum[2], 0);
     for (const int width : {1, 7, 8}) {
         const int dims[] = {width, 100, 1};
         std::vector<unsigned char> data(static_cast<std::size_t>(width) * 100);
@@ -208,10 +213,13 @@ TEST(KpConnectedComponents, measuresComponents)
     std::vector<int> huge(6);
     EXPECT_EQ(CC::labelLabelsHuge(values, dims, 8, huge.data(), 0, 0, table), 3);
     EXPECT_EQ(huge, (std::vector<int>{1, 1, 2, 3, 3, 2}));
-    EXPECT_TRUE(table[1].nSeeds == 0 && table[2].nSeeds == 7 && table[3].nSeeds == 3);
+    EXPECT_EQ(table[1].nSeeds, 0);
+    EXPECT_EQ(table[2].nSeeds, 7);
+    EXPECT_EQ(table[3].nSeeds, 3);
     std::vector<unsigned short> few(6);
     EXPECT_EQ(CC::labelLabels(values, dims, 4, few.data(), 0, 0, table), 3);
-    EXPECT_TRUE(CC::compareComponents(table[0], table[1]) == -1 && CC::compareComponents(table[1], table[2]) == 0);
+    EXPECT_EQ(CC::compareComponents(table[0], table[1]), -1);
+    EXPECT_EQ(CC::compareComponents(table[1], table[2]), 0);
 }
 
 // Half up, then cut to an int (none that fits is the smallest), then to the element type.
@@ -249,13 +257,16 @@ TEST(KpConnectedComponents, cleansUpAliasesAndSmallOnes)
     table.resize(6);
     EXPECT_EQ(CC::cleanup_components(table, labels.data(), 6, 3, -1), 3);
     EXPECT_EQ(labels, (std::vector<unsigned short>{2, 1, 1, 0, 0, 0, 5}));
-    EXPECT_TRUE(table[2].id == 2 && table[2].nVoxels == 5);
+    EXPECT_EQ(table[2].id, 2);
+    EXPECT_EQ(table[2].nVoxels, 5);
     int huge[] = {5, 3};
     EXPECT_EQ(CC::cleanup_components(another, huge, 2, -1, 5), 2);
     EXPECT_EQ(huge[0] * 10 + huge[1], 10);
 
     Component nonRoot{1, 1, 2, {1, 2, 3}}, other{7, 10, 20, {10, 20, 30}};
     nonRoot.addAlias(other, 1);
-    EXPECT_TRUE(other.id == 1 && nonRoot.nSeeds == 2 && nonRoot.nVoxels == 11);
+    EXPECT_EQ(other.id, 1);
+    EXPECT_EQ(nonRoot.nSeeds, 2);
+    EXPECT_EQ(nonRoot.nVoxels, 11);
     EXPECT_EQ(nonRoot.sum[2] + other.sum[2], 33);
 }

@@ -110,7 +110,9 @@ void compareWithWalk(const std::array<int, 3>& dims, double density, double visi
     }
     std::array<int, 6> box{};
     const unsigned long count = KpMorphology::floodfill(src, dst, seeds, value, dims.data(), box.data());
-    ASSERT_TRUE(count == plain.count && dst == expected && box == plain.box);
+    ASSERT_EQ(count, plain.count);
+    ASSERT_EQ(dst, expected);
+    ASSERT_EQ(box, plain.box);
 }
 
 TEST(FloodFill, equalsTheWalkBitByBit)
@@ -140,7 +142,9 @@ TEST(FloodFill, refusesWhatItCannotWorkOn)
     EXPECT_EQ(dst.nBits(), 0UL);
     const int dims[] = {2, 16384, 1};
     EXPECT_EQ(KpMorphology::floodfill(most16, dst, {}, true, dims, box), 0UL);
-    EXPECT_TRUE(dst.nBits() == 32768 && box[0] == 1 && box[5] == 6);
+    EXPECT_EQ(dst.nBits(), 32768);
+    EXPECT_EQ(box[0], 1);
+    EXPECT_EQ(box[5], 6);
     EXPECT_EQ(KpMorphology::floodfill(most16, dst, {{1, 16383, 0}}, true, dims, box), 32768UL);
     for (const auto& longest : {std::array{32768, 1, 1}, {1, 32768, 1}, {1, 1, 32768}}) {
         Field fresh;

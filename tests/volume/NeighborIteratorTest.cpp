@@ -33,7 +33,8 @@ void expectWhole(const KpNeighborIterator33& table, const std::vector<Weight>& w
             (d[0] < 0) + 2 * (d[0] > 0) + 4 * (d[1] < 0) + 8 * (d[1] > 0) + 16 * (d[2] < 0) + 32 * (d[2] > 0);
         EXPECT_EQ(table.borders()[i], border);
         const Weight weight = weights[static_cast<std::size_t>(13 + d[0] + 3 * d[1] + 9 * d[2])];
-        EXPECT_TRUE(table.fweights()[i] == weight && table.iweights()[i] == weight);
+        EXPECT_EQ(table.fweights()[i], weight);
+        EXPECT_EQ(table.iweights()[i], weight);
         offsets.insert(table.offsets()[i]);
     }
     EXPECT_EQ(offsets.size(), static_cast<std::size_t>(table.nNeighbors()));
@@ -53,7 +54,8 @@ TEST(KpNeighborIterator33, holdsEachNeighborOnceInItsOrder)
         const auto weights = randomWeights<short>(1, -5, 5);
         table.setWeights(weights.data(), 0);
         expectWhole(table, weights);
-        EXPECT_TRUE(table.offsets()[0] == c.firstOffset && table.offsets()[c.count - 1] == c.lastOffset);
+        EXPECT_EQ(table.offsets()[0], c.firstOffset);
+        EXPECT_EQ(table.offsets()[c.count - 1], c.lastOffset);
         for (int i = 0; i < c.count; ++i) {
             const std::int8_t* const d = table.deltas()[i];
             EXPECT_LE(std::abs(d[2]), c.mostInPlane);
@@ -76,7 +78,8 @@ TEST(KpNeighborIterator33, sortsAllByWeightAndTellsTheFirstPositive)
                 if (table.iweights()[i] > 0)
                     firstPositive = i;
             }
-            EXPECT_TRUE(table.sort_iweights() == firstPositive && table.sort_fweights() == firstPositive);
+            EXPECT_EQ(table.sort_iweights(), firstPositive);
+            EXPECT_EQ(table.sort_fweights(), firstPositive);
         }
     float floats[27];
     std::fill_n(floats, 27, 2.75F);
@@ -84,9 +87,13 @@ TEST(KpNeighborIterator33, sortsAllByWeightAndTellsTheFirstPositive)
     floats[14] = 0.5F;
     KpNeighborIterator33 table(6, dims);
     table.setWeights(floats, 1);
-    EXPECT_TRUE(table.offsets()[0] == -1 && table.iweights()[0] == INT32_MIN);
-    EXPECT_TRUE(table.offsets()[1] == 1 && table.iweights()[1] == 0 && table.iweights()[5] == 2);
-    EXPECT_TRUE(table.sort_fweights() == 1 && table.sort_iweights() == 2);
+    EXPECT_EQ(table.offsets()[0], -1);
+    EXPECT_EQ(table.iweights()[0], INT32_MIN);
+    EXPECT_EQ(table.offsets()[1], 1);
+    EXPECT_EQ(table.iweights()[1], 0);
+    EXPECT_EQ(table.iweights()[5], 2);
+    EXPECT_EQ(table.sort_fweights(), 1);
+    EXPECT_EQ(table.sort_iweights(), 2);
     KpNeighborIterator33 unlisted(7, dims);
     unlisted.setWeights(floats, 1);
     EXPECT_EQ(unlisted.sort_fweights(), 26);

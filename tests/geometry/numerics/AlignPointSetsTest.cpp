@@ -215,7 +215,8 @@ TEST(KpCompTransform, takesCentredMatrices)
     KpMat4f scaled, affine;
     kpCompRigidTransform(a, b, KpVec3f(1, 2, 3), KpVec3f(4, 5, 6), scaled, true);
     kpCompAffineTransform(a, b, KpVec3f(1, 2, 3), KpVec3f(4, 5, 6), affine);
-    EXPECT_TRUE(scaled.equals(expected, 1e-5F) && affine.equals(expected, 1e-5F));
+    EXPECT_TRUE(scaled.equals(expected, 1e-5F));
+    EXPECT_TRUE(affine.equals(expected, 1e-5F));
 }
 
 }  // namespace

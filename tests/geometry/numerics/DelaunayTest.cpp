@@ -246,7 +246,8 @@ TEST(KpDelaunay, refusesALargeCavity)
     EXPECT_FALSE(KpDelaunay::triangulate2D(reinterpret_cast<KpVec2f*>(fan.data()), 3001, triangles));
     EXPECT_FALSE(KpDelaunay::triangulate3D(reinterpret_cast<KpVec3f*>(ball.data()), 9001, tetrahedra));
     EXPECT_EQ(log.lines(), Lines{"E [] temporary storage exceeded\n"});  // in the plane only
-    EXPECT_TRUE(triangles.size() == 1 && tetrahedra.size() == 1);
+    EXPECT_EQ(triangles.size(), 1);
+    EXPECT_EQ(tetrahedra.size(), 1);
 }
 
 template <int Size>

@@ -94,16 +94,20 @@ TEST(KpODE, endsAtItsLastPointThenRepeatsTheSampleOrGoesOnAlongTheLastCubic)
     }
     KpODE2 flagged = ode;
     const KpVec2f sample = point;
-    EXPECT_TRUE(ode.next(point) == code && point == KpVec2f(2, 1) && ode.status() == code);
+    EXPECT_EQ(ode.next(point), code);
+    EXPECT_EQ(point, KpVec2f(2, 1));
+    EXPECT_EQ(ode.status(), code);
     EXPECT_FLOAT_EQ(ode.h(), 0.5F / 16);  // quartered twice
-    EXPECT_TRUE(ode.next(point) == code && point == sample);
+    EXPECT_EQ(ode.next(point), code);
+    EXPECT_EQ(point, sample);
     for (int i = 1; i <= 3; ++i) {
         EXPECT_EQ(flagged.next(point, 1), code);
         EXPECT_NEAR(point.x(), 1.8F + 0.3F * static_cast<float>(i), 1e-5F);
     }
     const KpVec2f beyond = point;
     flagged.freeze(KpVec2f(5, 6));
-    EXPECT_TRUE(flagged.next(point) == KpODE2::Frozen && point == beyond);
+    EXPECT_EQ(flagged.next(point), KpODE2::Frozen);
+    EXPECT_EQ(point, beyond);
 }
 
 // Circles, and a wall at x = 0 whose code is the user data.
@@ -218,7 +222,8 @@ TEST(KpODE, walksAsFarAsAChordIsNear)
         ode.init(KpVec2f(1, 0), 0.1F);
         KpVec2f point, derivative;
         const int steps = ode.nextSL(point, derivative, minSteps, maxSteps, tolerance);
-        EXPECT_TRUE(steps >= low && steps <= high) << steps;
+        EXPECT_GE(steps, low) << steps;
+        EXPECT_LE(steps, high) << steps;
     }
 }
 

@@ -39,7 +39,8 @@ TEST(KpRandom, staysInItsRangeForAnySeed)
         KpRandom random(seed);
         for (int i = 0; i < 10000; ++i) {
             const double drawn = random.next();
-            ASSERT_TRUE(drawn > 0 && drawn <= 0.99999988) << seed;
+            ASSERT_GT(drawn, 0) << seed;
+            ASSERT_LE(drawn, 0.99999988) << seed;
         }
     }
 }
@@ -52,7 +53,8 @@ TEST(KpRandom, servesManyThreadsFromOneGenerator)
             double sum = 0;
             for (int i = 0; i < 20000; ++i) {
                 const double drawn = KpRandom::rand();
-                ASSERT_TRUE(drawn > 0 && drawn <= 0.99999988);
+                ASSERT_GT(drawn, 0);
+                ASSERT_LE(drawn, 0.99999988);
                 sum += drawn;
             }
             EXPECT_NEAR(sum / 20000, 0.5, 0.05);

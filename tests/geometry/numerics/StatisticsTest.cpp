@@ -91,7 +91,8 @@ TEST(SimulatedAnnealer, findsTheLowestEnergyAndFreezesThere)
     const LogCapture log;
     annealer.anneal(&frozen, false);
     EXPECT_EQ(frozen.proposals - frozen.lastMade, 40);
-    EXPECT_TRUE(frozen.at == 17 && frozen.isChangePending());
+    EXPECT_EQ(frozen.at, 17);
+    EXPECT_TRUE(frozen.isChangePending());
     ASSERT_EQ(LogCapture::lines().size(), 2U * static_cast<size_t>(frozen.proposals));
     EXPECT_NE(LogCapture::lines().back().find(" \t 0.000000 \t 1.000000 \t 0 \t 0.000000 "), std::string::npos);
 }

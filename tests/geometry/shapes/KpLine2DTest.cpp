@@ -20,7 +20,9 @@ TEST(KpLine2D, distancesAreSignedAndEndless)
     point.setPosDir({1, 1}, {0, 0});
     EXPECT_FLOAT_EQ(point.getDistanceTo({4, -3}), 5);
     EXPECT_FLOAT_EQ(point.getDistance2To({4, -3}), 25);
-    EXPECT_TRUE(point.isEmpty() && KpLine2D().isEmpty() && line.isNotEmpty());
+    EXPECT_TRUE(point.isEmpty());
+    EXPECT_TRUE(KpLine2D().isEmpty());
+    EXPECT_TRUE(line.isNotEmpty());
     point.setPosDir({nan, 0}, {1, 0});
     EXPECT_TRUE(point.isEmpty());
 }

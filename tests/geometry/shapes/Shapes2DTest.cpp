@@ -33,12 +33,18 @@ TEST(Rectangle2D, cornersAreExchangedAsPairs)
 TEST(Rectangle2D, holdsMergesAndGoesRound)
 {
     Rectangle2D box({1, 2}, {3, 6});
-    EXPECT_TRUE(box.contains({1, 2}) && box.contains({3, 6}) && !box.contains({3, 6.5F}) && !box.contains({0.5F, 3}));
+    EXPECT_TRUE(box.contains({1, 2}));
+    EXPECT_TRUE(box.contains({3, 6}));
+    EXPECT_FALSE(box.contains({3, 6.5F}));
+    EXPECT_FALSE(box.contains({0.5F, 3}));
     EXPECT_EQ(box.vertices(), (Points{{1, 2}, {3, 2}, {3, 6}, {1, 6}, {1, 2}}));
     EXPECT_EQ(box.closestPoint({9, 0}).second, KpVec2f(3, 2));
     box.merge(Rectangle2D({0, 3}, {2, 9}));
-    EXPECT_TRUE(box == Rectangle2D({0, 2}, {3, 9}) && box.boundingBox() == box);
-    EXPECT_TRUE(Rectangle2D().isEmpty() && !Rectangle2D({0, 0}, {1, 1}).isEmpty() && box != Rectangle2D());
+    EXPECT_EQ(box, Rectangle2D({0, 2}, {3, 9}));
+    EXPECT_EQ(box.boundingBox(), box);
+    EXPECT_TRUE(Rectangle2D().isEmpty());
+    EXPECT_FALSE(Rectangle2D({0, 0}, {1, 1}).isEmpty());
+    EXPECT_NE(box, Rectangle2D());
 }
 
 TEST(Ellipse2D, pointsAndMeasures)
@@ -50,7 +56,9 @@ TEST(Ellipse2D, pointsAndMeasures)
     EXPECT_TRUE(circle.boundingBox() == Rectangle2D({-1, 0}, {3, 4}));
     const Points chords = circle.tesselate(4);
     ASSERT_EQ(chords.size(), 5U);
-    EXPECT_TRUE(isNear(chords[1], {1, 4}) && isNear(chords[2], {-1, 2}) && isNear(chords[4], chords[0]));
+    EXPECT_TRUE(isNear(chords[1], {1, 4}));
+    EXPECT_TRUE(isNear(chords[2], {-1, 2}));
+    EXPECT_TRUE(isNear(chords[4], chords[0]));
 
     const auto ellipse = Ellipse2D::span({6, 1}, {0, 3});
     EXPECT_TRUE(ellipse == Ellipse2D({3, 2}, 3, 1));
@@ -61,7 +69,8 @@ TEST(Ellipse2D, pointsAndMeasures)
         const KpVec2f d = (corner - outer.center()) / outer.AbstractEllipse2D::radius();
         EXPECT_NEAR(d.length(), 1, 1e-6);
     }
-    EXPECT_TRUE(Ellipse2D().isEmpty() && Ellipse2D().circumference() == 0);
+    EXPECT_TRUE(Ellipse2D().isEmpty());
+    EXPECT_EQ(Ellipse2D().circumference(), 0);
     EXPECT_FALSE(Ellipse2D({0, 0}, std::nanf(""), 0).isEmpty());
     EXPECT_EQ(Ellipse2D({0, 0}, 0, 2).closestPoint({0, 7}).second.y(), 2);
 }
@@ -80,7 +89,9 @@ TEST(Polyline2D, changesDropTheBox)
     line.setVertices({{2, 2}});
     EXPECT_TRUE(line.boundingBox() == Rectangle2D({2, 2}, {2, 2}));
     line.clear();
-    EXPECT_TRUE(line.boundingBox().isEmpty() && line.isEmpty() && line.numberOfSegments() == 0);
+    EXPECT_TRUE(line.boundingBox().isEmpty());
+    EXPECT_TRUE(line.isEmpty());
+    EXPECT_EQ(line.numberOfSegments(), 0);
     EXPECT_THROW(line.at(0), std::out_of_range);
 }
 
@@ -91,7 +102,11 @@ TEST(Polyline2D, closesAndMeasures)
     EXPECT_EQ(line.numberOfSegments(), 4U);
     EXPECT_FLOAT_EQ(line.lengthOfSegment(1), 4);  // of vertices 2 and 3
     EXPECT_EQ(line.lengthOfSegment(2), 0);
-    EXPECT_TRUE(!line.isClosed() && line.close() && line.isClosed() && line.close() && line.size() == 6);
+    EXPECT_FALSE(line.isClosed());
+    EXPECT_TRUE(line.close());
+    EXPECT_TRUE(line.isClosed());
+    EXPECT_TRUE(line.close());
+    EXPECT_EQ(line.size(), 6);
     EXPECT_FALSE(Polyline2D({{0, 0}, {0, 0}}).close() || Polyline2D({{0, 0}, {0, 0}}).isClosed());
 
     EXPECT_EQ(line.closestPoint({3, 2}).second, KpVec2f(3, 2));
@@ -137,7 +152,8 @@ TEST(Polygon2D, isFilled)
     }
     // On the border: the right and the lower (greater y) side of a square count.
     const Polygon2D square({{0, 0}, {2, 0}, {2, 2}, {0, 2}});
-    EXPECT_TRUE(square.contains({2, 1}) && square.contains({1, 2}));
+    EXPECT_TRUE(square.contains({2, 1}));
+    EXPECT_TRUE(square.contains({1, 2}));
     EXPECT_FALSE(square.contains({0, 1}) || square.contains({1, 0}));
     EXPECT_TRUE(Polygon2D({{0, 0}, {4, 0}, {0, 4}}).contains({2, 2}));
     EXPECT_FALSE(Polygon2D().contains({0, 0}));
@@ -156,7 +172,8 @@ TEST(Angle2D, hasThreeVertices)
         angle.setVertices({end, {0, 0}, KpVec2f(2.03F, 2) - end});
         EXPECT_FALSE(angle.isValid() || angle.angle().first);
     }
-    EXPECT_TRUE(Angle2D({{1, 0}, {0, 0}}).isEmpty() && !Angle2D({{1, 0}, {0, 0}}).angle().first);
+    EXPECT_TRUE(Angle2D({{1, 0}, {0, 0}}).isEmpty());
+    EXPECT_FALSE(Angle2D({{1, 0}, {0, 0}}).angle().first);
 }
 
 TEST(Shapes2D, differInKindBeforeTheyDifferInNumbers)
@@ -172,7 +189,8 @@ TEST(Shapes2D, differInKindBeforeTheyDifferInNumbers)
         for (const auto* b : shapes)
             EXPECT_EQ(*a == *b, a == b);
     }
-    EXPECT_TRUE(line == Polyline2D(points) && circle != Circle2D({0, 0}, 2));
+    EXPECT_EQ(line, Polyline2D(points));
+    EXPECT_NE(circle, Circle2D({0, 0}, 2));
 }
 
 }  // namespace

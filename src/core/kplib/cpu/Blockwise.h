@@ -9,40 +9,40 @@
 
 namespace kplib::detail {
 
-/// Bytes from which a target is written past the caches, since it couldn't stay there: reading its old contents first
-/// would cost a third of the time.
+// Bytes from which a target is written past the caches, since it couldn't stay there: reading its old contents first
+// would cost a third of the time.
 inline constexpr long streamedSize = 8L << 20;
 
-/// Copies past the caches; `dst` and `bytes` are multiples of 64. streamFence() has to follow before others look.
+// Copies past the caches; `dst` and `bytes` are multiples of 64. streamFence() has to follow before others look.
 void streamCopy(void* dst, const void* src, long bytes);
 void streamFence();
 
-/// Whether a target is large enough to be streamed, and can be brought to a cache line by whole elements.
+// Whether a target is large enough to be streamed, and can be brought to a cache line by whole elements.
 inline bool isStreamed(const void* dst, long n, int size)
 {
     return n >= streamedSize / size && reinterpret_cast<std::uintptr_t>(dst) % static_cast<unsigned>(size) == 0;
 }
 
-/// Elements of `size` bytes before the next cache line begins.
+// Elements of `size` bytes before the next cache line begins.
 inline long toCacheLine(const void* dst, int size)
 {
     return static_cast<long>(-reinterpret_cast<std::uintptr_t>(dst) % 64) / size;
 }
 
-/// A target and the source that it is made of, element by element and forward.
+// A target and the source that it is made of, element by element and forward.
 struct Transfer {
     void* dst;
     const void* src;
     long n;
-    int dstSize, srcSize;  ///< bytes of an element
+    int dstSize, srcSize;  // bytes of an element
 
     char* target(long i) const { return static_cast<char*>(dst) + i * dstSize; }
     const char* source(long i) const { return static_cast<const char*>(src) + i * srcSize; }
     bool overlaps() const { return target(0) < source(n) && source(0) < target(n); }
 };
 
-/// Has `make(dst, src, n)` do the transfer, whose arguments never overlap: in one go, or by blocks that are made in the
-/// first cache and then moved to their place.
+// Has `make(dst, src, n)` do the transfer, whose arguments never overlap: in one go, or by blocks that are made in the
+// first cache and then moved to their place.
 template <typename Make>
 void transfer(const Transfer& t, Make&& make)
 {

@@ -5,7 +5,7 @@
 
 namespace kplib::detail {
 
-/// The product of `factors`; where it is out of range, the largest number, of which no allocator has so many bytes.
+// The product of `factors`; where it is out of range, the largest number, of which no allocator has so many bytes.
 constexpr long byteCount(std::initializer_list<long> factors)
 {
     long product = 1;

@@ -8,7 +8,7 @@
 
 namespace kplib::detail {
 
-/// `value` brought into [low, high]; NaN passes.
+// `value` brought into [low, high]; NaN passes.
 template <typename T>
 KPLIB_KERNEL_BODY T clamped(T value, T low, T high)
 {
@@ -16,17 +16,17 @@ KPLIB_KERNEL_BODY T clamped(T value, T low, T high)
     return value > high ? high : value;
 }
 
-/// The fraction cut off, for values not below the smallest int; NaN and what lies above the largest become the
-/// smallest, as the processor answers them. The choice is made before the cast: a cast out of range is undefined, and
-/// compilers make use of that.
+// The fraction cut off, for values not below the smallest int; NaN and what lies above the largest become the
+// smallest, as the processor answers them. The choice is made before the cast: a cast out of range is undefined, and
+// compilers make use of that.
 template <typename Real>
 KPLIB_KERNEL_BODY std::int32_t truncatedToInt(Real value)
 {
     return static_cast<std::int32_t>(value < Real(2147483648.0) ? value : Real(-2147483648.0));
 }
 
-/// The bounds of a conversion from real numbers. Those of int are odd and meant: from float the upper bound is one
-/// above what an int holds, so all from there on becomes the smallest int; from double the lower is two above it.
+// The bounds of a conversion from real numbers. Those of int are odd and meant: from float the upper bound is one
+// above what an int holds, so all from there on becomes the smallest int; from double the lower is two above it.
 template <typename Integer, typename Real>
 struct RealBounds {
     static constexpr Real low = std::numeric_limits<Integer>::min();
@@ -41,10 +41,14 @@ struct RealBounds<std::int32_t, double> {
     static constexpr double low = -2147483646.0, high = 2147483647.0;
 };
 
-/// One element in another type: clamped, then cut towards zero, never rounded.
+// One element in another type: clamped, then cut towards zero, never rounded.
 template <typename To, typename From>
 KPLIB_KERNEL_BODY To converted(From value)
 {
+    static_assert(sizeof(To) <= 4 || std::is_floating_point_v<To>,
+                  "a wider integer is clamped as 32 bits here: extend it");
+    static_assert(sizeof(From) <= 4 || std::is_floating_point_v<From>,
+                  "a wider integer is read as 32 bits here: extend it");
     // Ushort to short: the bits as they are, not clamped, and that is meant.
     constexpr bool keepsBits = std::is_same_v<To, std::int16_t> && std::is_same_v<From, std::uint16_t>;
     if constexpr (std::is_floating_point_v<To> || keepsBits) {
@@ -58,7 +62,7 @@ KPLIB_KERNEL_BODY To converted(From value)
     }
 }
 
-/// The precision in which a linear map from one type to another is computed.
+// The precision in which a linear map from one type to another is computed.
 template <typename To, typename From>
 using MapReal =
     std::conditional_t<std::is_same_v<To, double> || (std::is_same_v<From, double> && sizeof(To) == sizeof(float)),

@@ -5,7 +5,7 @@
 
 namespace kplib::detail {
 
-/// Eight flag bytes, given as one number with the first in its lowest byte, as eight bits: set where the byte isn't 0.
+// Eight flag bytes, given as one number with the first in its lowest byte, as eight bits: set where the byte isn't 0.
 inline std::uint64_t bitsOfEight(std::uint64_t flags)
 {
     constexpr std::uint64_t low = 0x7F7F7F7F7F7F7F7F;
@@ -13,7 +13,7 @@ inline std::uint64_t bitsOfEight(std::uint64_t flags)
     return (highBits >> 7) * 0x0102040810204080 >> 56;  // gathers one bit from each byte
 }
 
-/// `n` flags from an address on as bits; 64 at most.
+// `n` flags from an address on as bits; 64 at most.
 inline std::uint64_t bitsOfFlags(const unsigned char* flags, long n)
 {
     std::uint64_t bits = 0, eight = 0;

@@ -5,7 +5,7 @@
 
 namespace kplib::detail {
 
-/// 64 flags, each 0 or 1, as bits. Inline: the flags may still be in registers.
+// 64 flags, each 0 or 1, as bits. Inline: the flags may still be in registers.
 inline std::uint64_t bitsOf64Flags(const unsigned char* flags)
 {
     std::uint64_t bits = 0;

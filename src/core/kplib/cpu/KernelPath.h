@@ -4,8 +4,8 @@
 #include <initializer_list>
 #include <span>
 
-/// A body shared by functions that are compiled for different processors: inlined at every level, so that it is
-/// compiled for the processor of its caller.
+// A body shared by functions that are compiled for different processors: inlined at every level, so that it is
+// compiled for the processor of its caller.
 #define KPLIB_KERNEL_BODY [[gnu::always_inline]] inline
 
 // The only place in the sources that distinguishes processors; else CMake chooses between files.
@@ -28,16 +28,16 @@
 
 namespace kplib::detail {
 
-/// One way to do a kernel's work. All usable paths of a table give equal results to the bit.
+// One way to do a kernel's work. All usable paths of a table give equal results to the bit.
 template <typename Function>
 struct KernelPath {
-    const char* name;  ///< for tests and benchmarks: "plain", "avx2" ...
-    bool usable;       ///< on this processor
+    const char* name;  // for tests and benchmarks: "plain", "avx2" ...
+    bool usable;       // on this processor
     Function* run;
 };
 
-/// All paths of a kernel: those that any processor has, of which the first is the plain loop, then those of this family
-/// of processors.
+// All paths of a kernel: those that any processor has, of which the first is the plain loop, then those of this family
+// of processors.
 template <typename Function>
 class KernelTable {
 public:
@@ -56,7 +56,7 @@ private:
     std::size_t size_ = 0;
 };
 
-/// The last usable path of a table; the first, the plain loop, is usable anywhere.
+// The last usable path of a table; the first, the plain loop, is usable anywhere.
 template <typename Function>
 Function* best(std::span<const KernelPath<Function>> paths)
 {
@@ -68,8 +68,8 @@ Function* best(std::span<const KernelPath<Function>> paths)
     return chosen;
 }
 
-/// Compiles one body for any processor: `Loop* loop = ForAny::run<Body>` is Body::run, which has to be a
-/// KPLIB_KERNEL_BODY of the signature Loop. Families of processors have the like in a header of their own.
+// Compiles one body for any processor: `Loop* loop = ForAny::run<Body>` is Body::run, which has to be a
+// KPLIB_KERNEL_BODY of the signature Loop. Families of processors have the like in a header of their own.
 struct ForAny {
     template <typename Body, typename... Args>
     [[gnu::noinline]] static auto run(Args... args) -> decltype(Body::run(args...))

@@ -6,7 +6,7 @@
 // mark each function with its target: flags of their own would also apply to inline functions of the standard library,
 // of which the linker may keep the copy that an older processor cannot run.
 
-/// Compiles a function for processors that have `features`; it may be called only where they were found.
+// Compiles a function for processors that have `features`; it may be called only where they were found.
 #define KPLIB_TARGET(features) [[gnu::target(features)]]
 #define KPLIB_TARGET_AVX2 KPLIB_TARGET("avx2")
 #if defined(__clang__)
@@ -40,7 +40,7 @@ inline bool hasAvx2()
     return __builtin_cpu_supports("avx2");
 }
 
-/// What KPLIB_TARGET_AVX512 names: the instructions on bytes and their permutation too.
+// What KPLIB_TARGET_AVX512 names: the instructions on bytes and their permutation too.
 inline bool hasAvx512()
 {
     return __builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512bw") &&

@@ -6,6 +6,7 @@
 #include <compare>
 #include <concepts>
 #include <cstdarg>
+#include <cstring>
 #include <iosfwd>
 #include <string_view>
 

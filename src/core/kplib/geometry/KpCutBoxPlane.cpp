@@ -3,6 +3,8 @@
 #include <kplib/geometry/KpPlane.h>
 #include <kplib/geometry/detail/CutBox.h>
 
+#include <span>
+
 using namespace kplib::detail;
 
 namespace {

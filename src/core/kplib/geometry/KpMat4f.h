@@ -20,6 +20,10 @@ class KpRotation;
 /// is not set to anything.
 class KPLIB_API KpMat4f {
 public:
+    /// Four floats that are computed with side by side, each in the order of a plain loop: one instruction where the
+    /// processor has vectors.
+    using Row = float __attribute__((vector_size(16)));
+
     constexpr KpMat4f() = default;
     constexpr KpMat4f(float m00, float m01, float m02, float m03, float m10, float m11, float m12, float m13, float m20,
                       float m21, float m22, float m23, float m30, float m31, float m32, float m33) :
@@ -178,9 +182,6 @@ public:
     std::string dump() const;
 
 private:
-    // Four sums side by side, each in the order of a plain loop: one instruction where the processor has vectors.
-    using Row = float __attribute__((vector_size(16)));
-
     Row row(int i) const
     {
         Row row;

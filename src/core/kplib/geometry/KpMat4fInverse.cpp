@@ -4,11 +4,12 @@
 
 #include <algorithm>
 #include <cmath>
+#include <span>
 #include <utility>
 
 namespace {
 
-/// The reciprocal of a row's largest magnitude; a row of zeros gets a tiny diagonal element first.
+// The reciprocal of a row's largest magnitude; a row of zeros gets a tiny diagonal element first.
 float scaleOfRow(float (&row)[4], int i)
 {
     if (std::all_of(row, row + 4, [](float element) { return element == 0; }))

@@ -1,5 +1,7 @@
 #include <kplib/geometry/KpVec3f.h>
 
+#include <initializer_list>
+
 KpVec3f KpVec3f::getClosestAxis() const
 {
     KpVec3f closest(0, 0, 0);

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <initializer_list>
 #include <utility>
 
 void KpViewVolume::translateCamera(const KpVec3f& translation)

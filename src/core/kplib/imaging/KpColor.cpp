@@ -170,8 +170,8 @@ void multiply(const Matrix& rows, const double* in, double* out)
         out[i] = rows[i][0] * in[0] + rows[i][1] * in[1] + rows[i][2] * in[2];
 }
 
-/// Correctly rounded: the C library's root differs in its last bit between processors, and differences of roots show
-/// it. One step of Newton from there, with the residual t - root^3 exact but for its own rounding.
+// Correctly rounded: the C library's root differs in its last bit between processors, and differences of roots show
+// it. One step of Newton from there, with the residual t - root^3 exact but for its own rounding.
 double cubeRoot(double t)
 {
     const double root = std::cbrt(t), square = root * root, rest = std::fma(root, root, -square);

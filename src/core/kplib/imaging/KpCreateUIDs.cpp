@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <atomic>
 #include <cstdint>
+#include <ctime>
 
 #include <unistd.h>
 
@@ -22,7 +23,7 @@ std::tm localTime(std::time_t time)
     return local;
 }
 
-/// Date and time as one number, five digits above the second. The part down to the hour has 32 bits.
+// Date and time as one number, five digits above the second. The part down to the hour has 32 bits.
 long long timeStamp(std::time_t time)
 {
     const std::tm local = localTime(time);
@@ -34,7 +35,7 @@ long long timeStamp(std::time_t time)
     return ((date * 100LL + local.tm_min) * 100 + local.tm_sec) * 100000;
 }
 
-/// The stamp of this second. Asking the C library takes a lock that all threads share, so each asks once a second.
+// The stamp of this second. Asking the C library takes a lock that all threads share, so each asks once a second.
 long long currentTimeStamp()
 {
     thread_local std::time_t second = -1;

@@ -3,6 +3,7 @@
 #include <kplib/geometry/KpMat4f.h>
 
 #include <cmath>
+#include <initializer_list>
 #include <string_view>
 
 namespace {

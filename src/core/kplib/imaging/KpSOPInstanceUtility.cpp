@@ -5,7 +5,10 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <cstdlib>
+#include <cstring>
 #include <string_view>
+#include <utility>
 
 namespace {
 
@@ -31,7 +34,7 @@ KpString hashOf(const KpDArray<Text>& list)
     return text;
 }
 
-/// What all texts begin with.
+// What all texts begin with.
 template <typename Text>
 std::string_view commonPrefix(const KpDArray<Text>& list)
 {
@@ -66,7 +69,7 @@ void store(HxParamBundle* bundle, const KpDArray<Text>& list)
     }
 }
 
-/// Calls `visit` with the number and the text of each image until it gives false; gives whether it never did.
+// Calls `visit` with the number and the text of each image until it gives false; gives whether it never did.
 template <typename Visit>
 bool forEachImage(const HxParamBundle& bundle, Visit&& visit)
 {
@@ -80,7 +83,7 @@ bool forEachImage(const HxParamBundle& bundle, Visit&& visit)
     return true;
 }
 
-/// The last parameter of exactly that name, wherever it stands: look-ups would ignore the case.
+// The last parameter of exactly that name, wherever it stands: look-ups would ignore the case.
 std::string prefixOf(const HxParamBundle& bundle)
 {
     std::string prefix;
@@ -92,7 +95,7 @@ std::string prefixOf(const HxParamBundle& bundle)
     return prefix;
 }
 
-/// An entry whose frame is the number behind its last point.
+// An entry whose frame is the number behind its last point.
 bool splitFrame(const std::string& text, KpSOPInstanceUtility::SopUIDAndFrame& entry)
 {
     const size_t dot = text.rfind('.');

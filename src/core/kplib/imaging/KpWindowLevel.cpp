@@ -8,7 +8,7 @@ namespace {
 
 constexpr char separator = '\\';
 
-/// As std::to_string() wrote it before it went over to the shortest text.
+// As std::to_string() wrote it before it went over to the shortest text.
 std::string sixDecimals(float value)
 {
     char text[64];  // FLT_MAX has 39 digits in front
@@ -16,7 +16,7 @@ std::string sixDecimals(float value)
     return text;
 }
 
-/// All pieces between separators, empty ones too.
+// All pieces between separators, empty ones too.
 std::vector<std::string> values(const std::string& text)
 {
     std::vector<std::string> pieces;

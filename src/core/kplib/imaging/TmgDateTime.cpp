@@ -15,13 +15,13 @@ Tmg::DateReformatString funcDateReformatString = Tmg::dateReformatString_default
 constexpr std::array<const char*, 12> months = {"-JAN-", "-FEB-", "-MAR-", "-APR-", "-MAY-", "-JUN-",
                                                 "-JUL-", "-AUG-", "-SEP-", "-OCT-", "-NOV-", "-DEC-"};
 
-/// As atoi(), also for numbers that no int holds.
+// As atoi(), also for numbers that no int holds.
 int number(const std::string& digits)
 {
     return static_cast<int>(std::strtol(digits.c_str(), nullptr, 10));
 }
 
-/// `value` by "%0*d".
+// `value` by "%0*d".
 std::string padded(int width, long long value)
 {
     char text[32];
@@ -29,7 +29,7 @@ std::string padded(int width, long long value)
     return text;
 }
 
-/// The digits of a number that got a 1 in front to keep its leading zeros.
+// The digits of a number that got a 1 in front to keep its leading zeros.
 std::string withoutFirst(int value)
 {
     return std::to_string(value).substr(1);

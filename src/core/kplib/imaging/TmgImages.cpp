@@ -6,6 +6,9 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <iterator>
 #include <string_view>
 
 namespace {
@@ -26,7 +29,7 @@ constexpr const char* tagNames[] = {
     "G0028-0101", "G0020-0052", "G0018-1120", "G0018-0081", "G0018-0080", "G0018-0082", "G0018-0087", "G0008-0070",
     "G0008-0080", "G0018-1016", "G0018-1018"};
 
-/// Text of a tag of the header; null without one.
+// Text of a tag of the header; null without one.
 const char* headerText(const HxParamBundle& object, const char* tag)
 {
     const HxParamBundle* const all = object.dicomAll();
@@ -34,7 +37,7 @@ const char* headerText(const HxParamBundle& object, const char* tag)
     return all && all->findString(tag, text) ? text : nullptr;
 }
 
-/// Takes the next field, up to a comma, off `fields`; false behind the last one.
+// Takes the next field, up to a comma, off `fields`; false behind the last one.
 bool nextField(const char*& fields, std::string_view& field)
 {
     if (!fields)
@@ -45,7 +48,7 @@ bool nextField(const char*& fields, std::string_view& field)
     return true;
 }
 
-/// The field of `values` that stands where `name` stands in `names`; false without one.
+// The field of `values` that stands where `name` stands in `names`; false without one.
 bool findField(const char* names, const char* values, std::string_view name, std::string_view& value)
 {
     std::string_view each;
@@ -62,7 +65,7 @@ bool hasOneImage(const HxParamBundle& bundle, const char* name)
     return bundle.findNum(name, 1, &count) && count == 1;
 }
 
-/// Whether what the header of the volume says of a tag may differ from what one of its images says.
+// Whether what the header of the volume says of a tag may differ from what one of its images says.
 bool isApproximate(const HxParamBundle& object, const HxParamBundle* list, const char* tag)
 {
     if (list && hasOneImage(*list, countName))

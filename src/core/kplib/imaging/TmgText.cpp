@@ -29,7 +29,7 @@ bool hasValue(const KpString& values, const KpString& value, const char* separat
     return false;
 }
 
-/// The separator that stands last in `values`, else the first that there is.
+// The separator that stands last in `values`, else the first that there is.
 char separatorFor(std::string_view values, const char* separators)
 {
     const size_t last = values.find_last_of(separators);
@@ -50,8 +50,8 @@ void appendValue(KpString& values, const KpString& value, const char* separators
 
 namespace Tmg {
 
-/// All positions in the text that the pattern may have reached are followed at once: trying one after the other takes
-/// exponential time for patterns of many runs.
+// All positions in the text that the pattern may have reached are followed at once: trying one after the other takes
+// exponential time for patterns of many runs.
 bool match(const char* pattern, const char* text, char anyRun, char anyOne)
 {
     const std::string_view rest(text ? text : "");

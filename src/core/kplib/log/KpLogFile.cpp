@@ -4,7 +4,9 @@
 #include <kplib/log/detail/KpLogFilePrivate.h>
 
 #include <cstdarg>
+#include <cstdio>
 #include <initializer_list>
+#include <string_view>
 
 namespace {
 

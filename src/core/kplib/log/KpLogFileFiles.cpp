@@ -5,8 +5,12 @@
 #include <kplib/system/KpTmpDir.h>
 
 #include <algorithm>
+#include <atomic>
+#include <cstdio>
 #include <cstdlib>
 #include <fcntl.h>
+#include <string>
+#include <string_view>
 #include <unistd.h>
 #include <utility>
 
@@ -14,7 +18,7 @@ namespace {
 
 using Lock = KpScopedLockT<KpMutex>;
 
-/// Opens for writing, under a number that is none of the three standard ones: a service may have closed those.
+// Opens for writing, under a number that is none of the three standard ones: a service may have closed those.
 int openAside(const char* path, int mode)
 {
     const int first = ::open(path, O_WRONLY | O_CLOEXEC | mode, 0666);
@@ -25,7 +29,7 @@ int openAside(const char* path, int mode)
     return descriptor;
 }
 
-/// Leads standard output and standard error to a file or a device; leaves them as they are where that can't be opened.
+// Leads standard output and standard error to a file or a device; leaves them as they are where that can't be opened.
 bool leadConsoleTo(const char* path, int mode)
 {
     const int descriptor = openAside(path, mode);
@@ -54,7 +58,7 @@ bool KpLogFilePrivate::chunkIsFull() const
     return file && maxLogFileSizeInBytes != 0 && bytesWritten > maxLogFileSizeInBytes;
 }
 
-/// Opens for appending, always: two files of one second have one name, and no line is lost to that.
+// Opens for appending, always: two files of one second have one name, and no line is lost to that.
 bool KpLogFilePrivate::openFile(KpFilename path)
 {
     if (consoleToLogEnabled)
@@ -81,8 +85,8 @@ void KpLogFilePrivate::closeFile()
     file = nullptr;
 }
 
-/// Removes the oldest files: names sort by time. Intentional: one more than the excess goes, since open() counts the
-/// file that it opens. `kept` is the name of a file that stays in any case.
+// Removes the oldest files: names sort by time. Intentional: one more than the excess goes, since open() counts the
+// file that it opens. `kept` is the name of a file that stays in any case.
 void KpLogFilePrivate::cleanUp(std::string_view kept) const
 {
     if (maxNumLogFiles == 0 || dateFoldersEnabled)
@@ -214,7 +218,7 @@ void KpLogFile::cleanUp()
     record_->cleanUp("");
 }
 
-/// Stores a flag of the console; where a file is open that takes a new one.
+// Stores a flag of the console; where a file is open that takes a new one.
 void KpLogFile::setConsoleFlag(std::atomic<bool>& flag, bool enabled)
 {
     const Lock lock(&record_->mutex);

@@ -27,8 +27,8 @@ std::string requestText(const std::string& host, const std::string& path, unsign
 
 }  // namespace
 
-/// While one lives the descriptor stays open, so that no call of the system's meets a stranger's of the same number; a
-/// connection that is closed meanwhile is shut down, which wakes the call, and closed in the end.
+// While one lives the descriptor stays open, so that no call of the system's meets a stranger's of the same number; a
+// connection that is closed meanwhile is shut down, which wakes the call, and closed in the end.
 class KpHttpGet::SocketInUse {
 public:
     explicit SocketInUse(KpHttpGet& owner) : owner_(owner)

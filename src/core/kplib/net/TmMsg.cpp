@@ -68,7 +68,7 @@ void TmMsg::reset(long size, long capacity)
     buffer_.remax(capacity, size);
 }
 
-/// The message is as it was if there is no memory.
+// The message is as it was if there is no memory.
 void TmMsg::writeGrowing(unsigned long count, const void* data)
 {
     own();
@@ -80,8 +80,8 @@ void TmMsg::writeGrowing(unsigned long count, const void* data)
     std::memcpy(buffer_.data() + size, isOwn ? buffer_.data() + index : from, count);
 }
 
-/// Becomes `size` bytes of 0. Large storage is fresh pages, so that an announced size takes memory only where it is
-/// read.
+// Becomes `size` bytes of 0. Large storage is fresh pages, so that an announced size takes memory only where it is
+// read.
 void TmMsg::becomeZeros(unsigned long size)
 {
     auto* const zeros = static_cast<unsigned char*>(std::calloc(size, 1));  // kpfree() takes it
@@ -91,7 +91,7 @@ void TmMsg::becomeZeros(unsigned long size)
     buffer_.setStorage(zeros, static_cast<long>(size), static_cast<long>(size));
 }
 
-/// Storage of somebody else is never reallocated: it is copied before it has to grow.
+// Storage of somebody else is never reallocated: it is copied before it has to grow.
 void TmMsg::own()
 {
     if (!externalData_)
@@ -101,7 +101,7 @@ void TmMsg::own()
     buffer_.swap(copy);
 }
 
-/// Lets go of storage of somebody else.
+// Lets go of storage of somebody else.
 void TmMsg::disown()
 {
     if (externalData_)

@@ -13,7 +13,7 @@ using namespace kplib::detail;
 
 namespace {
 
-/// Appends bytes that are not initialised, and gives where they begin.
+// Appends bytes that are not initialised, and gives where they begin.
 unsigned char* append(TmMsg& msg, long bytes)
 {
     const auto at = static_cast<long>(msg.size());
@@ -36,7 +36,7 @@ void writeVoxels(TmMsg& msg, const TmDataAccess& object)
     object.eachVoxelRun([&](const void* run, unsigned long n) { msg.writeRawBytes(n, run); });
 }
 
-/// The bytes of so many voxels; -1 if there can be no such volume.
+// The bytes of so many voxels; -1 if there can be no such volume.
 long voxelBytes(const KpVec3l& dims, int nDataVar, KpPrimType type)
 {
     const bool isNegative = std::min({dims[0], dims[1], dims[2], std::int64_t{nDataVar}}) < 0;

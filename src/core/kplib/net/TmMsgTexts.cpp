@@ -3,11 +3,14 @@
 #include <kplib/system/KpFilename.h>
 
 #include <algorithm>
+#include <cstring>
 #include <functional>
+#include <string>
+#include <string_view>
 
 namespace {
 
-/// The text at the read offset: up to the first NUL or, without one, to the end of the message. Moves past the NUL.
+// The text at the read offset: up to the first NUL or, without one, to the end of the message. Moves past the NUL.
 std::string_view readToNul(TmMsg& msg)
 {
     const unsigned long left = msg.holds(0) ? msg.bytesAvailable() : 0;
@@ -19,7 +22,7 @@ std::string_view readToNul(TmMsg& msg)
     return {text, length};
 }
 
-/// Whether the text is one that was read from the message: it moves with the bytes if these have to grow.
+// Whether the text is one that was read from the message: it moves with the bytes if these have to grow.
 bool isInside(const TmMsg& msg, const char* text)
 {
     const auto* const bytes = reinterpret_cast<const unsigned char*>(text);

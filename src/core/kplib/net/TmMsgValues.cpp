@@ -13,6 +13,8 @@
 #include <kplib/volume/KpBitfield.h>
 
 #include <algorithm>
+#include <cstdint>
+#include <cstring>
 
 // The sizes that peers of other builds count on; those of the geometry are stated with its classes.
 static_assert(sizeof(bool) == 1 && sizeof(long) == 8 && sizeof(KpPrimType) == 4);

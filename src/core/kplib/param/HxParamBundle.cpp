@@ -74,7 +74,7 @@ HxParamBundle& HxParamBundle::operator=(HxParamBundle&& other) noexcept
     return *this;
 }
 
-/// Exchanges the children of two bundles.
+// Exchanges the children of two bundles.
 void HxParamBundle::swapChildren(HxParamBundle& other) noexcept
 {
     const std::uint32_t mine = counts();
@@ -183,7 +183,7 @@ void HxParamBundle::reserve(long more)
         children_.remax(std::max(static_cast<long>(static_cast<double>(size()) * 1.5), needed));
 }
 
-/// Takes a child out without a record of it, and gives it to the caller.
+// Takes a child out without a record of it, and gives it to the caller.
 HxParamBase* HxParamBundle::takeAt(long i)
 {
     HxParamBase* const node = children_[i];

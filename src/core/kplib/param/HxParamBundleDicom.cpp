@@ -20,7 +20,7 @@ const char* tagValue(const HxParameter* leaf, const char* defaultValue)
     return value;
 }
 
-/// Reads up to four hexadecimal digits from position `from` on; a shorter text has none there.
+// Reads up to four hexadecimal digits from position `from` on; a shorter text has none there.
 bool readHex(const char* tag, size_t from, unsigned& out)
 {
     char digits[5] = {};
@@ -29,7 +29,7 @@ bool readHex(const char* tag, size_t from, unsigned& out)
     return std::sscanf(digits, "%4x", &out) == 1;
 }
 
-/// The name of the tag that replaces `tag` in enhanced objects.
+// The name of the tag that replaces `tag` in enhanced objects.
 class MappedTag {
 public:
     explicit MappedTag(const char* tag)
@@ -57,7 +57,7 @@ private:
     char name_[16] = "";
 };
 
-/// Whether a bundle is a sequence of an even group. Any name that sscanf() reads as a tag counts.
+// Whether a bundle is a sequence of an even group. Any name that sscanf() reads as a tag counts.
 bool isStandardSequence(const char* name)
 {
     unsigned group = 0, element = 0;
@@ -171,7 +171,7 @@ bool HxParamBundle::isEnhancedDcm(const HxParamBundle** perFrame, const HxParamB
     return found;
 }
 
-/// The tag in the functional groups; null in classic objects too.
+// The tag in the functional groups; null in classic objects too.
 const HxParameter* HxParamBundle::findInGroups(const char* tag) const
 {
     const HxParamBundle *perFrame = nullptr, *shared = nullptr;

@@ -4,8 +4,10 @@
 #include <kplib/param/detail/ParamLookup.h>
 
 #include <algorithm>
+#include <atomic>
 #include <cstdlib>
 #include <thread>
+#include <utility>
 
 using kplib::detail::asBundle;
 using kplib::detail::asParameter;
@@ -15,7 +17,7 @@ using kplib::detail::NameKey;
 
 namespace {
 
-/// The order of qsort over children.
+// The order of qsort over children.
 int compareParamNames(const void* a, const void* b)
 {
     return mystrcasecmp((*static_cast<HxParamBase* const*>(a))->name(), (*static_cast<HxParamBase* const*>(b))->name());
@@ -26,7 +28,7 @@ bool isWhite(char c)
     return c == ' ' || (c >= '\t' && c <= '\r');
 }
 
-/// The bits of a type mask that take a value of that type: its own and those of wider ones.
+// The bits of a type mask that take a value of that type: its own and those of wider ones.
 int takers(KpPrimType type)
 {
     enum : int { Byte = 1, Short = 2, Int = 4, Float = 8, Double = 16, Text = 64 };
@@ -52,8 +54,8 @@ int takers(KpPrimType type)
     return 0;
 }
 
-/// The numbers at the start of a text; false if it ends before the last one. What is no digit, `-` or blank is never
-/// passed, so that all further numbers are read there, and that is meant.
+// The numbers at the start of a text; false if it ends before the last one. What is no digit, `-` or blank is never
+// passed, so that all further numbers are read there, and that is meant.
 bool readNumbers(const char* text, int n, int* out)
 {
     for (int i = 0; i < n; ++i) {
@@ -88,7 +90,7 @@ const HxParameter* HxParamBundle::findSorted(const char* name) const
     return findSorted(NameKey(name, NameKey::Literal));
 }
 
-/// The parameter of that name, of any type.
+// The parameter of that name, of any type.
 const HxParameter* HxParamBundle::parameter(const NameKey& key) const
 {
     if (isSorted())
@@ -118,8 +120,8 @@ HxParameter* HxParamBundle::find(const char* name, int dimension, int typeMask)
     return const_cast<HxParameter*>(std::as_const(*this).find(name, dimension, typeMask));
 }
 
-/// Whether there is a parameter of that name that find() does not return: one of a type without a text, or one that was
-/// renamed after the parameters were sorted.
+// Whether there is a parameter of that name that find() does not return: one of a type without a text, or one that was
+// renamed after the parameters were sorted.
 bool HxParamBundle::isShadowed(const char* name) const
 {
     const NameKey key(name);
@@ -127,7 +129,7 @@ bool HxParamBundle::isShadowed(const char* name) const
     return !find(key, 0, 255) && std::any_of(children_.begin() + nBundles(), children_.end(), matches);
 }
 
-/// Whether the key is one of the first 16 words of the title.
+// Whether the key is one of the first 16 words of the title.
 bool HxParamBundle::isTitled(const NameKey& key) const
 {
     static constexpr NameKey nameKey("Name");

@@ -2,6 +2,7 @@
 #include <kplib/param/HxParamBundle.h>
 #include <kplib/param/HxParameter.h>
 
+#include <cstdio>
 #include <cstring>
 
 namespace {
@@ -26,7 +27,7 @@ void appendIndent(KpString& out, int indent)
         out += "    ";
 }
 
-/// A text that is escaped in part loses its double quotes for single ones and keeps the backslashes: odd, and meant.
+// A text that is escaped in part loses its double quotes for single ones and keeps the backslashes: odd, and meant.
 void escapeDoubleQuotes(KpString& text)
 {
     const bool isEscaped = std::strstr(text, "\\\"");
@@ -60,7 +61,7 @@ void appendParameter(KpString& out, const HxParameter& parameter)
     appendQuoted(out, text ? text : "");
 }
 
-/// Index of the last child that goes into a file; no comma stands from there on. 0 while none are written.
+// Index of the last child that goes into a file; no comma stands from there on. 0 while none are written.
 long lastSaved(const HxParamBundle& bundle)
 {
     long last = interpreteNoSave > 0 ? bundle.size() - 1 : 0;

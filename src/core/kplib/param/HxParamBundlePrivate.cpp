@@ -12,7 +12,7 @@ namespace {
 constexpr size_t tagLength = 10;  // "Ggggg-eeee"
 constexpr long firstBlock = 16, endOfBlocks = 256;
 
-/// The parameter at an index if it is named like a tag, else null.
+// The parameter at an index if it is named like a tag, else null.
 const HxParameter* tagAt(const HxParamBundle& bundle, long i)
 {
     const HxParamBase* const child = bundle[i];
@@ -25,7 +25,7 @@ bool isSameGroup(const HxParameter& reservation, const char* pattern)
     return std::strncmp(reservation.name(), pattern, 5) == 0;
 }
 
-/// Whether a template has the positions that blocks are written to.
+// Whether a template has the positions that blocks are written to.
 bool isTemplate(const char* pattern)
 {
     return std::strlen(pattern) >= tagLength;
@@ -39,7 +39,7 @@ KpString withBlock(const char* pattern, const char* digits)
     return name;
 }
 
-/// The full name of a private tag of a creator that has a reservation; else false.
+// The full name of a private tag of a creator that has a reservation; else false.
 bool findPrivateTagName(const HxParamBundle& creators, const char* creator, const char* pattern, KpString* out)
 {
     if (!isTemplate(pattern))
@@ -58,8 +58,8 @@ bool findPrivateTagName(const HxParamBundle& creators, const char* creator, cons
     return false;
 }
 
-/// Whether a parameter of a header is a reservation. The group's last digit is tested by its character, so that groups
-/// that end in A, C and E pass and those that end in B, D and F don't: odd, and meant.
+// Whether a parameter of a header is a reservation. The group's last digit is tested by its character, so that groups
+// that end in A, C and E pass and those that end in B, D and F don't: odd, and meant.
 bool isReservation(const char* tag)
 {
     return (tag[4] & 1) && tag[6] == '0' && tag[7] == '0';
@@ -82,7 +82,7 @@ HxParamBundle& findOrCreatePrivateCreatorBundle(HxParamBundle& all)
     return made;
 }
 
-/// The smallest block that no reservation of the group has; endOfBlocks if there is none.
+// The smallest block that no reservation of the group has; endOfBlocks if there is none.
 long freeBlock(const HxParamBundle& creators, const char* pattern)
 {
     bool isTaken[endOfBlocks] = {};
@@ -99,7 +99,7 @@ long freeBlock(const HxParamBundle& creators, const char* pattern)
     return block;
 }
 
-/// Reserves a block for a creator and gives the full name of its tag; false if the group is full.
+// Reserves a block for a creator and gives the full name of its tag; false if the group is full.
 bool createPrivateTagName(HxParamBundle& all, HxParamBundle& creators, const char* creator, const char* pattern,
                           KpString& out)
 {

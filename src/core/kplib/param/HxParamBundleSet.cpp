@@ -5,7 +5,7 @@
 #include <algorithm>
 #include <cstdio>
 
-/// Sets what find() gives by the setter of that form, or adds a parameter by the constructor of that form.
+// Sets what find() gives by the setter of that form, or adds a parameter by the constructor of that form.
 template <typename... Value>
 void HxParamBundle::setOrAdd(const char* name, Value... value)
 {

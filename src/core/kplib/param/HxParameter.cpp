@@ -6,12 +6,14 @@
 #include <kplib/param/HxParamBundle.h>
 
 #include <climits>
+#include <cstdint>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
 #include <memory>
 #include <new>
 #include <type_traits>
+#include <utility>
 
 namespace {
 
@@ -26,7 +28,7 @@ void* copyOfText(const char* text)
     return std::memcpy(kpmalloc(size), text, size);
 }
 
-/// A block for `n` elements, filled from `data` if there is any.
+// A block for `n` elements, filled from `data` if there is any.
 void* newArray(int n, KpPrimType type, const void* data)
 {
     const unsigned long bytes = bytesOf(n, type);
@@ -43,7 +45,7 @@ void* newValue(int n, KpPrimType type, const void* data)
     return n != 0 ? newArray(n, type, data) : nullptr;
 }
 
-/// Calls `work` with element `i` if that is a number, of complex ones with the real part.
+// Calls `work` with element `i` if that is a number, of complex ones with the real part.
 template <typename Work>
 void visitNumber(KpPrimType type, const void* values, long i, Work work)
 {
@@ -72,7 +74,7 @@ void visitNumber(KpPrimType type, const void* values, long i, Work work)
     }
 }
 
-/// Toward zero after adding 0.5, negative values too, and that is meant.
+// Toward zero after adding 0.5, negative values too, and that is meant.
 int rounded(double v)
 {
     v += 0.5;

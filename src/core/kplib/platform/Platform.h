@@ -8,56 +8,56 @@ struct dirent;
 
 namespace kplib::platform {
 
-/// Steady counter from an arbitrary start; never runs backwards. Safe from any thread.
+// Steady counter from an arbitrary start; never runs backwards. Safe from any thread.
 std::uint64_t ticks();
 
-/// Nanoseconds per tick, as a fraction.
+// Nanoseconds per tick, as a fraction.
 struct TickRatio {
     std::uint32_t numerator;
     std::uint32_t denominator;
 };
 TickRatio tickRatio();
 
-/// Time since 1970-01-01 00:00:00 UTC, truncated to milliseconds.
+// Time since 1970-01-01 00:00:00 UTC, truncated to milliseconds.
 struct WallTime {
     std::int64_t seconds;
     int milliseconds;  // 0 to 999
 };
 WallTime wallTime();
 
-/// The system's name, as in a build string.
+// The system's name, as in a build string.
 const char* name();
 
-/// The system's version; zeros where it doesn't tell.
+// The system's version; zeros where it doesn't tell.
 struct Version {
     int major, minor, bugFix;
 };
 Version version();
 
-/// What of this machine is online. False, and `counts` as it was, if it doesn't tell.
+// What of this machine is online. False, and `counts` as it was, if it doesn't tell.
 struct ProcessorCounts {
     int packages, physicalCores, logicalProcessors;
 };
 bool processorCounts(ProcessorCounts& counts);
 
-/// Bytes of physical memory; 0 if unknown.
+// Bytes of physical memory; 0 if unknown.
 std::uint64_t totalMemory();
-/// Bytes that processes can have without swapping. False if unknown.
+// Bytes that processes can have without swapping. False if unknown.
 bool availableMemory(std::uint64_t& bytes);
 
-/// Memory of a process, in bytes. False where the system has no such figures.
+// Memory of a process, in bytes. False where the system has no such figures.
 struct ProcessMemory {
     std::int64_t workingSet, peakWorkingSet, pagefile, peakPagefile;
 };
 bool processMemory(std::int64_t process, ProcessMemory& memory);
 
-/// Names the calling thread for the system's tools; the name is cut where the system has no room for more.
+// Names the calling thread for the system's tools; the name is cut where the system has no room for more.
 void setThreadName(const char* name);
 
-/// What this system calls a shared object that others call ".so".
+// What this system calls a shared object that others call ".so".
 const char* sharedObjectSuffix();
 
-/// Whether an entry of the folder that is open at a descriptor is a folder itself; a link to one is not.
+// Whether an entry of the folder that is open at a descriptor is a folder itself; a link to one is not.
 bool isFolder(int folder, const dirent& entry);
 
 }  // namespace kplib::platform

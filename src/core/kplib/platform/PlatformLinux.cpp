@@ -1,5 +1,6 @@
 #include <kplib/platform/Platform.h>
 
+#include <cstdint>
 #include <cstdio>
 #include <cstring>
 #include <ctime>
@@ -17,7 +18,7 @@
 namespace kplib::platform {
 namespace {
 
-/// The word that a file of a processor's topology holds; false for a processor that is offline.
+// The word that a file of a processor's topology holds; false for a processor that is offline.
 bool readTopology(long processor, const char* file, std::string& value)
 {
     std::ifstream in("/sys/devices/system/cpu/cpu" + std::to_string(processor) + "/topology/" + file);

@@ -6,6 +6,8 @@
 #include <algorithm>
 #include <array>
 #include <bit>
+#include <cstdint>
+#include <cstring>
 
 using kplib::detail::bitsOfFlags;
 
@@ -13,7 +15,7 @@ namespace {
 
 constexpr std::uint64_t eachByte = 0x0101010101010101;
 
-/// What eight positions with these flags get, a byte each: all ones if flagged, and the number of flags before it.
+// What eight positions with these flags get, a byte each: all ones if flagged, and the number of flags before it.
 struct Eight {
     std::uint64_t isFlagged = 0;
     std::uint64_t rank = 0;
@@ -38,7 +40,7 @@ constexpr std::array<Eight, 256> eights = makeEights();
 
 }  // namespace
 
-/// `eightFlags(i, count)` gives the flags of `count` positions from i on as bits; 8, but for the end.
+// `eightFlags(i, count)` gives the flags of `count` positions from i on as bits; 8, but for the end.
 template <typename EightFlags>
 void KpPackedIndexing::build(long n, EightFlags eightFlags)
 {

@@ -8,6 +8,7 @@
 
 #include <cmath>
 #include <limits>
+#include <span>
 #include <type_traits>
 
 namespace {
@@ -43,7 +44,7 @@ void fillAll(void* dst, T value, long n)
     }
 }
 
-/// What `n` counts in floats for complex numbers, which are walked as such.
+// What `n` counts in floats for complex numbers, which are walked as such.
 KpTypedPointer asNumbers(KpTypedPointer data, unsigned long& n)
 {
     if (data.type != KpPrimType::Complex)
@@ -52,7 +53,7 @@ KpTypedPointer asNumbers(KpTypedPointer data, unsigned long& n)
     return {data.data, KpPrimType::Float};
 }
 
-/// Bytes of the words that an element consists of, 0 for an unknown type; a complex number is two words.
+// Bytes of the words that an element consists of, 0 for an unknown type; a complex number is two words.
 int wordSize(KpPrimType type)
 {
     switch (type) {

@@ -24,7 +24,7 @@ long bytesOf(const PlaneShape& shape)
     return byteCount({shape.width, shape.height, shape.bytesPerPixel});
 }
 
-/// A block for the pixels without gaps, one also for none; null if there is no memory.
+// A block for the pixels without gaps, one also for none; null if there is no memory.
 void* allocated(const PlaneShape& shape)
 {
     const long bytes = bytesOf(shape);
@@ -108,7 +108,7 @@ void KpRawData2D::clear()
     clearPlane(planeOf(*this), shapeOf(*this));
 }
 
-/// Sizes and the strides of pixels without gaps.
+// Sizes and the strides of pixels without gaps.
 void KpRawData2D::setShape(int w, int h, int bytesPerPixel)
 {
     dims_[0] = w;

@@ -11,7 +11,7 @@ using namespace kplib::detail;
 
 namespace {
 
-/// The axes along a row, from row to row and from slice to slice.
+// The axes along a row, from row to row and from slice to slice.
 struct Axes {
     int row, column, across;
 };
@@ -22,7 +22,7 @@ Axes axesOf(int orientation)
     return axes[orientation == 1 || orientation == 2 ? orientation : 0];
 }
 
-/// Voxels from one to the next along `axis`.
+// Voxels from one to the next along `axis`.
 long step(const std::int32_t* dims, int axis)
 {
     return axis == 0 ? 1L : axis == 1 ? long{dims[0]} : long{dims[0]} * dims[1];

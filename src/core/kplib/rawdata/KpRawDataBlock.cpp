@@ -6,13 +6,14 @@
 #include <climits>
 #include <cstdlib>
 #include <cstring>
+#include <span>
 #include <utility>
 
 namespace {
 
 using namespace kplib::detail;
 
-/// Storage of malloc, freed at the end of its scope unless it was given away.
+// Storage of malloc, freed at the end of its scope unless it was given away.
 class Storage {
 public:
     explicit Storage(unsigned long size) : data_(static_cast<char*>(std::malloc(size))) {}
@@ -28,7 +29,7 @@ private:
 
 constexpr unsigned long exchangeSize = 16384;  // of a piece that is exchanged by way of the first cache
 
-/// Large items, in pieces that stay in registers.
+// Large items, in pieces that stay in registers.
 void exchange(char* a, char* b, unsigned long bytes)
 {
     constexpr unsigned long piece = 64;
@@ -42,8 +43,8 @@ void exchange(char* a, char* b, unsigned long bytes)
     std::swap_ranges(a, a + bytes, b);
 }
 
-/// Small items, by way of the first cache. The items at the end are met downwards, which the processor doesn't foresee,
-/// so the next one of them is asked for ahead.
+// Small items, by way of the first cache. The items at the end are met downwards, which the processor doesn't foresee,
+// so the next one of them is asked for ahead.
 void exchange(char* a, char* b, unsigned long bytes, char* buffer)
 {
     for (unsigned long line = 0; line < bytes; line += 64)
@@ -53,7 +54,7 @@ void exchange(char* a, char* b, unsigned long bytes, char* buffer)
     std::memcpy(b, buffer, bytes);
 }
 
-/// Mirrors `count` items of `size` bytes by exchanging the first with the last, moving inward.
+// Mirrors `count` items of `size` bytes by exchanging the first with the last, moving inward.
 void flipItems(char* items, long count, unsigned long size, char* buffer)
 {
     char* last = items + static_cast<unsigned long>(count - 1) * size;
@@ -65,8 +66,8 @@ void flipItems(char* items, long count, unsigned long size, char* buffer)
     }
 }
 
-/// The same in pieces: the reversed end goes to the front, the reversed front to the end. What fits into the buffer is
-/// copied there and comes back reversed: memory is then read and written upwards only, as the processor foresees it.
+// The same in pieces: the reversed end goes to the front, the reversed front to the end. What fits into the buffer is
+// copied there and comes back reversed: memory is then read and written upwards only, as the processor foresees it.
 void flipWords(char* words, long count, long size, ReverseLoop* reverse, char* buffer)
 {
     const long pieces = static_cast<long>(exchangeSize) / size;
@@ -96,7 +97,7 @@ struct Box {
         return true;
     }
 
-    /// Bytes of the box, all there are if that is more.
+    // Bytes of the box, all there are if that is more.
     unsigned long bytes(long voxel) const
     {
         unsigned long result = static_cast<unsigned long>(voxel);
@@ -110,7 +111,7 @@ struct Box {
     long row(long y, long z) const { return (z * size[1] + y) * size[0]; }
 };
 
-/// Rows are packed towards the head; a row may overlap its own target, but never one that is still to come.
+// Rows are packed towards the head; a row may overlap its own target, but never one that is still to come.
 void packRows(char* data, long voxel, const Box& box)
 {
     char* to = data;
@@ -130,7 +131,7 @@ char* repeat(char* to, const void* value, long voxel, long n)
     return to;
 }
 
-/// One row of the box out of the row of the block that lies there, or is the nearest to it.
+// One row of the box out of the row of the block that lies there, or is the nearest to it.
 char* extendRow(char* to, const char* row, long voxel, const Box& box, const void* fillValue)
 {
     const long end = box.first[0] + box.count[0];

@@ -5,12 +5,15 @@
 #include <kplib/log/KpLogFile.h>
 #include <kplib/rawdata/detail/RawDataKernels.h>
 
+#include <cstring>
+#include <span>
+
 namespace {
 
 using namespace kplib::detail;
 
-/// Whether both types are numbers. A target that isn't one is an error, a source that isn't is left out without a word,
-/// and that is meant.
+// Whether both types are numbers. A target that isn't one is an error, a source that isn't is left out without a word,
+// and that is meant.
 bool areNumbers(KpPrimType to, KpPrimType from)
 {
     if (!to.isNumber()) {

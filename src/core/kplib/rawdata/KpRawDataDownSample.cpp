@@ -8,20 +8,21 @@
 #include <kplib/threads/ProgressScope.h>
 
 #include <cstdint>
+#include <span>
 
 namespace {
 
 using namespace kplib::detail;
 
-/// Sizes and factors of a call.
+// Sizes and factors of a call.
 struct Grid {
     unsigned long size[3];
     int factor[3];
 
     bool hasFactors() const { return factor[0] >= 1 && factor[1] >= 1 && factor[2] >= 1; }
-    /// Whether no factor exceeds its size by more than one, which is an axis without blocks.
+    // Whether no factor exceeds its size by more than one, which is an axis without blocks.
     bool isWithin() const { return within(0) && within(1) && within(2); }
-    /// Null will do where nothing is read and written; the progress runs all the same.
+    // Null will do where nothing is read and written; the progress runs all the same.
     bool accepts(const void* dst, const void* src) const
     {
         return (dst && src) || !(blocks(0) && blocks(1) && blocks(2));
@@ -41,8 +42,8 @@ bool isSupported(KpPrimType type)
     return false;
 }
 
-/// Has `makeLayer(k)` make each layer of voxels and reports step `reached(k)` after it. A canceled progress still gets
-/// its first layer.
+// Has `makeLayer(k)` make each layer of voxels and reports step `reached(k)` after it. A canceled progress still gets
+// its first layer.
 template <typename MakeLayer, typename Reached>
 void eachLayer(const Grid& grid, KpProgressInterface* progress, MakeLayer makeLayer, Reached reached)
 {
@@ -90,7 +91,7 @@ void downSample(BlockRule rule, void* dst, KpTypedPointer src, const Grid& grid,
     eachLayer(grid, progress, makeLayer, [&](long k) { return k * row.fz + 1; });
 }
 
-/// FX is the factor, 0 if known at run time only.
+// FX is the factor, 0 if known at run time only.
 template <int FX, typename Word>
 void takeEvery(Loose<Word>* __restrict to, const Loose<Word>* __restrict from, long n, long factor)
 {

@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <cstdio>
 #include <cstring>
 
 #include <unistd.h>
@@ -19,7 +20,7 @@ unsigned long sizeOf(KpTypedPointer data)
     return static_cast<unsigned long>(data.type.size());
 }
 
-/// Has `pass(done, chunk)` pass on the bytes piece by piece until it passes fewer than it is asked to.
+// Has `pass(done, chunk)` pass on the bytes piece by piece until it passes fewer than it is asked to.
 template <typename Pass>
 unsigned long wholeItems(unsigned long size, unsigned long count, Pass pass)
 {

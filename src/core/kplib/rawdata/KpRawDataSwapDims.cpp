@@ -12,6 +12,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <memory>
+#include <span>
 #include <utility>
 
 namespace {
@@ -19,7 +20,7 @@ namespace {
 using namespace kplib::detail;
 using Dims = std::array<long, 3>;
 
-/// A permutation of axes: axis i of the result is axis perm[i] of the source.
+// A permutation of axes: axis i of the result is axis perm[i] of the source.
 using Perm = std::array<int, 3>;
 
 bool isPermutation(const int* perm)
@@ -34,7 +35,7 @@ Dims permuted(const Dims& dims, const Perm& perm)
     return {size(0), size(1), size(2)};
 }
 
-/// Permutes the axes of a block of voxels of so many bytes in its own memory.
+// Permutes the axes of a block of voxels of so many bytes in its own memory.
 class AxisSwap {
 public:
     AxisSwap(char* data, long voxelSize, char* scratch, KpBitfield& visited) :
@@ -42,7 +43,7 @@ public:
     {
     }
 
-    /// What the permutation is made of: exchanges of y and z, and of x and y.
+    // What the permutation is made of: exchanges of y and z, and of x and y.
     void run(Dims dims, const Perm& perm)
     {
         const bool beginsWithYZ = perm == Perm{0, 2, 1} || perm[0] == 2;
@@ -93,9 +94,9 @@ private:
         }
     }
 
-    /// The in-place transposition of a matrix of rows: each cycle of places is walked once, with the row that was met
-    /// last in one half of the scratch area and the one that it drives out in the other. Rows are asked for some steps
-    /// ahead, since no processor foresees where they are.
+    // The in-place transposition of a matrix of rows: each cycle of places is walked once, with the row that was met
+    // last in one half of the scratch area and the one that it drives out in the other. Rows are asked for some steps
+    // ahead, since no processor foresees where they are.
     void followCycles(long ny, long nz)
     {
         const auto placeOf = [&](long index) { return index % ny * nz + index / ny; };
@@ -149,7 +150,7 @@ private:
     std::size_t rowSize_ = 0;
 };
 
-/// Four bytes move as an int, whatever they are.
+// Four bytes move as an int, whatever they are.
 bool canPermute(KpPrimType type, long voxelSize)
 {
     return voxelSize == 4 || type.isNumber();

@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <bit>
+#include <cstdint>
 
 void KpSuperPackedIndexing::appendIndexSpace(const unsigned char* flags, long n)
 {
@@ -27,7 +28,7 @@ void KpSuperPackedIndexing::openBlock()
     blockStarts_.append(runs_.size() - 1);
 }
 
-/// The last run goes on, and each change of the flags ends one.
+// The last run goes on, and each change of the flags ends one.
 void KpSuperPackedIndexing::appendWithinBlock(const unsigned char* flags, long n)
 {
     unsigned char lengths[blockSize + 1];

@@ -15,7 +15,7 @@ void KpTypedData2D::init(int w, int h, int /*ignored*/, int rowStride, KpTypedPo
     KpRawData2D::init(w, h, setElements(p.type, nDataVar), rowStride, p.data);
 }
 
-/// Gives the size of a pixel.
+// Gives the size of a pixel.
 int KpTypedData2D::setElements(KpPrimType type, int nDataVar)
 {
     primType_ = type;

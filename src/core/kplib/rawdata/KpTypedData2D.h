@@ -3,6 +3,8 @@
 #include <kplib/rawdata/KpRawData2D.h>
 #include <kplib/rawdata/KpTypedPointer.h>
 
+#include <cstdint>
+
 /// A KpRawData2D whose pixels are a number of components of one element type. The size of a pixel follows from the two.
 class KPLIB_API KpTypedData2D : public KpRawData2D {
 public:

@@ -18,7 +18,7 @@ void KpTypedData3D::getSlice(int orientation, int k, KpTypedData2D& out, int cop
     out.setElements(primType_, nDataVar_);
 }
 
-/// Gives the size of a voxel.
+// Gives the size of a voxel.
 int KpTypedData3D::setElements(KpPrimType type, int nDataVar)
 {
     primType_ = type;

@@ -3,6 +3,8 @@
 #include <kplib/rawdata/KpRawData3D.h>
 #include <kplib/rawdata/KpTypedPointer.h>
 
+#include <cstdint>
+
 /// A KpRawData3D whose voxels are a number of components of one element type. The size of a voxel follows from the two.
 /// It cannot be copied either.
 class KPLIB_API KpTypedData3D : public KpRawData3D {

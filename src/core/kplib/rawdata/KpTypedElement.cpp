@@ -10,7 +10,7 @@ namespace {
 
 using kplib::detail::Loose;
 
-/// What arithmetic on T is done in: unsigned for integers, since that wraps where signed overflow is undefined.
+// What arithmetic on T is done in: unsigned for integers, since that wraps where signed overflow is undefined.
 template <typename T>
 struct Arithmetic : std::type_identity<std::uint32_t> {
 };

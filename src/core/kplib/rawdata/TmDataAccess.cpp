@@ -79,7 +79,7 @@ bool TmDataAccess::isContiguous() const
            strides_[1] == byteCount({strides_[0], dims_[0]}) && strides_[2] == byteCount({strides_[1], dims_[1]});
 }
 
-/// A stride of 0 is to be worked out.
+// A stride of 0 is to be worked out.
 void TmDataAccess::fixStrides()
 {
     if (strides_[0] == 0)

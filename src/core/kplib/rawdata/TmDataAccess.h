@@ -13,6 +13,7 @@
 #include <kplib/log/KpResult.h>
 
 #include <cstddef>
+#include <cstdint>
 
 /// A volume in memory: sizes, element type, components, strides and the memory itself. Goes around as
 /// KpHandle<TmDataAccess>.

@@ -5,6 +5,9 @@
 #include <kplib/foundation/KpPrimTypeVisit.h>
 #include <kplib/rawdata/detail/RawDataKernels.h>
 
+#include <cstdint>
+#include <span>
+
 using namespace kplib::detail;
 
 namespace {
@@ -26,14 +29,14 @@ Line lineAt(long x, long y, long z, const KpVec3l& strides)
     return line;
 }
 
-/// Elements without gaps, by the conversion of KpRawData; its bounds are those of a line.
+// Elements without gaps, by the conversion of KpRawData; its bounds are those of a line.
 void convertDense(void* dst, KpPrimType to, const void* src, KpPrimType from, long n)
 {
     static ConvertLoops* const loops = best(convertPaths());
     loops(to, from)(dst, src, n);
 }
 
-/// Calls `each(element, i)` for each of `n` elements that lie `step` bytes apart.
+// Calls `each(element, i)` for each of `n` elements that lie `step` bytes apart.
 template <typename T, typename Each>
 void eachElement(void* first, long step, long n, Each each)
 {
@@ -44,7 +47,7 @@ void eachElement(void* first, long step, long n, Each each)
 
 }  // namespace
 
-/// A message may announce a volume without a voxel that is long on one axis; there is nothing behind its lines.
+// A message may announce a volume without a voxel that is long on one axis; there is nothing behind its lines.
 bool TmDataAccess::hasVoxels() const
 {
     return hasData() && nDataVar_ > 0 && dims_[0] > 0 && dims_[1] > 0 && dims_[2] > 0;

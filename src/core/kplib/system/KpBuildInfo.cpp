@@ -7,6 +7,7 @@
 #include <initializer_list>
 #include <map>
 #include <string>
+#include <utility>
 
 namespace {
 
@@ -14,8 +15,8 @@ namespace values = kplib::build;
 
 constexpr int numbers[] = {values::major, values::minor, values::patch, values::build};
 
-/// The text with numbers in place of %1%, %2% ... Not by a stream or format, which group digits as the program's locale
-/// has it.
+// The text with numbers in place of %1%, %2% ... Not by a stream or format, which group digits as the program's locale
+// has it.
 std::string filled(std::string text, std::initializer_list<int> items)
 {
     int place = 1;
@@ -26,7 +27,7 @@ std::string filled(std::string text, std::initializer_list<int> items)
     return text;
 }
 
-/// Major, minor and patch, with the build number or without.
+// Major, minor and patch, with the build number or without.
 std::string version(bool hasBuild)
 {
     const std::string three = filled("%1%.%2%.%3%", {values::major, values::minor, values::patch});
@@ -51,7 +52,7 @@ const std::map<std::string, std::string>& tags()
     return sTags;
 }
 
-/// What stands in the brackets of a build string; it may be nothing.
+// What stands in the brackets of a build string; it may be nothing.
 std::string details(int flags)
 {
     std::string inside;

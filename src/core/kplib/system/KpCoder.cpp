@@ -3,6 +3,8 @@
 #include <kplib/foundation/KpString.h>
 #include <kplib/system/detail/CoderKernels.h>
 
+#include <span>
+
 using namespace kplib::detail;
 
 unsigned int KpCoder::crc(const unsigned char* data, unsigned int n)

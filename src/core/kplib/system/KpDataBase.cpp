@@ -5,6 +5,7 @@
 #include <kplib/system/detail/TableWalk.h>
 
 #include <algorithm>
+#include <cstdint>
 
 using namespace kplib::detail;
 
@@ -57,8 +58,8 @@ void KpDataBase::clone(KpDataBase& target) const
     target.unskipCheck();
 }
 
-/// Leads the columns of a table cloned from `source`, and all they point to, to the tables of this table's own
-/// database.
+// Leads the columns of a table cloned from `source`, and all they point to, to the tables of this table's own
+// database.
 void KpTable::adoptTargets(const KpDataBase& source)
 {
     for (int column = columnCount_ - 1; column >= 0; --column) {

@@ -9,6 +9,7 @@
 #include <cerrno>
 #include <climits>
 #include <cstring>
+#include <ctime>
 #include <dirent.h>
 #include <memory>
 #include <string_view>
@@ -35,7 +36,7 @@ bool isWanted(const char* name, const char* pattern)
     return std::strcmp(name, ".") != 0 && std::strcmp(name, "..") != 0;
 }
 
-/// Calls `visit` with the name of each wanted entry and with a question whether it is a folder.
+// Calls `visit` with the name of each wanted entry and with a question whether it is a folder.
 template <typename Visit>
 bool walk(const char* dir, const char* pattern, Visit visit)
 {
@@ -62,7 +63,7 @@ unsigned long long since1601(std::time_t seconds)
     return static_cast<unsigned long long>(seconds) * unitsPerSecond + from1601To1970;
 }
 
-/// Copies a file, or a link as a link. To open a pipe or a device might block for ever.
+// Copies a file, or a link as a link. To open a pipe or a device might block for ever.
 void copyEntry(const KpString& source, const KpString& target)
 {
     struct stat status {};
@@ -79,8 +80,8 @@ void copyEntry(const KpString& source, const KpString& target)
     }
 }
 
-/// Copies what is in `source` to the folder `target`, which it makes; `newFolder`, the outermost such one, is no part
-/// of what is copied where it lies within the source.
+// Copies what is in `source` to the folder `target`, which it makes; `newFolder`, the outermost such one, is no part
+// of what is copied where it lies within the source.
 int copyTree(const char* source, const char* target, const struct stat* newFolder)
 {
     KpDArray<KpString> files, folders;
@@ -104,7 +105,7 @@ int copyTree(const char* source, const char* target, const struct stat* newFolde
     return 0;
 }
 
-/// Whether the path is a link; slashes behind it, with which the system would follow the link, don't count.
+// Whether the path is a link; slashes behind it, with which the system would follow the link, don't count.
 bool isLink(const char* path)
 {
     const std::string_view text(path);
@@ -113,7 +114,7 @@ bool isLink(const char* path)
     return lstat(bare, &status) == 0 && S_ISLNK(status.st_mode);
 }
 
-/// Logs what cannot be deleted, and passes the result on.
+// Logs what cannot be deleted, and passes the result on.
 int deleted(int result, const char* path)
 {
     if (result != 0)

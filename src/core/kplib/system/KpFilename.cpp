@@ -8,7 +8,7 @@
 
 namespace {
 
-/// What stat() tells of a name; all zero where it fails.
+// What stat() tells of a name; all zero where it fails.
 struct Status : stat {
     explicit Status(const char* name) : stat{}, isKnown(::stat(name, this) == 0) {}
     bool isSameFile(const Status& other) const

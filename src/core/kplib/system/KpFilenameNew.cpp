@@ -5,13 +5,14 @@
 #include <atomic>
 #include <cstring>
 #include <ctime>
+#include <initializer_list>
 #include <string>
 #include <sys/stat.h>
 #include <unistd.h>
 
 namespace {
 
-/// Whether `path` is a folder, which is made if nothing is there.
+// Whether `path` is a folder, which is made if nothing is there.
 bool haveFolder(const KpFilename& path)
 {
     return path.doesExist() ? path.isDirectory() : mkdir(path, 0775) == 0;
@@ -26,7 +27,7 @@ std::tm localTime()
     return local;
 }
 
-/// `root` without slashes at its end, but for a first one.
+// `root` without slashes at its end, but for a first one.
 KpFilename withoutSlashes(const KpString& root)
 {
     int length = root.length();

@@ -7,12 +7,13 @@
 #include <memory>
 #include <string>
 #include <unistd.h>
+#include <utility>
 
 namespace {
 
 using Pieces = KpDArray<KpString>;
 
-/// The folders of the directory that a path lies in; none for a path without a slash.
+// The folders of the directory that a path lies in; none for a path without a slash.
 Pieces foldersOf(const KpFilename& path)
 {
     KpFilename packed(path);

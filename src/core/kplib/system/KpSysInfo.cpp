@@ -16,7 +16,7 @@ struct ClosePipe {
     void operator()(FILE* pipe) const { pclose(pipe); }
 };
 
-/// Takes a line that begins with a number as it would be printed again, which the heading doesn't.
+// Takes a line that begins with a number as it would be printed again, which the heading doesn't.
 bool readProcess(const char* line, KpSysInfo::ProcessEntry& entry)
 {
     std::istringstream columns(line);

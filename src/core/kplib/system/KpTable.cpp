@@ -78,7 +78,7 @@ bool KpTable::canAdd(int columnId, ColumnType type, int size, const KpTable* tar
     return target && (type == RowPointer || (type == Relation && rowSize_ < maxRelationOffset));
 }
 
-/// Room for two cells' worth of entries a row of a new table, none of them used.
+// Room for two cells' worth of entries a row of a new table, none of them used.
 void KpTable::addPool(int offset)
 {
     dropPool(offset);

@@ -4,12 +4,13 @@
 #include <kplib/system/detail/TableWalk.h>
 
 #include <algorithm>
+#include <cstdint>
 
 using namespace kplib::detail;
 
 namespace {
 
-/// The two ends of a list, as a relation column holds them.
+// The two ends of a list, as a relation column holds them.
 struct Ends {
     char** first;
     char** last;
@@ -102,7 +103,7 @@ void KpTable::relationRemoveAll(char* row, int offset)
     setEnds(row, offset, {nullptr, nullptr});
 }
 
-/// Clears a cell, for which the list has room.
+// Clears a cell, for which the list has room.
 void KpTable::freeCell(char** cell, int offset)
 {
     cell[0] = cell[1] = nullptr;
@@ -130,7 +131,7 @@ void KpTable::relationReserve(int cells, int offset)
     relationExpand(wanted, offset, pool);
 }
 
-/// Gives the pool room for `size` cells, and leads all pointers to cells to where these are then.
+// Gives the pool room for `size` cells, and leads all pointers to cells to where these are then.
 void KpTable::relationExpand(long size, int offset, Pool& pool)
 {
     if (pool.capacity() >= size * 2)
@@ -145,7 +146,7 @@ void KpTable::relationExpand(long size, int offset, Pool& pool)
         shiftCells(offset, moved);
 }
 
-/// Leads the pointers to the cells of a pool that has moved by `bytes` to where they are.
+// Leads the pointers to the cells of a pool that has moved by `bytes` to where they are.
 void KpTable::shiftCells(int offset, std::intptr_t bytes)
 {
     Pool& pool = *relationPool_[offset];

@@ -7,12 +7,14 @@
 #include <kplib/system/detail/TableWalk.h>
 
 #include <algorithm>
+#include <cstdint>
+#include <cstring>
 
 using namespace kplib::detail;
 
 namespace {
 
-/// Where a row has moved to: written into the first bytes of the place it has left.
+// Where a row has moved to: written into the first bytes of the place it has left.
 char* movedTo(const char* oldRow)
 {
     return readAt<char*>(oldRow);
@@ -144,7 +146,7 @@ void KpTable::relationsRepair()
         database_->tables()[i]->repairColumns(*this);
 }
 
-/// Leads all pointers to rows of `moved` to where these are.
+// Leads all pointers to rows of `moved` to where these are.
 void KpTable::repairColumns(const KpTable& moved)
 {
     for (int column = columnCount_ - 1; column >= 0; --column) {

@@ -10,7 +10,7 @@ namespace {
 
 constexpr const char* form = "{00000000-0000-0000-0000-000000000000}";  // 0: a digit
 
-/// Fills all `n` bytes, though a signal may cut a read short.
+// Fills all `n` bytes, though a signal may cut a read short.
 bool readFully(int file, unsigned char* out, size_t n)
 {
     while (n > 0) {

@@ -1,5 +1,7 @@
 #include <kplib/system/KpVersion.h>
 
+#include <cstdint>
+#include <initializer_list>
 #include <locale>
 #include <sstream>
 

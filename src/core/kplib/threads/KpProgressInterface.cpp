@@ -4,6 +4,7 @@
 #include <kplib/threads/KpProgressGuiInterface.h>
 
 #include <algorithm>
+#include <functional>
 #include <utility>
 
 namespace {

@@ -46,7 +46,7 @@ struct KpThreadPrivate {
     KpString name;
 };
 
-/// `failure`: the error line, formatted with the error's code.
+// `failure`: the error line, formatted with the error's code.
 KpThreadPrivate* KpThreadPrivate::make(const char* name, const char* failure)
 {
     auto* const record = new KpThreadPrivate(name);

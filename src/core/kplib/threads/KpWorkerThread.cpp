@@ -73,7 +73,7 @@ void KpWorkerThreadPrivate::run()
     enter(KpWorkerThread::NotStarted);
 }
 
-/// False when the thread is to end.
+// False when the thread is to end.
 bool KpWorkerThreadPrivate::awaitPass()
 {
     const Lock lock(&stateMutex);

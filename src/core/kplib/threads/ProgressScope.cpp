@@ -2,6 +2,8 @@
 
 #include <kplib/threads/KpProgressInterface.h>
 
+#include <vector>
+
 ProgressScope::ProgressScope(KpProgressInterface* progress) :
     progress_(progress), depth_(progress ? progress->steps_.size() : 0)
 {

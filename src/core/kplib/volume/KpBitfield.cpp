@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <bit>
 #include <cstring>
+#include <span>
 
 using namespace kplib::detail;
 
@@ -17,7 +18,7 @@ constexpr unsigned long wordsFor(unsigned long nBits)
     return nBits == 0 ? 0 : (nBits >> 5) + 1;
 }
 
-/// The bits below number `nBits` in the word that holds that number.
+// The bits below number `nBits` in the word that holds that number.
 constexpr BitWord lowBits(unsigned long nBits)
 {
     return (1U << (nBits & 31)) - 1;
@@ -30,7 +31,7 @@ void combine(BitWord* a, const BitWord* b, unsigned long n)
     run(a, b, n);
 }
 
-/// Whether Op gives a set bit among the first `nBits`.
+// Whether Op gives a set bit among the first `nBits`.
 template <typename Op>
 bool any(const BitWord* a, const BitWord* b, unsigned long nBits)
 {
@@ -141,7 +142,7 @@ bool KpBitfield::hasIntersection(const KpBitfield& other) const
     return any<BitAnd>(bits_, other.bits_, std::min(nBits_, other.nBits_));
 }
 
-/// The bits behind the full words.
+// The bits behind the full words.
 std::uint32_t KpBitfield::lastBits() const
 {
     return nBits_ == 0 ? 0 : bits_[nBits_ >> 5] & lowBits(nBits_);

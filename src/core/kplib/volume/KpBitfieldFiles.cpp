@@ -4,6 +4,7 @@
 #include <kplib/system/KpCoder.h>
 
 #include <algorithm>
+#include <cstdint>
 #include <cstdio>
 #include <memory>
 

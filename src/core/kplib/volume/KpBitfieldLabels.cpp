@@ -2,6 +2,8 @@
 
 #include <kplib/volume/detail/BitfieldKernels.h>
 
+#include <span>
+
 using namespace kplib::detail;
 
 void KpBitfield::fromLabels(unsigned long n, const unsigned char* labels, unsigned char label)

@@ -10,6 +10,7 @@
 #include <cmath>
 #include <cstdint>
 #include <cstring>
+#include <initializer_list>
 #include <limits>
 #include <type_traits>
 
@@ -53,15 +54,15 @@ Neighbours previousNeighbours(int neighbours)
     }
 }
 
-/// Threads that label at once share the counters: no access may be a data race, but diagnostics are not worth the bus
-/// lock of an exact count.
+// Threads that label at once share the counters: no access may be a data race, but diagnostics are not worth the bus
+// lock of an exact count.
 void countUp(int& counter)
 {
     // std::atomic_ref is missing from libc++ 14.
     __atomic_store_n(&counter, __atomic_load_n(&counter, __ATOMIC_RELAXED) + 1, __ATOMIC_RELAXED);
 }
 
-/// Rounded half up, cut to 32 bits as the processor does (all that doesn't fit is the smallest int), then to the type.
+// Rounded half up, cut to 32 bits as the processor does (all that doesn't fit is the smallest int), then to the type.
 template <typename T>
 T threshold(double value)
 {
@@ -73,7 +74,7 @@ T threshold(double value)
     }
 }
 
-/// Labels in 32 bytes.
+// Labels in 32 bytes.
 template <typename L>
 constexpr long blockOf = 32 / sizeof(L);
 
@@ -95,8 +96,8 @@ void renumberEach(L* labels, long n, const int* numbers)
     std::transform(labels, labels + n, labels, [=](L label) { return static_cast<L>(numbers[label]); });
 }
 
-/// Gives each label its new number. Labels come in runs, and most keep theirs: blocks of one label are not looked up
-/// one by one, and not written if nothing changes.
+// Gives each label its new number. Labels come in runs, and most keep theirs: blocks of one label are not looked up
+// one by one, and not written if nothing changes.
 template <typename L>
 void renumber(L* labels, long n, const int* numbers)
 {

@@ -10,7 +10,7 @@ using Ground = kplib::detail::FloodGround;
 
 namespace {
 
-/// Part of a row from where to look for what is to be filled. The size matters: there may be many.
+// Part of a row from where to look for what is to be filled. The size matters: there may be many.
 struct SF3D_Segment {
     std::int16_t z, y, xLeft, xRight;
 };
@@ -61,7 +61,7 @@ private:
     // The ground goes by value and into inlined functions: as a field it would be loaded anew after each write of bits,
     // as an argument copied by way of memory.
 
-    /// A segment in which nothing is open has no effect, not later either. `pos` is the voxel at its left.
+    // A segment in which nothing is open has no effect, not later either. `pos` is the voxel at its left.
     [[gnu::always_inline]] void push(Ground ground, int z, int y, int xLeft, int xRight, long pos)
     {
         if (!ground.isOpen(pos, xRight - xLeft + 1))
@@ -84,9 +84,9 @@ private:
             push(ground, z, y + 1, xLeft, xRight, pos + nx_);
     }
 
-    /// Fills the runs that begin in the segment, the first one to both sides. Where runs are partly visited already,
-    /// what is filled depends on these very steps: only the first looks to its left, and visited ground at the end of
-    /// the segment ends it.
+    // Fills the runs that begin in the segment, the first one to both sides. Where runs are partly visited already,
+    // what is filled depends on these very steps: only the first looks to its left, and visited ground at the end of
+    // the segment ends it.
     void walk(Ground ground, const SF3D_Segment segment)
     {
         const long start = row(segment.y, segment.z), last = start + segment.xRight;
@@ -149,7 +149,7 @@ unsigned long fillAll(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpV
     return count;
 }
 
-/// The fields at a size that the fill can work on.
+// The fields at a size that the fill can work on.
 unsigned long fillFew(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpVec3i>& seeds, bool value,
                       const int* dims, Box& box)
 {

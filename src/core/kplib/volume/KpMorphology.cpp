@@ -4,7 +4,9 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <initializer_list>
 #include <memory>
+#include <span>
 
 using namespace kplib::detail;
 
@@ -36,7 +38,7 @@ void byVoxel(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long p
     }
 }
 
-/// False, and nothing is done, if there is no memory for the work area.
+// False, and nothing is done, if there is no memory for the work area.
 bool byWords(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long passes, const Operation& operation)
 {
     MorphologyJob job{src.data(), dst.data(), dims[0], dims[1], dims[2], passes, operation.reach, operation.erodes};
@@ -52,7 +54,7 @@ bool byWords(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long p
     return true;
 }
 
-/// Brings dst to its size; whether there is anything to do then.
+// Brings dst to its size; whether there is anything to do then.
 bool prepare(KpBitfield& dst, unsigned long nBits)
 {
     if (dst.nBits() != nBits)
@@ -60,7 +62,7 @@ bool prepare(KpBitfield& dst, unsigned long nBits)
     return nBits != 0;
 }
 
-/// `alignedNeedsArea`: also for rows that begin at words.
+// `alignedNeedsArea`: also for rows that begin at words.
 void morph(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long passes, const Operation& operation,
            bool alignedNeedsArea)
 {

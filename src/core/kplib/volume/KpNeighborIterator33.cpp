@@ -22,7 +22,7 @@ constexpr Delta edgesInPlane[] = {{-1, -1, 0}, {1, -1, 0}, {-1, 1, 0}, {1, 1, 0}
 constexpr Delta faces[] = {{0, 0, -1}, {0, -1, 0}, {-1, 0, 0}, {0, 0, 1}, {0, 1, 0}, {1, 0, 0}};
 constexpr Delta facesInPlane[] = {{0, -1, 0}, {-1, 0, 0}, {0, 1, 0}, {1, 0, 0}};
 
-/// Calls `visit` with each neighbour in the table's order; nothing for a number of neighbours that isn't one.
+// Calls `visit` with each neighbour in the table's order; nothing for a number of neighbours that isn't one.
 template <typename Visit>
 void forEachNeighbor(int count, Visit visit)
 {

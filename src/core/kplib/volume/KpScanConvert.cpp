@@ -14,14 +14,14 @@ namespace {
 
 thread_local const KpScanConvert* current = nullptr;  // what renders on this thread
 
-/// An edge that the scanline crosses.
+// An edge that the scanline crosses.
 struct Active {
     float x;   // of the crossing
     float dx;  // from one scanline to the next
     int i;     // from vertex i to the next
 };
 
-/// NaN behind all numbers, so that an order there is.
+// NaN behind all numbers, so that an order there is.
 float sortKey(float value)
 {
     return std::isnan(value) ? std::numeric_limits<float>::infinity() : value;
@@ -32,14 +32,14 @@ bool compare_active(const Active& a, const Active& b)
     return sortKey(a.x) < sortKey(b.x);
 }
 
-/// The integer that a float comes to between two bounds; NaN comes to the lower one.
+// The integer that a float comes to between two bounds; NaN comes to the lower one.
 int clampedTo(double value, int low, int high)
 {
     return !(value > low) ? low : value < high ? static_cast<int>(value) : high;
 }
 
-/// Memory that a scan takes and gives back at its end: from a buffer, and from the heap once that is used up. As
-/// std::pmr's, which is missing from libc++ 14.
+// Memory that a scan takes and gives back at its end: from a buffer, and from the heap once that is used up. As
+// std::pmr's, which is missing from libc++ 14.
 class Arena {
 public:
     void* take(std::size_t bytes)
@@ -88,7 +88,7 @@ public:
         });
     }
 
-    /// Calls `span` with y, xLeft and xRight of each span.
+    // Calls `span` with y, xLeft and xRight of each span.
     template <typename Span>
     void concave(Span span)
     {
@@ -107,7 +107,7 @@ private:
     int before(int i) const { return i > 0 ? i - 1 : n_ - 1; }
     int behind(int i) const { return i < n_ - 1 ? i + 1 : 0; }
 
-    /// Takes up the vertices up to the middle of the scanline: each starts, ends or passes over its two edges.
+    // Takes up the vertices up to the middle of the scanline: each starts, ends or passes over its two edges.
     void meetVertices(int y)
     {
         for (; next_ < n_ && points_[order_[static_cast<std::size_t>(next_)]].y() <= y + 0.5; ++next_) {
@@ -139,7 +139,7 @@ private:
         if (found != active_.end())
             active_.erase(found);
     }
-    /// The list is nearly sorted, but for the edges that have just come.
+    // The list is nearly sorted, but for the edges that have just come.
     void sortActive()
     {
         if (!std::is_sorted(active_.begin(), active_.end(), compare_active))

@@ -5,7 +5,7 @@
 
 namespace kplib::detail {
 
-/// The wall-clock time that is `milliseconds` after `now`, whose part below a millisecond is dropped.
+// The wall-clock time that is `milliseconds` after `now`, whose part below a millisecond is dropped.
 inline timespec deadlineAfter(timeval now, unsigned long milliseconds)
 {
     const unsigned long ms = static_cast<unsigned long>(now.tv_usec) * 1000 / 1000000 + milliseconds % 1000;

@@ -9,13 +9,13 @@
 
 namespace kplib::detail {
 
-/// The polygon for each set of corners that lie on the plane's lower side, bit i for corner i: the number of vertices,
-/// then the edges that they lie on, in order around it, one corner's number in the high nibble and the other's in the
-/// low one. A set and its complement have one polygon, so half the sets are here.
+// The polygon for each set of corners that lie on the plane's lower side, bit i for corner i: the number of vertices,
+// then the edges that they lie on, in order around it, one corner's number in the high nibble and the other's in the
+// low one. A set and its complement have one polygon, so half the sets are here.
 extern const std::uint8_t cuts[128][7];
 
-/// The corners of a box given as xmin, xmax, ymin, ymax, zmin, zmax; x is the upper bound in corner i if bit 0 of i is
-/// set, y if bit 1 is, z if bit 2 is.
+// The corners of a box given as xmin, xmax, ymin, ymax, zmin, zmax; x is the upper bound in corner i if bit 0 of i is
+// set, y if bit 1 is, z if bit 2 is.
 template <typename Vector, typename Number>
 void fillCorners(Vector (&corners)[8], std::span<const Number, 6> box)
 {
@@ -30,7 +30,7 @@ void projectCorners(Number (&values)[8], const Vector (&corners)[8], const Vecto
         values[i] = corners[i].dot(normal);
 }
 
-/// Bit i is set if `distance` is strictly above value i.
+// Bit i is set if `distance` is strictly above value i.
 template <typename Number>
 unsigned maskBelow(const Number (&values)[8], Number distance)
 {
@@ -40,8 +40,8 @@ unsigned maskBelow(const Number (&values)[8], Number distance)
     return mask;
 }
 
-/// Calls `vertex(i, a, b, t)` for each vertex of the cut at `distance`, which lies at `t` from corner b toward corner
-/// a, and gives their number.
+// Calls `vertex(i, a, b, t)` for each vertex of the cut at `distance`, which lies at `t` from corner b toward corner
+// a, and gives their number.
 template <typename Number, typename Vertex>
 int visitCut(const Number (&values)[8], Number distance, Vertex&& vertex)
 {
@@ -57,7 +57,7 @@ int visitCut(const Number (&values)[8], Number distance, Vertex&& vertex)
     return count;
 }
 
-/// Writes the polygon with vertices between `corners`, and the same between `others` unless there is no place for it.
+// Writes the polygon with vertices between `corners`, and the same between `others` unless there is no place for it.
 template <typename Number, typename Vector>
 int cutCorners(const Number (&values)[8], Number distance, const Vector (&corners)[8], Vector* vertices,
                const Vector (&others)[8], Vector* otherVertices)

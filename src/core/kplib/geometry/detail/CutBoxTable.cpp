@@ -1,6 +1,7 @@
 #include <kplib/geometry/detail/CutBox.h>
 
 #include <bit>
+#include <cstdint>
 
 // Sets that no plane divides the corners into are empty, or hold several polygons in a row, which are never used.
 constexpr std::uint8_t kplib::detail::cuts[128][7] = {

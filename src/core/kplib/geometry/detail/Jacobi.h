@@ -4,27 +4,27 @@
 
 namespace kplib::detail {
 
-/// Cyclic Jacobi rotations of a symmetric 3x3 matrix, of which the upper half is read. `Real` is what the work is done
-/// in; eigenvalues and eigenvectors are floats at each step, whatever it is.
-///
-/// Everything is indexed by constants once run() is unrolled, so that it stays in registers.
+// Cyclic Jacobi rotations of a symmetric 3x3 matrix, of which the upper half is read. `Real` is what the work is done
+// in; eigenvalues and eigenvectors are floats at each step, whatever it is.
+//
+// Everything is indexed by constants once run() is unrolled, so that it stays in registers.
 template <typename Real>
 class Jacobi {
 public:
     float evalues[3];
-    float evectors[3][3] = {{1, 0, 0}, {0, 1, 0}, {0, 0, 1}};  ///< one a column
+    float evectors[3][3] = {{1, 0, 0}, {0, 1, 0}, {0, 0, 1}};  // one a column
     int rotations = 0;
     int sweeps = 0;
 
-    /// Small elements are left alone while the sweep is below `thresholdSweeps`; from `skipSweep` on those are dropped
-    /// that the eigenvalues don't feel.
+    // Small elements are left alone while the sweep is below `thresholdSweeps`; from `skipSweep` on those are dropped
+    // that the eigenvalues don't feel.
     Jacobi(const float* rows, int stride, int thresholdSweeps, int skipSweep) :
         evalues{rows[0], rows[stride + 1], rows[2 * stride + 2]}, thresholdSweeps_(thresholdSweeps),
         skipSweep_(skipSweep), off_{rows[stride + 2], rows[2], rows[1]}, sums_{evalues[0], evalues[1], evalues[2]}
     {
     }
 
-    /// Whether it came to an end within 50 sweeps.
+    // Whether it came to an end within 50 sweeps.
     bool run()
     {
         for (; sweeps < 50; ++sweeps) {
@@ -45,7 +45,7 @@ public:
     }
 
 private:
-    /// Element p, q is off_[3 - p - q]: the index is the one that both lack.
+    // Element p, q is off_[3 - p - q]: the index is the one that both lack.
     template <int P, int Q>
     [[gnu::always_inline]] void visit(Real threshold, Real (&shifts)[3])
     {
@@ -57,7 +57,7 @@ private:
             rotate<P, Q>(g, shifts);
     }
 
-    /// An eigenvalue is a float, so that is what it has to be lost in.
+    // An eigenvalue is a float, so that is what it has to be lost in.
     static bool isLostIn(float value, Real g) { return static_cast<float>(g + std::abs(value)) == std::abs(value); }
 
     template <int P, int Q>
@@ -80,7 +80,7 @@ private:
         ++rotations;
     }
 
-    /// Of the angle that makes `element` vanish between eigenvalues that differ by `h`.
+    // Of the angle that makes `element` vanish between eigenvalues that differ by `h`.
     static Real tangent(Real h, Real g, Real element)
     {
         if (g + std::abs(h) == std::abs(h))
@@ -102,7 +102,7 @@ private:
 
     int thresholdSweeps_, skipSweep_;
     Real off_[3];
-    Real sums_[3];  ///< the eigenvalues, to which the shifts of a whole sweep are added at once
+    Real sums_[3];  // the eigenvalues, to which the shifts of a whole sweep are added at once
 };
 
 }  // namespace kplib::detail

@@ -1,9 +1,12 @@
 #include <kplib/geometry/detail/Mat4fLoops.h>
 
+#include <initializer_list>
+#include <span>
+
 namespace kplib::detail {
 namespace {
 
-/// The reference.
+// The reference.
 bool invertPlain(const float* in, float* out)
 {
     double a[3][3];

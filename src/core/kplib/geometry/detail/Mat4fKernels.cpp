@@ -2,6 +2,9 @@
 
 #include <kplib/geometry/KpMat4f.h>
 
+#include <initializer_list>
+#include <span>
+
 namespace kplib::detail {
 
 std::span<const KernelPath<TransformLoop>> transformPaths()

@@ -20,7 +20,7 @@ KPLIB_TARGET_AVX2 inline __m256d turnedRight(__m256d v)
     return _mm256_permute4x64_pd(v, _MM_SHUFFLE(3, 1, 0, 2));
 }
 
-/// Adds the first three lanes of `terms`, one by one, to the sums of (positive, negative).
+// Adds the first three lanes of `terms`, one by one, to the sums of (positive, negative).
 KPLIB_TARGET_AVX2 inline __m128d added(__m128d sums, __m256d terms)
 {
     const __m256d positive = _mm256_max_pd(terms, _mm256_setzero_pd());

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <kplib/geometry/KpMat4f.h>
 #include <kplib/geometry/detail/Mat4fKernels.h>
 
 #include <cmath>
@@ -11,9 +12,9 @@ namespace kplib::detail {
 KPLIB_X86_ROWS(TransformLoop, transformX86);
 KPLIB_X86_ROWS(AffineInverse, affineInverseX86);
 
-/// The reference. A row of the matrix is a vector, its fourth lane the divisor.
+// The reference. A row of the matrix is a vector, its fourth lane the divisor.
 struct TransformEach {
-    using Row = float __attribute__((vector_size(16)));
+    using Row = KpMat4f::Row;
 
     KPLIB_KERNEL_BODY static void run(const float* matrix, const float* from, float* to, long n)
     {
@@ -27,17 +28,17 @@ struct TransformEach {
     }
 };
 
-/// `Lanes` points at a time, each of their components in a vector of its own.
-///
-/// The points fill three vectors, first, second and third. Component c of point p is in place (3 p + c) % Lanes of one
-/// of these, and no other point has that c in this place, as Lanes is not a multiple of 3: two blends collect a
-/// component, one permutation sorts it, and the same steps backwards write it.
+// `Lanes` points at a time, each of their components in a vector of its own.
+//
+// The points fill three vectors, first, second and third. Component c of point p is in place (3 p + c) % Lanes of one
+// of these, and no other point has that c in this place, as Lanes is not a multiple of 3: two blends collect a
+// component, one permutation sorts it, and the same steps backwards write it.
 template <int Lanes>
 struct TransformTogether {
     typedef float Vector __attribute__((vector_size(4 * Lanes)));  // gcc 12 takes such an alias for a float
     using Places = std::make_integer_sequence<int, Lanes>;
 
-    /// Which of the three vectors has component c in `place`.
+    // Which of the three vectors has component c in `place`.
     static constexpr int holder(int c, int place) { return (c - place + 3 * Lanes) * (Lanes % 3) % 3; }
     static constexpr int placeOf(int c, int point) { return (3 * point + c) % Lanes; }
     static constexpr int pointAt(int c, int place) { return (holder(c, place) * Lanes + place - c) / 3; }
@@ -90,7 +91,7 @@ struct TransformTogether {
     }
 };
 
-/// Whether the determinant is nothing beside the sums of its positive and its negative terms.
+// Whether the determinant is nothing beside the sums of its positive and its negative terms.
 KPLIB_KERNEL_BODY bool isSingular(double positive, double negative)
 {
     const double det = positive + negative, magnitude = positive - negative;

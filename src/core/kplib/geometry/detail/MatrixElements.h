@@ -5,7 +5,7 @@
 
 namespace kplib::detail {
 
-/// Whether no element differs by strictly more than `tolerance`; NaN does not.
+// Whether no element differs by strictly more than `tolerance`; NaN does not.
 template <int Count>
 bool elementsEqual(const float* a, const float* b, float tolerance)
 {
@@ -16,7 +16,7 @@ bool elementsEqual(const float* a, const float* b, float tolerance)
     return true;
 }
 
-/// {"m00":"1.000000", ... } of a square matrix, row by row.
+// {"m00":"1.000000", ... } of a square matrix, row by row.
 template <int Size>
 std::string dumpElements(const float* elements)
 {

@@ -16,8 +16,8 @@ constexpr double flat = 1e-5;  // a singular value below it: the points lie in a
 
 enum Mode : int { Rigid = 0, RigidWithScale = 1, Affine = 2 };
 
-/// How the weights of the two lists are used: one array for both, whose sum in list 1 divides both centroids and which
-/// weights the rows of list 2 alone, or an array for each.
+// How the weights of the two lists are used: one array for both, whose sum in list 1 divides both centroids and which
+// weights the rows of list 2 alone, or an array for each.
 enum class Weights { None, Shared, Own };
 
 KpMat4f between(const KpVec3f& centroidA, const KpMat3f& matrix, const KpVec3f& centroidB)
@@ -47,7 +47,7 @@ KpMat3f timesTransposed(const KpDMatrix<float>& u, const KpDMatrix<float>& v)
     return left * right.transpose();
 }
 
-/// The places of the smallest, the middle and the largest singular value; 0, 1, 2 if they are all equal.
+// The places of the smallest, the middle and the largest singular value; 0, 1, 2 if they are all equal.
 struct Order {
     explicit Order(const float (&w)[3])
     {
@@ -60,7 +60,7 @@ struct Order {
     int smallest, middle, largest;
 };
 
-/// The rotation R that makes the sum of the squares of A R - B least, for H = transpose(A) * B.
+// The rotation R that makes the sum of the squares of A R - B least, for H = transpose(A) * B.
 KpMat3f rotationFor(const KpMat3f& h)
 {
     KpDMatrix<float> correlation(3, 3), u, v;
@@ -106,7 +106,7 @@ float scaleFor(const Rows& rows, const KpMat3f& rotation)
     return sums.products / sums.squares;
 }
 
-/// The points of the two lists, of which the rows hold the differences from their centroids.
+// The points of the two lists, of which the rows hold the differences from their centroids.
 struct Centroids {
     KpVec3f list1, list2;
 };
@@ -170,7 +170,7 @@ public:
 private:
     Centroids centroids() const { return {rows_.centre1, rows_.centre2}; }
 
-    /// False if there is nothing to divide by.
+    // False if there is nothing to divide by.
     bool computeCentroids()
     {
         const auto sums = kplib::detail::sumOfPairs<CentroidSums>(
@@ -196,7 +196,7 @@ const float* numbers(const KpVec3f* points)
     return reinterpret_cast<const float*>(points);  // a vector is its three floats; without pairs the lists may be null
 }
 
-/// Null for index lists or weights that there are none of.
+// Null for index lists or weights that there are none of.
 template <bool isIndexed, Weights kind>
 void align(KpMat4f& result, const KpVec3f* points1, const KpVec3f* points2, const int* index1, const int* index2,
            const float* weights1, const float* weights2, int n, int mode, const KpMat4f* initial)
@@ -205,7 +205,7 @@ void align(KpMat4f& result, const KpVec3f* points1, const KpVec3f* points2, cons
     alignment.run(result, mode, initial);
 }
 
-/// Rows that are there already.
+// Rows that are there already.
 auto rowsOf(const KpDMatrix<float>& a, const KpDMatrix<float>& b)
 {
     using List = PointList<false, false>;

@@ -6,13 +6,16 @@
 #include <kplib/geometry/numerics/detail/DelaunaySteps.h>
 #include <kplib/log/KpLogFile.h>
 
+#include <algorithm>
 #include <cmath>
 #include <cstdlib>
+#include <span>
+#include <utility>
 
 namespace kplib::detail::delaunay {
 namespace {
 
-/// How many ranges the corners of the enclosing simplex lie beyond the lowest coordinates.
+// How many ranges the corners of the enclosing simplex lie beyond the lowest coordinates.
 constexpr float far(int size)
 {
     return size == 2 ? 50 : 800;
@@ -43,7 +46,7 @@ Box<Size> boxOf(const KpDArray<Point<Size>>& points, int n)
     return box;
 }
 
-/// Positive for corners in the order that is given out, zero for a flat simplex.
+// Positive for corners in the order that is given out, zero for a flat simplex.
 template <int Size>
 float volume(const KpDArray<Point<Size>>& points, const Simplex<Size>& simplex)
 {

@@ -28,7 +28,7 @@ struct ScatterSums {
     }
 };
 
-/// The sum of transpose(d) * d over the differences from `centroid`.
+// The sum of transpose(d) * d over the differences from `centroid`.
 KpMat3f scatterMatrix(const KpDArray<KpVec3f>& points, const KpVec3f& centroid)
 {
     const auto s = kplib::detail::pairwiseSum<ScatterSums>(points.size(), [&](ScatterSums& sums, long i, long end) {

@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <iterator>
 
 // Plan
 //
@@ -42,7 +43,7 @@ namespace {
 
 float lengthOf(const KpVec2f& v)
 {
-    return static_cast<float>(std::hypot(static_cast<double>(v.x()), static_cast<double>(v.y())));
+    return v.hypot();
 }
 
 float lengthOf(const KpVec3f& v)
@@ -119,7 +120,7 @@ void KpODEBase<Vector>::init(const Vector& start, float h0)
     s.h = std::min(static_cast<float>(length == 0 ? step : step / static_cast<double>(length)), 5 * s.hSampling);
 }
 
-/// Scales what the right-hand side gave; false for a derivative of length 0.
+// Scales what the right-hand side gave; false for a derivative of length 0.
 template <typename Vector>
 bool KpODEBase<Vector>::orient(Vector& derivative) const
 {
@@ -197,7 +198,7 @@ int KpODEBase<Vector>::attempt(Vector& y, Vector& f, Vector& error) const
     }
 }
 
-/// An attempt that leaves the field is made again with a quarter of the step, twice.
+// An attempt that leaves the field is made again with a quarter of the step, twice.
 template <typename Vector>
 int KpODEBase<Vector>::attemptWithSmallerSteps(Vector& y, Vector& f, Vector& error)
 {
@@ -219,7 +220,7 @@ double KpODEBase<Vector>::stepFactor(float error) const
     return std::pow(static_cast<double>(ratio), static_cast<double>(exponent[state_.method]));
 }
 
-/// The code for a step that cannot go on: that of the field where the field made it small.
+// The code for a step that cannot go on: that of the field where the field made it small.
 template <typename Vector>
 int KpODEBase<Vector>::stepTooSmall() const
 {
@@ -281,7 +282,7 @@ int KpODEBase<Vector>::next(Vector& point, Vector& derivative, Vector& secondDer
     return s.status;
 }
 
-/// Advances the tables by one sample, over as many steps as that takes.
+// Advances the tables by one sample, over as many steps as that takes.
 template <typename Vector>
 auto KpODEBase<Vector>::advanceToSample() -> Phase
 {
@@ -319,7 +320,7 @@ auto KpODEBase<Vector>::nextSegment() -> Phase
     return s.status == Success ? Phase::Running : Phase::Ending;
 }
 
-/// The Hermite cubic of the segment at the sample, with the differences for a sampling distance.
+// The Hermite cubic of the segment at the sample, with the differences for a sampling distance.
 template <typename Vector>
 void KpODEBase<Vector>::setCubic()
 {

@@ -18,7 +18,7 @@ KpBitfield noMarks(const Points& points)
     return {static_cast<unsigned long>(points.size()), KpBitfield::INIT_UNSET};
 }
 
-/// The point strictly between that is farthest from the line, the first of equal ones, and its distance.
+// The point strictly between that is farthest from the line, the first of equal ones, and its distance.
 std::pair<long, float> farthest(const Points& points, const KpLine2D& line, long first, long last)
 {
     std::pair<long, float> best{first, -1.0F};
@@ -65,7 +65,7 @@ void KpPls::DouglasPeuckerInLoop(const Points& points, float tolerance, Points& 
     extractMarkedPoints(points, marks, result);
 }
 
-/// A stack of stretches stands for the recursion, which a spiral would drive as deep as it has points.
+// A stack of stretches stands for the recursion, which a spiral would drive as deep as it has points.
 void KpPls::DouglasPeuckerImpl(const Points& points, KpBitfield& marks, long first, long last, float tolerance)
 {
     std::vector<std::pair<long, long>> stretches{{first, last}};

@@ -6,19 +6,19 @@
 
 namespace {
 
-/// Keeps a denominator away from 0.
+// Keeps a denominator away from 0.
 float lifted(float denominator)
 {
     constexpr float least = 1e-30F;
     return std::abs(denominator) < least ? least : denominator;
 }
 
-/// Lentz's evaluation of a continued fraction whose partial denominators are all 1.
+// Lentz's evaluation of a continued fraction whose partial denominators are all 1.
 struct Lentz {
     float c = 1, d, h;
 
     explicit Lentz(float first) : d(1 / lifted(first)), h(d) {}
-    /// Takes the next partial numerator; gives the factor by which the value changed.
+    // Takes the next partial numerator; gives the factor by which the value changed.
     float step(float numerator)
     {
         d = 1 / lifted(1 + numerator * d);

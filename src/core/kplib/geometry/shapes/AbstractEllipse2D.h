@@ -2,6 +2,9 @@
 
 #include <kplib/geometry/shapes/CurvedShape2D.h>
 
+#include <utility>
+#include <vector>
+
 /// An ellipse along the axes: what circles and ellipses share.
 class KPLIB_API AbstractEllipse2D : public CurvedShape2D {
 public:

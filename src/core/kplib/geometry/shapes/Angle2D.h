@@ -2,6 +2,9 @@
 
 #include <kplib/geometry/shapes/Polyline2D.h>
 
+#include <utility>
+#include <vector>
+
 /// An angle: three vertices, with the apex in the middle.
 class KPLIB_API Angle2D : public Polyline2D {
 public:

@@ -4,7 +4,7 @@
 
 namespace {
 
-/// Whether the ray from `p` toward greater x crosses the edge. No `p` passes the first test for a horizontal edge.
+// Whether the ray from `p` toward greater x crosses the edge. No `p` passes the first test for a horizontal edge.
 bool crosses(const KpVec2f& p, const KpVec2f& a, const KpVec2f& b)
 {
     if (!(p.y() > std::min(a.y(), b.y()) && p.y() <= std::max(a.y(), b.y()) && p.x() <= std::max(a.x(), b.x())))

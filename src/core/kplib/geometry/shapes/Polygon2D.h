@@ -2,6 +2,9 @@
 
 #include <kplib/geometry/shapes/Polyline2D.h>
 
+#include <utility>
+#include <vector>
+
 /// A filled polygon: a closed list of vertices, whose last one is the first again. It may cross itself; what lies
 /// inside is told by the even-odd rule.
 class KPLIB_API Polygon2D : public Polyline2D {

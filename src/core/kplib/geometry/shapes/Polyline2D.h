@@ -3,6 +3,9 @@
 #include <kplib/geometry/shapes/Rectangle2D.h>
 #include <kplib/geometry/shapes/Shape2D.h>
 
+#include <utility>
+#include <vector>
+
 /// A line through a list of vertices. Its bounding box is kept once it was asked for, so that asking changes the object
 /// too: threads that share one need a lock, also for reading.
 class KPLIB_API Polyline2D : public Shape2D {

@@ -2,6 +2,9 @@
 
 #include <kplib/geometry/shapes/Shape2D.h>
 
+#include <utility>
+#include <vector>
+
 /// A rectangle along the axes, y downward. Its first corner is the upper left one and its second the lower right one,
 /// unless whoever made it says otherwise: nothing sorts them axis by axis.
 class KPLIB_API Rectangle2D : public Shape2D {

@@ -8,7 +8,7 @@
 
 namespace kplib::detail {
 
-/// The child at an index if it is a parameter, else null.
+// The child at an index if it is a parameter, else null.
 inline const HxParameter* parameterAt(const HxParamBundle& bundle, long index)
 {
     if (index < 0 || index >= bundle.size())
@@ -17,22 +17,22 @@ inline const HxParameter* parameterAt(const HxParamBundle& bundle, long index)
     return child && !child->isBundle() ? static_cast<const HxParameter*>(child) : nullptr;
 }
 
-/// The text of a parameter, "" for one without a value.
+// The text of a parameter, "" for one without a value.
 inline const char* textOf(const HxParameter& parameter)
 {
     const char* const text = parameter.getString();
     return text ? text : "";
 }
 
-/// What a DICOM leaf "description: value" holds: the text two characters behind the colon or, without something behind
-/// a colon, all of it.
+// What a DICOM leaf "description: value" holds: the text two characters behind the colon or, without something behind
+// a colon, all of it.
 inline const char* leafValue(const char* text)
 {
     const char* const colon = std::strchr(text, ':');
     return colon && colon[1] ? colon + 2 : text;
 }
 
-/// The number in a name made by "Image%05d", as sscanf reads it by "Image%d"; false for other names.
+// The number in a name made by "Image%05d", as sscanf reads it by "Image%d"; false for other names.
 inline bool imageNumberOfName(const char* name, int& number)
 {
     constexpr char prefix[] = "Image";
@@ -45,7 +45,7 @@ inline bool imageNumberOfName(const char* name, int& number)
     return end != name + length;
 }
 
-/// Adds a text parameter behind the others.
+// Adds a text parameter behind the others.
 inline void addText(HxParamBundle& bundle, const char* name, const char* text)
 {
     bundle.insert(HxParameter::create(name, text), 0);

@@ -10,16 +10,16 @@
 #include <cstdio>
 #include <string>
 
-/// What a log knows. The mutex guards all but the atomics, of which those of the level and the callback are set during
-/// start-up.
+// What a log knows. The mutex guards all but the atomics, of which those of the level and the callback are set during
+// start-up.
 struct KpLogFilePrivate {
     KpLogFilePrivate();
 
     // The caller holds the mutex for these.
 
-    /// The line of a message.
+    // The line of a message.
     KpString formatLine(KpLogLevel level, const char* module, const char* text);
-    /// Puts out the text, with a newline unless it ends in one.
+    // Puts out the text, with a newline unless it ends in one.
     void write(std::string_view line);
     void flush();
     std::string_view timeText(KpLogFile::DateTimeFormat format);
@@ -52,7 +52,7 @@ struct KpLogFilePrivate {
 
 namespace kplib::detail {
 
-/// The record of a log, for what opens its file.
+// The record of a log, for what opens its file.
 KpLogFilePrivate& logRecord(KpLogFile& log);
 
 }  // namespace kplib::detail

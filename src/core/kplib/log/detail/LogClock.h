@@ -8,14 +8,14 @@
 
 namespace kplib::detail {
 
-/// Times as text, each valid until the next is asked for. Local time above the millisecond is kept for as long as the
-/// second and the time zone in the environment stay the same. One thread at a time.
+// Times as text, each valid until the next is asked for. Local time above the millisecond is kept for as long as the
+// second and the time zone in the environment stay the same. One thread at a time.
 class KpLogClock {
 public:
-    /// Local date and time, "2017-03-01 14:03:59.120".
+    // Local date and time, "2017-03-01 14:03:59.120".
     std::string_view dateAndTime(kplib::platform::WallTime time);
 
-    /// The time from `start` to `now`, "00:00:01.050"; the hours wrap at 24.
+    // The time from `start` to `now`, "00:00:01.050"; the hours wrap at 24.
     std::string_view elapsed(kplib::platform::WallTime start, kplib::platform::WallTime now);
 
 private:

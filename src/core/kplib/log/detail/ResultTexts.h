@@ -2,7 +2,7 @@
 
 namespace kplib::detail {
 
-/// What a code of KpResult says by itself; null where it has no such text.
+// What a code of KpResult says by itself; null where it has no such text.
 struct KpResultTexts {
     const char* shortText;
     const char* defaultData;

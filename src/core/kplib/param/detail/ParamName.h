@@ -16,18 +16,18 @@ constexpr bool isDigit(char c)
     return c >= '0' && c <= '9';
 }
 
-/// ASCII only: a sorted bundle must stay sorted whatever the locale.
+// ASCII only: a sorted bundle must stay sorted whatever the locale.
 constexpr unsigned char upperCase(char c)
 {
     const auto byte = static_cast<unsigned char>(c);
     return c >= 'a' && c <= 'z' ? byte - ('a' - 'A') : byte;
 }
 
-/// The order of node names, -1, 0 or 1. A blank in `b`, and only there, ends `b`, so that a token inside a text can be
-/// compared where it stands. A null `a` comes first, then a null `b`.
+// The order of node names, -1, 0 or 1. A blank in `b`, and only there, ends `b`, so that a token inside a text can be
+// compared where it stands. A null `a` comes first, then a null `b`.
 int mystrcasecmp(const char* a, const char* b);
 
-/// The value of a hexadecimal digit in either case, 16 for any other character.
+// The value of a hexadecimal digit in either case, 16 for any other character.
 constexpr unsigned hexDigit(char c)
 {
     const unsigned digit = static_cast<unsigned char>(c) - unsigned{'0'};
@@ -35,7 +35,7 @@ constexpr unsigned hexDigit(char c)
     return digit < 10 ? digit : letter < 6 ? letter + 10 : 16;
 }
 
-/// The number 0xggggeeee of a name "Ggggg-eeee" in either case, else 0. The order of names is that of their numbers.
+// The number 0xggggeeee of a name "Ggggg-eeee" in either case, else 0. The order of names is that of their numbers.
 constexpr std::uint32_t tagNumber(const char* name)
 {
     if (*name != 'G' && *name != 'g')
@@ -51,16 +51,16 @@ constexpr std::uint32_t tagNumber(const char* name)
     return name[10] ? 0 : number;
 }
 
-/// Bytes that the blocks of nodes' names are a multiple of, so that NameKey can read the first ones in one go.
+// Bytes that the blocks of nodes' names are a multiple of, so that NameKey can read the first ones in one go.
 constexpr unsigned long nameBlock = 8;
 
-/// A name to look for among nodes. The names of tags are compared by their numbers, which nodes keep for it, so that a
-/// lookup in a header reads no texts; others by their first eight characters at once. Refers to the text.
+// A name to look for among nodes. The names of tags are compared by their numbers, which nodes keep for it, so that a
+// lookup in a header reads no texts; others by their first eight characters at once. Refers to the text.
 class NameKey {
 public:
     enum Form {
         Literal,
-        Canonical,  ///< a leading digit gets the `_` in front that it has in the name of a node
+        Canonical,  // a leading digit gets the `_` in front that it has in the name of a node
     };
 
     constexpr explicit NameKey(const char* name, Form form = Canonical) :
@@ -70,7 +70,7 @@ public:
             takeHead();
     }
 
-    /// mystrcasecmp(name of the node, key) == 0: a blank ends the key.
+    // mystrcasecmp(name of the node, key) == 0: a blank ends the key.
     bool matches(const HxParamBase& node) const
     {
         if (tag_ != 0)
@@ -78,7 +78,7 @@ public:
         return head_ == head(node.name_) && (!rest_ || mystrcasecmp(node.name_ + nameBlock, rest_) == 0) && name_;
     }
 
-    /// mystrcasecmp(key, name of the node).
+    // mystrcasecmp(key, name of the node).
     int order(const HxParamBase& node) const
     {
         if (tag_ != 0 && node.tag_ != 0)
@@ -86,7 +86,7 @@ public:
         return orderOfText(node.name_);
     }
 
-    /// mystrcasecmp(key, token) == 0, for a token in any text.
+    // mystrcasecmp(key, token) == 0, for a token in any text.
     bool matchesToken(const char* token) const { return orderOfText(token) == 0; }
 
 private:
@@ -103,8 +103,8 @@ private:
         rest_ = i == nameBlock ? next : nullptr;
     }
 
-    /// The first characters of a node's name in upper case. Names hold letters, digits, `-` and `_` only, and of these
-    /// just the small letters have both 0x20 and 0x40 set.
+    // The first characters of a node's name in upper case. Names hold letters, digits, `-` and `_` only, and of these
+    // just the small letters have both 0x20 and 0x40 set.
     static std::uint64_t head(const char* nodeName)
     {
         std::uint64_t chars = 0;

@@ -1,7 +1,9 @@
 #include <kplib/cpu/KernelPathX86.h>
 #include <kplib/rawdata/detail/ConvertLoops.h>
 
+#include <cstdint>
 #include <immintrin.h>
+#include <span>
 #include <type_traits>
 
 namespace kplib::detail {

@@ -20,7 +20,7 @@ struct Unmapped {
     KPLIB_KERNEL_BODY Real operator()(Real value) const { return value; }
 };
 
-/// Sum and product are rounded each by itself.
+// Sum and product are rounded each by itself.
 template <typename Number>
 struct Linear {
     using Real = Number;
@@ -41,7 +41,7 @@ struct EachElement {
     }
 };
 
-/// The rows of one kind of processor. Others have an each() of their own.
+// The rows of one kind of processor. Others have an each() of their own.
 template <typename Path>
 struct Rows {
     template <typename To, typename From, typename Map>

@@ -9,23 +9,23 @@
 
 namespace kplib::detail {
 
-/// A row of blocks of voxels and where their results go. Strides count elements.
+// A row of blocks of voxels and where their results go. Strides count elements.
 struct BlockRow {
-    const void* src;  ///< first element of the first block
+    const void* src;  // first element of the first block
     void* dst;
     long blocks;
-    int fx, fy, fz;  ///< voxels of a block
-    int components;  ///< interleaved elements of a voxel
+    int fx, fy, fz;  // voxels of a block
+    int components;  // interleaved elements of a voxel
     long rowStride, sliceStride;
 
     long voxels() const { return static_cast<long>(fx) * fy * fz; }
 };
 
-/// How the voxels of a block become one, each component by itself.
+// How the voxels of a block become one, each component by itself.
 enum class BlockRule : int { Mean, Maximum };
 
 using BlockLoop = void(const BlockRow& row);
-/// The loop for elements of `type`, null if they are no numbers.
+// The loop for elements of `type`, null if they are no numbers.
 using BlockLoops = BlockLoop*(KpPrimType type, BlockRule rule);
 std::span<const KernelPath<BlockLoops>> blockPaths();
 

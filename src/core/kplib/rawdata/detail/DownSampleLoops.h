@@ -19,7 +19,7 @@ KPLIB_X86_ROWS(BlockLoops, blockX86);
 
 namespace blocks {
 
-/// Sums of integers may wrap, as unsigned numbers do. The smaller State serves blocks of few voxels.
+// Sums of integers may wrap, as unsigned numbers do. The smaller State serves blocks of few voxels.
 template <typename T, typename Sum>
 struct Mean {
     using Element = T;
@@ -31,8 +31,8 @@ struct Mean {
 
     KPLIB_KERNEL_BODY static T result(State sum, long count) { return static_cast<T>(signedSum(sum) / count); }
 
-    /// A product with the reciprocal, made a little too large, and cut is the exact quotient of all sums below 2^22 in
-    /// single and 2^50 in double precision: it never falls below an integer quotient, and the next one is too far away.
+    // A product with the reciprocal, made a little too large, and cut is the exact quotient of all sums below 2^22 in
+    // single and 2^50 in double precision: it never falls below an integer quotient, and the next one is too far away.
     KPLIB_KERNEL_BODY static void finish(Loose<T>* dst, const State* sums, long n, long count)
     {
         if (count < (1L << 22) / largest)
@@ -60,7 +60,7 @@ private:
     }
 };
 
-/// Sums of real numbers are kept in their own precision and depend on their order.
+// Sums of real numbers are kept in their own precision and depend on their order.
 template <typename T>
 requires std::is_floating_point_v<T>
 struct Mean<T, T> {
@@ -77,7 +77,7 @@ struct Mean<T, T> {
     }
 };
 
-/// NaN is never greater, and nothing is greater than NaN: it stays only where it comes first.
+// NaN is never greater, and nothing is greater than NaN: it stays only where it comes first.
 template <typename T>
 struct Maximum {
     using Element = T;
@@ -93,7 +93,7 @@ struct Maximum {
     }
 };
 
-/// The definition: each component of each block by itself, z, y and x ascending.
+// The definition: each component of each block by itself, z, y and x ascending.
 template <typename Rule>
 struct PlainRow {
     static void run(const BlockRow& row)
@@ -119,7 +119,7 @@ struct PlainRow {
 // The loops that a row is made of, each compiled for itself: as parts of a larger nest gcc takes them for rarely run
 // code, or joins several rows to one loop, which is no faster and defeats the processor's foresight in reading.
 
-/// Joins the elements of a row to the line of states, whatever block they belong to.
+// Joins the elements of a row to the line of states, whatever block they belong to.
 template <typename Rule>
 struct JoinRow {
     KPLIB_KERNEL_BODY static void run(typename Rule::State* line, const void* src, long n, bool isFirst)
@@ -136,8 +136,8 @@ struct JoinRow {
     }
 };
 
-/// The next voxel of a block, `step` items on, and so forth. By recursion, since gcc unrolls a loop only after it has
-/// given up to make vectors of the one around it.
+// The next voxel of a block, `step` items on, and so forth. By recursion, since gcc unrolls a loop only after it has
+// given up to make vectors of the one around it.
 template <typename Rule, int Count, typename Item>
 KPLIB_KERNEL_BODY typename Rule::State nextOf(typename Rule::State state, const Item* item, long step)
 {
@@ -147,8 +147,8 @@ KPLIB_KERNEL_BODY typename Rule::State nextOf(typename Rule::State state, const 
         return nextOf<Rule, Count - 1>(Rule::next(state, *item), item + step, step);
 }
 
-/// Joins to each block's state the voxels of one row of it, x ascending. `FX` and `N` are the voxels and their
-/// components, 0 where they are known at run time only.
+// Joins to each block's state the voxels of one row of it, x ascending. `FX` and `N` are the voxels and their
+// components, 0 where they are known at run time only.
 template <typename Rule, typename Item, int FX, int N>
 struct JoinColumns {
     KPLIB_KERNEL_BODY static void run(typename Rule::State* states, const void* items, long blocks, long fx, long n,
@@ -176,8 +176,8 @@ struct JoinColumns {
     }
 };
 
-/// Joins a line of integers likewise, for voxels of N components, of which gcc makes no vectors. All shifts of the line
-/// are joined as they lie, and of the results those at the heads of the blocks are moved together.
+// Joins a line of integers likewise, for voxels of N components, of which gcc makes no vectors. All shifts of the line
+// are joined as they lie, and of the results those at the heads of the blocks are moved together.
 template <typename Rule, int N>
 struct JoinGroups {
     using State = typename Rule::State;
@@ -242,8 +242,8 @@ void joinLine(typename Rule::State* joined, const typename Rule::State* line, lo
 
 constexpr long lineLength = 2048;  // states of a stretch of a row; they stay in the first cache
 
-/// A stretch of blocks whose states fit into a line. Integers are joined along y and z as they lie, then along x. The
-/// order of real numbers is kept: each block takes its voxels of one row after the other.
+// A stretch of blocks whose states fit into a line. Integers are joined along y and z as they lie, then along x. The
+// order of real numbers is kept: each block takes its voxels of one row after the other.
 template <typename Path, typename Rule>
 void joinStretch(const BlockRow& row, const void* src, void* dst, long blocks)
 {
@@ -282,7 +282,7 @@ void rowByLines(const BlockRow& row)
                                 std::min(most, row.blocks - done));
 }
 
-/// Sums of few bytes fit into 16 bits, of which a vector holds twice as many.
+// Sums of few bytes fit into 16 bits, of which a vector holds twice as many.
 template <typename Path>
 void meanOfBytes(const BlockRow& row)
 {
@@ -291,6 +291,10 @@ void meanOfBytes(const BlockRow& row)
     else
         rowByLines<Path, Mean<std::uint8_t, std::uint32_t>>(row);
 }
+
+// Sums of the integers of a block of up to 2^32 voxels must fit: of 32 bits into 64, of fewer into 32.
+template <typename T>
+inline constexpr bool hasSumType = std::is_floating_point_v<T> || sizeof(T) <= sizeof(std::uint32_t);
 
 template <typename T>
 using MeanOf = Mean<T, std::conditional_t<std::is_floating_point_v<T>, T,
@@ -313,6 +317,7 @@ BlockLoop* blockLoop(KpPrimType type, BlockRule rule)
 {
     BlockLoop* loop = nullptr;
     kpVisitNumberType(type, [&]<typename T>(KpElementTag<T>) {
+        static_assert(hasSumType<T>, "a wider integer needs a wider sum: extend MeanOf");
         BlockLoop* const mean = Rows::template loop<MeanOf<T>>;
         BlockLoop* const maximum = Rows::template loop<Maximum<T>>;
         loop = rule == BlockRule::Mean ? mean : maximum;

@@ -8,7 +8,7 @@ namespace {
 
 using PixelLoop = void(char* to, long toStride, const char* from, long fromStride, long n, std::size_t width);
 
-/// The common widths are compiled in: a block copy of a size not known ahead costs more than the pixel. 0: any width.
+// The common widths are compiled in: a block copy of a size not known ahead costs more than the pixel. 0: any width.
 template <std::size_t Width>
 void copyPixels(char* to, long toStride, const char* from, long fromStride, long n, std::size_t width)
 {
@@ -37,7 +37,7 @@ bool isEmpty(const PlaneShape& shape)
     return shape.width < 1 || shape.height < 1 || shape.bytesPerPixel < 1;
 }
 
-/// Calls `block(offset in a, offset in b, bytes)` for each run that has no gaps in either plane.
+// Calls `block(offset in a, offset in b, bytes)` for each run that has no gaps in either plane.
 template <typename Block>
 void eachBlock(const Plane& a, const Plane& b, const PlaneShape& shape, Block block)
 {

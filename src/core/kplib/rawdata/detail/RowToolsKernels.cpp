@@ -2,6 +2,8 @@
 
 #include <kplib/rawdata/detail/RowToolsLoops.h>
 
+#include <initializer_list>
+
 namespace kplib::detail {
 
 std::span<const KernelPath<ScaleLoop>> multiplyAndStorePaths()

@@ -1,6 +1,8 @@
 #include <kplib/cpu/KernelPathX86.h>
 #include <kplib/rawdata/detail/RowToolsLoops.h>
 
+#include <span>
+
 namespace kplib::detail {
 
 std::span<const KernelPath<ScaleLoop>> multiplyAndStoreX86()

@@ -1,5 +1,8 @@
 #include <kplib/rawdata/detail/ScanLoops.h>
 
+#include <initializer_list>
+#include <span>
+
 namespace kplib::detail {
 
 using namespace scan;

@@ -63,7 +63,7 @@ struct Lanes {
     KPLIB_KERNEL_BODY static void load(Vector& to, const void* from) { std::memcpy(&to, from, Bytes); }
 };
 
-/// Smallest and largest of a multiple of Lanes::step elements and the given range, but for the sign of zeros.
+// Smallest and largest of a multiple of Lanes::step elements and the given range, but for the sign of zeros.
 template <typename T, int Bytes>
 KPLIB_KERNEL_BODY void blockRange(const Loose<T>* values, long n, T& min, T& max)
 {
@@ -89,8 +89,8 @@ KPLIB_KERNEL_BODY void blockRange(const Loose<T>* values, long n, T& min, T& max
     }
 }
 
-/// The bound after a block whose smallest or largest element is `found`: the earlier one stays if they are equal, and
-/// of the zeros in the block the first is taken, since lanes lose their order.
+// The bound after a block whose smallest or largest element is `found`: the earlier one stays if they are equal, and
+// of the zeros in the block the first is taken, since lanes lose their order.
 template <typename T>
 KPLIB_KERNEL_BODY T settled(T bound, T found, const Loose<T>* values)
 {

@@ -8,7 +8,7 @@
 namespace kplib::detail {
 namespace {
 
-/// The tile of a matrix from (row, column) on.
+// The tile of a matrix from (row, column) on.
 template <typename T>
 struct Tile {
     const T* from;
@@ -27,7 +27,7 @@ struct Tile {
     }
 };
 
-/// Block by block, so that what is read and what is written both stay in the first cache.
+// Block by block, so that what is read and what is written both stay in the first cache.
 template <typename T, typename Block>
 void blockwise(const void* from, void* to, long rows, long columns, Block block)
 {
@@ -48,9 +48,9 @@ void transposePlain(const void* from, void* to, long rows, long columns)
     });
 }
 
-/// A tile of as many rows as 16 bytes have elements, a row a vector. Each round pairs rows that are half the tile
-/// apart; after as many rounds as there are halvings a row holds what was a column. Written out, since compilers gather
-/// the elements of a column one by one.
+// A tile of as many rows as 16 bytes have elements, a row a vector. Each round pairs rows that are half the tile
+// apart; after as many rounds as there are halvings a row holds what was a column. Written out, since compilers gather
+// the elements of a column one by one.
 template <typename T, int... I>
 void transposeTile(const Tile<T>& tile, long row, long column, std::integer_sequence<int, I...>)
 {

@@ -2,13 +2,15 @@
 
 #include <kplib/cpu/KernelPath.h>
 
+#include <span>
+
 namespace kplib::detail {
 
-/// Writes the transposed of a dense matrix: to[column * rows + row] = from[row * columns + column]. The two don't
-/// overlap.
+// Writes the transposed of a dense matrix: to[column * rows + row] = from[row * columns + column]. The two don't
+// overlap.
 using Transpose = void(const void* from, void* to, long rows, long columns);
 
-/// The ways to transpose elements of 1, 2, 4 or 8 bytes; empty for any other size.
+// The ways to transpose elements of 1, 2, 4 or 8 bytes; empty for any other size.
 std::span<const KernelPath<Transpose>> transposePaths(long elementSize);
 
 }  // namespace kplib::detail

@@ -1,5 +1,8 @@
 #include <kplib/rawdata/detail/WordLoops.h>
 
+#include <initializer_list>
+#include <span>
+
 namespace kplib::detail {
 
 std::span<const KernelPath<SwapLoops>> swapPaths()

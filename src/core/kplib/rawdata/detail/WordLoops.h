@@ -47,8 +47,8 @@ struct CopyReversed {
     }
 };
 
-/// Elements of 3 bytes, the pixels of colour images. Five of them are reversed in a register of 16 bytes, whose surplus
-/// the next store covers; one by one they would take several times as long.
+// Elements of 3 bytes, the pixels of colour images. Five of them are reversed in a register of 16 bytes, whose surplus
+// the next store covers; one by one they would take several times as long.
 struct CopyThreesReversed {
     using Sixteen = unsigned char __attribute__((vector_size(16)));
 

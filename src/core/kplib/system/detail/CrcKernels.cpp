@@ -2,7 +2,10 @@
 
 #include <array>
 #include <bit>
+#include <cstdint>
 #include <cstring>
+#include <initializer_list>
+#include <span>
 
 namespace kplib::detail {
 
@@ -10,7 +13,7 @@ using namespace crc;
 
 namespace {
 
-/// Entry [k][b]: what byte b, followed by k zero bytes, makes of a register of zero.
+// Entry [k][b]: what byte b, followed by k zero bytes, makes of a register of zero.
 using Tables = std::array<std::array<std::uint32_t, 256>, 8>;
 
 constexpr Tables makeTables()
@@ -27,7 +30,7 @@ constexpr Tables makeTables()
 
 constexpr Tables tables = makeTables();
 
-/// The reference.
+// The reference.
 std::uint32_t crcPlain(std::uint32_t crc, const unsigned char* data, long n)
 {
     for (long i = 0; i < n; ++i)

@@ -1,7 +1,9 @@
 #include <kplib/cpu/KernelPathX86.h>
 #include <kplib/system/detail/CrcLoops.h>
 
+#include <cstdint>
 #include <immintrin.h>
+#include <span>
 
 namespace kplib::detail {
 
@@ -32,7 +34,7 @@ KPLIB_TARGET_PCLMUL inline __m128i load16(const unsigned char* data)
     return reversed(_mm_loadu_si128(reinterpret_cast<const __m128i*>(data)));
 }
 
-/// `v` moved on by `distance` bits and added to what stands there.
+// `v` moved on by `distance` bits and added to what stands there.
 template <int distance>
 KPLIB_TARGET_PCLMUL inline __m128i fold(__m128i v, __m128i onto)
 {
@@ -81,7 +83,7 @@ KPLIB_TARGET_VPCLMUL inline __m512i fold(__m512i v, __m512i onto)
     return _mm512_ternarylogic_epi64(low, high, onto, 0x96);  // exclusive or of all three
 }
 
-/// Four folds in each instruction. The 64 bytes that are left go through crcPclmul() as if they were data.
+// Four folds in each instruction. The 64 bytes that are left go through crcPclmul() as if they were data.
 KPLIB_TARGET_VPCLMUL std::uint32_t crcVpclmul(std::uint32_t crc, const unsigned char* data, long n)
 {
     if (n < 256)

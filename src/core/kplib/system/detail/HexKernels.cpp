@@ -1,5 +1,8 @@
 #include <kplib/system/detail/HexLoops.h>
 
+#include <initializer_list>
+#include <span>
+
 namespace kplib::detail {
 namespace {
 

@@ -1,6 +1,8 @@
 #include <kplib/cpu/KernelPathX86.h>
 #include <kplib/system/detail/HexLoops.h>
 
+#include <span>
+
 namespace kplib::detail {
 
 std::span<const KernelPath<HexLoop>> hexX86()

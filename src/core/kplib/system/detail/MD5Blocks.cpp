@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <bit>
+#include <cstdint>
 #include <cstring>
 #include <utility>
 
@@ -22,15 +23,15 @@ constexpr std::uint32_t sines[64] = {
 };
 constexpr int rotations[4][4] = {{7, 12, 17, 22}, {5, 9, 14, 20}, {4, 11, 16, 23}, {6, 10, 15, 21}};
 
-/// Has `value` computed as it is written: compilers put sums into another order, with more steps behind the newest
-/// term.
+// Has `value` computed as it is written: compilers put sums into another order, with more steps behind the newest
+// term.
 [[gnu::always_inline]] inline void settle(std::uint32_t& value)
 {
     asm("" : "+r"(value));
 }
 
-/// Step I of the 64. All time goes into the chain from b, the result of the step before, so each round adds to `sum`
-/// what is known without b, and b comes in with as few operations as can be: clang, left alone, takes a third longer.
+// Step I of the 64. All time goes into the chain from b, the result of the step before, so each round adds to `sum`
+// what is known without b, and b comes in with as few operations as can be: clang, left alone, takes a third longer.
 template <int I>
 [[gnu::always_inline]] inline void step(std::uint32_t (&words)[4], const unsigned char* block)
 {

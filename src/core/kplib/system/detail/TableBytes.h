@@ -6,7 +6,7 @@
 
 namespace kplib::detail {
 
-/// A value that stands unaligned in a row.
+// A value that stands unaligned in a row.
 template <typename T>
 T readAt(const char* place)
 {
@@ -21,13 +21,13 @@ void writeAt(char* place, const T& value)
     std::memcpy(place, &value, sizeof value);
 }
 
-/// The distance of two blocks that are no parts of one array.
+// The distance of two blocks that are no parts of one array.
 inline std::intptr_t distance(const void* from, const void* to)
 {
     return reinterpret_cast<std::intptr_t>(to) - reinterpret_cast<std::intptr_t>(from);
 }
 
-/// The place that follows a pointer's target by `bytes`; null stays null.
+// The place that follows a pointer's target by `bytes`; null stays null.
 template <typename T>
 T* shifted(T* pointer, std::intptr_t bytes)
 {

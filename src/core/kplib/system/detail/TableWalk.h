@@ -3,8 +3,8 @@
 #include <kplib/system/KpTable.h>
 #include <kplib/system/detail/TableBytes.h>
 
-/// Calls `work` with a reference to each pointer to a row that a column holds, null or not: in the cells of its pool,
-/// or in each row.
+// Calls `work` with a reference to each pointer to a row that a column holds, null or not: in the cells of its pool,
+// or in each row.
 template <typename Work>
 void KpTable::forEachRowPointer(int column, Work work)
 {

@@ -1,5 +1,8 @@
 #include <kplib/volume/detail/BitfieldLoops.h>
 
+#include <initializer_list>
+#include <span>
+
 namespace kplib::detail {
 
 using namespace bits;

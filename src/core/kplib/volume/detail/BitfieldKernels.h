@@ -4,6 +4,7 @@
 #include <kplib/volume/KpBitfield.h>
 
 #include <cstdint>
+#include <span>
 
 namespace kplib::detail {
 
@@ -30,7 +31,7 @@ struct BitXor {
         return a ^ b;
     }
 };
-/// Bits of b that a lacks.
+// Bits of b that a lacks.
 struct BitsMissing {
     template <typename T>
     KPLIB_KERNEL_BODY static T of(T a, T b)
@@ -39,30 +40,30 @@ struct BitsMissing {
     }
 };
 
-/// Number of set bits.
+// Number of set bits.
 using CountLoop = unsigned long(const BitWord* words, unsigned long n);
 std::span<const KernelPath<CountLoop>> countPaths();
 
-/// Index of the first, or last, word that isn't `skipped`; `n` if there is none.
+// Index of the first, or last, word that isn't `skipped`; `n` if there is none.
 using FindLoop = unsigned long(const BitWord* words, unsigned long n, BitWord skipped);
 std::span<const KernelPath<FindLoop>> findFirstPaths();
 std::span<const KernelPath<FindLoop>> findLastPaths();
 
-/// a = Op::of(a, b); for BitAnd, BitOr and BitXor.
+// a = Op::of(a, b); for BitAnd, BitOr and BitXor.
 using CombineLoop = void(BitWord* a, const BitWord* b, unsigned long n);
 template <typename Op>
 std::span<const KernelPath<CombineLoop>> combinePaths();
 
-/// Whether Op::of(a, b) has a bit anywhere; for BitAnd, BitXor and BitsMissing.
+// Whether Op::of(a, b) has a bit anywhere; for BitAnd, BitXor and BitsMissing.
 using AnyLoop = bool(const BitWord* a, const BitWord* b, unsigned long n);
 template <typename Op>
 std::span<const KernelPath<AnyLoop>> anyPaths();
 
-/// Writes all n / 32 + 1 words of the mask of `n` labels, as KpBitfield::fromLabels() tells.
+// Writes all n / 32 + 1 words of the mask of `n` labels, as KpBitfield::fromLabels() tells.
 using FromLabelsLoop = void(BitWord* words, const unsigned char* labels, unsigned long n, unsigned char label);
 std::span<const KernelPath<FromLabelsLoop>> fromLabelsPaths();
 
-/// Merges `n` bits into labels, as KpBitfield::InsertPolicy tells.
+// Merges `n` bits into labels, as KpBitfield::InsertPolicy tells.
 using ToLabelsLoop = void(const BitWord* words, unsigned char* labels, unsigned long n, unsigned char label);
 using ToLabelsLoops = ToLabelsLoop*(KpBitfield::InsertPolicy policy);  // null for an unknown policy
 std::span<const KernelPath<ToLabelsLoops>> toLabelsPaths();

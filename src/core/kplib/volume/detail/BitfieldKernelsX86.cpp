@@ -1,10 +1,12 @@
 #include <kplib/cpu/KernelPathX86.h>
 #include <kplib/volume/detail/BitfieldLoops.h>
 
+#include <cstdint>
 #include <cstring>
 #include <immintrin.h>
 #include <iterator>
 #include <numeric>
+#include <span>
 
 namespace kplib::detail {
 

@@ -1,6 +1,8 @@
 #include <kplib/volume/detail/BitfieldLabelLoops.h>
 
 #include <algorithm>
+#include <initializer_list>
+#include <span>
 
 namespace kplib::detail {
 

@@ -10,7 +10,7 @@ using namespace labels;
 
 namespace {
 
-/// Without the fours of set bits that stand side by side from a multiple of four.
+// Without the fours of set bits that stand side by side from a multiple of four.
 template <typename Bits>
 KPLIB_KERNEL_BODY Bits withoutFours(Bits bits)
 {
@@ -49,7 +49,7 @@ KPLIB_TARGET_AVX512 void fromLabelsAvx512(BitWord* words, const unsigned char* l
 typedef unsigned char Labels32 __attribute__((vector_size(32)));
 typedef unsigned char Labels64 __attribute__((vector_size(64)));
 
-/// A register of labels merged with `ones`, which holds all ones where the bit is set.
+// A register of labels merged with `ones`, which holds all ones where the bit is set.
 template <Policy policy, typename Labels>
 KPLIB_KERNEL_BODY void merge(unsigned char* labels, const Labels& ones, const Labels& label)
 {
@@ -69,7 +69,7 @@ KPLIB_KERNEL_BODY void merge(unsigned char* labels, const Labels& ones, const La
     std::memcpy(labels, &old, sizeof old);
 }
 
-/// Whether labels without a set bit stay as they are: then they needn't be looked at.
+// Whether labels without a set bit stay as they are: then they needn't be looked at.
 template <Policy policy>
 constexpr bool needsBits = policy == Policy::INSERT_SET || policy == Policy::INSERT_INTO_EMPTY;
 

@@ -36,7 +36,7 @@ void toLabelsPlain(const BitWord* words, unsigned char* labels, unsigned long n,
         labels[i] = merged<policy>((words[i / 32] >> i % 32 & 1) != 0, labels[i], label);
 }
 
-/// The loop of a row for each policy.
+// The loop of a row for each policy.
 template <typename Row>
 ToLabelsLoop* loopOf(Policy policy)
 {

@@ -3,33 +3,34 @@
 #include <kplib/volume/detail/LabelPlainly.h>
 #include <kplib/volume/detail/RowBits.h>
 
+#include <algorithm>
 #include <cstring>
 #include <limits>
 
 namespace kplib::detail {
 namespace {
 
-/// The neighbours that a voxel has, by their offsets in elements.
+// The neighbours that a voxel has, by their offsets in elements.
 struct Steps {
     int n = 0;
     long offsets[13];
 };
 
-/// A row before, of which a voxel sees the columns up to its own, or to the next one if it is `wide`.
+// A row before, of which a voxel sees the columns up to its own, or to the next one if it is `wide`.
 struct RowBefore {
     long offset;
     int dy, dz;
     bool isWide;
 };
 
-/// The pass, a row at a time.
-///
-/// What decides a voxel is the ids of the labels around it. After an exact step that gave the root m, those ids are m
-/// or have just become its aliases, with nothing left to merge. So a voxel that sees no other labels than the one
-/// before gets m too and changes nothing but the counts of m, which are added for all such voxels of a stretch at once.
-/// A stretch ends where a row before brings in a label that differs from the one on its left, isn't the background, and
-/// has another id than m. In label mode equal labels have equal values, so all this holds there too, as long as the
-/// voxels have the same value.
+// The pass, a row at a time.
+//
+// What decides a voxel is the ids of the labels around it. After an exact step that gave the root m, those ids are m
+// or have just become its aliases, with nothing left to merge. So a voxel that sees no other labels than the one
+// before gets m too and changes nothing but the counts of m, which are added for all such voxels of a stretch at once.
+// A stretch ends where a row before brings in a label that differs from the one on its left, isn't the background, and
+// has another id than m. In label mode equal labels have equal values, so all this holds there too, as long as the
+// voxels have the same value.
 template <typename T, typename L>
 class RowLabelling {
 public:
@@ -69,7 +70,7 @@ private:
         return reinterpret_cast<unsigned char*>(bits_.data() + 3 * nWords_) + ((z % 2) * dims_[1] + y) * rowBytes_;
     }
 
-    /// Bytes for the changes of label of a row: narrow rows share words, so that they take no more for a voxel.
+    // Bytes for the changes of label of a row: narrow rows share words, so that they take no more for a voxel.
     static long bytesOfRow(long n) { return n <= 8 ? 1 : n <= 16 ? 2 : n <= 32 ? 4 : (wordsOf(n) - 1) * 8; }
     bool isNarrow() const { return rowBytes_ < 8; }
 
@@ -104,7 +105,7 @@ private:
         return true;
     }
 
-    /// The neighbours in reach of the rows along this border, for voxels at either end of the row and between.
+    // The neighbours in reach of the rows along this border, for voxels at either end of the row and between.
     void findNeighbours()
     {
         const int border = (y_ == 0 ? 1 : 0) + (y_ + 1 == dims_[1] ? 2 : 0) + (z_ == 0 ? 4 : 0);
@@ -137,8 +138,8 @@ private:
         rows_[i].isWide |= dx > 0;
     }
 
-    /// Marks the voxels that may see other labels than the one before. After a clean-up some changes of label are none
-    /// any more; that costs time only.
+    // Marks the voxels that may see other labels than the one before. After a clean-up some changes of label are none
+    // any more; that costs time only.
     void findEnds()
     {
         const T* row = data_ + start_;
@@ -186,7 +187,7 @@ private:
         return true;
     }
 
-    /// Whether all labels that come into sight at `x` lead to `m`.
+    // Whether all labels that come into sight at `x` lead to `m`.
     bool isNoEnd(long x, int m) const
     {
         if (isLabelMode_ && data_[start_ + x] != data_[start_ + x - 1])
@@ -212,7 +213,7 @@ private:
         addRowTo(component.sum, from, y_, z_, end - from);
     }
 
-    /// The exact step; -1 if there are too many components.
+    // The exact step; -1 if there are too many components.
     int labelVoxel(long x)
     {
         const long at = start_ + x;
@@ -234,8 +235,8 @@ private:
         return m;
     }
 
-    /// Finds the label of a voxel and makes the others around it its aliases. The background's entry has the id 0, so
-    /// all labels can be looked up alike.
+    // Finds the label of a voxel and makes the others around it its aliases. The background's entry has the id 0, so
+    // all labels can be looked up alike.
     template <bool isLabelMode>
     int gather(const Steps& steps, long at, int (&ids)[13])
     {

@@ -10,22 +10,22 @@ namespace kplib::detail {
 using Component = KpConnectedComponents::Component;
 using ComponentTable = KpDArray<Component>;
 
-/// KpConnectedComponents::addNewComponent() and cleanup_components() for images of more voxels than an int counts.
+// KpConnectedComponents::addNewComponent() and cleanup_components() for images of more voxels than an int counts.
 template <typename L>
 int addComponent(ComponentTable& components, L* labels, long nLabelled);
 template <typename L>
 int cleanUpComponents(ComponentTable& components, L* labels, long nLabelled, int minVoxels, int minSeeds);
 
-/// Zeroes the counters and leaves nothing but the background in the table.
+// Zeroes the counters and leaves nothing but the background in the table.
 void startComponents(ComponentTable& components);
 
-/// The voxels of an image; 0 if a size is below 1.
+// The voxels of an image; 0 if a size is below 1.
 inline long nVoxelsOf(const int* dims)
 {
     return dims[0] < 1 || dims[1] < 1 || dims[2] < 1 ? 0 : static_cast<long>(dims[0]) * dims[1] * dims[2];
 }
 
-/// The value of a region as its seeds: integers modulo 2^32; real numbers cut off to 64 bits before, and 0 outside.
+// The value of a region as its seeds: integers modulo 2^32; real numbers cut off to 64 bits before, and 0 outside.
 template <typename T>
 unsigned seedsOf(T value)
 {

@@ -10,7 +10,7 @@
 
 namespace kplib::detail {
 
-/// The unit of floats around a sum of integers, and the power of two where a larger one begins.
+// The unit of floats around a sum of integers, and the power of two where a larger one begins.
 struct FloatGrid {
     long unit, top;
 
@@ -23,7 +23,7 @@ struct FloatGrid {
     }
 };
 
-/// The sum after `n` terms of `term`, one after the other. All are below 2^31, the result below 2^62.
+// The sum after `n` terms of `term`, one after the other. All are below 2^31, the result below 2^62.
 inline float plusEqualTerms(float sum, long term, long n)
 {
     while (n > 0) {
@@ -44,8 +44,8 @@ inline float plusEqualTerms(float sum, long term, long n)
     return sum;
 }
 
-/// As plusRamp(), where the sum stays within the grid and its unit is above 1: ties are added one by one, what lies
-/// between two of them at once.
+// As plusRamp(), where the sum stays within the grid and its unit is above 1: ties are added one by one, what lies
+// between two of them at once.
 inline float plusRampWithin(FloatGrid grid, float sum, long first, long n)
 {
     const long half = grid.unit / 2;
@@ -62,7 +62,7 @@ inline float plusRampWithin(FloatGrid grid, float sum, long first, long n)
     return sum;
 }
 
-/// The sum after `n` terms first, first + 1, ..., one after the other, with the same limits.
+// The sum after `n` terms first, first + 1, ..., one after the other, with the same limits.
 inline float plusRamp(float sum, long first, long n)
 {
     constexpr long few = 16;
@@ -79,7 +79,7 @@ inline float plusRamp(float sum, long first, long n)
     return sum;
 }
 
-/// Adds the coordinates of `n` voxels of one row, from `x` on, to the sums of x, y and z, one after the other.
+// Adds the coordinates of `n` voxels of one row, from `x` on, to the sums of x, y and z, one after the other.
 inline void addRowTo(float (&sum)[3], long x, long y, long z, long n)
 {
     constexpr float large = 4611686018427387904.0f;  // 2^62

@@ -9,9 +9,9 @@
 
 namespace kplib::detail {
 
-/// What a flood fill goes by: the ground, voxels of the value, in one field, and the visited voxels in the other.
-///
-/// The fields have at least 64 bits. At any position `step` bits may be looked at; those behind the end vary.
+// What a flood fill goes by: the ground, voxels of the value, in one field, and the visited voxels in the other.
+//
+// The fields have at least 64 bits. At any position `step` bits may be looked at; those behind the end vary.
 class FloodGround {
 public:
     using Word = std::uint64_t;
@@ -23,7 +23,7 @@ public:
     {
     }
 
-    /// Ones where the value is.
+    // Ones where the value is.
     Word ground(long pos) const { return load(src_, pos) ^ flip_; }
     Word visited(long pos) const { return load(dst_, pos); }
     Word open(long pos) const
@@ -34,7 +34,7 @@ public:
     bool isGround(long pos) const { return (ground(pos) & 1) != 0; }
     bool isVisited(long pos) const { return (visited(pos) & 1) != 0; }
 
-    /// Whether some of n > 0 voxels is still to be filled.
+    // Whether some of n > 0 voxels is still to be filled.
     bool isOpen(long pos, long n) const
     {
         for (; n > step; pos += step, n -= step) {
@@ -59,7 +59,7 @@ public:
         return first(pos, end, [this](long at) { return ~visited(at); });
     }
 
-    /// Where the run begins that `pos` is in, at `row` at the earliest.
+    // Where the run begins that `pos` is in, at `row` at the earliest.
     long runStart(long pos, long row) const
     {
         while (pos > row) {

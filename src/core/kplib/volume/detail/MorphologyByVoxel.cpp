@@ -6,7 +6,7 @@
 namespace kplib::detail {
 namespace {
 
-/// Whether voxel (x, y, z) or a neighbour inside the volume has the value.
+// Whether voxel (x, y, z) or a neighbour inside the volume has the value.
 bool isAround(const KpBitfield& field, const KpVec3i& dims, int x, int y, int z, int reach, bool value)
 {
     for (int dz = -std::min(z, 1); dz <= std::min(dims[2] - 1 - z, 1); ++dz)

@@ -2,6 +2,8 @@
 
 #include <kplib/volume/detail/MorphologyPasses.h>
 
+#include <initializer_list>
+
 namespace kplib::detail {
 
 using namespace morphology;

@@ -5,10 +5,11 @@
 #include <kplib/volume/KpBitfield.h>
 
 #include <cstdint>
+#include <span>
 
 namespace kplib::detail {
 
-/// Which voxels are neighbours: those with at most that sum of absolute offsets, each of them at most 1.
+// Which voxels are neighbours: those with at most that sum of absolute offsets, each of them at most 1.
 enum class MorphologyReach : int { Faces = 1, Edges = 2, Corners = 3 };
 
 struct MorphologyJob {
@@ -20,15 +21,15 @@ struct MorphologyJob {
     bool erodes;
 };
 
-/// `job.passes` passes in one go through memory; `area` is of morphologyAreaBytes(job).
+// `job.passes` passes in one go through memory; `area` is of morphologyAreaBytes(job).
 using MorphologyLoop = void(const MorphologyJob& job, void* area);
 std::span<const KernelPath<MorphologyLoop>> morphologyPaths();
 unsigned long morphologyAreaBytes(const MorphologyJob& job);
 
-/// How many passes, of those that the job asks for, to do at once so that their work area stays in the cache.
+// How many passes, of those that the job asks for, to do at once so that their work area stays in the cache.
 long morphologyPassesAtOnce(const MorphologyJob& job);
 
-/// One pass voxel by voxel: what all else has to equal, and what needs no work area.
+// One pass voxel by voxel: what all else has to equal, and what needs no work area.
 void morphologyByVoxel(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, MorphologyReach reach, bool erodes);
 
 }  // namespace kplib::detail

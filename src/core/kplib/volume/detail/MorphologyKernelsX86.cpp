@@ -1,6 +1,8 @@
 #include <kplib/cpu/KernelPathX86.h>
 #include <kplib/volume/detail/MorphologyPasses.h>
 
+#include <span>
+
 namespace kplib::detail {
 
 std::span<const KernelPath<MorphologyLoop>> morphologyX86()

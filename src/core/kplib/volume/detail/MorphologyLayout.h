@@ -10,7 +10,7 @@ namespace kplib::detail {
 
 using MorphologyWord [[gnu::may_alias]] = std::uint64_t;  // fields are of halves of it
 
-/// Does `step` passes at once: slices that step before and behind, too, contribute.
+// Does `step` passes at once: slices that step before and behind, too, contribute.
 struct MorphologyStage {
     long step;
     long delay;   // slices that have come to the first stage before one comes to this
@@ -18,9 +18,9 @@ struct MorphologyStage {
     long masks;   // the first of its two
 };
 
-/// The stages, and where things lie in the work area, in words. Each slice has zeros before and behind, for shifts by
-/// rows. Several passes with all 26 neighbours are a box: from a box of radius r one step of r + 1 makes that of 2r +
-/// 1, and where the volume cuts it off nothing is missing, as the ways to each voxel lead through the ones between.
+// The stages, and where things lie in the work area, in words. Each slice has zeros before and behind, for shifts by
+// rows. Several passes with all 26 neighbours are a box: from a box of radius r one step of r + 1 makes that of 2r +
+// 1, and where the volume cuts it off nothing is missing, as the ways to each voxel lead through the ones between.
 struct MorphologyLayout {
     static constexpr long wordBits = 64, block = 8;  // loops go by blocks, the words of a cache line
     static constexpr long maxStages = 32, maxStep = 8;
@@ -43,7 +43,7 @@ struct MorphologyLayout {
         masks = pad + slices * (words + pad);
     }
     static constexpr long roundedUp(long n, long to) { return (n + to - 1) / to * to; }
-    /// The masks of the ends of rows repeat themselves.
+    // The masks of the ends of rows repeat themselves.
     static constexpr long maskPeriod(long nx) { return std::lcm(nx, wordBits * block) / wordBits; }
     constexpr long slice(long i) const { return pad + i * (words + pad); }
     constexpr unsigned long bytes() const

@@ -6,14 +6,14 @@
 #include <algorithm>
 #include <cstdint>
 
-/// The inner loops of morphology on strings of bits, compiled for each kind of processor.
+// The inner loops of morphology on strings of bits, compiled for each kind of processor.
 namespace kplib::detail::morphology {
 
 using Word = MorphologyWord;
 using LooseWord = Loose<std::uint64_t>;
 constexpr long wordBits = MorphologyLayout::wordBits, block = MorphologyLayout::block;
 
-/// `count` bits from bit `pos`, without looking at words beyond; the bits above are of no meaning.
+// `count` bits from bit `pos`, without looking at words beyond; the bits above are of no meaning.
 KPLIB_KERNEL_BODY Word bitsAt(const std::uint32_t* field, long pos, long count)
 {
     const std::uint32_t* word = field + pos / 32;
@@ -23,7 +23,7 @@ KPLIB_KERNEL_BODY Word bitsAt(const std::uint32_t* field, long pos, long count)
     return bits;
 }
 
-/// Writes the lowest `count` bits to those from `pos` on; the ones beside stay.
+// Writes the lowest `count` bits to those from `pos` on; the ones beside stay.
 KPLIB_KERNEL_BODY void putBits(std::uint32_t* field, long pos, long count, Word bits)
 {
     while (count > 0) {
@@ -37,7 +37,7 @@ KPLIB_KERNEL_BODY void putBits(std::uint32_t* field, long pos, long count, Word 
     }
 }
 
-/// The 64 bits that end `by` bits, 0 to 63, below the top of `high`, or start `by` above the bottom of `low`.
+// The 64 bits that end `by` bits, 0 to 63, below the top of `high`, or start `by` above the bottom of `low`.
 KPLIB_KERNEL_BODY Word shiftedUp(Word low, Word high, long by)
 {
     return high << by | low >> 1 >> (63 - by);
@@ -47,7 +47,7 @@ KPLIB_KERNEL_BODY Word shiftedDown(Word low, Word high, long by)
     return low >> by | high << 1 << (63 - by);
 }
 
-/// The voxels so many rows of bits before and behind along y.
+// The voxels so many rows of bits before and behind along y.
 template <bool rowsOfWords>
 KPLIB_KERNEL_BODY Word alongY(const Word* bits, long words, long by)
 {
@@ -64,7 +64,7 @@ KPLIB_KERNEL_BODY void unalign(LooseWord* __restrict to, const Word* __restrict 
         to[i].value = shiftedUp(from[i - 1], from[i], by) ^ flip;
 }
 
-/// The voxels and those `step` beside them along x.
+// The voxels and those `step` beside them along x.
 KPLIB_KERNEL_BODY void alongX(Word* __restrict to, const Word* __restrict bits, const Word* __restrict notFirst,
                               const Word* __restrict notLast, long n, long step)
 {
@@ -74,7 +74,7 @@ KPLIB_KERNEL_BODY void alongX(Word* __restrict to, const Word* __restrict bits, 
                 (shiftedDown(bits[i], bits[i + 1], step) & notLast[i]);
 }
 
-/// Both at once, for words that begin `by` bits, 1 to 62, above the bottom of those of the field.
+// Both at once, for words that begin `by` bits, 1 to 62, above the bottom of those of the field.
 KPLIB_KERNEL_BODY void realignAlongX(Word* __restrict to, Word* __restrict wide, const LooseWord* __restrict from,
                                      const Word* __restrict notFirst, const Word* __restrict notLast, long n, long by,
                                      Word flip)
@@ -87,8 +87,8 @@ KPLIB_KERNEL_BODY void realignAlongX(Word* __restrict to, Word* __restrict wide,
     }
 }
 
-/// Completes the slice before `in`, and takes up what `in` contributes: `near` and `farBefore` are those of the slice
-/// before, `far` that of the one before it and then that of `in`.
+// Completes the slice before `in`, and takes up what `in` contributes: `near` and `farBefore` are those of the slice
+// before, `far` that of the one before it and then that of `in`.
 template <MorphologyReach reach, bool rowsOfWords>
 struct Combine {
     KPLIB_KERNEL_BODY static void run(Word* __restrict out, Word* __restrict near, Word* __restrict far,

@@ -47,7 +47,7 @@ struct Passes {
         for (long i = 0; i < layout.count; ++i)
             makeMasks(layout.stages[i]);
     }
-    /// Of the voxels with one `step` before, or behind, them in their row.
+    // Of the voxels with one `step` before, or behind, them in their row.
     KPLIB_KERNEL_BODY void makeMasks(const Stage& stage) const
     {
         const auto bits = static_cast<unsigned long>(layout.maskWords * wordBits);
@@ -65,7 +65,7 @@ struct Passes {
             mask[i / 64] &= ~(Word{1} << i % 64);
     }
 
-    /// Zeros behind the last voxel.
+    // Zeros behind the last voxel.
     KPLIB_KERNEL_BODY void clearTail(Word* bits) const
     {
         const long last = layout.sliceBits / wordBits;
@@ -75,7 +75,7 @@ struct Passes {
             bits[i] = 0;
     }
 
-    /// Slice z, and what it reaches along x.
+    // Slice z, and what it reaches along x.
     KPLIB_KERNEL_BODY void load(long z, Word* to) const
     {
         const long from = z * layout.sliceBits, used = (layout.sliceBits + wordBits - 1) / wordBits;
@@ -93,7 +93,7 @@ struct Passes {
         widen(layout.stages[0], to, whole);
     }
 
-    /// What a slice reaches along x, from a word on.
+    // What a slice reaches along x, from a word on.
     KPLIB_KERNEL_BODY void widen(const Stage& stage, const Word* bits, long start) const
     {
         while (start < layout.words) {
@@ -103,13 +103,13 @@ struct Passes {
         }
     }
 
-    /// Whether slices can be written in place.
+    // Whether slices can be written in place.
     KPLIB_KERNEL_BODY bool isInBlocks() const { return layout.sliceBits == layout.words * wordBits; }
     KPLIB_KERNEL_BODY Word* target(long z) const
     {
         return reinterpret_cast<Word*>(job.dst + z * layout.sliceBits / 32);
     }
-    /// Slices share words with the ones beside them.
+    // Slices share words with the ones beside them.
     KPLIB_KERNEL_BODY void store(long z, const Word* bits) const
     {
         const long to = z * layout.sliceBits, by = to % 32, base = to - by, end = layout.sliceBits + by;
@@ -121,7 +121,7 @@ struct Passes {
                     shiftedUp(bits[whole - 1], bits[whole], by) ^ flip);
     }
 
-    /// Slice z comes to a stage; the one `step` before it is complete then, and goes out.
+    // Slice z comes to a stage; the one `step` before it is complete then, and goes out.
     template <MorphologyReach reach>
     KPLIB_KERNEL_BODY void step(const Stage& stage, const Word* in, long z, Word* out, Word flipOut) const
     {
@@ -134,7 +134,7 @@ struct Passes {
     }
 };
 
-/// A slice is read before any that is written at the time, so dst may be src.
+// A slice is read before any that is written at the time, so dst may be src.
 template <MorphologyReach reach>
 struct AllPasses {
     KPLIB_KERNEL_BODY static void run(const MorphologyJob* job, Word* area)

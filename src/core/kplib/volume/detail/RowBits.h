@@ -9,7 +9,7 @@
 
 namespace kplib::detail {
 
-/// A bit a voxel of a row, with a word of zeros behind.
+// A bit a voxel of a row, with a word of zeros behind.
 using RowBits = std::uint64_t;
 
 inline long wordsOf(long n)
@@ -17,7 +17,7 @@ inline long wordsOf(long n)
     return (n + 63) / 64 + 1;
 }
 
-/// 64 of `isSet(i)` from `start` on: a loop of fixed length, so that it becomes vector instructions.
+// 64 of `isSet(i)` from `start` on: a loop of fixed length, so that it becomes vector instructions.
 template <typename IsSet>
 RowBits bitsOf64(long start, IsSet isSet)
 {
@@ -27,7 +27,7 @@ RowBits bitsOf64(long start, IsSet isSet)
     return bitsOf64Flags(flags);
 }
 
-/// The bits of `isSet(i)`; tells whether there is any.
+// The bits of `isSet(i)`; tells whether there is any.
 template <typename IsSet>
 bool fillBits(RowBits* bits, long n, IsSet isSet)
 {
@@ -47,7 +47,7 @@ bool fillBits(RowBits* bits, long n, IsSet isSet)
     return any != 0;
 }
 
-/// The first set bit from `from` on, or `end`. Unset ones are found with `flip` all ones.
+// The first set bit from `from` on, or `end`. Unset ones are found with `flip` all ones.
 inline long findBit(const RowBits* bits, long from, long end, RowBits flip = 0)
 {
     if (from >= end)
@@ -63,7 +63,7 @@ inline long findBit(const RowBits* bits, long from, long end, RowBits flip = 0)
     return end;
 }
 
-/// How many bits are set in [from, end), which isn't empty.
+// How many bits are set in [from, end), which isn't empty.
 inline long countBits(const RowBits* bits, long from, long end)
 {
     const long last = (end - 1) / 64;

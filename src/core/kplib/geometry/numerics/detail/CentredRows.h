@@ -1,6 +1,7 @@
 #pragma once
 
 #include <kplib/geometry/KpMat3f.h>
+#include <kplib/geometry/KpMat4f.h>
 #include <kplib/geometry/KpVec3f.h>
 #include <kplib/geometry/numerics/detail/PairwiseSum.h>
 
@@ -8,8 +9,8 @@
 
 namespace kplib::detail {
 
-/// Four sums side by side, of which three are used: one instruction where the processor has vectors.
-using Row4 = float __attribute__((vector_size(16)));
+// Four sums side by side, of which three are used: one instruction where the processor has vectors.
+using Row4 = KpMat4f::Row;
 
 inline Row4 toRow(const KpVec3f& v)
 {
@@ -21,7 +22,7 @@ inline KpVec3f toVector(Row4 row)
     return {row[0], row[1], row[2]};
 }
 
-/// A list of points, three floats each, that are found by an index list or not, with weights by the point or without.
+// A list of points, three floats each, that are found by an index list or not, with weights by the point or without.
 template <bool indexed, bool weighted>
 struct PointList {
     static constexpr bool isIndexed = indexed, isWeighted = weighted;
@@ -49,7 +50,7 @@ struct PointList {
         const float* const p = points + 3 * place(i);
         return Row4{p[0], p[1], p[2], 0};
     }
-    /// point(i), and the first number of the next one in the fourth place, which has to be there; one load.
+    // point(i), and the first number of the next one in the fourth place, which has to be there; one load.
     Row4 pointWithNext(long i) const
     {
         Row4 row;
@@ -58,8 +59,8 @@ struct PointList {
     }
 };
 
-/// The sum over all `n` pairs, to which work(sums, i, list1's point, list2's point) adds one; the fourth numbers of the
-/// points are undefined.
+// The sum over all `n` pairs, to which work(sums, i, list1's point, list2's point) adds one; the fourth numbers of the
+// points are undefined.
 template <typename Sums, typename List1, typename List2, typename Work>
 Sums sumOfPairs(const List1& list1, const List2& list2, long n, Work work)
 {
@@ -73,8 +74,8 @@ Sums sumOfPairs(const List1& list1, const List2& list2, long n, Work work)
     });
 }
 
-/// The rows of the two matrices of a fit, made where they are needed: `a` from list 2, `b` from list 1, both less their
-/// centres and times the point's weight; `b` is weighted only with `weightsB`.
+// The rows of the two matrices of a fit, made where they are needed: `a` from list 2, `b` from list 1, both less their
+// centres and times the point's weight; `b` is weighted only with `weightsB`.
 template <typename List1, typename List2, bool weightsB>
 struct CentredRows {
     List1 list1;
@@ -82,7 +83,7 @@ struct CentredRows {
     KpVec3f centre1, centre2;
     long n;
 
-    /// The sum over all rows, to which work(sums, a, b) adds one.
+    // The sum over all rows, to which work(sums, a, b) adds one.
     template <typename Sums, typename Work>
     Sums sum(Work work) const
     {
@@ -98,7 +99,7 @@ struct CentredRows {
     }
 };
 
-/// A 3 by 3 matrix of sums, the fourth column of which is undefined.
+// A 3 by 3 matrix of sums, the fourth column of which is undefined.
 struct MatrixSums {
     Row4 rows[3];
 
@@ -110,7 +111,7 @@ struct MatrixSums {
     }
 };
 
-/// The sum of transpose(a) * right(a, b) over all rows.
+// The sum of transpose(a) * right(a, b) over all rows.
 template <typename Rows, typename Right>
 KpMat3f sumOfProducts(const Rows& rows, Right right)
 {

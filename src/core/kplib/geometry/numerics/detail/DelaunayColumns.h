@@ -6,11 +6,11 @@
 
 namespace kplib::detail::delaunay {
 
-/// Numbered circles as the scan wants them: an array for each number of a circle.
+// Numbered circles as the scan wants them: an array for each number of a circle.
 template <int Size>
 class CircleColumns {
 public:
-    /// What is new is not set to anything.
+    // What is new is not set to anything.
     void resize(long count)
     {
         for (KpDArray<double>& column : columns_)
@@ -35,7 +35,7 @@ public:
         return circle;
     }
 
-    /// Which of the first `count` contain `point`.
+    // Which of the first `count` contain `point`.
     long scan(CircleScan* run, long count, const Position<Size>& point, std::int32_t* hits) const
     {
         const double* columns[Size + 1];

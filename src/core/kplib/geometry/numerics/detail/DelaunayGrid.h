@@ -10,17 +10,17 @@
 
 namespace kplib::detail::delaunay {
 
-/// Finds the circles around a point among many, by a pyramid of grids whose cells are powers of two wide.
-///
-/// A circle stands in the cell of its box's low corner, in the finest level where a box of its width reaches no more
-/// than `reach` cells along an axis: so a point's circles stand in its own cell or in those few before it. The boxes
-/// are wide enough for all roundings of contains(). Cells share hash buckets; strangers met there fail the test like
-/// other neighbours. What is wide against the set, or has no place (infinite, not a number, tiny but far out), is in a
-/// table of its own that is scanned for every point.
+// Finds the circles around a point among many, by a pyramid of grids whose cells are powers of two wide.
+//
+// A circle stands in the cell of its box's low corner, in the finest level where a box of its width reaches no more
+// than `reach` cells along an axis: so a point's circles stand in its own cell or in those few before it. The boxes
+// are wide enough for all roundings of contains(). Cells share hash buckets; strangers met there fail the test like
+// other neighbours. What is wide against the set, or has no place (infinite, not a number, tiny but far out), is in a
+// table of its own that is scanned for every point.
 template <int Size>
 class CircleGrid {
 public:
-    /// For about that many circles, of points that spread over `range`.
+    // For about that many circles, of points that spread over `range`.
     CircleGrid(long circles, float range, CircleScan* scan) : widest_(range / 4.0), scan_(scan)
     {
         const int bits = std::max(8, static_cast<int>(std::bit_width(static_cast<unsigned long>(circles))));
@@ -57,8 +57,8 @@ public:
             nodes_[node.next].before = node.before;
     }
 
-    /// Writes the slots of the circles that contain `point` to `hits`, in no order and some perhaps more than once, and
-    /// gives how many it wrote; -1 if it would have to walk over more than `most`, or if the point isn't finite.
+    // Writes the slots of the circles that contain `point` to `hits`, in no order and some perhaps more than once, and
+    // gives how many it wrote; -1 if it would have to walk over more than `most`, or if the point isn't finite.
     long find(const Position<Size>& point, long most, std::int32_t* hits) const
     {
         for (const double x : point)
@@ -128,7 +128,7 @@ private:
         wideSlots_.resize(wideSlots_.size() - 1);
     }
 
-    /// 1 over the width of a level's cells.
+    // 1 over the width of a level's cells.
     static double scale(int level)
     {
         return std::bit_cast<double>(static_cast<std::uint64_t>(1023 - smallest - level) << 52);
@@ -140,7 +140,7 @@ private:
         return std::max(exponent + 3 - reach - smallest, 0);
     }
 
-    /// Adds the share of the cell that holds `x`, along `axis`, to the hash; false for cells beyond number `last`.
+    // Adds the share of the cell that holds `x`, along `axis`, to the hash; false for cells beyond number `last`.
     static bool addCell(double x, int level, int axis, double last, std::uint64_t& hash)
     {
         const double cell = x * scale(level);

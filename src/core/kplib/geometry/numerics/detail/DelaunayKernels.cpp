@@ -1,5 +1,8 @@
 #include <kplib/geometry/numerics/detail/DelaunayLoops.h>
 
+#include <cstdint>
+#include <span>
+
 namespace kplib::detail::delaunay {
 namespace {
 

@@ -2,12 +2,14 @@
 #include <kplib/geometry/numerics/detail/DelaunayLoops.h>
 
 #include <bit>
+#include <cstdint>
 #include <immintrin.h>
+#include <span>
 
 namespace kplib::detail::delaunay {
 namespace {
 
-/// Appends the positions of the bits of `mask`, which are few.
+// Appends the positions of the bits of `mask`, which are few.
 KPLIB_KERNEL_BODY long put(std::uint32_t mask, long first, std::int32_t* hits, long count)
 {
     for (; mask != 0; mask &= mask - 1)

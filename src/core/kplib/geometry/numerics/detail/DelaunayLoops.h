@@ -8,7 +8,7 @@ namespace kplib::detail::delaunay {
 template <int Size>
 KPLIB_X86_ROWS(CircleScan, circleScanX86);
 
-/// Continues a scan at circle `i`, with `count` hits found before it.
+// Continues a scan at circle `i`, with `count` hits found before it.
 template <int Size>
 long scanFrom(long i, long count, const double* const* columns, long n, const double* point, std::int32_t* hits)
 {

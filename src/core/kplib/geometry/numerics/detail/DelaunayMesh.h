@@ -8,19 +8,19 @@
 
 namespace kplib::detail::delaunay {
 
-/// How the simplices around a point are found: by a scan of all, or by a grid once so many slots are used.
+// How the simplices around a point are found: by a scan of all, or by a grid once so many slots are used.
 struct Finder {
     CircleScan* scan;
     long gridFrom;
 };
 
-/// The simplices of the points so far, in numbered slots. The results depend on the numbers: cavities grow in the order
-/// of their slots, and a new simplex takes the slot that was freed last, or else the next one never used.
+// The simplices of the points so far, in numbered slots. The results depend on the numbers: cavities grow in the order
+// of their slots, and a new simplex takes the slot that was freed last, or else the next one never used.
 template <int Size>
 class Mesh {
 public:
-    /// Holds the simplex of the last Size + 1 of `points`, whose circle contains whatever is put in. The points have to
-    /// outlive the mesh; it is told how many there will be, and how far they spread.
+    // Holds the simplex of the last Size + 1 of `points`, whose circle contains whatever is put in. The points have to
+    // outlive the mesh; it is told how many there will be, and how far they spread.
     Mesh(const Point<Size>* points, int n, float range, const Finder& finder) :
         points_(points), finder_(finder), expected_(n), range_(range)
     {
@@ -31,7 +31,7 @@ public:
         take(corners, {{}, std::numeric_limits<float>::max()});
     }
 
-    /// Puts point `i` in; false if its cavity has too many faces, and the mesh is of no more use.
+    // Puts point `i` in; false if its cavity has too many faces, and the mesh is of no more use.
     bool insert(int i)
     {
         rim_.clear();
@@ -49,7 +49,7 @@ public:
         return true;
     }
 
-    /// Slots that have been used; some of them may be empty.
+    // Slots that have been used; some of them may be empty.
     std::int32_t slots() const { return used_; }
     bool isAlive(std::int32_t slot) const { return simplices_[slot][0] >= 0; }
     const Simplex<Size>& operator[](std::int32_t slot) const { return simplices_[slot]; }
@@ -58,7 +58,7 @@ private:
     static constexpr int perPoint = Size == 2 ? 2 : 7;  // simplices, in a large set
     static constexpr long worthIt = 16;                 // a circle of the grid costs as much as that many of the scan
 
-    /// Makes room for `more` simplices; for hits too, which a point that isn't a number has everywhere.
+    // Makes room for `more` simplices; for hits too, which a point that isn't a number has everywhere.
     void reserve(long more)
     {
         const long needed = used_ + more;
@@ -99,8 +99,8 @@ private:
         return true;
     }
 
-    /// Fills hits_ with the slots whose circles contain point `i`, ascending; empty slots and repetitions may be among
-    /// them. Gives their number.
+    // Fills hits_ with the slots whose circles contain point `i`, ascending; empty slots and repetitions may be among
+    // them. Gives their number.
     long findHits(int i)
     {
         Position<Size> point;

@@ -7,8 +7,8 @@
 
 namespace kplib::detail::delaunay {
 
-/// The faces between a cavity and what stays around it, as a list whose order decides where new simplices go, with a
-/// hash table over it: the list may be long.
+// The faces between a cavity and what stays around it, as a list whose order decides where new simplices go, with a
+// hash table over it: the list may be long.
 template <int Size>
 class CavityRim {
 public:
@@ -22,8 +22,8 @@ public:
         std::fill(heads_.begin(), heads_.end(), none);
     }
 
-    /// Takes `face` out if it is there, the last one moving to its place, and else puts it at the end; false if there
-    /// is no room. A list of one or two isn't searched: simplices with the same corners then leave a face twice.
+    // Takes `face` out if it is there, the last one moving to its place, and else puts it at the end; false if there
+    // is no room. A list of one or two isn't searched: simplices with the same corners then leave a face twice.
     bool flip(const Face<Size>& face)
     {
         const Index at = count_ > 2 ? find(face) : none;
@@ -60,7 +60,7 @@ private:
         return sum >> (32 - bits);
     }
 
-    /// The first of its kind in the list, which need not be the first in its bucket.
+    // The first of its kind in the list, which need not be the first in its bucket.
     Index find(const Face<Size>& face) const
     {
         Index first = none;

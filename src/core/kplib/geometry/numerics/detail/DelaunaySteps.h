@@ -4,7 +4,7 @@
 
 namespace kplib::detail::delaunay {
 
-/// What is triangulated: a shifted copy of the caller's points, and behind it the corners of a simplex around them.
+// What is triangulated: a shifted copy of the caller's points, and behind it the corners of a simplex around them.
 template <int Size>
 struct PointSet {
     KpDArray<Point<Size>> points;
@@ -12,15 +12,15 @@ struct PointSet {
     float range = 0;  // the greatest along an axis, before the shift
 };
 
-/// Reads `n` points of Size coordinates each, and draws Size numbers for each of them.
+// Reads `n` points of Size coordinates each, and draws Size numbers for each of them.
 template <int Size>
 PointSet<Size> shifted(const float* coordinates, int n);
 
-/// Whether no cavity was too large; only then `result` is written.
+// Whether no cavity was too large; only then `result` is written.
 template <int Size>
 bool triangulate(const PointSet<Size>& set, const Finder& finder, KpDArray<Simplex<Size>>& result);
 
-/// The fastest on this processor.
+// The fastest on this processor.
 template <int Size>
 Finder bestFinder();
 

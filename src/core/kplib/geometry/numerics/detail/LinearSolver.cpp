@@ -5,6 +5,8 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstdlib>
+#include <initializer_list>
 #include <numeric>
 #include <utility>
 
@@ -35,8 +37,8 @@ double norm(const float* values, int n)
 // Sums of products wait for one another, so that several rows are summed side by side, each in its own order.
 constexpr int together = 4;
 
-/// Subtracts from each of `count` sums the products of a row with `x`, from column `begin` toward `end` in steps of 1
-/// or -1.
+// Subtracts from each of `count` sums the products of a row with `x`, from column `begin` toward `end` in steps of 1
+// or -1.
 template <int Step, typename RowAt>
 void subtractProducts(RowAt rowAt, int count, const float* x, int begin, int end, float* sums)
 {
@@ -122,7 +124,7 @@ bool LinearSolver::decompose(float& sign)
     return true;
 }
 
-/// The row from `column` on with the greatest magnitude in it, the last of equals.
+// The row from `column` on with the greatest magnitude in it, the last of equals.
 int LinearSolver::pivotOf(int column) const
 {
     int pivot = column;
@@ -149,7 +151,7 @@ void LinearSolver::solve(float* side)
     std::copy_n(x_, n_, side);
 }
 
-/// Adds what the factors give for the residual to the solution.
+// Adds what the factors give for the residual to the solution.
 void LinearSolver::correct()
 {
     float* const y = correction_;
@@ -173,7 +175,7 @@ void LinearSolver::correct()
         x_[i] += y[i];
 }
 
-/// b - A x, and its norm.
+// b - A x, and its norm.
 double LinearSolver::computeResidual()
 {
     std::copy_n(b_, n_, residual_);

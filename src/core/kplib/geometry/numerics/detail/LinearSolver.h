@@ -8,10 +8,10 @@
 
 namespace kplib::detail {
 
-/// Room for the factors of an n by n matrix, one block a row.
+// Room for the factors of an n by n matrix, one block a row.
 class SolverRows {
 public:
-    /// Logs it as an error when the memory is exhausted.
+    // Logs it as an error when the memory is exhausted.
     explicit SolverRows(int n);
     SolverRows(const SolverRows&) = delete;
     SolverRows& operator=(const SolverRows&) = delete;
@@ -26,16 +26,16 @@ private:
     std::unique_ptr<float*[], KpFree> rows_;
 };
 
-/// The work of KpDMatrix::solveLRdecomp() on the `n` by `n` matrix `a`, of which `lr` holds a copy.
+// The work of KpDMatrix::solveLRdecomp() on the `n` by `n` matrix `a`, of which `lr` holds a copy.
 class LinearSolver {
 public:
-    /// Logs it as an error when the memory is exhausted.
+    // Logs it as an error when the memory is exhausted.
     LinearSolver(const float* a, int n, float** lr);
 
     bool isComplete() const { return work_ && permutation_; }
-    /// False, and logged, for a singular matrix; negates `sign` at each exchange of rows.
+    // False, and logged, for a singular matrix; negates `sign` at each exchange of rows.
     bool decompose(float& sign);
-    /// Replaces `side` by the solution for it.
+    // Replaces `side` by the solution for it.
     void solve(float* side);
 
 private:
@@ -51,7 +51,7 @@ private:
     float *b_ = nullptr, *residual_ = nullptr, *x_ = nullptr, *correction_ = nullptr;  // within work_
 };
 
-/// One step of the elimination: the factors of `column` in the rows below it, and what they leave of the lower right.
+// One step of the elimination: the factors of `column` in the rows below it, and what they leave of the lower right.
 using EliminateLoop = void(float* const* lr, int column, int n);
 
 std::span<const KernelPath<EliminateLoop>> eliminatePaths();

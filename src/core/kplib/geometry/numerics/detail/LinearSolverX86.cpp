@@ -1,6 +1,8 @@
 #include <kplib/cpu/KernelPathX86.h>
 #include <kplib/geometry/numerics/detail/EliminateLoop.h>
 
+#include <span>
+
 namespace kplib::detail {
 
 std::span<const KernelPath<EliminateLoop>> eliminateX86()

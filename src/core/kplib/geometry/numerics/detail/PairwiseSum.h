@@ -4,11 +4,11 @@
 
 namespace kplib::detail {
 
-/// The sum of many sums of equal length, added in pairs like the nodes of a binary tree: its rounding error grows with
-/// the logarithm of their number, where that of a running sum grows with the number itself. The order depends on the
-/// number alone. Higham, "The accuracy of floating point summation", SIAM J. Sci. Comput. 14(4), 1993.
-///
-/// `Sums` starts at zero and has an operator+=.
+// The sum of many sums of equal length, added in pairs like the nodes of a binary tree: its rounding error grows with
+// the logarithm of their number, where that of a running sum grows with the number itself. The order depends on the
+// number alone. Higham, "The accuracy of floating point summation", SIAM J. Sci. Comput. 14(4), 1993.
+//
+// `Sums` starts at zero and has an operator+=.
 template <typename Sums>
 class PairwiseSum {
 public:
@@ -35,7 +35,7 @@ private:
     unsigned long count_ = 0;
 };
 
-/// The sum over the indices 0 to n - 1, to which add(sums, begin, end) adds those of a short range, in order.
+// The sum over the indices 0 to n - 1, to which add(sums, begin, end) adds those of a short range, in order.
 template <typename Sums, typename Add>
 Sums pairwiseSum(long n, Add add)
 {

@@ -68,8 +68,8 @@ Vector weightedSum(const double* weights, const Vector* k, int count)
     return sum;
 }
 
-/// A step of `h` from `y0`, where the field is `k1`. `evaluate(x, k)` gives 0, or a code that ends the step with
-/// nothing written.
+// A step of `h` from `y0`, where the field is `k1`. `evaluate(x, k)` gives 0, or a code that ends the step with
+// nothing written.
 template <typename Tableau, typename Vector, typename Evaluate>
 int rungeKuttaStep(const Vector& y0, const Vector& k1, float h, Evaluate evaluate, Vector& y, Vector& f, Vector& error)
 {

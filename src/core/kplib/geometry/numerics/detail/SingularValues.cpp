@@ -8,21 +8,21 @@
 namespace kplib::detail {
 namespace {
 
-/// `magnitude` with the sign of `value`. A zero counts as positive whatever its sign, which is left to chance by what
-/// comes before.
+// `magnitude` with the sign of `value`. A zero counts as positive whatever its sign, which is left to chance by what
+// comes before.
 float withSignOf(float value, float magnitude)
 {
     return value >= 0 ? magnitude : -magnitude;
 }
 
-/// A reflector that makes a scaled vector with the first element `f` and the sum of squares `s` a multiple g of the
-/// first axis; `h` is half the squared length of its normal, negative.
+// A reflector that makes a scaled vector with the first element `f` and the sum of squares `s` a multiple g of the
+// first axis; `h` is half the squared length of its normal, negative.
 struct Reflector {
     Reflector(float f, float s) : g(-withSignOf(f, std::sqrt(s))), h(f * g - s) {}
     float g, h;
 };
 
-/// The work on a matrix that stands in `u`; `Fixed`: its rows and columns where they are known to the compiler, or 0.
+// The work on a matrix that stands in `u`; `Fixed`: its rows and columns where they are known to the compiler, or 0.
 template <int Fixed>
 class SingularValues {
 public:
@@ -57,7 +57,7 @@ private:
     float* v(int row) const { return v_ + static_cast<std::ptrdiff_t>(row) * n(); }
     bool vanishes(float value) const { return std::abs(value) + norm_ == norm_; }
 
-    /// Turns columns `p` and `q` against each other.
+    // Turns columns `p` and `q` against each other.
     void rotate(float* row, int rows, int p, int q, float c, float s) const
     {
         for (int i = 0; i < rows; ++i, row += n()) {
@@ -229,7 +229,7 @@ private:
         return 0;  // there is nothing above the first value
     }
 
-    /// Rotates the superdiagonal element above w[l] away, along the row of the vanished w[l - 1].
+    // Rotates the superdiagonal element above w[l] away, along the row of the vanished w[l - 1].
     void cancel(int l, int k)
     {
         float c = 0, s = 1;
@@ -246,7 +246,7 @@ private:
         }
     }
 
-    /// The first element of the shifted column; the shift is an eigenvalue of the bottom 2x2 minor.
+    // The first element of the shifted column; the shift is an eigenvalue of the bottom 2x2 minor.
     float shift(int l, int k) const
     {
         const float x = w_[l], y = w_[k - 1], z = w_[k], g = rv_[k - 1], h = rv_[k];
