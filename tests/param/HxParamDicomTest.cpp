@@ -53,7 +53,7 @@ TEST(DicomTags, holdManyValues)
         KpDArray<float> values{7, 7, 7};
         EXPECT_FALSE(root.findTag("G0028-0031", values) || values.size() != 3);
         EXPECT_EQ(root.findTag("G0028-0030", values), c.ok) << c.text;
-        EXPECT_TRUE(std::ranges::equal(values, c.values)) << c.text;
+        EXPECT_TRUE(std::equal(values.begin(), values.end(), c.values.begin(), c.values.end())) << c.text;
     }
 }
 

@@ -18,7 +18,7 @@ int plainOrder(std::string a, std::string b)
 {
     b = b.substr(0, b.find(' '));
     for (std::string* s : {&a, &b})
-        std::ranges::transform(*s, s->begin(), [](int c) { return std::toupper(c); });
+        std::transform(s->begin(), s->end(), s->begin(), [](int c) { return std::toupper(c); });
     return a < b ? -1 : a > b;
 }
 

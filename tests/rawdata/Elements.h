@@ -57,8 +57,8 @@ std::vector<T> someValues(long n, unsigned seed)
 template <typename T>
 bool areSame(const std::vector<T>& a, const std::vector<T>& b)
 {
-    return std::ranges::equal(
-        a, b, [](T x, T y) { return !std::memcmp(&x, &y, sizeof x) || (std::isnan(x) && std::isnan(y)); });
+    return std::equal(a.begin(), a.end(), b.begin(), b.end(),
+                      [](T x, T y) { return !std::memcmp(&x, &y, sizeof x) || (std::isnan(x) && std::isnan(y)); });
 }
 
 /// What `work(address)` makes of `values`, `start` bytes off, in memory that ends with them, so that a step over shows.

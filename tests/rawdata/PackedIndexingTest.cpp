@@ -76,10 +76,12 @@ TEST(SuperPackedIndexing, growsAsIfByOnePositionAtATime)
             for (long i = 0; i < 2000; i += piece)
                 indexing.appendIndexSpace(flags.data() + i, std::min(piece, 2000 - i));
             indexing.appendIndexSpace(nullptr, -5);
-            EXPECT_TRUE(std::ranges::equal(indexing.runs(), runs));
+            EXPECT_TRUE(std::equal(indexing.runs().begin(), indexing.runs().end(), runs.begin(), runs.end()));
             EXPECT_EQ(indexing.currentValue(), value);
-            EXPECT_TRUE(std::ranges::equal(indexing.blockCounts(), counts));
-            EXPECT_TRUE(std::ranges::equal(indexing.blockStarts(), starts));
+            EXPECT_TRUE(
+                std::equal(indexing.blockCounts().begin(), indexing.blockCounts().end(), counts.begin(), counts.end()));
+            EXPECT_TRUE(
+                std::equal(indexing.blockStarts().begin(), indexing.blockStarts().end(), starts.begin(), starts.end()));
             long number = 0;
             for (long i = 0; i < 2000; ++i)
                 ASSERT_EQ(indexing.index(i), flags[i] ? number++ : -1) << i;
