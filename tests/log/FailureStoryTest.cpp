@@ -22,6 +22,8 @@ TEST(KpMessageCollector, reportsWhatWasCountedInOrder)
     EXPECT_TRUE(collector.generateReport(report, true));
     EXPECT_FALSE(collector.generateReport(report, false));
     EXPECT_STREQ(report, "second (1 times)\nthird (1 times)\n");
+    const long copy = collector.addMessageSlot(collector.slots()[first].message);  // the array grows for it
+    EXPECT_STREQ(collector.slots()[copy].message, "first %s");
 }
 
 TEST(KpTerminateProcessDeathTest, endsBySignalOrByStatusWithoutExitHandlers)

@@ -4,8 +4,9 @@ KpMessageCollector::~KpMessageCollector() = default;
 
 long KpMessageCollector::addMessageSlot(const KpString& message)
 {
+    const TCountedMsg slot(message);  // before the growth: the message may be that of a slot
     slots_.reserveOne();
-    slots_.append(TCountedMsg(message));
+    slots_.append(slot);
     return slots_.size() - 1;
 }
 
