@@ -53,6 +53,17 @@ TEST(KpString, takesTextFromItself)
     EXPECT_EQ(text + 'd' + "e", "abcde");
 }
 
+TEST(KpString, holdsMoreThanTwoGibibytes)
+{
+    constexpr long size = 0x80000002;
+    KpString text;
+    text.remax(size + 2, size);  // pages that are not written take no memory
+    text[size - 1] = '\0';
+    text += "ab";
+    EXPECT_TRUE(text.size() == size + 2 && text.data() + size - 1 == "ab"sv);
+    EXPECT_EQ(text.substr(size - 1, size), "ab");
+}
+
 TEST(KpString, comparesWithTextAndNull)
 {
     const char* const null = nullptr;

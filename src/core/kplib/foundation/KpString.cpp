@@ -90,7 +90,7 @@ KpString& KpString::operator+=(const char* s)
 
 void KpString::append(const char* s, long count)
 {
-    const long end = length();
+    const long end = size() > 0 ? size() - 1 : 0;  // length() is an int
     const long needed = end + count + 1;
     const bool isOwn = s >= data() && s <= data() + end;
     const long index = isOwn ? s - data() : 0;
@@ -217,7 +217,7 @@ bool KpString::isDigit() const
 
 KpString KpString::substr(unsigned from, unsigned to) const
 {
-    return KpString(c_str(), static_cast<int>(from), static_cast<int>(to - from + 1));
+    return KpString(c_str() + from, 0, static_cast<int>(to - from + 1));
 }
 
 void KpString::replaceSubStr(const char* from, const char* to)

@@ -44,7 +44,7 @@ void appendQuoted(KpString& out, const char* text)
     } else {
         out += text;
     }
-    if (out[out.length() - 1] == '\\')
+    if (out[out.size() - 2] == '\\')
         out += ' ';  // so that the closing quote doesn't read as escaped
     out += '"';
 }
@@ -101,5 +101,5 @@ void HxParamBundle::print(FILE* stream, int indent, const char* name) const
         const NoSaveScope scope;
         print(text, indent, name);
     }
-    std::fwrite(text.c_str(), 1, static_cast<size_t>(text.length()), stream);
+    std::fwrite(text.c_str(), 1, static_cast<size_t>(text.size() - 1), stream);
 }
