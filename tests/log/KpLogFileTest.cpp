@@ -108,7 +108,7 @@ TEST_F(KpLogFileTest, linesGoWhereTheFlagsLead)
 
 TEST_F(KpLogFileTest, timeIsLocalOrSinceTheStamp)
 {
-    kplib::detail::KpLogClock clock;
+    kplib::detail::LogClock clock;
     setenv("TZ", "TST-5:30", 1);
     EXPECT_EQ(clock.dateAndTime({59, 7}), "1970-01-01 05:30:59.007");
     setenv("TZ", "UTC0", 1);

@@ -47,7 +47,7 @@ struct KpLogFilePrivate {
     bool timeStampSet = false;
     kplib::platform::WallTime timeStamp{};
 
-    kplib::detail::KpLogClock clock;
+    kplib::detail::LogClock clock;
 };
 
 namespace kplib::detail {

@@ -6,7 +6,7 @@
 
 namespace kplib::detail {
 
-std::string_view KpLogClock::dateAndTime(kplib::platform::WallTime time)
+std::string_view LogClock::dateAndTime(kplib::platform::WallTime time)
 {
     const char* const set = std::getenv("TZ");
     const char* const zone = set ? set : ":/etc/localtime";  // what the C library reads when none is set
@@ -22,7 +22,7 @@ std::string_view KpLogClock::dateAndTime(kplib::platform::WallTime time)
     return {text_, static_cast<size_t>(length_) + 4};
 }
 
-void KpLogClock::split(std::int64_t seconds)
+void LogClock::split(std::int64_t seconds)
 {
     tzset();
     const time_t moment = seconds;
@@ -33,7 +33,7 @@ void KpLogClock::split(std::int64_t seconds)
     second_ = seconds;
 }
 
-std::string_view KpLogClock::elapsed(kplib::platform::WallTime start, kplib::platform::WallTime now)
+std::string_view LogClock::elapsed(kplib::platform::WallTime start, kplib::platform::WallTime now)
 {
     const bool borrows = now.milliseconds < start.milliseconds;
     const int milliseconds = now.milliseconds - start.milliseconds + (borrows ? 1000 : 0);

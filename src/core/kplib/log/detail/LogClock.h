@@ -10,7 +10,7 @@ namespace kplib::detail {
 
 // Times as text, each valid until the next is asked for. Local time above the millisecond is kept for as long as the
 // second and the time zone in the environment stay the same. One thread at a time.
-class KpLogClock {
+class LogClock {
 public:
     // Local date and time, "2017-03-01 14:03:59.120".
     std::string_view dateAndTime(kplib::platform::WallTime time);

@@ -6,7 +6,7 @@ namespace {
 
 struct Row {
     int code;
-    kplib::detail::KpResultTexts texts;
+    kplib::detail::ResultTexts texts;
 };
 
 constexpr Row rows[] = {
@@ -99,7 +99,7 @@ constexpr Row rows[] = {
 
 }  // namespace
 
-kplib::detail::KpResultTexts kplib::detail::resultTexts(int code)
+kplib::detail::ResultTexts kplib::detail::resultTexts(int code)
 {
     for (const Row& row : rows) {
         if (row.code == code)

@@ -3,10 +3,10 @@
 namespace kplib::detail {
 
 // What a code of KpResult says by itself; null where it has no such text.
-struct KpResultTexts {
+struct ResultTexts {
     const char* shortText;
     const char* defaultData;
 };
-KpResultTexts resultTexts(int code);
+ResultTexts resultTexts(int code);
 
 }  // namespace kplib::detail
