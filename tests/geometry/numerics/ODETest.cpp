@@ -131,6 +131,12 @@ TEST(KpODE, passesOnTheCodeOfAWallHoweverTheStepsEnd)
         }
         EXPECT_EQ(ode.status(), code) << i;
     }
+    KpODE2 inaccurate;  // quartered twice at the wall, then rejected below the smallest step
+    inaccurate.setRightHandSide(walled, &code);
+    inaccurate.setTolerance(0);
+    inaccurate.init(KpVec2f(0.1F, 1), 1);
+    KpVec2f point;
+    EXPECT_EQ(inaccurate.next(point), KpODE2::StepTooSmall);
 }
 
 /// The same everywhere, as the user data has it.

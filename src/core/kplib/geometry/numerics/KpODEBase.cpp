@@ -245,7 +245,9 @@ int KpODEBase<Vector>::nextRK(Vector& y, Vector& f, float& hUsed)
             state_.h = std::min(static_cast<float>(static_cast<double>(state_.h) * factor), state_.hMax);
             return Success;
         }
-        if (state_.h < state_.hMin || state_.h == 0)  // a step of 0 cannot shrink
+        if (state_.h < state_.hMin)
+            return StepTooSmall;
+        if (state_.h == 0)  // cannot shrink
             return stepTooSmall();
         const double factor = err == 0 ? 0.5 : std::max(0.5, stepFactor(err));  // a NaN counts as 0.5
         state_.h = static_cast<float>(static_cast<double>(state_.h) * factor);

@@ -42,7 +42,8 @@ public:
     ~KpODEBase() = default;
 
     void setMethod(int method) { state_.method = method; }
-    /// `min`: rejected steps below it end the integration. `max` bounds all steps but the first.
+    /// `min`: a rejected step below it ends the integration with StepTooSmall, also if the field failed before. `max`
+    /// bounds all steps but the first.
     void setHMinMax(float min, float max);
     /// Distance between samples along the parameter.
     void setHSampling(float hSampling) { state_.hSampling = hSampling; }
