@@ -182,6 +182,10 @@ TEST_F(KpDirectoryTest, theCollectorGoesDownFromTheLastName)
     found.clear();
     KpFilenameCollector::collect(found, "k*", (temp / "outside").c_str());
     EXPECT_EQ(joined(found), temp / "outside/kept" + "|");
+    std::filesystem::create_directory_symlink("deep", tree + "/sub/again");  // beside what it leads to
+    found.clear();
+    KpFilenameCollector::collect(found, "f", (tree + "/sub").c_str());
+    EXPECT_EQ(joined(found), tree + "/sub/deep/f|" + tree + "/sub/again/f|");
 }
 
 TEST_F(KpDirectoryTest, temporaryFoldersAreUniqueAndGo)

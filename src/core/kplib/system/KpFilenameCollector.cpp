@@ -8,14 +8,16 @@
 
 namespace {
 
-using Visited = std::set<std::pair<dev_t, ino_t>>;
+using Folders = std::set<std::pair<dev_t, ino_t>>;
 
-void collectInto(KpDArray<KpString>& out, const char* pattern, const char* dir, Visited& visited)
+/// `ancestors`: the folders on the way to `dir`; a link back to one of them would lead in circles.
+void collectInto(KpDArray<KpString>& out, const char* pattern, const char* dir, Folders& ancestors)
 {
     struct stat status {};
     if (!KpDirectory::isDirectory(dir) || stat(dir, &status) != 0)
         return;
-    if (!visited.emplace(status.st_dev, status.st_ino).second)
+    const auto [self, isNew] = ancestors.emplace(status.st_dev, status.st_ino);
+    if (!isNew)
         return;
     const auto pathOf = [dir](const KpString& name) { return KpString(0, "%s/%s", dir, name.c_str()); };
     KpDArray<KpString> names;
@@ -27,15 +29,16 @@ void collectInto(KpDArray<KpString>& out, const char* pattern, const char* dir, 
     for (long i = names.size() - 1; i >= 0; --i) {
         const KpString path = pathOf(names[i]);
         if (KpDirectory::isDirectory(path))
-            collectInto(out, pattern, path, visited);
+            collectInto(out, pattern, path, ancestors);
     }
+    ancestors.erase(self);
 }
 
 }  // namespace
 
 void KpFilenameCollector::collect(KpDArray<KpString>& out, const char* pattern, const char* dir)
 {
-    Visited visited;
+    Folders ancestors;
     if (pattern && dir)
-        collectInto(out, pattern, dir, visited);
+        collectInto(out, pattern, dir, ancestors);
 }
