@@ -1,16 +1,9 @@
-// volume-road: makes a DICOM series of a volume, and takes a series all the way to pictures.
+// volume-road: reads any DICOM series of an archive and takes it all the way to pictures, measures and a page.
 
-#include "DicomTree.h"
-#include "DicomWriter.h"
-#include "Measure.h"
-#include "NiftiVolume.h"
-#include "OutputFolder.h"
-#include "PeerRoad.h"
-#include "Phantom.h"
-#include "Pictures.h"
-#include "RemoteVolume.h"
-#include "RunRoad.h"
-#include "TerminalProgress.h"
+#include "commands/Abort.h"
+#include "commands/Commands.h"
+#include "commands/TerminalProgress.h"
+#include "dicom/Pixels.h"
 
 #include <kplib/foundation/KpException.h>
 #include <kplib/log/KpLogFile.h>
@@ -19,44 +12,131 @@
 #include <dcmtk/config/osconfig.h>
 #include <dcmtk/oflog/oflog.h>
 
+#include <cmath>
 #include <cstdio>
-#include <optional>
-#include <string>
 
 namespace {
 
-constexpr int exitBadInput = 2, exitInterrupted = 130;
+constexpr int exitBadInput = 2;
+constexpr int usualTimeout = 60;
 
-KpResult makeSeries(const std::string& nifti, const std::string& target, KpProgressInterface& progress)
+using Command = KpResult (*)(const Job&, KpProgressInterface&);
+
+CLI::App& addCommand(CLI::App& app, const char* name, const char* purpose, const std::string& example)
 {
-    Volume volume;
-    if (nifti.empty())
-        volume = makePhantom();
-    else if (KpResult read = readNifti(nifti.c_str(), volume); read.isBad())
-        return read;
-    OutputFolder out;
-    if (KpResult opened = out.open(target); opened.isBad())
-        return opened;
-    const Window window = windowOf(volume);
-    const SeriesText text{"Example study", nifti.empty() ? "Head phantom" : "Head", nifti.empty() ? "phantom" : "NIfTI",
-                          window.center, window.width};
-    KpResult result = writeSeries(volume, text, out.working().c_str(), progress);
-    if (progress.isCanceled())
-        return KpResult(KpResult::Interrupted, "cancelled, nothing was written", nullptr);
-    if (result.isOk())
-        result << out.publish();
-    return result;
+    CLI::App& command = *app.add_subcommand(name, purpose);
+    command.footer("Example:\n  volume-road " + example);
+    return command;
 }
 
-KpResult printHeader(const std::string& path)
+void addSeries(CLI::App& command, Job& job, bool isRequired = true)
 {
-    HxParamBundle root("Header");
-    if (KpResult read = readHeader(path.c_str(), root); read.isBad())
-        return read;
-    KpString text;
-    root.print(text, 0, nullptr);
-    std::fputs(text, stdout);
-    return std::fflush(stdout) == 0 ? KpResult() : badInput("can't write to standard output");
+    command.add_option("SERIES", job.choice.folder, "folder with the images, in any order")->required(isRequired);
+    command.add_option("--series", job.choice.uid, "series instance UID, where the folder holds several");
+    command
+        .add_option("--volume", job.choice.volume, "number of the volume, where the series holds several (see list)")
+        ->check(CLI::Range(1, 1 << 20));
+}
+
+void addThreshold(CLI::App& command, Job& job)
+{
+    command
+        .add_option("--threshold", job.threshold,
+                    "value from which on voxels belong to the object; by Otsu's method, if not given")
+        ->check([](const std::string& text) {
+            return std::isfinite(std::strtod(text.c_str(), nullptr)) ? ""
+                                                                     : "--threshold takes a number, not '" + text + "'";
+        });
+}
+
+void addTimeout(CLI::App& command, Job& job)
+{
+    command.add_option("--timeout", job.timeout, "seconds that the peer may be silent; 0 waits for ever (default 60)")
+        ->check(CLI::Range(0, 86400));
+}
+
+void addMakeSeries(CLI::App& app, Job& job)
+{
+    CLI::App& command = addCommand(app, "make-series", "write a volume as a DICOM series",
+                                   "make-series --nifti brain.nii.gz --volume 2 brain-series");
+    static bool isPhantom = false;  // without a source file it is the phantom
+    CLI::Option_group& source = *command.add_option_group("source");
+    source.add_option("--nifti", job.source, "a NIfTI volume");
+    source.add_flag("--phantom", isPhantom, "the built-in head phantom");
+    source.require_option(1);
+    command.add_option("--volume", job.sourceVolume, "number of the volume, where the file holds several");
+    command.add_option("OUT", job.target, "folder to write the images into")->required();
+}
+
+void addRun(CLI::App& app, Job& job)
+{
+    CLI::App& command = addCommand(app, "run", "read a series; write pictures, header, reports and a page",
+                                   "run archive/patient7 out --volume 2 --derived out-half");
+    addSeries(command, job, false);
+    addThreshold(command, job);
+    addTimeout(command, job);
+    CLI::Option* const remote = command.add_option("--http", job.url, "URL of an exported volume, in place of SERIES");
+    command.add_option("--derived", job.derived, "folder for the reduced volume as a DICOM series of its own")
+        ->excludes(remote);
+    command.add_option("OUT", job.target, "folder to write into");
+}
+
+void addMeasure(CLI::App& app, Job& job)
+{
+    CLI::App& command = addCommand(app, "measure", "measure the largest region of a series",
+                                   "measure archive/patient7 measured --threshold 300");
+    addSeries(command, job);
+    addThreshold(command, job);
+    command.add_flag("--json", job.isJson, "write measures.json in place of measures.txt");
+    command.add_option("OUT", job.target, "folder to write into")->required();
+}
+
+void addList(CLI::App& app, Job& job)
+{
+    CLI::App& command = addCommand(app, "list", "print every series and volume below a folder", "list archive --json");
+    command.add_option("FOLDER", job.choice.folder)->required();
+    command.add_flag("--json", job.isJson, "as JSON");
+}
+
+void addExport(CLI::App& app, Job& job)
+{
+    CLI::App& command = addCommand(app, "export", "write a series as one raw file, for a server to give out",
+                                   "export archive/patient7 volume.raw --describe volume.json");
+    addSeries(command, job);
+    command.add_option("--describe", job.describe, "JSON file for the layout of the file and the place of each slice");
+    command.add_option("FILE", job.target, "the file to write; - is standard output")->required();
+}
+
+void addSend(CLI::App& app, Job& job)
+{
+    CLI::App& command = addCommand(app, "send", "reduce and segment a series, and send it to a peer",
+                                   "send archive/patient7 127.0.0.1 4040 sent");
+    addSeries(command, job);
+    addThreshold(command, job);
+    addTimeout(command, job);
+    command.add_option("HOST", job.address, "name or address of the peer")->required();
+    command.add_option("PORT", job.port, "its port")->required()->check(CLI::Range(1, 65535));
+    command.add_option("OUT", job.target, "folder for the pictures of the volume that is sent");
+}
+
+void addServe(CLI::App& app, Job& job)
+{
+    CLI::App& command = addCommand(app, "serve", "wait for a peer; write the pictures of the volume it sends",
+                                   "serve 4040 received --listen 0.0.0.0");
+    command.add_option("PORT", job.port, "port of this machine, 0 for any free one")
+        ->required()
+        ->check(CLI::Range(0, 65535));
+    command.add_option("--listen", job.address, "address to listen at (default 127.0.0.1: this machine alone)");
+    addTimeout(command, job);
+    command.add_option("OUT", job.target, "folder to write into")->required();
+}
+
+void addHeader(CLI::App& app, Job& job)
+{
+    CLI::App& command =
+        addCommand(app, "header", "print the header of one DICOM file as a tree", "header image.dcm --json");
+    command.add_option("FILE", job.source)->required();
+    command.add_flag("--json", job.isJson, "as JSON, with VR, keyword and private creator of each tag");
 }
 
 int report(const KpResult& result)
@@ -64,80 +144,72 @@ int report(const KpResult& result)
     if (result.isOk())
         return 0;
     std::fprintf(stderr, "volume-road: %s\n", result.text());
-    return result.code() == KpResult::Interrupted ? exitInterrupted : exitBadInput;
+    return result.code() == KpResult::Interrupted ? exitCodeOfSignal() : exitBadInput;
 }
 
 /// A job reads a series or a URL; with a URL the one folder that is given is the output.
-KpResult checkSource(Job& job, std::string& target)
+KpResult runJob(const Job& given, KpProgressInterface& progress)
 {
-    if (!job.url.empty() && target.empty())
-        std::swap(job.folder, target);
-    if (target.empty() || job.folder.empty() == job.url.empty())
-        return badInput("run takes SERIES and OUT, or --http URL and OUT; see volume-road --help");
-    return KpResult();
+    Job job = given;
+    if (!job.url.empty() && job.target.empty())
+        std::swap(job.choice.folder, job.target);
+    if (job.target.empty() || job.choice.folder.empty() == job.url.empty())
+        return KpResult(KpResult::InvalidArgument,
+                        "run takes SERIES and OUT, or --http URL and OUT; see volume-road --help", nullptr);
+    return run(job, progress);
 }
 
-int run(int argc, char** argv)
+const struct {
+    const char* name;
+    Command command;
+} commands[] = {
+    {"make-series", makeSeries},
+    {"run", runJob},
+    {"measure", measure},
+    {"list", list},
+    {"export", exportSeries},
+    {"send", send},
+    {"serve", [](const Job& job, KpProgressInterface&) { return serve(job); }},
+    {"header", [](const Job& job, KpProgressInterface&) { return printHeader(job); }},
+};
+
+int start(const CLI::App& app, Job& job)
 {
-    std::string nifti, target, file, host;
-    int port = 0;
-    bool isPhantom = false;
+    watchSignals();
+    registerDecoders();
+    KpProgressInterface progress;
+    TerminalProgress terminal;
+    progress.setProgressGui(&terminal);
+    for (const auto& [name, command] : commands) {
+        if (!app.got_subcommand(name))
+            continue;
+        return report(command(job, progress));
+    }
+    return exitBadInput;
+}
+
+/// A first word that is no command: the library of the command line says only that one is missing.
+bool isUnknownCommand(int argc, char** argv)
+{
+    return argc > 1 && argv[1][0] != '-' &&
+           std::none_of(std::begin(commands), std::end(commands),
+                        [&](const auto& command) { return std::string(command.name) == argv[1]; });
+}
+
+int parseAndStart(int argc, char** argv)
+{
     Job job;
-    CLI::App app("Takes a volume down the road: DICOM files, header tree, voxels, reduced volumes, pictures.",
+    job.timeout = usualTimeout;
+    CLI::App app("Reads DICOM series and takes them down the road: header tree, volume, pictures, measures, page.",
                  "volume-road");
     app.require_subcommand(1);
-
-    CLI::App& make = *app.add_subcommand("make-series", "write a volume as a DICOM series");
-    CLI::Option_group& source = *make.add_option_group("source");
-    source.add_option("--nifti", nifti, "a NIfTI volume");
-    source.add_flag("--phantom", isPhantom, "the built-in head phantom");
-    source.require_option(1);
-    make.add_option("OUT", target, "folder to write the images into")->required();
-
-    const auto addSeries = [&job](CLI::App& command) {
-        command.add_option("SERIES", job.folder, "folder with the images, in any order")->required();
-        command.add_option("--series", job.uid, "series instance UID, where the folder holds several");
-    };
-    const auto addThreshold = [&job](CLI::App& command) {
-        command.add_option("--threshold", job.threshold,
-                           "value from which on voxels belong to the object; by Otsu's method, if not given");
-    };
-
-    CLI::App& road = *app.add_subcommand("run", "read a series; write pictures, header and report");
-    addSeries(road);
-    addThreshold(road);
-    CLI::Option* const remote =
-        road.add_option("--http", job.url, "URL of an exported volume on a server, in place of SERIES");
-    road.get_option("SERIES")->required(false);
-    road.add_option("--derived", job.derived, "folder for the reduced volume as a DICOM series of its own")
-        ->excludes(remote);
-    road.add_option("OUT", target, "folder to write into");
-
-    CLI::App& measuring = *app.add_subcommand("measure", "measure the largest region of a series");
-    addSeries(measuring);
-    addThreshold(measuring);
-    measuring.add_option("OUT", target, "folder to write into")->required();
-
-    CLI::App& exporting = *app.add_subcommand("export", "write a series as one raw file, for a server to give out");
-    addSeries(exporting);
-    exporting.add_option("FILE", file, "the file to write")->required();
-
-    CLI::App& sending = *app.add_subcommand("send", "reduce and segment a series, and send it to a peer");
-    addSeries(sending);
-    addThreshold(sending);
-    sending.add_option("HOST", host, "where the peer is")->required();
-    sending.add_option("PORT", port, "where it waits")->required()->check(CLI::Range(1, 65535));
-    sending.add_option("OUT", target, "folder for the pictures of what is sent");
-
-    CLI::App& serving = *app.add_subcommand("serve", "wait for a peer; write the pictures of what it sends");
-    serving.add_option("PORT", port, "port of this machine, 0 for any free one")
-        ->required()
-        ->check(CLI::Range(0, 65535));
-    serving.add_option("OUT", target, "folder to write into")->required();
-
-    CLI::App& header = *app.add_subcommand("header", "print the header of one DICOM file as a tree");
-    header.add_option("FILE", file)->required();
-
+    app.footer("volume-road COMMAND --help explains a command and gives an example.");
+    for (auto* const add : {addMakeSeries, addRun, addMeasure, addList, addExport, addSend, addServe, addHeader})
+        add(app, job);
+    if (isUnknownCommand(argc, argv)) {
+        std::fprintf(stderr, "volume-road: there is no command '%s'; see volume-road --help\n", argv[1]);
+        return exitBadInput;
+    }
     try {
         app.parse(argc, argv);
     } catch (const CLI::ParseError& e) {
@@ -146,37 +218,20 @@ int run(int argc, char** argv)
         std::fprintf(stderr, "volume-road: %s; see volume-road --help\n", e.what());
         return exitBadInput;
     }
-    if (road) {
-        if (KpResult checked = checkSource(job, target); checked.isBad())
-            return report(checked);
-    }
-    if (header)
-        return report(printHeader(file));
-    KpProgressInterface progress;
-    TerminalProgress terminal;
-    progress.setProgressGui(&terminal);
-    if (make)
-        return report(makeSeries(nifti, target, progress));
-    if (serving)
-        return report(serveRoad(port, target));
-    if (sending)
-        return report(sendRoad(job, host, port, target, progress));
-    if (measuring)
-        return report(measureRoad(job, target, progress));
-    if (exporting)
-        return report(exportVolume(job.folder, job.uid, file, progress));
-    return report(runRoad(job, target, progress));
+    if (app.got_subcommand("serve") && job.address.empty())
+        job.address = "127.0.0.1";
+    return start(app, job);
 }
 
 }  // namespace
 
 int main(int argc, char** argv)
 {
-    // What concerns the user is told in our own words.
+    // All messages for the user are the program's own.
     OFLog::configure(OFLogger::OFF_LOG_LEVEL);
     getTheLogInstance().setLogLevel(KpLogOff);
     try {
-        return run(argc, argv);
+        return parseAndStart(argc, argv);
     } catch (KpException& e) {
         std::fprintf(stderr, "volume-road: %s\n", e.what());
     } catch (const std::exception& e) {

@@ -1,4 +1,4 @@
-#include "volume-road/DicomTree.h"
+#include "volume-road/dicom/DicomTree.h"
 
 #include <kplib/foundation/KpDArray.h>
 #include <kplib/foundation/KpString.h>

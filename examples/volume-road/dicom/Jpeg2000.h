@@ -1,0 +1,11 @@
+#pragma once
+
+#include "Image.h"
+
+class DcmPixelData;
+
+/// Whether a transfer syntax of this UID holds JPEG 2000 codestreams.
+bool isJpeg2000(const std::string& syntax);
+
+/// Decodes one frame into words of its allocated bits, colours interleaved as red, green and blue.
+KpResult decodeJpeg2000(DcmPixelData& pixelData, const Image& plane, const std::string& syntax, unsigned char* pixels);

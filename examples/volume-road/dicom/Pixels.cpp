@@ -1,0 +1,199 @@
+#include "Pixels.h"
+
+#include "Colour.h"
+#include "DicomTree.h"
+#include "Jpeg2000.h"
+
+#include <dcmtk/config/osconfig.h>
+#include <dcmtk/dcmdata/dcrledrg.h>
+#include <dcmtk/dcmdata/dctk.h>
+#include <dcmtk/dcmjpeg/djdecode.h>
+#include <dcmtk/dcmjpls/djdecode.h>
+
+#include <cstring>
+
+namespace {
+
+/// The stored bits as a number: cut out, and with their sign.
+template <typename Word>
+Word cutOut(Word from, const PixelFormat& format)
+{
+    const int unused = static_cast<int>(sizeof(Word)) * 8 - format.bitsStored;
+    const int below = format.highBit + 1 - format.bitsStored;
+    const Word bits = static_cast<Word>(static_cast<Word>(from >> below) << unused);
+    using Signed = std::make_signed_t<Word>;
+    return format.isSigned ? static_cast<Word>(static_cast<Signed>(bits) >> unused) : static_cast<Word>(bits >> unused);
+}
+
+/// The columns and rows of a frame that a plane covers.
+struct Region2D {
+    long left, top, columns, rows, frameColumns;
+
+    explicit Region2D(const Image& plane) : columns(plane.columns), rows(plane.rows)
+    {
+        frameColumns = columns * plane.tilesAcross;
+        left = plane.tile < 0 ? 0 : plane.tile % plane.tilesAcross * columns;
+        top = plane.tile < 0 ? 0 : plane.tile / plane.tilesAcross * rows;
+    }
+};
+
+template <typename Word, typename Stored>
+void copyWords(const unsigned char* pixels, const Image& plane, Stored* to)
+{
+    const Region2D region(plane);
+    for (long y = 0; y < region.rows; ++y) {
+        const auto* const row =
+            reinterpret_cast<const Word*>(pixels) + (region.top + y) * region.frameColumns + region.left;
+        for (long x = 0; x < region.columns; ++x) {
+            const Word bits = cutOut(row[x], plane.format);
+            *to++ = static_cast<Stored>(plane.format.isSigned ? static_cast<std::make_signed_t<Word>>(bits) : bits);
+        }
+    }
+}
+
+void copyValues(const unsigned char* pixels, const Image& plane, void* stored)
+{
+    const PixelFormat& format = plane.format;
+    switch (format.bitsAllocated) {
+    case 16:
+        if (format.isSigned)
+            copyWords<Uint16>(pixels, plane, static_cast<short*>(stored));
+        else
+            copyWords<Uint16>(pixels, plane, static_cast<unsigned short*>(stored));
+        break;
+    case 32:
+        if (format.isSigned)
+            copyWords<Uint32>(pixels, plane, static_cast<int*>(stored));
+        else
+            for (long i = 0; i < static_cast<long>(plane.rows) * plane.columns; ++i)
+                static_cast<double*>(stored)[i] = cutOut(reinterpret_cast<const Uint32*>(pixels)[i], format);
+        break;
+    default:
+        if (format.isSigned)
+            copyWords<Uint8>(pixels, plane, static_cast<short*>(stored));
+        else
+            copyWords<Uint8>(pixels, plane, static_cast<unsigned char*>(stored));
+    }
+}
+
+/// The bits of one frame as bytes. Frames follow each other without a gap, the lowest bit of a byte first.
+bool copyBits(DcmItem& data, const Image& plane, unsigned char* to)
+{
+    const Uint8* bytes = nullptr;
+    unsigned long available = 0;
+    const unsigned long n = static_cast<unsigned long>(plane.rows) * static_cast<unsigned long>(plane.columns);
+    if (data.findAndGetUint8Array(DCM_PixelData, bytes, &available).bad() || available * 8 < (plane.frame + 1) * n)
+        return false;
+    for (unsigned long i = 0, bit = plane.frame * n; i < n; ++i, ++bit)
+        to[i] = bytes[bit / 8] >> (bit % 8) & 1;
+    return true;
+}
+
+long bytesOfFrame(const Image& plane)
+{
+    const long across = plane.tilesAcross;
+    return static_cast<long>(plane.rows) * plane.columns * across * across * plane.format.samples *
+           plane.format.bitsAllocated / 8;
+}
+
+}  // namespace
+
+PixelReader::PixelReader() = default;
+PixelReader::~PixelReader() = default;
+
+KpResult PixelReader::open(const Image& plane)
+{
+    if (file_ && path_ == plane.path)
+        return KpResult();
+    hasFrame_ = false;
+    path_ = plane.path;
+    file_ = std::make_unique<DcmFileFormat>();
+    KpResult loaded = loadDicom(path_.c_str(), *file_);
+    if (loaded.isBad())
+        file_.reset();
+    return loaded;
+}
+
+KpResult PixelReader::decode(const Image& plane)
+{
+    if (hasFrame_ && frame_ == plane.frame)
+        return KpResult();
+    hasFrame_ = false;
+    DcmDataset& data = *file_->getDataset();
+    DcmElement* element = nullptr;
+    if (data.findAndGetElement(DCM_PixelData, element).bad())
+        return badInput("%s has no pixel data", plane.name().c_str());
+    auto& pixelData = static_cast<DcmPixelData&>(*element);
+    const long size = bytesOfFrame(plane);
+    pixels_.resize(size + 2);  // compressed frames are padded to an even size
+    const DcmXfer transfer(data.getOriginalXfer());
+    photometric_ = plane.format.photometric;
+    isPlanar_ = plane.format.isPlanar != 0 && plane.format.samples == 3;
+    const std::string syntax = transfer.getXferID();
+    if (isJpeg2000(syntax)) {
+        KpResult decoded = decodeJpeg2000(pixelData, plane, syntax, pixels_.data());
+        if (plane.format.samples == 3)
+            photometric_ = "RGB";
+        isPlanar_ = false;
+        hasFrame_ = decoded.isOk();
+        frame_ = plane.frame;
+        return decoded;
+    }
+    Uint32 fragment = 0;
+    OFString model;
+    const OFCondition status = pixelData.getUncompressedFrame(
+        &data, static_cast<Uint32>(plane.frame), fragment, pixels_.data(), static_cast<Uint32>(pixels_.size()), model);
+    if (status.bad()) {
+        if (!transfer.isEncapsulated())
+            return badInput("%s is cut off: %s", plane.name().c_str(), status.text());
+        return badInput("%s has pixels in %s that cannot be decoded: %s", plane.name().c_str(),
+                        plane.transferSyntax.c_str(), status.text());
+    }
+    if (transfer.isEncapsulated() && !model.empty())
+        photometric_ = model.c_str();
+    if (transfer.isEncapsulated() && transfer.getXfer() != EXS_RLELossless)
+        isPlanar_ = false;
+    hasFrame_ = true;
+    frame_ = plane.frame;
+    return KpResult();
+}
+
+KpResult PixelReader::read(const Image& plane, void* stored)
+{
+    if (KpResult opened = open(plane); opened.isBad())
+        return opened;
+    if (plane.format.bitsAllocated == 1)
+        return copyBits(*file_->getDataset(), plane, static_cast<unsigned char*>(stored))
+                   ? KpResult()
+                   : badInput("%s is cut off", plane.name().c_str());
+    if (KpResult decoded = decode(plane); decoded.isBad())
+        return decoded;
+    if (plane.format.isColour())
+        return toColours(*file_->getDataset(), plane, photometric_, isPlanar_, pixels_.data(),
+                         static_cast<unsigned char*>(stored));
+    copyValues(pixels_.data(), plane, stored);
+    return KpResult();
+}
+
+KpPrimType storedType(const PixelFormat& format)
+{
+    if (format.isColour())
+        return KpPrimType::Byte;
+    switch (format.bitsAllocated) {
+    case 16:
+        return format.isSigned ? KpPrimType::Short : KpPrimType::UShort;
+    case 32:
+        return format.isSigned ? KpPrimType::Int : KpPrimType::Double;
+    default:
+        return format.isSigned ? KpPrimType::Short : KpPrimType::Byte;
+    }
+}
+
+void registerDecoders()
+{
+    // Attributes that passed a system which did not know them have no VR in the file; the dictionary has it.
+    dcmEnableUnknownVRConversion.set(OFTrue);
+    DJDecoderRegistration::registerCodecs(EDC_photometricInterpretation, EUC_default, EPC_colorByPixel);
+    DJLSDecoderRegistration::registerCodecs(EJLSUC_never, EJLSPC_colorByPixel);
+    DcmRLEDecoderRegistration::registerCodecs();
+}
