@@ -264,6 +264,23 @@ def spacing_that_is_unknown():
         refused("pixel spacing is unknown", "measure", path, SCRATCH + "/no")
 
 
+def big_endian_dose():
+    """Pixels of 32 bits, whose halves a big-endian file has in the other order, and frames at offsets from the first."""
+    for syntax in ("little", "big"):
+        voxels = rng.integers(0, 2 ** 32, (3, 6, 8)).astype("<u4")
+        ds = image("1.2.840.10008.5.1.4.1.1.481.2", "RTDOSE", NumberOfFrames=3, InstanceNumber=1, DoseGridScaling="0.001")
+        put_pixels(ds, voxels)
+        ds.PixelSpacing, ds.GridFrameOffsetVector = [2, 3], [0, 5, 10]
+        ds.ImagePositionPatient, ds.ImageOrientationPatient = [1, 2, 3], [1, 0, 0, 0, 1, 0]
+        if syntax == "big":
+            ds.PixelData = voxels.astype(">u4").tobytes()
+            ds.is_little_endian, ds.file_meta.TransferSyntaxUID = False, "1.2.840.10008.1.2.2"
+        write(ds, folder("dose") + "/object")
+        read = Read(SCRATCH + "/dose")
+        assert np.array_equal(read.voxels, voxels) and read.info["slope"] == 0.001, syntax
+        assert [s["position"][2] for s in read.slices] == [3, 8, 13]
+
+
 def window_functions():
     def own(ds, z):
         ds.WindowCenter, ds.WindowWidth = 100 + 10 * z * z, 50 + z
@@ -665,6 +682,86 @@ def exporting():
     refused("No space left", "export", path, "/dev/full")
 
 
+def serving():
+    """Web servers that close after each answer or fall silent, and peers that do."""
+    import http.server, socket, threading, time
+    path = made("served", noise(6, 40, 40, np.uint16))
+    road("export", path, SCRATCH + "/raw")
+    content, connections = open(SCRATCH + "/raw", "rb").read(), []
+
+    class Closing(http.server.BaseHTTPRequestHandler):
+        def do_GET(self):
+            first, last = map(int, self.headers["Range"].split("=")[1].split("-"))
+            connections.append(self.client_address)
+            self.send_response(206)
+            self.send_header("Content-Length", str(last - first + 1))
+            self.send_header("Content-Range", f"bytes {first}-{last}/{len(content)}")
+            self.end_headers()
+            self.wfile.write(content[first:last + 1])
+
+        def log_message(self, *_):
+            pass
+    server = http.server.HTTPServer(("127.0.0.1", 0), Closing)
+    threading.Thread(target=server.serve_forever, daemon=True).start()
+    road("run", "--http", f"http://127.0.0.1:{server.server_port}/raw", folder("fetched"))
+    assert len(connections) == len(set(connections)) == 8, connections  # prefix, head and six slices
+    server.shutdown()
+    report(path)
+    for name in ("axial.png", "oblique.png", "index.html", "overview-mean.png"):
+        here, there = (open(f"{SCRATCH}/{o}/{name}", "rb").read() for o in ("out", "fetched"))
+        assert here == there or name == "index.html", name
+    silent = socket.create_server(("127.0.0.1", 0))
+    port = silent.getsockname()[1]
+    for command in (("run", "--http", f"http://127.0.0.1:{port}/raw", SCRATCH + "/no"), ("send", path, "127.0.0.1", port, SCRATCH + "/no")):
+        start = time.time()
+        refused("was silent for 1 s", *command, "--timeout", 1)
+        assert time.time() - start < 3 and not [n for n in os.listdir(SCRATCH) if n.startswith(".no")], command
+    refused("only http:// is supported", "run", "--http", "https://127.0.0.1/raw", SCRATCH + "/no")
+    refused("the host 'no.such.host.invalid' is unknown", "send", path, "no.such.host.invalid", 4040)
+    peer = subprocess.Popen([ROAD, "serve", "0", SCRATCH + "/no", "--timeout", "1", "--listen", "127.0.0.1"], stdout=subprocess.PIPE,
+                            stderr=subprocess.PIPE, text=True)
+    port = int(peer.stdout.readline().split()[-1])
+    with socket.create_connection(("127.0.0.1", port)):
+        assert peer.wait(3) == 2 and "was silent for 1 s" in peer.stderr.read()
+    refused("is not an address", "serve", 0, SCRATCH + "/no", "--listen", "somewhere")
+
+
+def signals():
+    """Every command ends within half a second, with 128 + the signal, and leaves nothing."""
+    import signal, time
+    voxels = np.zeros((60, 256, 256), np.int16)
+    voxels[10:50, 50:200, 50:200] = 1000
+    path = made("long", voxels)
+    commands = [("run", path, SCRATCH + "/gone"), ("measure", path, SCRATCH + "/gone"), ("serve", "0", SCRATCH + "/gone"),
+                ("export", path, SCRATCH + "/gone"), ("make-series", "--phantom", SCRATCH + "/gone")]
+    ended = 0
+    for command in commands:
+        for number in (signal.SIGINT, signal.SIGTERM):
+            for delay in (0.05, 0.15, 0.4):
+                job = subprocess.Popen([ROAD, *command], stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
+                time.sleep(delay)
+                start = time.time()
+                job.send_signal(number)
+                code = job.wait(5)
+                if code == 0 or code == -number:  # done before, or not yet watching
+                    shutil.rmtree(SCRATCH + "/gone", ignore_errors=True)
+                    continue
+                assert code == 128 + number and time.time() - start < 0.6, (command, number, code, time.time() - start)
+                assert not [n for n in os.listdir(SCRATCH) if "gone" in n], (command, os.listdir(SCRATCH))
+                ended += 1
+    assert ended > 10, ended
+
+
+def one_line_refusals():
+    path = made("plain", noise())
+    refused("there is no command 'show'", "show")
+    refused("takes a number, not 'nan'", "run", path, SCRATCH + "/no", "--threshold", "nan")
+    refused("No such file", "header", SCRATCH + "/nothing")
+    refused("can't read the folder", "list", SCRATCH + "/nothing")
+    for command in ("run", "list", "measure", "export", "send", "serve", "header", "make-series"):
+        assert "Example:" in road(command, "--help").stdout, command
+
+
 def valid_objects():
     if not shutil.which("dciodvfy"):
         print("skipped: validation of written images, dicom3tools is not installed")
@@ -732,9 +829,10 @@ def real_series():
         assert len(seen) == sum(int(ds.NumberOfFrames) for ds in objects.values()), name
 
 
-tests = [orientations, tilted_gantry, positions, uneven_gaps, spacing_that_is_unknown, window_functions, scales, unknown_vr, syntaxes,
+tests = [orientations, tilted_gantry, positions, uneven_gaps, spacing_that_is_unknown, window_functions, scales, big_endian_dose, unknown_vr, syntaxes,
          colours, padding, multi_frame, compressed_frames, secondary_capture, several_at_one_place, damaged_files,
-         same_warnings, header_values, nifti, publishing, exporting, valid_objects]
+         same_warnings, header_values, nifti, publishing, exporting, serving, signals,
+         one_line_refusals, valid_objects]
 if os.path.isdir(DATA):
     tests += [mosaics, real_series]
 else:

@@ -18,7 +18,7 @@ using std::chrono::steady_clock;
 namespace {
 
 constexpr int exitBadInput = 2;
-constexpr auto patience = std::chrono::milliseconds(200);  // for work that polls the progress
+constexpr auto patience = std::chrono::milliseconds(100);  // for work that polls the progress
 
 std::atomic<int> received = 0;
 
@@ -64,7 +64,7 @@ void waitForSignal(sigset_t signals)
     sigwait(&signals, &signal);
     received = signal;
     std::this_thread::sleep_for(patience);
-    std::fputs("\nvolume-road: cancelled, nothing was written\n", stderr);
+    std::fprintf(stderr, "%svolume-road: cancelled, nothing was written\n", isatty(STDERR_FILENO) ? "\n" : "");
     endProgram(128 + signal);
 }
 

@@ -230,6 +230,9 @@ Image describeFrame(const std::string& path, DcmDataset& data, unsigned long fra
     addOffset(values, image);
     if (const std::string problem = formatProblem(image); !problem.empty())
         image.problem = problem;
+    if (!DcmXfer(data.getOriginalXfer()).isEncapsulated() && image.format.photometric.rfind("YBR_", 0) == 0 &&
+        image.format.photometric != "YBR_FULL")
+        image.problem = "the colour model " + image.format.photometric + " is read from compressed pixels only";
     return image;
 }
 

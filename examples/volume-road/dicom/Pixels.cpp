@@ -89,6 +89,14 @@ bool copyBits(DcmItem& data, const Image& plane, unsigned char* to)
     return true;
 }
 
+/// Pixels of 32 bits are read as pairs of 16-bit words, which stand in the wrong order in a big-endian file.
+void swapHalves(unsigned char* pixels, long size)
+{
+    auto* const words = reinterpret_cast<Uint16*>(pixels);
+    for (long i = 0; i + 1 < size / 2; i += 2)
+        std::swap(words[i], words[i + 1]);
+}
+
 long bytesOfFrame(const Image& plane)
 {
     const long across = plane.tilesAcross;
@@ -153,6 +161,8 @@ KpResult PixelReader::decode(const Image& plane)
         photometric_ = model.c_str();
     if (transfer.isEncapsulated() && transfer.getXfer() != EXS_RLELossless)
         isPlanar_ = false;
+    if (plane.format.bitsAllocated == 32 && transfer.getByteOrder() == EBO_BigEndian)
+        swapHalves(pixels_.data(), size);
     hasFrame_ = true;
     frame_ = plane.frame;
     return KpResult();
