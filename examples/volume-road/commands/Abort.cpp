@@ -21,6 +21,7 @@ constexpr int exitBadInput = 2;
 constexpr auto patience = std::chrono::milliseconds(100);  // for work that polls the progress
 
 std::atomic<int> received = 0;
+bool isPublished = false;  // guarded by the mutex of publishing
 
 // Never destroyed: the watching thread outlives main().
 std::mutex& mutexOfPaths()
@@ -50,10 +51,14 @@ void removeUnfinished()
     }
 }
 
-[[noreturn]] void endProgram(int code)
+/// Prints the message and ends the program, unless its results are published: then it ends by itself, with success.
+void endProgram(int code, const std::string& message)
 {
     const std::scoped_lock lock(mutexOfPublishing(), mutexOfPaths());
+    if (isPublished)
+        return;
     removeUnfinished();
+    std::fprintf(stderr, "volume-road: %s\n", message.c_str());
     std::fflush(nullptr);
     _exit(code);
 }
@@ -64,8 +69,7 @@ void waitForSignal(sigset_t signals)
     sigwait(&signals, &signal);
     received = signal;
     std::this_thread::sleep_for(patience);
-    std::fprintf(stderr, "%svolume-road: cancelled, nothing was written\n", isatty(STDERR_FILENO) ? "\n" : "");
-    endProgram(128 + signal);
+    endProgram(128 + signal, "cancelled, nothing was written");
 }
 
 }  // namespace
@@ -92,6 +96,7 @@ Publishing::Publishing()
 
 Publishing::~Publishing()
 {
+    isPublished = true;
     mutexOfPublishing().unlock();
 }
 
@@ -133,8 +138,8 @@ Silence::Silence(int seconds, const std::string& message) : watch_(seconds > 0 ?
         while (!watch_->ends) {
             const auto end = watch_->last + std::chrono::seconds(seconds);
             if (steady_clock::now() >= end) {
-                std::fprintf(stderr, "volume-road: %s\n", message.c_str());
-                endProgram(exitBadInput);
+                endProgram(exitBadInput, message);
+                return;
             }
             watch_->changed.wait_until(lock, end);
         }

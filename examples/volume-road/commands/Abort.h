@@ -20,7 +20,8 @@ private:
     std::string path_;
 };
 
-/// While one exists, SIGINT and SIGTERM wait: what is being published is published as a whole.
+/// While one exists, SIGINT and SIGTERM wait: what is being published is published as a whole. Later ones are ignored:
+/// the program is about to end.
 class Publishing {
 public:
     Publishing();

@@ -10,9 +10,11 @@ KpResult exportSeries(const Job& job, KpProgressInterface& progress)
     Volume volume;
     HxParamBundle root("Volume");
     const ProgressScope scope(&progress);
-    progress.startWorking(3, "export");
+    progress.startWorking(2, "export");
     Road road(progress);
     loadSeries(job, road, progress, series, volume, root);
-    road.plain("write", [&] { return writeRemote(job.target, job.describe, series, volume, root); });
-    return road.result();
+    KpResult result = road.result();
+    if (result.isOk())
+        result << writeRemote(job.target, job.describe, series, volume, root);
+    return result;
 }

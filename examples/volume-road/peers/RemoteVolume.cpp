@@ -129,6 +129,7 @@ KpResult writeFile(const std::string& file, Write write)
         isWritten = false;
     }
     errno = cause;
+    const Publishing publishing;
     if (isWritten && (!isReplaced || std::rename(path.c_str(), file.c_str()) == 0))
         return KpResult();
     KpResult failure = cannotWrite(file);
