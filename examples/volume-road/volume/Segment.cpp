@@ -14,8 +14,9 @@
 namespace {
 
 /// Calls `visit(value, isPadding)` with the displayed value of each voxel in order, a slice in memory at a time.
+/// One step of the progress a slice.
 template <typename Visit>
-void forEachValue(Volume& volume, Visit visit)
+void forEachValue(Volume& volume, KpProgressInterface& progress, Visit visit)
 {
     KpDArray<double> values;
     values.resize(volume.sliceCount());
@@ -23,6 +24,7 @@ void forEachValue(Volume& volume, Visit visit)
         KpRawData::memcpy({values.data(), KpPrimType::Double}, volume.slice(z), values.size());
         for (const double stored : values)
             visit(stored * volume.slope + volume.intercept, volume.padding.contains(stored) || std::isnan(stored));
+        progress.nextStep();
     }
 }
 
@@ -55,24 +57,24 @@ int brighterClass(const Histogram& counts)
 }
 
 /// Otsu's threshold on a scale of 256 levels.
-double otsu(Volume& volume)
+double otsu(Volume& volume, KpProgressInterface& progress)
 {
     const auto [low, high] = displayedRange(volume);
     const double step = std::max(high - low, 1e-6) / levels;
     Histogram counts{};
-    forEachValue(volume, [&, low = low](double value, bool isPadding) {
+    forEachValue(volume, progress, [&, low = low](double value, bool isPadding) {
         if (!isPadding)
             ++counts[static_cast<size_t>(std::clamp(static_cast<int>((value - low) / step), 0, levels - 1))];
     });
     return low + brighterClass(counts) * step;
 }
 
-KpBitfield maskAbove(Volume& volume, double threshold)
+KpBitfield maskAbove(Volume& volume, double threshold, KpProgressInterface& progress)
 {
     KpBitfield mask;
     mask.resize(static_cast<unsigned long>(volume.count()), KpBitfield::INIT_UNSET);
     unsigned long i = 0;
-    forEachValue(volume, [&](double value, bool isPadding) {
+    forEachValue(volume, progress, [&](double value, bool isPadding) {
         if (!isPadding && value >= threshold)
             mask.set(i);
         ++i;
@@ -186,12 +188,10 @@ KpResult segment(Volume& volume, const Space& space, std::optional<double> thres
         return segment(grey, space, threshold, progress, region);
     }
     const ProgressScope scope(&progress);
-    progress.startWorking(5, "");
+    progress.startWorking(static_cast<int>(2 * volume.dims[2] + 3), "");
     region.isThresholdGiven = threshold.has_value();
-    region.threshold = threshold ? *threshold : otsu(volume);
-    progress.nextStep();
-    KpBitfield mask = maskAbove(volume, region.threshold), eroded;
-    progress.nextStep();
+    region.threshold = threshold ? *threshold : otsu(volume, progress);
+    KpBitfield mask = maskAbove(volume, region.threshold, progress), eroded;
 
     const int dims[] = {static_cast<int>(volume.dims[0]), static_cast<int>(volume.dims[1]),
                         static_cast<int>(volume.dims[2])};
