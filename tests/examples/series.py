@@ -486,7 +486,7 @@ def multi_frame():
     scaled = enhanced([(voxels[i], positions[i], {"slope": 1 + i}) for i in range(4)])
     read = Read(scaled)
     assert read.info["type"] == "float" and np.allclose(read.voxels[3], voxels[3] * 4.0 + 1)
-    # Two frames at each place that only their dimension index tells apart.
+    # Two frames at each place that differ only in their dimension index.
     frames = [(voxels[i], positions[i % 4], {"DimensionIndexValues": [1, i % 4 + 1, i // 4 + 1]}) for i in range(8)]
     read = Read(enhanced(frames, dimensions=(0x00209056, 0x00209057, 0x00189004)), "--volume", 2)
     assert np.array_equal(read.voxels, voxels[4:8]) and read.info["label"].endswith(" 2"), read.info["label"]
@@ -551,6 +551,9 @@ def several_at_one_place():
     listed = json.loads(road("list", cases[0][0], "--json").stdout)["series"][0]["volumes"]
     assert [v["label"] for v in listed] == [f"temporal position {i}" for i in (1, 2, 3)] and listed[0]["slices"] == 4
     assert listed[0]["spacing"] == [0.75, 1.25, 2] and "temporal position 3" in road("list", cases[0][0]).stdout
+    # One image of a time point is missing where images differ only in their order.
+    os.remove(cases[5][0] + f"/{(5 * 7 + 3) % 101:03}")
+    assert "may mix them" in Read(cases[5][0]).stderr
     # The scout of a series is a volume of its own.
     path = made("scout", noise(), each=lambda ds, z: z == 0 and setattr(ds, "ImageOrientationPatient", [1, 0, 0, 0, 0, -1.0]))
     assert [v["slices"] for v in json.loads(road("list", path, "--json").stdout)["series"][0]["volumes"]] == [1, 4]
@@ -746,7 +749,8 @@ def signals():
                 if code == 0 or code == -number:  # done before, or not yet watching
                     subprocess.run(["rm", "-rf", SCRATCH + "/gone"])
                     continue
-                assert code == 128 + number and time.time() - start < 0.6, (command, number, code, time.time() - start)
+                limit = 3 if "asan" in ROAD else 0.6
+                assert code == 128 + number and time.time() - start < limit, (command, number, code, time.time() - start)
                 assert not [n for n in os.listdir(SCRATCH) if "gone" in n], (command, os.listdir(SCRATCH))
                 ended += 1
     assert ended > 10, ended

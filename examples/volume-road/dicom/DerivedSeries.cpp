@@ -105,11 +105,17 @@ void putRequired(DcmItem& data, const std::string& sopClass)
           DcmTag(DCM_StudyID), DcmTag(DCM_Manufacturer), DcmTag(DCM_PositionReferenceIndicator),
           DcmTag(DCM_PatientPosition)})
         require(tag, "");
-    if (!data.tagExists(DCM_BodyPartExamined))  // which would name the side, or that there is none
+    // An unpaired body part has no side; without a body part an unknown side is written.
+    if (!data.tagExists(DCM_BodyPartExamined))
         require(DCM_Laterality, "");
+    else if (!data.tagExistsWithValue(DCM_Laterality))
+        data.findAndDeleteElement(DCM_Laterality);
     require(DCM_AcquisitionNumber, "");
     if (sopClass == UID_SecondaryCaptureImageStorage) {
         put(data, DCM_ConversionType, "WSD");
+        require(DCM_PatientOrientation, "");
+        if (data.tagExists(DCM_RescaleSlope))
+            require(DCM_RescaleType, "US");
         return;
     }
     if (sopClass == UID_CTImageStorage) {

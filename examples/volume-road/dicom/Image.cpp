@@ -15,6 +15,8 @@ void readPlace(const FrameValues& values, Image& image)
         !values.reals(DCM_ImageOrientationPatient, axes.data(), 6))
         return;
     const KpVec3d row(axes[0], axes[1], axes[2]), column(axes[3], axes[4], axes[5]);
+    if (row.length() == 0 && column.length() == 0)
+        return;  // what some devices write for an orientation that they do not know
     if (!isPlace(position, row, column)) {
         image.problem = "its position or orientation is not one of a plane";
         return;
@@ -261,11 +263,12 @@ std::vector<Image> describe(const std::string& path, DcmFileFormat& file)
     DcmDataset& data = *file.getDataset();
     const int frames = FrameValues(data, 0).integer(DCM_NumberOfFrames, 1);
     std::vector<Image> images;
-    constexpr int mostFrames = 1 << 20;
-    for (int frame = 0; frame < std::clamp(frames, 1, mostFrames); ++frame) {
+    constexpr int mostFrames = 1 << 16;  // more are a damaged header, not an object
+    for (int frame = 0; frame < std::clamp(frames, 1, frames > mostFrames ? 1 : mostFrames); ++frame) {
         images.push_back(describeFrame(path, data, static_cast<unsigned long>(frame)));
         images.back().isMultiFrame = frames > 1;
     }
-    // Frames that all share the place of the data set are a sequence in time, or their places are not written down.
+    if (frames > mostFrames)
+        images.front().problem = "it announces " + std::to_string(frames) + " frames";
     return images.size() == 1 ? unfolded(images.front(), data) : images;
 }

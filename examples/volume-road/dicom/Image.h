@@ -8,7 +8,7 @@
 
 class DcmFileFormat;
 
-/// What tells apart images of a series that lie at one place, in the order in which a series is split by them.
+/// What distinguishes images of a series that lie at one place, in the order in which a series is split by it.
 enum class Trait : size_t {
     TemporalPosition,
     EchoNumber,

@@ -201,10 +201,13 @@ KpResult inspect(Part part, Series& series)
         return measured;
     const std::vector<std::string>& found = series.geometry.warnings;
     series.warnings.insert(series.warnings.end(), found.begin(), found.end());
+    if (part.isUncertain)
+        series.warnings.emplace_back("the places of the series have different numbers of images, distinguished only by "
+                                     "their order: this volume may mix them");
     takeWindows(planes, series);
     warnOfTables(planes, series);
     if (!isSameScale(planes) && planes.front().padding.isPresent())
-        series.warnings.emplace_back("the slices have scales of their own: padding is not told apart from values");
+        series.warnings.emplace_back("the slices have scales of their own: padding is not distinguished from values");
     series.planes = std::move(part.planes);
     return KpResult();
 }

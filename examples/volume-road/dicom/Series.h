@@ -9,7 +9,7 @@
 /// One volume of a series: its planes in order, and what was found about it.
 struct Series {
     std::vector<Image> planes;
-    std::string label;               ///< what tells it apart from other volumes of its series; empty if there are none
+    std::string label;  ///< what distinguishes it from other volumes of its series; empty if there are none
     size_t volume = 1, volumes = 1;  ///< number of this one, and of all in the series
     std::vector<std::string> warnings;
     int skippedFiles = 0;  ///< files that are not DICOM

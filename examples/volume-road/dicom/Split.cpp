@@ -58,7 +58,7 @@ std::vector<Part> groupsOf(std::vector<Image>& planes)
         const auto group = std::find_if(groups.begin(), groups.end(),
                                         [&](const Part& part) { return fit(part.planes.front(), plane); });
         if (group == groups.end())
-            groups.push_back({{std::move(plane)}, {}});
+            groups.push_back({{std::move(plane)}, {}, false});
         else
             group->planes.push_back(std::move(plane));
     }
@@ -141,8 +141,8 @@ std::vector<Part> byValue(Part& part, Trait trait, const std::set<std::string, d
     for (const std::string& value : values) {
         indices[value] = parts.size();
         const std::string shown = value.empty() ? std::string("none") : value;
-        parts.push_back(
-            {{}, joined(part.label, trait == Trait::Dimensions ? shown : std::string(nameOf(trait)) + " " + shown)});
+        const std::string what = trait == Trait::Dimensions ? shown : std::string(nameOf(trait)) + " " + shown;
+        parts.push_back({{}, joined(part.label, what), false});
     }
     for (Image& plane : part.planes)
         parts[indices[plane.trait(trait)]].planes.push_back(std::move(plane));
@@ -158,12 +158,14 @@ std::vector<Part> byRank(Part& part, const Places& places, const std::string& wh
             parts[static_cast<size_t>(i - places.begin(p))].planes.push_back(
                 std::move(part.planes[static_cast<size_t>(i)]));
     }
-    for (size_t i = 0; i < parts.size(); ++i)
+    for (size_t i = 0; i < parts.size(); ++i) {
+        parts[i].isUncertain = part.planes.size() != places.count() * places.most();
         parts[i].label = joined(part.label, what + " " + std::to_string(i + 1) + " of " + std::to_string(parts.size()));
+    }
     return parts;
 }
 
-/// Splits by a trait that differs at a place; empty if it does not, or does not tell the planes apart.
+/// Splits by a trait that differs at a place; empty if it does not, or does not distinguish the planes.
 std::vector<Part> splitBy(Part& part, Trait trait, const Places& places)
 {
     std::set<std::string, decltype(&isLess)> values(&isLess);

@@ -5,8 +5,8 @@
 /// Writes a series as one raw file: a head (header tree, geometry, windows, warnings) and then the voxels, slice after
 /// slice. A regular file appears at once or not at all; a device, a pipe or a link that is there is written through,
 /// and
-/// "-" is standard output. If `describe` is not empty, a JSON file of that name tells where in the file which slice is
-/// and where it lies in the patient.
+/// "-" is standard output. If `describe` is not empty, a JSON file of that name lists where
+/// each slice is in the file and in the patient.
 KpResult writeRemote(const std::string& file, const std::string& describe, const Series& series, Volume& volume,
                      const HxParamBundle& root);
 
