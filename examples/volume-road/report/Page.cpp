@@ -225,6 +225,7 @@ Json metaOf(const Volume& volume, const Grid& grid, const Series& series, const 
     return {{"title", title.empty() ? "Volume" : title},
             {"dims", grid.dims},
             {"spacing", {grid.spacing[0], grid.spacing[1], grid.spacing[2]}},
+            {"placed", volume.isPlaced},
             {"components", volume.components},
             {"slope", volume.slope},
             {"intercept", volume.intercept},
