@@ -215,6 +215,38 @@ def tilted_gantry():
         shutil.rmtree(os.path.join(SCRATCH, "half"))
 
 
+def pictures_in_every_orientation():
+    """A block towards the patient's left, back and head is there in the pictures and in the page."""
+    import base64, re, zlib
+    from PIL import Image
+    axes = [np.array(a, float) for a in ((1, 0, 0), (-1, 0, 0), (0, 1, 0), (0, -1, 0), (0, 0, 1), (0, 0, -1))]
+    turns = [(row, column) for row in axes for column in axes if row @ column == 0]
+    for number, (row, column) in enumerate(turns):
+        normal = np.cross(row, column)
+        step = normal * 2 + (row * 0.4 + column * 0.2 if number % 2 else 0)
+        z, y, x = np.mgrid[0:44, 0:80, 0:72]
+        place = x[..., None] * row + y[..., None] * column + z[..., None] * step
+        middle = 36 * row + 40 * column + 22 * step
+        inside = np.all((place - middle > -7) & (place - middle < 25), axis=-1)
+        path = made("block", np.where(inside, 900, 50).astype(np.int16), row, column, step, (0, 0, 0), (1, 1),
+                    WindowCenter=500, WindowWidth=800)
+        _, _, out = report(path)
+        for name, right, down in (("axial", 1, 1), ("coronal", 1, -1), ("sagittal", 1, -1)):
+            picture = np.asarray(Image.open(f"{out}/{name}.png")).astype(int)[14:-14, 14:-14]
+            bright = np.argwhere(picture.sum(-1) > 400).mean(0) - (np.array(picture.shape[:2]) - 1) / 2
+            assert bright[1] * right > 3 and bright[0] * down > 3, (name, row, column, bright)
+        page = open(out + "/index.html").read()
+        meta = json.loads(re.search(r'id="meta">(.*?)</script>', page, re.S).group(1))
+        voxels, mask = (np.frombuffer(zlib.decompress(base64.b64decode(re.search(rf'id="{what}">(.*?)</script>', page, re.S).group(1))), kind)
+                        .reshape(meta["dims"][::-1]) for what, kind in (("voxels", "<u2"), ("mask", "u1")))
+        values = voxels * meta["slope"] + meta["intercept"]
+        assert values.max() == 900, values.max()
+        for found in (values > 475, mask > 0):
+            off = (np.argwhere(found).mean(0)[::-1] - (np.array(meta["dims"]) - 1) / 2) * meta["spacing"]
+            assert np.abs(off - 9).max() < 2.5, (row, column, off)
+        assert [meta["letters"][v]["right"][0] + meta["letters"][v]["top"][0] for v in ("axial", "coronal", "sagittal")] == ["LA", "LH", "PH"]
+
+
 def positions():
     """Decubitus and feet first: the place is that of the header, whatever the patient's position says."""
     for position in ("HFS", "FFS", "HFDL", "FFDR", "HFP"):
@@ -795,6 +827,23 @@ def mosaics():
                 assert np.abs(read.place(0, 0, z) - (first + np.array([0, 0, 12 * z]))).max() < 1e-3
 
 
+def mosaic_downward():
+    """The private header of the scanner says that the tiles run against the cross product of rows and columns."""
+    path = folder("downward")
+    ds = files(DATA + "/mosaic/mr_0003")[0]
+    table = bytes(ds[0x0029, 0x1010].value)
+    at = table.index(b"SliceNormalVector")
+    at = table.index(b"1.00000000", at)
+    ds[0x0029, 0x1010].value = table[:at] + b"-1.0000000" + table[at + 10:]
+    ds.save_as(path + "/mosaic")
+    read = Read(path)
+    assert [round(s["position"][2], 3) for s in read.slices] == [-32, -20, -8, 4, 16], read.slices
+    assert np.array_equal(read.voxels[4], ds.pixel_array[:72, :72]) and [s["tile"] for s in read.slices] == [4, 3, 2, 1, 0]
+    ds[0x0029, 0x1010].value = b"SV10"
+    ds.save_as(path + "/mosaic")
+    refused("private header does not say", "export", path, SCRATCH + "/no")
+
+
 def functional_group(ds, frame, sequence, name):
     for group in (ds.PerFrameFunctionalGroupsSequence[frame], ds.SharedFunctionalGroupsSequence[0]):
         if sequence in group and name in group[sequence][0]:
@@ -833,12 +882,12 @@ def real_series():
         assert len(seen) == sum(int(ds.NumberOfFrames) for ds in objects.values()), name
 
 
-tests = [orientations, tilted_gantry, positions, uneven_gaps, spacing_that_is_unknown, window_functions, scales, big_endian_dose, unknown_vr, syntaxes,
+tests = [orientations, tilted_gantry, pictures_in_every_orientation, positions, uneven_gaps, spacing_that_is_unknown, window_functions, scales, big_endian_dose, unknown_vr, syntaxes,
          colours, padding, multi_frame, compressed_frames, secondary_capture, several_at_one_place, damaged_files,
          same_warnings, header_values, nifti, publishing, exporting, serving, signals,
          one_line_refusals, valid_objects]
 if os.path.isdir(DATA):
-    tests += [mosaics, real_series]
+    tests += [mosaics, mosaic_downward, real_series]
 else:
     print(f"skipped: real series, there is no {DATA}")
 failed = 0

@@ -4,11 +4,6 @@
 #include "Picture.h"
 
 #include <kplib/geometry/KpBox2f.h>
-#include <kplib/geometry/KpBox3f.h>
-
-/// What the voxels cover in the system of the voxels, half a voxel around their middles: also a single slice has a
-/// thickness.
-KpBox3f coveredBox(const Volume& volume);
 
 /// Cuts a volume of bytes by the plane z = 0 of `plane`, a system of unit axes in the patient's space. The picture
 /// shows `extent` of the plane in pixels of `pixel` mm, with the voxels of `outline` (a mask of the volume's size)

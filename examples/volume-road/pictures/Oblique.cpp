@@ -1,5 +1,7 @@
 #include "Oblique.h"
 
+#include "../volume/Sampler.h"
+
 #include <kplib/geometry/KpCutBoxPlane.h>
 #include <kplib/geometry/KpMat4f.h>
 #include <kplib/geometry/KpPlane.h>

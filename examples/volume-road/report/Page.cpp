@@ -2,6 +2,7 @@
 
 #include "../pictures/Pictures.h"
 #include "../volume/Reduce.h"
+#include "../volume/Sampler.h"
 #include "Template.h"
 
 #include <kplib/geometry/KpMat4f.h>
@@ -93,59 +94,28 @@ void forEachPlace(const Grid& grid, const Space& space, Visit visit)
     }
 }
 
-/// Values between the voxels of a volume of words or colours.
+/// The values of a volume on the grid; zero outside.
 template <typename Element>
-void resample(Volume& volume, const Grid& grid, const Space& space, KpDArray<unsigned char>& bytes)
+void resample(const Volume& volume, const Grid& grid, const Space& space, KpDArray<unsigned char>& bytes)
 {
-    const long components = volume.components;
-    bytes.resize(grid.count() * components * static_cast<long>(sizeof(Element)));
+    bytes.resize(grid.count() * volume.components * static_cast<long>(sizeof(Element)));
     std::fill(bytes.begin(), bytes.end(), static_cast<unsigned char>(0));
     auto* const to = reinterpret_cast<Element*>(bytes.data());
-    const auto* const from = reinterpret_cast<const Element*>(volume.bytes.data());
-    const KpBox3f covered = coveredBox(volume);
-    const auto [nx, ny, nz] = volume.dims;
-    forEachPlace(grid, space, [&, nx = nx, ny = ny, nz = nz](long i, const KpVec3f& place) {
-        if (!covered.contains(place))
-            return;
-        const auto level = static_cast<float>(volume.sliceAt(static_cast<double>(place.z()) * volume.spacing[2]));
-        const float at[] = {place.x(), place.y(), level};
-        const long size[] = {nx, ny, nz};
-        long low[3], high[3];
-        float share[3];
-        for (int axis = 0; axis < 3; ++axis) {
-            const float inside = std::clamp(at[axis], 0.0F, static_cast<float>(size[axis] - 1));
-            low[axis] = static_cast<long>(inside);
-            high[axis] = std::min(low[axis] + 1, size[axis] - 1);
-            share[axis] = inside - static_cast<float>(low[axis]);
-        }
-        for (long c = 0; c < components; ++c) {
-            float sum = 0;
-            for (int corner = 0; corner < 8; ++corner) {
-                float weight = 1;
-                long voxel[3];
-                for (int axis = 0; axis < 3; ++axis) {
-                    const bool isHigh = (corner >> axis & 1) != 0;
-                    weight *= isHigh ? share[axis] : 1 - share[axis];
-                    voxel[axis] = isHigh ? high[axis] : low[axis];
-                }
-                sum += weight * static_cast<float>(from[((voxel[2] * ny + voxel[1]) * nx + voxel[0]) * components + c]);
-            }
-            to[i * components + c] = static_cast<Element>(std::lround(sum));
-        }
+    const Sampler<Element> sampler(volume);
+    forEachPlace(grid, space, [&](long i, const KpVec3f& place) {
+        if (sampler.contains(place))
+            sampler.sample(place, to + i * volume.components);
     });
 }
 
+/// A mask of the volume's size on the grid.
 KpDArray<unsigned char> maskOn(const Grid& grid, const Volume& volume, const Space& space, const KpBitfield& mask)
 {
     KpDArray<unsigned char> bytes;
     bytes.resize(grid.count());
+    const Sampler<unsigned char> sampler(volume);
     forEachPlace(grid, space, [&](long i, const KpVec3f& place) {
-        const double level = volume.sliceAt(static_cast<double>(place.z()) * volume.spacing[2]);
-        const long x = std::lround(place.x()), y = std::lround(place.y()), z = std::lround(level);
-        const bool isInside =
-            x >= 0 && x < volume.dims[0] && y >= 0 && y < volume.dims[1] && z >= 0 && z < volume.dims[2];
-        bytes[i] = isInside && mask.nBits() > 0 &&
-                   mask.test(static_cast<unsigned long>((z * volume.dims[1] + y) * volume.dims[0] + x));
+        bytes[i] = mask.nBits() > 0 && sampler.contains(place) && mask.test(sampler.nearest(place));
     });
     return bytes;
 }
