@@ -583,6 +583,15 @@ def several_at_one_place():
     listed = json.loads(road("list", cases[0][0], "--json").stdout)["series"][0]["volumes"]
     assert [v["label"] for v in listed] == [f"temporal position {i}" for i in (1, 2, 3)] and listed[0]["slices"] == 4
     assert listed[0]["spacing"] == [0.75, 1.25, 2] and "temporal position 3" in road("list", cases[0][0]).stdout
+    # A patient who moved a little between two acquisitions: not one volume with twice as many slices.
+    def moved(ds, z):
+        ds.ImagePositionPatient, ds.AcquisitionNumber = [0, 0, 2.0 * (z % 6) + 0.3 * (z // 6)], z // 6 + 1
+    path = made("moved", voxels, each=moved)
+    for number in (1, 2):
+        assert np.array_equal(same_series(path, "--volume", number).voxels, voxels[6 * number - 6:6 * number])
+    # Directions whose numbers differ a little from slice to slice have no order.
+    turned = of(DiffusionGradientOrientation=lambda z: [[1.0, z / 1e4, 0], [1.0, -z / 1e4, 0], [0, 0, 1.0]][z // 4])
+    assert Read(turned).info["label"] == "number 1 of 3"
     # One image of a time point is missing where images differ only in their order.
     os.remove(cases[5][0] + f"/{(5 * 7 + 3) % 101:03}")
     assert "may mix them" in Read(cases[5][0]).stderr

@@ -182,12 +182,65 @@ std::vector<Part> splitBy(Part& part, Trait trait, const Places& places)
         return {};
     if (values.size() <= places.most())
         return byValue(part, trait, values);
-    if (!isDistinct)
+    // Only a single number has an order that means the same at all places.
+    const bool isNumber = trait != Trait::Gradient && trait != Trait::ImageType && trait != Trait::ContrastPhase &&
+                          trait != Trait::Dimensions;
+    if (!isDistinct || !isNumber)
         return {};
     for (size_t p = 0; p < places.count(); ++p)
         std::sort(part.planes.begin() + places.begin(p), part.planes.begin() + places.begin(p + 1),
                   [&](const Image& a, const Image& b) { return isLess(a.trait(trait), b.trait(trait)); });
     return byRank(part, places, nameOf(trait));
+}
+
+double widest(const std::vector<double>& places)
+{
+    double gap = 0;
+    for (size_t i = 1; i < places.size(); ++i)
+        gap = std::max(gap, places[i] - places[i - 1]);
+    return gap;
+}
+
+double narrowest(const std::vector<double>& places)
+{
+    double gap = places.back() - places.front();
+    for (size_t i = 1; i < places.size(); ++i)
+        gap = std::min(gap, places[i] - places[i - 1]);
+    return gap;
+}
+
+/// Whether the planes, sorted by place, are several even stacks of different values that lie within each other: the
+/// scanner has followed a patient who moved between them.
+bool areInterleaved(const std::vector<Image>& planes, Trait trait)
+{
+    std::map<std::string, std::vector<double>> stacks;
+    std::vector<double> all;
+    for (const Image& plane : planes) {
+        stacks[plane.trait(trait)].push_back(plane.place());
+        all.push_back(plane.place());
+    }
+    if (stacks.size() < 2 || widest(all) < 1.5 * narrowest(all))
+        return false;
+    return std::all_of(stacks.begin(), stacks.end(), [&](const auto& stack) {
+        const std::vector<double>& places = stack.second;
+        const double extent = places.back() - places.front();
+        return places.size() > 1 && extent > 0.5 * (all.back() - all.front()) &&
+               widest(places) < 1.2 * narrowest(places);
+    });
+}
+
+std::vector<Part> splitInterleaved(Part& part)
+{
+    for (size_t t = 0; t < static_cast<size_t>(Trait::Count); ++t) {
+        const auto trait = static_cast<Trait>(t);
+        if (!areInterleaved(part.planes, trait))
+            continue;
+        std::set<std::string, decltype(&isLess)> values(&isLess);
+        for (const Image& plane : part.planes)
+            values.insert(plane.trait(trait));
+        return byValue(part, trait, values);
+    }
+    return {};
 }
 
 void splitPart(Part part, std::vector<Part>& volumes)
@@ -198,11 +251,15 @@ void splitPart(Part part, std::vector<Part>& volumes)
         return;
     }
     const Places places(part.planes);
+    std::vector<Part> parts;
     if (places.most() == 1) {
-        volumes.push_back(std::move(part));
+        parts = splitInterleaved(part);
+        if (parts.empty())
+            volumes.push_back(std::move(part));
+        for (Part& stack : parts)
+            volumes.push_back(std::move(stack));
         return;
     }
-    std::vector<Part> parts;
     for (size_t t = 0; t < static_cast<size_t>(Trait::Count) && parts.empty(); ++t)
         parts = splitBy(part, static_cast<Trait>(t), places);
     if (parts.empty())

@@ -95,14 +95,55 @@ void forEachSetBit(const KpBitfield& mask, Visit visit)
     }
 }
 
-/// Labels the mask's regions and keeps the largest of them; false if there are too many to number.
-bool keepLargest(KpBitfield& mask, const int* dims, Region& region)
+/// The slices, rows and columns around the set voxels of a mask.
+struct Crop {
+    std::array<long, 3> low{}, dims{};
+
+    Crop(const KpBitfield& mask, const std::array<long, 3>& size)
+    {
+        std::array<long, 3> high{-1, -1, -1};
+        low = size;
+        forEachSetBit(mask, [&](unsigned long bit) {
+            const auto i = static_cast<long>(bit);
+            const std::array<long, 3> at{i % size[0], i / size[0] % size[1], i / size[0] / size[1]};
+            for (size_t axis = 0; axis < 3; ++axis) {
+                low[axis] = std::min(low[axis], at[axis]);
+                high[axis] = std::max(high[axis], at[axis]);
+            }
+        });
+        for (size_t axis = 0; axis < 3; ++axis)
+            dims[axis] = std::max(high[axis] - low[axis] + 1, 0L);
+    }
+
+    long count() const { return dims[0] * dims[1] * dims[2]; }
+
+    /// Calls `visit(i, bit)` for each voxel within, with its number there and in the mask.
+    template <typename Visit>
+    void forEach(const std::array<long, 3>& size, Visit visit) const
+    {
+        long i = 0;
+        for (long z = 0; z < dims[2]; ++z) {
+            for (long y = 0; y < dims[1]; ++y) {
+                const long row = ((z + low[2]) * size[1] + y + low[1]) * size[0] + low[0];
+                for (long x = 0; x < dims[0]; ++x, ++i)
+                    visit(i, static_cast<unsigned long>(row + x));
+            }
+        }
+    }
+};
+
+/// Labels the mask's regions and keeps the largest of them; false if there are too many to number. Two bytes a voxel of
+/// the box around the mask are the most memory that segmentation takes.
+bool keepLargest(KpBitfield& mask, const std::array<long, 3>& size, Region& region)
 {
+    const Crop crop(mask, size);
+    if (crop.count() == 0)
+        return true;
     KpDArray<unsigned short> labels;  // the labels replace the image of the mask in the same memory
-    labels.resize(static_cast<long>(mask.nBits()));
-    std::fill(labels.begin(), labels.end(), static_cast<unsigned short>(0));
-    forEachSetBit(mask, [&](unsigned long bit) { labels[static_cast<long>(bit)] = 1; });
+    labels.resize(crop.count());
+    crop.forEach(size, [&](long i, unsigned long bit) { labels[i] = mask.test(bit); });
     unsigned short* image = labels.data();
+    const int dims[] = {static_cast<int>(crop.dims[0]), static_cast<int>(crop.dims[1]), static_cast<int>(crop.dims[2])};
     KpDArray<KpConnectedComponents::Component> components;
     region.components =
         KpConnectedComponents::labelCC({image, KpPrimType::UShort}, dims, 26, image, 0, 1, 1, 0, 0, &components);
@@ -114,10 +155,10 @@ bool keepLargest(KpBitfield& mask, const int* dims, Region& region)
             largest = i;
     }
     mask.unsetAll();
-    for (long i = 0; largest > 0 && i < labels.size(); ++i) {
-        if (labels[i] == largest)
-            mask.set(static_cast<unsigned long>(i));
-    }
+    crop.forEach(size, [&](long i, unsigned long bit) {
+        if (largest > 0 && labels[i] == largest)
+            mask.set(bit);
+    });
     return true;
 }
 
@@ -193,14 +234,13 @@ KpResult segment(Volume& volume, const Space& space, std::optional<double> thres
     region.threshold = threshold ? *threshold : otsu(volume, progress);
     KpBitfield mask = maskAbove(volume, region.threshold, progress), eroded;
 
-    const int dims[] = {static_cast<int>(volume.dims[0]), static_cast<int>(volume.dims[1]),
-                        static_cast<int>(volume.dims[2])};
-    const KpVec3i size(dims[0], dims[1], dims[2]);
+    const KpVec3i size(static_cast<int>(volume.dims[0]), static_cast<int>(volume.dims[1]),
+                       static_cast<int>(volume.dims[2]));
     KpMorphology::erosion3D(mask, eroded, size, 1, true);
     KpMorphology::dilation3D(eroded, mask, size, 1, true);
     progress.nextStep();
 
-    if (!keepLargest(mask, dims, region))
+    if (!keepLargest(mask, volume.dims, region))
         return badInput("there are too many regions at or above %.6g; choose another value with --threshold",
                         region.threshold);
     progress.nextStep();

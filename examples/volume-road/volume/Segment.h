@@ -25,6 +25,6 @@ struct Region {
 /// opening), connected by faces, edges or corners. Colour volumes are segmented by their luminance. N. Otsu, "A
 /// threshold selection method from gray-level histograms", 1979.
 ///
-/// Memory: two bytes a voxel and three masks.
+/// Memory: two bytes a voxel of the box around the voxels above the threshold, and three masks.
 KpResult segment(Volume& volume, const Space& space, std::optional<double> threshold, KpProgressInterface& progress,
                  Region& region);
