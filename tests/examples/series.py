@@ -397,6 +397,22 @@ def syntaxes():
             read = Read(path)
             assert np.array_equal(read.voxels, expected.voxels), f"{kind} in {name}"
             assert read.voxels.dtype == expected.voxels.dtype
+    # Codestreams of 8 bits in images that announce 16: the samples are those of the codestream.
+    narrow_voxels = noise(2, 32, 48, np.uint8)
+    plain = made("plain", narrow_voxels)
+    for command in (["dcmcjpeg", "+e1"], ["dcmcjpls"], ["gdcmconv", "--j2k"]):
+        if not shutil.which(command[0]):
+            continue
+        path = folder("compressed")
+        for file in os.listdir(plain):
+            subprocess.run([*command, f"{plain}/{file}", f"{path}/{file}"], check=True, capture_output=True)
+            ds = pydicom.dcmread(f"{path}/{file}")
+            ds.BitsAllocated = 16
+            ds.save_as(f"{path}/{file}")
+        if command[0] == "dcmcjpls":
+            refused("cannot be decoded", "export", path, SCRATCH + "/no")
+        else:
+            assert np.array_equal(Read(path).voxels, narrow_voxels), command
     smooth = (np.add.outer(np.arange(64), np.arange(64)) * 16).astype(np.uint16)
 
     def lossy(ds, z):

@@ -2,10 +2,9 @@
 // standard, is maintained, and decodes from memory through a small interface.
 #include "Jpeg2000.h"
 
+#include "Fragments.h"
+
 #include <dcmtk/config/osconfig.h>
-#include <dcmtk/dcmdata/dccodec.h>
-#include <dcmtk/dcmdata/dcpixseq.h>
-#include <dcmtk/dcmdata/dcpxitem.h>
 #include <dcmtk/dcmdata/dctk.h>
 
 #include <openjpeg.h>
@@ -17,7 +16,7 @@
 namespace {
 
 struct Bytes {
-    std::vector<Uint8> data;
+    std::vector<unsigned char> data;
     size_t at = 0;
 };
 
@@ -47,28 +46,6 @@ OPJ_BOOL seekBytes(OPJ_OFF_T position, void* user)
         return OPJ_FALSE;
     bytes.at = static_cast<size_t>(position);
     return OPJ_TRUE;
-}
-
-/// The fragments of one frame, joined.
-bool codestreamOf(DcmPixelSequence& sequence, const Image& plane, Sint32 frames, Bytes& bytes)
-{
-    Uint32 first = 1, end = static_cast<Uint32>(sequence.card());
-    if (frames > 1) {
-        const auto frame = static_cast<Uint32>(plane.frame);
-        if (DcmCodec::determineStartFragment(frame, frames, &sequence, first).bad())
-            return false;
-        if (static_cast<Sint32>(frame) + 1 < frames &&
-            DcmCodec::determineStartFragment(frame + 1, frames, &sequence, end).bad())
-            return false;
-    }
-    for (Uint32 i = first; i < end; ++i) {
-        DcmPixelItem* item = nullptr;
-        Uint8* fragment = nullptr;
-        if (sequence.getItem(item, i).bad() || item->getUint8Array(fragment).bad() || !fragment)
-            return false;
-        bytes.data.insert(bytes.data.end(), fragment, fragment + item->getLength());
-    }
-    return !bytes.data.empty();
 }
 
 using Image2000 = std::unique_ptr<opj_image_t, decltype(&opj_image_destroy)>;
@@ -125,16 +102,10 @@ bool isJpeg2000(const std::string& syntax)
     return syntax == UID_JPEG2000LosslessOnlyTransferSyntax || syntax == UID_JPEG2000TransferSyntax;
 }
 
-KpResult decodeJpeg2000(DcmPixelData& pixelData, const Image& plane, const std::string& syntax, unsigned char* pixels)
+KpResult decodeJpeg2000(DcmPixelData& pixelData, const Image& plane, unsigned char* pixels)
 {
-    DcmPixelSequence* sequence = nullptr;
-    const E_TransferSyntax transfer = DcmXfer(syntax.c_str()).getXfer();
-    Sint32 frames = 1;
-    if (DcmItem* const parent = pixelData.getParentItem())
-        parent->findAndGetSint32(DCM_NumberOfFrames, frames);
-    Bytes bytes;
-    if (pixelData.getEncapsulatedRepresentation(transfer, nullptr, sequence).bad() || !sequence ||
-        !codestreamOf(*sequence, plane, frames, bytes))
+    Bytes bytes{codestreamOf(pixelData, plane)};
+    if (bytes.data.empty())
         return badInput("%s has compressed pixels whose frames cannot be found", plane.name().c_str());
     const Image2000 image = decode(bytes);
     if (!image || !isExpected(*image, plane))

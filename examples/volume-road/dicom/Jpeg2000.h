@@ -8,4 +8,4 @@ class DcmPixelData;
 bool isJpeg2000(const std::string& syntax);
 
 /// Decodes one frame into words of its allocated bits, colours interleaved as red, green and blue.
-KpResult decodeJpeg2000(DcmPixelData& pixelData, const Image& plane, const std::string& syntax, unsigned char* pixels);
+KpResult decodeJpeg2000(DcmPixelData& pixelData, const Image& plane, unsigned char* pixels);

@@ -2,6 +2,7 @@
 
 #include "Colour.h"
 #include "DicomTree.h"
+#include "Fragments.h"
 #include "Jpeg2000.h"
 
 #include <dcmtk/config/osconfig.h>
@@ -97,6 +98,14 @@ void swapHalves(unsigned char* pixels, long size)
         std::swap(words[i], words[i + 1]);
 }
 
+/// A codestream of 8 bits is decoded into bytes, also where the header announces words.
+void widen(unsigned char* pixels, long samples)
+{
+    auto* const words = reinterpret_cast<Uint16*>(pixels);
+    for (long i = samples - 1; i >= 0; --i)
+        words[i] = pixels[i];
+}
+
 long bytesOfFrame(const Image& plane)
 {
     const long across = plane.tilesAcross;
@@ -129,42 +138,53 @@ KpResult PixelReader::decode(const Image& plane)
     hasFrame_ = false;
     DcmDataset& data = *file_->getDataset();
     DcmElement* element = nullptr;
-    if (data.findAndGetElement(DCM_PixelData, element).bad())
+    data.findAndGetElement(DCM_PixelData, element);
+    auto* const pixelData = dynamic_cast<DcmPixelData*>(element);
+    if (!pixelData)
         return badInput("%s has no pixel data", plane.name().c_str());
-    auto& pixelData = static_cast<DcmPixelData&>(*element);
-    const long size = bytesOfFrame(plane);
-    pixels_.resize(size + 2);  // compressed frames are padded to an even size
-    const DcmXfer transfer(data.getOriginalXfer());
+    pixels_.resize(bytesOfFrame(plane) + 2);  // compressed frames are padded to an even size
     photometric_ = plane.format.photometric;
     isPlanar_ = plane.format.isPlanar != 0 && plane.format.samples == 3;
-    const std::string syntax = transfer.getXferID();
-    if (isJpeg2000(syntax)) {
-        KpResult decoded = decodeJpeg2000(pixelData, plane, syntax, pixels_.data());
+    KpResult decoded;
+    if (isJpeg2000(DcmXfer(data.getOriginalXfer()).getXferID())) {
+        decoded = decodeJpeg2000(*pixelData, plane, pixels_.data());
+        isPlanar_ = false;
         if (plane.format.samples == 3)
             photometric_ = "RGB";
-        isPlanar_ = false;
-        hasFrame_ = decoded.isOk();
-        frame_ = plane.frame;
-        return decoded;
+    } else {
+        decoded = decodeByToolkit(*pixelData, plane);
     }
+    hasFrame_ = decoded.isOk();
+    frame_ = plane.frame;
+    return decoded;
+}
+
+KpResult PixelReader::decodeByToolkit(DcmPixelData& pixelData, const Image& plane)
+{
+    DcmDataset& data = *file_->getDataset();
+    const DcmXfer transfer(data.getOriginalXfer());
     Uint32 fragment = 0;
     OFString model;
     const OFCondition status = pixelData.getUncompressedFrame(
         &data, static_cast<Uint32>(plane.frame), fragment, pixels_.data(), static_cast<Uint32>(pixels_.size()), model);
-    if (status.bad()) {
-        if (!transfer.isEncapsulated())
+    if (!transfer.isEncapsulated()) {
+        if (status.bad())
             return badInput("%s is cut off: %s", plane.name().c_str(), status.text());
+        if (plane.format.bitsAllocated == 32 && transfer.getByteOrder() == EBO_BigEndian)
+            swapHalves(pixels_.data(), pixels_.size() - 2);
+        return KpResult();
+    }
+    if (status.bad())
         return badInput("%s has pixels in %s that cannot be decoded: %s", plane.name().c_str(),
                         plane.transferSyntax.c_str(), status.text());
-    }
-    if (transfer.isEncapsulated() && !model.empty())
+    if (!model.empty())
         photometric_ = model.c_str();
-    if (transfer.isEncapsulated() && transfer.getXfer() != EXS_RLELossless)
-        isPlanar_ = false;
-    if (plane.format.bitsAllocated == 32 && transfer.getByteOrder() == EBO_BigEndian)
-        swapHalves(pixels_.data(), size);
-    hasFrame_ = true;
-    frame_ = plane.frame;
+    if (transfer.getXfer() == EXS_RLELossless)
+        return KpResult();
+    isPlanar_ = false;
+    const int bits = jpegPrecision(codestreamOf(pixelData, plane));
+    if (bits > 0 && bits <= 8 && plane.format.bitsAllocated == 16)
+        widen(pixels_.data(), (pixels_.size() - 2) / 2);
     return KpResult();
 }
 

@@ -5,7 +5,7 @@
 #include <memory>
 
 class DcmFileFormat;
-class DcmItem;
+class DcmPixelData;
 
 /// Reads planes of pixels, uncompressed or compressed, a frame in memory at a time.
 ///
@@ -25,6 +25,7 @@ public:
 
 private:
     KpResult decode(const Image& plane);
+    KpResult decodeByToolkit(DcmPixelData& pixelData, const Image& plane);
 
     std::string path_;
     std::unique_ptr<DcmFileFormat> file_;
