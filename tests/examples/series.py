@@ -467,7 +467,11 @@ def padding():
     voxels = np.full((4, 30, 30), 100, np.int16)
     voxels[:, 10:20, 10:20] = 200
     voxels[:, :, :5] = -2000
-    found, _, _ = report(made("padding", voxels, PixelPaddingValue=-2000))
+    found, _, _ = report(made("padding", voxels, PixelPaddingValue=-2000), "--derived", SCRATCH + "/half")
+    half = Read(SCRATCH + "/half").voxels
+    assert set(np.unique(half)) == {-2000, 100, 200} and (half[:, :, :3] == -2000).all()  # no mean of padding and values
+    assert files(SCRATCH + "/half")[0].PixelPaddingValue == -2000
+    shutil.rmtree(SCRATCH + "/half")
     assert found["values"] == [100, 200] and 100 < found["threshold"] < 200, (found["values"], found["threshold"])
 
 

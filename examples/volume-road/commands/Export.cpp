@@ -1,4 +1,4 @@
-#include "../peers/RemoteVolume.h"
+#include "../peers/ExportVolume.h"
 #include "Commands.h"
 #include "Load.h"
 
@@ -15,6 +15,6 @@ KpResult exportSeries(const Job& job, KpProgressInterface& progress)
     loadSeries(job, road, progress, series, volume, root);
     KpResult result = road.result();
     if (result.isOk())
-        result << writeRemote(job.target, job.describe, series, volume, root);
+        result << writeExport(job.target, job.describe, series, volume, root);
     return result;
 }

@@ -77,6 +77,7 @@ Volume inWords(Volume& volume)
     KpRawData::mapLinear(words.voxels(), volume.voxels(), count, step / 2 - static_cast<double>(low), 1 / step);
     words.intercept = volume.intercept + static_cast<double>(low) * volume.slope;
     words.slope = volume.slope * step;
+    words.padding = {};  // no longer a value of its own
     return words;
 }
 

@@ -70,6 +70,10 @@ void putPixels(DcmItem& data, Volume& volume, long z)
     data.putAndInsertUint16(DCM_BitsStored, bits);
     data.putAndInsertUint16(DCM_HighBit, static_cast<Uint16>(bits - 1));
     data.putAndInsertUint16(DCM_PixelRepresentation, volume.type == KpPrimType::Short ? 1 : 0);
+    if (volume.padding.isPresent() && volume.type == KpPrimType::Short)
+        data.putAndInsertSint16(DcmTag(DCM_PixelPaddingValue, EVR_SS), static_cast<Sint16>(volume.padding.low));
+    else if (volume.padding.isPresent())
+        data.putAndInsertUint16(DcmTag(DCM_PixelPaddingValue, EVR_US), static_cast<Uint16>(volume.padding.low));
     const void* const pixels = volume.slice(z).data;
     if (isColour)
         data.putAndInsertUint8Array(DCM_PixelData, static_cast<const Uint8*>(pixels),

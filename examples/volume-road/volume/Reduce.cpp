@@ -38,6 +38,25 @@ Volume shrunk(const Volume& volume, std::array<int, 3>& factors)
     return small;
 }
 
+/// A block that holds padding has no mean: it becomes padding.
+void keepPadding(Volume& volume, const std::array<int, 3>& factors, Volume& small)
+{
+    KpDArray<double> values;
+    values.resize(volume.sliceCount());
+    double padding = volume.padding.low;
+    for (long z = 0; z < small.dims[2] * factors[2]; ++z) {
+        KpRawData::memcpy({values.data(), KpPrimType::Double}, volume.slice(z), values.size());
+        const KpTypedPointer slice = small.slice(z / factors[2]);
+        for (long i = 0; i < values.size(); ++i) {
+            const long x = i % volume.dims[0] / factors[0], y = i / volume.dims[0] / factors[1];
+            if (!volume.padding.contains(values[i]) || x >= small.dims[0] || y >= small.dims[1])
+                continue;
+            void* const voxel = static_cast<unsigned char*>(slice.data) + (y * small.dims[0] + x) * small.type.size();
+            KpRawData::memcpy({voxel, small.type}, {&padding, KpPrimType::Double}, 1);
+        }
+    }
+}
+
 }  // namespace
 
 Volume reducedByMean(Volume& volume, std::array<int, 3> f, KpProgressInterface& progress)
@@ -47,6 +66,8 @@ Volume reducedByMean(Volume& volume, std::array<int, 3> f, KpProgressInterface& 
     KpRawData::downSample3DN(small.bytes.data(), volume.voxels(), static_cast<unsigned long>(x),
                              static_cast<unsigned long>(y), static_cast<unsigned long>(z), f[0], f[1], f[2],
                              volume.components, &progress);
+    if (volume.padding.isPresent())
+        keepPadding(volume, f, small);
     return small;
 }
 
