@@ -5,7 +5,7 @@
 #include <kplib/imaging/KpSOPInstanceUtility.h>
 #include <kplib/imaging/TmgImages.h>
 
-#include <sys/resource.h>
+#include <fstream>
 
 namespace {
 
@@ -144,11 +144,16 @@ void addInstances(const HxParamBundle& root, Lines& lines)
                   {numbers[0], numbers[numbers.size() - 1]});
 }
 
+/// The largest resident set. getrusage() would also count the process that has started this one.
 long peakBytes()
 {
-    rusage usage{};
-    getrusage(RUSAGE_SELF, &usage);
-    return usage.ru_maxrss * 1024;
+    std::ifstream status("/proc/self/status");
+    for (std::string word; status >> word;) {
+        long kilobytes = 0;
+        if (word == "VmHWM:" && status >> kilobytes)
+            return kilobytes * 1024;
+    }
+    return 0;
 }
 
 }  // namespace
@@ -168,7 +173,7 @@ Report makeReport(const Findings& findings)
         lines.add("warning", warning.c_str());
     for (const Stage& stage : findings.stages)
         lines.add(stage.name, KpString(0, "%.3f s", stage.seconds), stage.seconds);
-    lines.add("peak memory", memoryLine(findings.volume).substr(12).c_str());
+    lines.add("peak memory", memoryLine(findings.volume).substr(12).c_str(), peakBytes());
     return lines;
 }
 
