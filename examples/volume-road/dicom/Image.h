@@ -38,7 +38,8 @@ struct PixelFormat {
 /// One plane of pixels: a single-frame image, a frame, or a tile of a mosaic; with what its header says of it.
 struct Image {
     std::string path;
-    unsigned long frame = 0;
+    bool isMultiFrame = false;
+    unsigned long frame = 0;         ///< in the file, from 0
     int tile = -1, tilesAcross = 1;  ///< number of the tile in a mosaic, row by row
     std::string instanceUid, seriesUid, seriesDescription, modality, frameUid, transferSyntax, stack, segment;
     std::array<std::string, static_cast<size_t>(Trait::Count)> traits;
@@ -59,7 +60,6 @@ struct Image {
     const std::string& trait(Trait t) const { return traits[static_cast<size_t>(t)]; }
     /// The file, and the frame if the file has several.
     std::string name() const;
-    bool isMultiFrame = false;
 };
 
 /// The planes of a file, in its order.

@@ -113,6 +113,20 @@ bool isSound(const Volume& volume)
            isVoxelType(volume.type) && (volume.components == 1 || isColour);
 }
 
+void writeWindow(TmMsg& msg, const Window& window)
+{
+    msg << window.center << window.width << static_cast<int>(window.function) << window.isInverted;
+}
+
+bool readWindow(TmMsg& msg, Window& window)
+{
+    int function = 0;
+    msg >> window.center >> window.width >> function >> window.isInverted;
+    window.function = static_cast<Window::Function>(function);
+    window.origin = "from the peer";
+    return function >= Window::Linear && function <= Window::Sigmoid;
+}
+
 void writeRegion(TmMsg& msg, const Region& region)
 {
     msg << region.threshold << region.isThresholdGiven << region.components
@@ -210,15 +224,6 @@ std::string hexadecimal(const Kp128& hash)
     return text.c_str();
 }
 
-namespace {
-
-void writeWindow(TmMsg& msg, const Window& window)
-{
-    msg << window.center << window.width << static_cast<int>(window.function) << window.isInverted;
-}
-
-}  // namespace
-
 void writeParcel(TmMsg& msg, Parcel& parcel)
 {
     const KpHandle<TmDataAccess> voxels = accessTo(parcel.volume);
@@ -240,11 +245,7 @@ KpResult readParcel(TmMsg& msg, Parcel& parcel)
         return badInput("what the peer sends is no volume");
     msg >> parcel.frameUid;
     bool isWhole = readTree(msg, parcel.root) && readGeometry(msg, parcel.volume);
-    int function = 0;
-    msg >> parcel.window.center >> parcel.window.width >> function >> parcel.window.isInverted;
-    isWhole = isWhole && function >= Window::Linear && function <= Window::Sigmoid;
-    parcel.window.function = static_cast<Window::Function>(function);
-    parcel.window.origin = "from the peer";
+    isWhole = readWindow(msg, parcel.window) && isWhole;
     unsigned long long first = 0, second = 0;
     if (isWhole) {
         readRegion(msg, parcel.region);
