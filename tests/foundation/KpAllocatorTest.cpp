@@ -14,8 +14,7 @@ TEST(KpAllocator, asksForMemoryToBeFreedOnceBeforeItGivesUp)
     void* const block = second.allocate(10);
     EXPECT_TRUE(block);
     EXPECT_FALSE(second.allocate(10));
-    EXPECT_EQ(attempts, 4);
-    EXPECT_EQ(called, 2);
+    EXPECT_EQ(std::tuple(attempts, called), std::tuple(4, 2));
     second.deallocate(block);
     KpAllocator::setFreeUnusedUncompressedDataCB(nullptr);
     EXPECT_EQ(KpAllocator(KpAllocator::AllocatorNew).allocate(ULONG_MAX / 4), nullptr) << "without an exception";

@@ -65,7 +65,7 @@ static void changeAtRandomBesideAVector(ValueOf valueOf)
         ASSERT_EQ(array.capacity(), capacity) << "step " << step;
     }
     const KpDArray<T> copy = array;
-    EXPECT_TRUE(std::equal(copy.begin(), copy.end(), model.begin(), model.end()));
+    EXPECT_EQ(std::vector<T>(copy.begin(), copy.end()), model);
     EXPECT_EQ(copy.capacity(), copy.size());
 }
 
