@@ -5,11 +5,11 @@
 #include <kplib/log/detail/KpLogFilePrivate.h>
 
 #include <support/ExhaustedMemory.h>
-#include <support/JoiningThread.h>
 
 #include <gtest/gtest.h>
 
 #include <cstdlib>
+#include <future>
 #include <memory>
 #include <regex>
 #include <string>
@@ -136,8 +136,7 @@ TEST(KpLogFileCompanions, restoreWhatTheyFound)
         EXPECT_FALSE(log.writeCallback());
     }
     EXPECT_FALSE(log.defaultModule());
-    EXPECT_EQ(log.writeCallback(), receive);
-    EXPECT_EQ(log.writeCallbackLogLevel(), KpLogWarning);
+    EXPECT_EQ(std::tuple(log.writeCallback(), log.writeCallbackLogLevel()), std::tuple(&receive, KpLogWarning));
     log.setWriteCallback(nullptr, KpLogOff);
 }
 
@@ -151,8 +150,8 @@ TEST_F(KpLogFileTest, exhaustedMemoryLeavesNoLockBehind)
 using KpLogFileThreads = KpLogFileTest;
 TEST_F(KpLogFileThreads, linesOfManyThreadsDontInterleave)
 {
-    for (kplib::test::JoiningThread threads[3]; kplib::test::JoiningThread & thread : threads) {
-        thread = kplib::test::JoiningThread([&] {
+    for (std::future<void> threads[3]; std::future<void> & thread : threads) {
+        thread = std::async(std::launch::async, [&] {
             for (int k = 0; k < 200; ++k) {
                 log->errorf("%0500d", 0);
                 log->setDefaultModule(k % 2 ? "a" : "b");

@@ -12,8 +12,7 @@
 #include <thread>
 #include <utility>
 
-using kplib::test::Lines;
-using kplib::test::LogCapture;
+using namespace kplib::test;
 
 namespace {
 
@@ -38,14 +37,11 @@ TEST(KpResult, recordsAFailureOnceAndNoSuccess)
     static_assert(sizeof(KpResult) == sizeof(void*));
     const LogCapture log;
     const KpResult ok(KpResult::Ok, 7, "f", "t", "d"), result(5000, 12, "f.cpp", "text", "data"), shared = result;
-    EXPECT_TRUE(ok.isOk());
+    EXPECT_EQ(std::tuple(ok.isOk(), ok.line()), std::tuple(true, 0));
     EXPECT_EQ(std::string(ok.text()) + ok.file() + ok.data(), "");
-    EXPECT_EQ(ok.line(), 0);
     EXPECT_EQ(log.lines(), Lines{"D [KpResult::Error] code: 1388 file: f.cpp line: 12 message: text data: data"});
-    EXPECT_TRUE(shared.isBad());
-    EXPECT_EQ(shared.code(), 5000);
-    EXPECT_EQ(shared.line(), 12);
-    EXPECT_EQ(shared.text(), result.text());
+    EXPECT_EQ(std::tuple(shared.isBad(), shared.code(), shared.line(), shared.text()),
+              std::tuple(true, 5000, 12, result.text()));
 }
 
 TEST_F(TmTest, codesHaveTheirOwnTexts)

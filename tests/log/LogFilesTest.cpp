@@ -4,7 +4,6 @@
 #include <kplib/system/KpTmpDir.h>
 
 #include <support/ExhaustedMemory.h>
-#include <support/JoiningThread.h>
 #include <support/LogCapture.h>
 #include <support/TempFolder.h>
 
@@ -13,6 +12,7 @@
 #include <atomic>
 #include <climits>
 #include <fcntl.h>
+#include <future>
 #include <map>
 #include <memory>
 #include <poll.h>
@@ -20,14 +20,11 @@
 #include <sstream>
 #include <sys/ioctl.h>
 #include <sys/mount.h>
-#include <sys/wait.h>
 #include <thread>
 #include <tuple>
 #include <vector>
 
-using kplib::test::contentOf;
-using kplib::test::namesIn;
-using kplib::test::TempFolder;
+using namespace kplib::test;
 
 namespace {
 
@@ -73,21 +70,6 @@ void say(const std::string& text)  // to standard output and standard error, pas
     EXPECT_EQ(write(STDERR_FILENO, text.data(), text.size()), static_cast<ssize_t>(text.size()));
 }
 
-/// Runs `work` in a process of its own session; true if all went well there.
-template <typename Work>
-bool inOwnSession(Work work)
-{
-    const pid_t child = fork();
-    if (child == 0) {
-        setsid();
-        work();
-        _exit(testing::Test::HasFailure());
-    }
-    int status = -1;
-    waitpid(child, &status, 0);
-    return status == 0;
-}
-
 }  // namespace
 
 TEST_F(LogFilesTest, theLineThatCrossesTheLimitStays)
@@ -112,7 +94,7 @@ TEST_F(LogFilesTest, theLineThatCrossesTheLimitStays)
     EXPECT_TRUE(log->open(true));
     EXPECT_TRUE(contentOf(path()).empty());
     log->close();
-    EXPECT_FALSE(log->isOpen() || log->chunkIsFull() || path().empty());
+    EXPECT_EQ(std::tuple(log->isOpen(), log->chunkIsFull(), path().empty()), std::tuple(false, false, false));
 }
 
 TEST_F(LogFilesTest, whatCantBeOpenedLeavesTheLogUsable)
@@ -140,8 +122,8 @@ TEST_F(LogFilesTest, exhaustedMemoryLeavesAFileOpen)
 {
     ASSERT_TRUE(log->open(false));
     clockRuns = 0;  // else each failure leaves a file
-    kplib::test::failAtEachAllocation([&] { log->chunkTryOpenNext(); },
-                                      [&] { EXPECT_TRUE(log->isOpen() && std::filesystem::exists(path())); });
+    failAtEachAllocation([&] { log->chunkTryOpenNext(); },
+                         [&] { EXPECT_TRUE(log->isOpen() && std::filesystem::exists(path())); });
 }
 
 TEST_F(LogFilesTest, appendGoesOnWhereAFileEnds)
@@ -149,8 +131,7 @@ TEST_F(LogFilesTest, appendGoesOnWhereAFileEnds)
     const std::string file = temp.file("file", std::string(1000, 'x'));
     log->setMaxLogFileSizeInBytes(1000);
     EXPECT_TRUE(log->append(file.c_str()));
-    EXPECT_TRUE(log->isOpen());
-    EXPECT_FALSE(log->chunkIsFull());
+    EXPECT_EQ(std::tuple(log->isOpen(), log->chunkIsFull()), std::tuple(true, false));
     log->setMaxLogFileSizeInBytes(999);
     EXPECT_TRUE(log->chunkIsFull());
     log->writeCharBuffer("y");
@@ -187,9 +168,9 @@ TEST_F(LogFilesTest, theOldestFilesGo)
 
 TEST_F(LogFilesTest, onlyCleanUpLogsAMissingFolder)
 {
-    const kplib::test::LogCapture capture;
+    const LogCapture capture;
     log->cleanUp();
-    EXPECT_EQ(capture.lines(), kplib::test::Lines{"E [] Can't open dir " + folder + "\n"});
+    EXPECT_EQ(capture.lines(), Lines{"E [] Can't open dir " + folder + "\n"});
     EXPECT_TRUE(log->open(false));
     EXPECT_FALSE(log->append((temp / "no/file").c_str()));
     EXPECT_EQ(capture.lines().size(), 1U);
@@ -207,14 +188,13 @@ TEST_F(LogFilesTest, theFileOfTheSameSecondStays)
 
 TEST_F(LogFilesTest, theEnvironmentSetsLimits)
 {
-    EXPECT_EQ(log->maxNumLogFiles(), 40);
-    EXPECT_EQ(log->logLevel(), KpLogInfo);
+    EXPECT_EQ(std::tuple(log->maxNumLogFiles(), log->logLevel()), std::tuple(40, KpLogInfo));
     for (const auto& [files, debug] : {std::pair("7", "1"), {"x", "0"}}) {
         setenv("TAMRIN_MAXNUMLOGFILES", files, 1);
         setenv("TAMRIN_DEBUG_LOG", debug, 1);
         const std::unique_ptr<KpLogFile> made(KpLogFile::createInstance());
-        EXPECT_EQ(made->maxNumLogFiles(), std::atoi(files));
-        EXPECT_EQ(made->debugEnabled(), (*debug == '1'));
+        EXPECT_EQ(std::tuple(made->maxNumLogFiles(), made->debugEnabled()),
+                  std::tuple(std::atoi(files), *debug == '1'));
     }
     unsetenv("TAMRIN_MAXNUMLOGFILES");
     unsetenv("TAMRIN_DEBUG_LOG");
@@ -230,7 +210,8 @@ TEST_F(LogFilesTest, theConsoleGoesToTheFileAndBack)
         ASSERT_EQ(grantpt(master), 0);
         ASSERT_EQ(unlockpt(master), 0);
         const int terminal = open(ptsname(master), O_RDWR | O_NOCTTY);
-        EXPECT_TRUE(inOwnSession([&] {
+        const auto inOwnSession = [&] {
+            setsid();
             EXPECT_TRUE(!hasTerminal || ioctl(terminal, TIOCSCTTY, 0) == 0);
             const int console = open("/dev/null", O_WRONLY);
             for (const int standard : {STDOUT_FILENO, STDERR_FILENO})
@@ -253,7 +234,9 @@ TEST_F(LogFilesTest, theConsoleGoesToTheFileAndBack)
             EXPECT_EQ(contentOf(path()), continues + second + "\nE [] apart\n");
             EXPECT_EQ(contentOf(second), expected + (hasTerminal ? "" : "after\nafter\n"));
             EXPECT_EQ(contentOf(first), "E [] before\n");
-        }));
+            _exit(HasFailure());
+        };
+        EXPECT_EXIT(inOwnSession(), testing::ExitedWithCode(0), "");
         const std::string expected = hasTerminal ? "after\r\nafter\r\n" : "";
         std::string text;
         fcntl(master, F_SETFL, O_NONBLOCK);
@@ -328,9 +311,9 @@ TEST_F(LogFilesThreads, everyLineOfEveryThreadIsThereOnceAndInOrder)
     log->setMaxLogFileSizeInBytes(2000);
     log->setWriteCallback([](KpLogLevel, const KpString&) { ++received; }, KpLogError);
     ASSERT_TRUE(log->open(false));
-    std::vector<kplib::test::JoiningThread> threads;
+    std::vector<std::future<void>> threads;
     for (int t = 0; t < 8; ++t)
-        threads.emplace_back([&, t] {
+        threads.push_back(std::async(std::launch::async, [&, t] {
             for (int i = 0; i < lines; ++i) {
                 clockRuns = i % 3 == 0;  // else in the same second, thus in the same file
                 log->errorf("%d %d %s", t, i, std::string(static_cast<size_t>(i), 'x').c_str());
@@ -338,7 +321,7 @@ TEST_F(LogFilesThreads, everyLineOfEveryThreadIsThereOnceAndInOrder)
                     log->open(true);
                 log->chunkIsFull();
             }
-        });
+        }));
     threads.clear();
     EXPECT_EQ(received, 8 * lines);
     std::map<int, int> next;
