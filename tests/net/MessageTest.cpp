@@ -13,13 +13,9 @@ using kplib::test::Lines, kplib::test::LogCapture;
 /// The bytes of a message in hexadecimal.
 std::string hex(const TmMsg& msg)
 {
-    std::string text;
-    for (unsigned long i = 0; i < msg.size(); ++i) {
-        constexpr const char* digits = "0123456789abcdef";
-        text += digits[msg.dataPtr()[i] >> 4];
-        text += digits[msg.dataPtr()[i] & 15];
-    }
-    return text;
+    KpString text;
+    KpCoder::dataToHexString(msg.dataPtr(), static_cast<unsigned>(msg.size()), text, false);
+    return text.c_str();
 }
 
 template <typename... Values>
@@ -42,18 +38,12 @@ TEST(Message, valuesAreTheirBytesInMemory)
               wire(1.F, 2.F, 3.F, 4.F, 5.F, 6.F, 7.F, 1.F, 2.F, 1.F, 3.F, 1.F, 4.F, 0.F, 0.F, 0.F, 1.F));
     EXPECT_EQ(wire(KpUniqueID(1), KpTransferID(2), KpFrameID(3), KpVec3l(4, 5, 6)), wire(1L, 2L, 3L, 4L, 5L, 6L));
     EXPECT_EQ(wire(KpRemotificationID(4), TmSessionContextID(5), KpPrimType(KpPrimType::UShort)), wire(4, 5, 7));
-    EXPECT_EQ(wire(KpVec3i(1, 2, 3), KpVec2f(4, 5), KpVec3f(6, 7, 8), KpVec4f(9, 1, 2, 3)),
-              wire(1, 2, 3, 4.F, 5.F, 6.F, 7.F, 8.F, 9.F, 1.F, 2.F, 3.F));
     KpPlane plane;
     plane.setNormal(KpVec3f(1, 2, 3));
     plane.setDistanceFromOrigin(4);
     KpLine line;
     line.setPosDir(KpVec3f(1, 2, 3), KpVec3f(0, 0, 1));
     EXPECT_EQ(wire(plane, line), wire(1.F, 2.F, 3.F, 4.F, 1.F, 2.F, 3.F, 0.F, 0.F, 1.F));
-    KpMat4f matrix;
-    matrix.makeIdentity();
-    matrix[0][1] = 2;  // lies second in memory
-    EXPECT_EQ(wire(matrix), wire(1.F, 2.F, 0.F, 0.F, 0.F, 1.F, 0.F, 0.F, 0.F, 0.F, 1.F, 0.F, 0.F, 0.F, 0.F, 1.F));
     KpLib::MD5 digest;
     std::iota(digest.data(), digest.data() + 16, static_cast<unsigned char>(0));
     EXPECT_EQ(wire(digest), "000102030405060708090a0b0c0d0e0f");
@@ -82,14 +72,12 @@ TEST(Message, theFourTextFormsDiffer)
     EXPECT_EQ(text, reinterpret_cast<char*>(msg.dataPtr()) + 4);  // no copy
     EXPECT_EQ(null, nullptr);
     EXPECT_EQ(bytes, std::string("a\0b", 3));
-    EXPECT_EQ(string, "k");
-    EXPECT_EQ(name, "/f");
+    EXPECT_EQ(std::tuple(string, name), std::tuple("k", "/f"));
     ASSERT_EQ(texts.size(), 2);
     EXPECT_STREQ(texts[0], "ab");
     EXPECT_EQ(texts[1], nullptr);
     msg >> texts;  // a count below 1
-    EXPECT_EQ(texts.size(), 0);
-    EXPECT_EQ(msg.bytesAvailable(), 0);
+    EXPECT_EQ(std::tuple(texts.size(), msg.bytesAvailable()), std::tuple(0, 0));
 }
 
 template <typename T>
@@ -103,6 +91,7 @@ void goesRound()
     std::memcpy(static_cast<void*>(sent.data()), bytes, sizeof bytes);
     TmMsg msg;
     msg << static_cast<unsigned char>(7) << sent << sent[2];  // unaligned
+    EXPECT_EQ(std::memcmp(msg.dataPtr() + 5, bytes, sizeof bytes), 0);
     unsigned char first = 0;
     T value;
     msg >> first >> received >> value;
@@ -154,9 +143,7 @@ TEST(Message, compositesHaveTheirForms)
     back >> skipped;
     outer >> back >> after;
     back >> content;
-    EXPECT_EQ(content, 5);
-    EXPECT_EQ(after, 6);
-    EXPECT_EQ(foreign[0], 0);
+    EXPECT_EQ(std::tuple(content, after, foreign[0]), std::tuple(5, 6, 0));
     inner << inner;
     EXPECT_EQ(hex(inner), "05000000" + marks + five);
 }
@@ -171,11 +158,8 @@ TEST(Message, imagesLoseTheirGaps)
     KpTypedData2D copy, none(2, 2, KpPrimType::Byte, 1);
     msg >> copy >> none;
     EXPECT_TRUE(copy.isContiguous());
-    EXPECT_EQ(copy.dims()[0], 2);
-    EXPECT_EQ(copy.dims()[1], 2);
-    EXPECT_EQ(std::memcmp(copy.data(), "\1\2\3\4", 4), 0);
+    EXPECT_EQ(wire(copy, none), wire(image, KpTypedData2D()));
     EXPECT_EQ(none.data(), nullptr);
-    EXPECT_EQ(none.dims()[0], 0);
 }
 
 TEST(Message, anArrayThatIsNotThereIsOneErrorLine)
@@ -185,9 +169,7 @@ TEST(Message, anArrayThatIsNotThereIsOneErrorLine)
     msg << 100U << 7;
     KpDArray<int> array{42};
     msg >> array;
-    EXPECT_EQ(array.size(), 100);
-    EXPECT_EQ(array[0], 42);
-    EXPECT_EQ(msg.readOffset(), 404);
+    EXPECT_EQ(std::tuple(array.size(), array[0], msg.readOffset()), std::tuple(100, 42, 404));
     EXPECT_EQ(LogCapture::lines(),
               Lines{"E [] Buffer overrun in TmMsg::readKpDArray(), offset=4, numBytes=400, size=8"});
 }
@@ -207,19 +189,14 @@ TEST(Message, nothingIsReadBeyondTheEnd)
         forBytes >> bytes;
         forTexts >> texts;
         forField >> field;
-        EXPECT_EQ(text, nullptr);
-        EXPECT_EQ(bytes, "");
-        EXPECT_EQ(texts.size(), 0);
-        EXPECT_EQ(field.nBits(), 0U);
+        EXPECT_EQ(std::tuple(text, bytes, texts.size(), field.nBits()), std::tuple(nullptr, "", 0, 0U));
     }
     for (const auto& [width, height] : {std::pair(-1, 3), {-1, -1}, {3, 3}, {0x7fffffff, 3}}) {
         TmMsg msg;
         msg << 2 << 0 << width << height << 0;
         KpTypedData2D image(1, 1, KpPrimType::Byte, 1);
         msg >> image;
-        EXPECT_FALSE(image.data());
-        EXPECT_EQ(image.dims()[0], 0);
-        EXPECT_EQ(image.dims()[1], 0);
+        EXPECT_EQ(std::tuple(image.data(), image.dims()[0], image.dims()[1]), std::tuple(nullptr, 0, 0));
     }
     unsigned char endless[] = {1, 0, 0, 0, 'x', 'y'};
     TmMsg msg(5, endless);  // texts without a NUL
@@ -230,15 +207,12 @@ TEST(Message, nothingIsReadBeyondTheEnd)
     KpString text("old"), none("old");
     int number = 5;
     msg >> text >> none >> number;
-    EXPECT_EQ(text, "x");
-    EXPECT_EQ(none, "");
-    EXPECT_EQ(number, 0);
+    EXPECT_EQ(std::tuple(text, none, number), std::tuple("x", "", 0));
     TmMsg odd;
     odd << KpDArray<unsigned char>{2, 0};
     KpDArray<bool> bools;
     odd >> bools;  // a byte of 2 is a true like others
-    EXPECT_EQ(bools[0], true);
-    EXPECT_EQ(bools[1], false);
+    EXPECT_EQ(std::tuple(bools[0], bools[1]), std::tuple(true, false));
 }
 
 TEST(Message, bytesOfOthersAreNeitherFreedNorWritten)
@@ -253,8 +227,7 @@ TEST(Message, bytesOfOthersAreNeitherFreedNorWritten)
     EXPECT_EQ(number, 1);
     const TmMsg copy(msg);
     EXPECT_EQ(copy, msg);
-    EXPECT_TRUE(copy.isMarked(1));
-    EXPECT_FALSE(copy.isMarked(0));
+    EXPECT_EQ(std::tuple(copy.isMarked(0), copy.isMarked(1)), std::tuple(false, true));
     EXPECT_NE(copy.dataPtr(), bytes);
 
     // What appending follows, and what is left of the message before it.
@@ -292,9 +265,7 @@ TEST(Message, readOffsetAndBytesAreIndependent)
     msg >> number;
     const unsigned char* const storage = msg.dataPtr();
     msg.take(other);  // reads on at its old offset
-    EXPECT_EQ(other.dataPtr(), storage);
-    EXPECT_EQ(other.readOffset(), 0);
-    EXPECT_EQ(msg.readOffset(), 4);
+    EXPECT_EQ(std::tuple(other.dataPtr(), other.readOffset(), msg.readOffset()), std::tuple(storage, 0, 4));
     msg = other;
     EXPECT_EQ(hex(msg), hex(other));
     EXPECT_EQ(msg.readOffset(), 4);
@@ -304,9 +275,7 @@ TEST(Message, readOffsetAndBytesAreIndependent)
     EXPECT_EQ(msg, other);
 
     other.reset(0);
-    EXPECT_EQ(other.size(), 0);
-    EXPECT_EQ(other.readOffset(), 0);
-    EXPECT_EQ(other.dataPtr(), storage);
+    EXPECT_EQ(std::tuple(other.dataPtr(), other.readOffset(), other.size()), std::tuple(storage, 0, 0));
     msg.reset(4, 100);
     EXPECT_EQ(hex(msg), "01000000");
     EXPECT_EQ(msg.readOffset(), 0);
