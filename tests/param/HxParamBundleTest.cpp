@@ -2,12 +2,12 @@
 
 #include <kplib/param/HxParameter.h>
 
-#include <support/JoiningThread.h>
-
 #include <gtest/gtest.h>
 
+#include <array>
 #include <cmath>
 #include <cstdio>
+#include <future>
 #include <map>
 #include <random>
 #include <string>
@@ -57,9 +57,8 @@ TEST(HxParamBundle, keepsBundlesFirstAndReplacesInPlace)
     fresh->touch(1);
     bundle.untouchAll(255);
     bundle.insert(fresh, 1);
-    EXPECT_EQ(bundle.index(fresh), 2);
-    EXPECT_EQ(fresh->flags(), HxParamBase::FlagHidden);
-    EXPECT_EQ(fresh->touched(), 17);
+    EXPECT_EQ(std::tuple(bundle.index(fresh), fresh->flags(), fresh->touched()),
+              std::tuple(2, HxParamBase::FlagHidden, 17));
     EXPECT_EQ(bundle.touched(), HxParamBase::TouchValue | HxParamBase::TouchAny);
     bundle.insert(new HxParamBundle("SUB"), 1);
     EXPECT_TRUE(bundle.isSorted());
@@ -114,19 +113,15 @@ TEST(HxParamBundle, readsNumbers)
     bundle.set("pair", 2, pair);
     bundle.set("text", "1 2");
     bundle.set("real", "1.5 7");
-    int n[3] = {9, 9, 9};
-    EXPECT_FALSE(bundle.findNum("text", 3, n));
-    EXPECT_EQ(n[0], 1);
-    EXPECT_EQ(n[1], 2);
-    EXPECT_EQ(n[2], 9);
-    EXPECT_TRUE(bundle.findNum("real", 3, n)) << "nothing passes the point: .5 is read as 0 again and again";
-    EXPECT_EQ(n[0], 1) << "nothing passes the point: .5 is read as 0 again and again";
-    EXPECT_EQ(n[1], 0) << "nothing passes the point: .5 is read as 0 again and again";
-    EXPECT_EQ(n[2], 0) << "nothing passes the point: .5 is read as 0 again and again";
-    EXPECT_TRUE(bundle.findNum("pair", 2, n));
+    std::array n = {9, 9, 9};
+    EXPECT_FALSE(bundle.findNum("text", 3, n.data()));
+    EXPECT_EQ(n, (std::array{1, 2, 9}));
+    EXPECT_TRUE(bundle.findNum("real", 3, n.data()));
+    EXPECT_EQ(n, (std::array{1, 0, 0})) << "nothing passes the point: .5 is read as 0 again and again";
+    EXPECT_TRUE(bundle.findNum("pair", 2, n.data()));
     EXPECT_EQ(n[1], -5);
-    EXPECT_FALSE(bundle.findNum("pair", 0, n));
-    EXPECT_TRUE(bundle.findNum("text", 0, n));
+    EXPECT_FALSE(bundle.findNum("pair", 0, n.data()));
+    EXPECT_TRUE(bundle.findNum("text", 0, n.data()));
     double d[3] = {};
     float f[3] = {};
     EXPECT_TRUE(bundle.findReal("pair", 2, d));
@@ -171,8 +166,7 @@ TEST(HxParamBundle, copiesAndMerges)
     target.remove("secret");
     target.sortParameters();
     fresh = target;
-    EXPECT_TRUE(fresh.isSorted());
-    EXPECT_EQ(textOf(fresh), textOf(target));
+    EXPECT_EQ(std::tuple(fresh.isSorted(), textOf(fresh)), std::tuple(true, textOf(target)));
     fresh = *fresh.bundle("sub");
     EXPECT_EQ(textOf(fresh), "SUB {\n    own 5\n    inner 3\n}\n") << "from one of its own children";
 }
@@ -184,9 +178,7 @@ TEST(HxParamBundle, moves)
     source.bundle("sub", 1)->bundle("deep", 1);
     source.sortParameters();
     HxParamBundle moved(std::move(source)), other("other");
-    EXPECT_EQ(moved.bundle("sub")->parent(), &moved);
-    EXPECT_TRUE(moved.isSorted());
-    EXPECT_EQ(source.size(), 0);
+    EXPECT_EQ(std::tuple(moved.bundle("sub")->parent(), moved.isSorted(), source.size()), std::tuple(&moved, true, 0));
     other.set("A", 2);
     other.set("b", 3);
     other.move(moved);
@@ -200,11 +192,9 @@ TEST(HxParamBundle, printsItsTextForm)
 {
     HxParamBundle root("A");
     root.bundle("B", 1)->set("N", 3);
-    root.set("quoted", "say \"x\"");
-    root.set("escaped", "a\\\"b\"c");
-    root.set("path", "C:\\");
-    root.set("hidden", 1);
-    root.set("empty", "");
+    for (const auto& [name, text] :
+         {std::pair("quoted", "say \"x\""), {"escaped", "a\\\"b\"c"}, {"path", "C:\\"}, {"hidden", "1"}, {"empty", ""}})
+        root.set(name, text);
     root.set("last", 2, std::vector<float>{0.1f, 2}.data());
     root.insert(new HxParameter("null", 1, KpPrimType::String, nullptr), 0);
     for (const char* name : {"last", "null"})
@@ -230,9 +220,9 @@ TEST(HxParamBundleThreads, lookUpAndSortSideBySide)
         HxParamBundle bundle("b");
         for (int i = 199; i >= 0; --i)
             bundle.set(std::to_string(-1000 - i).c_str(), i);
-        kplib::test::JoiningThread threads[4];
-        for (kplib::test::JoiningThread& thread : threads) {
-            thread = kplib::test::JoiningThread([&bundle] {
+        std::future<void> threads[4];
+        for (std::future<void>& thread : threads) {
+            thread = std::async(std::launch::async, [&bundle] {
                 for (int i = 0; i < 200; ++i)
                     ASSERT_EQ(bundle.findSorted(std::to_string(-1000 - i).c_str())->getNum(0), i);
             });

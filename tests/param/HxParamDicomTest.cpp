@@ -23,10 +23,9 @@ HxParamBundle& below(HxParamBundle& bundle, std::initializer_list<const char*> p
 TEST(DicomTags, areFoundByTheirText)
 {
     HxParamBundle root("root");
-    root.setTag("G0008-0060", "CT");
-    root.setTag("G0010-4000", "");
-    root.setTag("G0020-0013", "12");
-    root.setTag("G0028-0030", "0.5\\0.25");
+    for (const auto& [tag, value] :
+         {std::pair("G0008-0060", "CT"), {"G0010-4000", ""}, {"G0020-0013", "12"}, {"G0028-0030", "0.5\\0.25"}})
+        root.setTag(tag, value);
     root.dicomAllCreate()->set("G0008-0070", "no colon");
     for (const auto& [tag, value] : {std::pair("g0008-0060", "CT"), {"G0010-4000", ""}, {"G0008-0070", "none"}})
         EXPECT_STREQ(root.findTag(tag, "none"), value);
@@ -42,18 +41,16 @@ TEST(DicomTags, areFoundByTheirText)
 
 TEST(DicomTags, holdManyValues)
 {
-    const struct {
-        const char* text;
-        bool ok;
-        KpDArray<float> values;  // 7: as it was
-    } cases[] = {{"0.5\\0.25", true, {0.5f, 0.25f}}, {"3", true, {3}}, {"3\\", false, {3, 7}}, {"", false, {7}}};
-    for (const auto& c : cases) {
+    // A 7 is left as it was.
+    const std::tuple<const char*, bool, KpDArray<float>> cases[] = {
+        {"0.5\\0.25", true, {0.5f, 0.25f}}, {"3", true, {3}}, {"3\\", false, {3, 7}}, {"", false, {7}}};
+    for (const auto& [text, ok, expected] : cases) {
         HxParamBundle root("root");
-        root.setTag("G0028-0030", c.text);
+        root.setTag("G0028-0030", text);
         KpDArray<float> values{7, 7, 7};
         EXPECT_FALSE(root.findTag("G0028-0031", values) || values.size() != 3);
-        EXPECT_EQ(root.findTag("G0028-0030", values), c.ok) << c.text;
-        EXPECT_TRUE(std::equal(values.begin(), values.end(), c.values.begin(), c.values.end())) << c.text;
+        EXPECT_EQ(root.findTag("G0028-0030", values), ok) << text;
+        EXPECT_TRUE(std::equal(values.begin(), values.end(), expected.begin(), expected.end())) << text;
     }
 }
 
