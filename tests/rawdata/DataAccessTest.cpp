@@ -7,7 +7,6 @@
 
 #include <support/FailingMalloc.h>
 
-#include <climits>
 #include <cstdlib>
 
 using namespace kplib::test;
@@ -92,10 +91,8 @@ TEST(Volume, worksOutStrides)
         const Handle volume = isSliced ? new TmDataAccess(dims, given, slices, KpPrimType::Short, 3, none)
                                        : new TmDataAccess(dims, given, nullptr, KpPrimType::Short, 3, none);
         EXPECT_EQ(volume->strides(), strides);
-        EXPECT_EQ(volume->isLinear(), (strides[2] > 0));
-        EXPECT_EQ(volume->isValid(), valid);
-        EXPECT_EQ(volume->isContiguous(), contiguous);
-        EXPECT_EQ(volume->hasData(), isSliced);
+        EXPECT_EQ(std::tuple(volume->isLinear(), volume->hasData()), std::tuple(strides[2] > 0, isSliced));
+        EXPECT_EQ(std::tuple(volume->isValid(), volume->isContiguous()), std::tuple(valid, contiguous));
         EXPECT_TRUE((!isSliced || volume->dataPtrs()[0] == &block[0]));
     }
 }
@@ -109,8 +106,7 @@ TEST(Volume, givesItsMemoryBack)
         KpAllocator::setFreeUnusedUncompressedDataCB([] { ++callbacks; });
         Handle volume = new TmDataAccess(size543, KpPrimType::Int, 1, counting), view;
         KpAllocator::setFreeUnusedUncompressedDataCB({});
-        EXPECT_EQ(volume->hasData(), (fails < 2));
-        EXPECT_EQ(callbacks, (fails > 0));
+        EXPECT_EQ(std::tuple(volume->hasData(), callbacks), std::tuple(fails<2, fails> 0));
         int seen = 0;
         volume->setDeleteCallback(
             [](TmDataAccess* object, void* data) { *static_cast<int*>(data) = object->hasData() ? 1 : 2; }, &seen);
@@ -121,8 +117,7 @@ TEST(Volume, givesItsMemoryBack)
         if (fails == 1)
             volume->dataRelease();
         volume = nullptr;
-        EXPECT_EQ(freed, (fails < 2));
-        EXPECT_EQ(seen, (fails == 0 ? 1 : 2));
+        EXPECT_EQ(std::tuple(freed, seen), std::tuple(fails < 2, fails == 0 ? 1 : 2));
     }
     void* const slices[] = {std::malloc(1), std::malloc(1)};
     TmDataAccess({1L, 1L, 2L}, dense, slices, KpPrimType::Byte, 1, counting).dataRelease();
@@ -136,8 +131,8 @@ TEST(Volume, subBoxLooksOnAndCloneCopies)
             Handle view;
             volume->subBox(view, box);
             EXPECT_EQ(view->dims(), KpVec3l(box.size()) + KpVec3l(1L, 1L, 1L));
-            EXPECT_TRUE(view->isValid());
-            EXPECT_EQ(view->isLinear(), (!layout.isSliced || view->dims()[2] == 1));
+            EXPECT_EQ(std::tuple(view->isValid(), view->isLinear()),
+                      std::tuple(true, (!layout.isSliced || view->dims()[2] == 1)));
             for (long z = 0; z < view->dims()[2]; ++z)
                 EXPECT_EQ(view->dataPtr(1, 1, z), volume->dataPtr(box.xmin() + 1, box.ymin() + 1, box.zmin() + z));
         }
@@ -204,8 +199,7 @@ TEST(Volume, linesEqualTheirVoxelsOneByOne)
         const TmDataAccess volume(size543, dense, type == 0 ? nullptr : &memory[0], KpPrimType(type), 1, none);
         EXPECT_TRUE(volume.putRow(-1, 0, 0, &untouched).isOk());
         EXPECT_TRUE(volume.row(-1, 0, 0, &untouched).isOk());
-        EXPECT_EQ(untouched, 5);
-        EXPECT_EQ(memory, Bytes(480, 9));
+        EXPECT_EQ(std::tuple(untouched, memory), std::tuple(5, Bytes(480, 9)));
     }
 }
 
@@ -239,8 +233,7 @@ TEST(Volume, digestAndMessageHoldTheVoxels)
             ASSERT_TRUE(read);
             ASSERT_EQ(read->refCount(), 0);
             const Handle handle(read);
-            EXPECT_TRUE(read->isContiguous());
-            EXPECT_EQ(read->primType(), type);
+            EXPECT_EQ(std::tuple(read->isContiguous(), read->primType()), std::tuple(true, type));
             EXPECT_EQ(voxels(*read), sent);
             volume->dataRelease();
         }
@@ -279,9 +272,8 @@ TEST(Volume, doubtfulMessages)
                 float line[3] = {5};
                 const auto words = (KpLib::MD5Coder() << type << nDataVar << dims).md5().words();
                 EXPECT_EQ(object->hash() == (Kp128{words[0], words[1]}), come == 0 || fails == 2);
-                EXPECT_EQ(object->hasData(), (fails == 3));
-                EXPECT_EQ(object->size(), come);
-                EXPECT_FALSE(msg.holds(1));
+                EXPECT_EQ(std::tuple(object->hasData(), object->size(), msg.holds(1)),
+                          std::tuple(fails == 3, come, false));
                 EXPECT_TRUE(object->row(-1, 0, 0, line).isOk());
                 EXPECT_EQ(line[0], (come > 0 && fails == 3 ? 7 : 5));
             }
@@ -289,8 +281,8 @@ TEST(Volume, doubtfulMessages)
     TmMsg msg;
     TmDataAccess below({-3L, 2L, 1L}, dense, nullptr, KpPrimType::Byte, 1, none), *object = &below;
     msg << static_cast<TmDataAccess*>(nullptr) << object;
-    EXPECT_EQ(msg.size(), 34);
-    EXPECT_EQ(*msg.dataPtr(), 1);  // one byte for null, and of nothing the sizes alone
+    EXPECT_EQ(std::tuple(msg.size(), *msg.dataPtr()),
+              std::tuple(34, 1));  // a byte for null, and of nothing the sizes alone
     msg >> object;
     EXPECT_EQ(object, nullptr);
 }

@@ -9,17 +9,14 @@ using namespace kplib::test;
 
 namespace {
 
-struct Closer {
-    void operator()(FILE* f) const { std::fclose(f); }
-};
-using File = std::unique_ptr<FILE, Closer>;
+using File = std::shared_ptr<FILE>;
 
 constexpr size_t mebi = 1 << 20;
 
 /// A stream of `size` bytes of memory, and no more.
 File limited(size_t size, const char* mode)
 {
-    File f(fmemopen(nullptr, size, mode));
+    File f(fmemopen(nullptr, size, mode), std::fclose);
     std::setvbuf(f.get(), nullptr, _IONBF, 0);
     return f;
 }
@@ -41,7 +38,7 @@ TEST(Files, streamsAreServedUpToTheFirstShortPiece)
 TEST(Files, byteOrderIsThatOfTheName)
 {
     std::vector<std::int32_t> values = {0x01020304, -2, 7}, read(3);
-    const File f(std::tmpfile());
+    const File f(std::tmpfile(), std::fclose);
     EXPECT_EQ(KpRawData::writeBigEndian(values.data(), 3, f.get()), 3);
     EXPECT_EQ(values[0], 0x01020304) << "swapped back";
     EXPECT_EQ(KpRawData::writeLittleEndian(values.data(), 1, f.get()), 1);

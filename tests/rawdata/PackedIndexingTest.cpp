@@ -11,6 +11,7 @@
 namespace {
 
 using Flags = std::vector<unsigned char>;
+const auto asVector = [](const auto& array) { return std::vector(array.begin(), array.end()); };
 
 /// Runs of about `length` positions; flags of all values.
 Flags someFlags(long n, unsigned length)
@@ -38,8 +39,8 @@ TEST(PackedIndexing, numbersFlaggedPositions)
                 flags[i] ? bits.set(i) : bits.unset(i);
             const KpPackedIndexing fromFlags(flags.data(), static_cast<int>(n)), fromBits(bits);
             for (const auto* indexing : {&fromFlags, &fromBits}) {
-                ASSERT_EQ(indexing->blockBase().size(), (n + 255) / 256);
-                ASSERT_EQ(indexing->offsets().size(), n);
+                ASSERT_EQ(std::tuple(indexing->blockBase().size(), indexing->offsets().size()),
+                          std::tuple((n + 255) / 256, n));
                 int count = 0, base = 0;
                 for (long i = 0; i < n; ++i) {
                     base = i % 256 == 0 ? count : base;
@@ -76,19 +77,15 @@ TEST(SuperPackedIndexing, growsAsIfByOnePositionAtATime)
             for (long i = 0; i < 2000; i += piece)
                 indexing.appendIndexSpace(flags.data() + i, std::min(piece, 2000 - i));
             indexing.appendIndexSpace(nullptr, -5);
-            EXPECT_TRUE(std::equal(indexing.runs().begin(), indexing.runs().end(), runs.begin(), runs.end()));
+            EXPECT_EQ(asVector(indexing.runs()), runs);
             EXPECT_EQ(indexing.currentValue(), value);
-            EXPECT_TRUE(
-                std::equal(indexing.blockCounts().begin(), indexing.blockCounts().end(), counts.begin(), counts.end()));
-            EXPECT_TRUE(
-                std::equal(indexing.blockStarts().begin(), indexing.blockStarts().end(), starts.begin(), starts.end()));
+            EXPECT_EQ(asVector(indexing.blockCounts()), counts);
+            EXPECT_EQ(asVector(indexing.blockStarts()), starts);
             long number = 0;
             for (long i = 0; i < 2000; ++i)
                 ASSERT_EQ(indexing.index(i), flags[i] ? number++ : -1) << i;
-            EXPECT_EQ(indexing.nFlagged(), number);
-            EXPECT_EQ(indexing.nPositions(), 2000);
-            EXPECT_EQ(indexing.index(-1), -1);
-            EXPECT_EQ(indexing.index(2000), -1);
+            EXPECT_EQ(std::tuple(indexing.nFlagged(), indexing.nPositions()), std::tuple(number, 2000L));
+            EXPECT_EQ(std::tuple(indexing.index(-1), indexing.index(2000)), std::tuple(-1L, -1L)) << "outside";
         }
     }
     EXPECT_EQ(KpSuperPackedIndexing().currentValue(), 1);

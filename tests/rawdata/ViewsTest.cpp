@@ -13,6 +13,8 @@ using namespace kplib::test;
 
 namespace {
 
+const std::pair<void*, void*> nothing;  // no data, and none owned
+
 /// The bytes of all pixels, row after row.
 Bytes pixels(const KpRawData2D& image)
 {
@@ -63,8 +65,7 @@ TEST(Image, ownsOrLooksOn)
     Bytes memory = someValues<std::uint8_t>(24, 3);
     KpRawData2D image(5, 5, 5);  // its block goes with the assignment
     image = KpRawData2D(2, 3, 4, memory.data());
-    EXPECT_EQ(image.data(), memory.data());
-    EXPECT_FALSE(image.ownedData());
+    EXPECT_EQ(std::tuple(image.data(), image.ownedData()), std::tuple(memory.data(), nullptr));
     image.makeLocal();
     void* const block = image.data();
     image.makeLocal();
@@ -79,8 +80,7 @@ TEST(Image, ownsOrLooksOn)
     image.commit(3, 2, 1, other);
     EXPECT_EQ(image.ownedData(), other);
     image.init(0, 3, 4);
-    EXPECT_EQ(image.data(), other);
-    EXPECT_FALSE(image.ownedData());  // no size, no change
+    EXPECT_EQ(std::tuple(image.data(), image.ownedData()), std::tuple(other, nullptr));  // no size, no change
 }
 
 TEST(Image, withoutMemoryHoldsNull)
@@ -94,8 +94,7 @@ TEST(Image, withoutMemoryHoldsNull)
         view.makeLocal();
     }
     for (KpRawData2D* image : {&view, &huge, &made, &copy}) {
-        EXPECT_FALSE(image->data());
-        EXPECT_FALSE(image->ownedData());
+        EXPECT_EQ(std::pair(image->data(), image->ownedData()), nothing);
         image->clear();
         EXPECT_TRUE(image->copyData(*image));
     }
@@ -113,9 +112,7 @@ TEST(Slice, equalsVoxelsOneByOne)
             KpRawData3D block(5, 4, 3, voxel, memory.data());
             int dims[3], strides[2];
             block.getDims(dims, orientation);
-            EXPECT_EQ(dims[0], size[row]);
-            EXPECT_EQ(dims[1], size[column]);
-            EXPECT_EQ(dims[2], size[across]);
+            EXPECT_EQ(std::to_array(dims), (std::array{size[row], size[column], size[across]}));
             for (int k = 0; k < size[across]; ++k) {
                 Bytes expected, copied(dims[0] * dims[1] * voxel), noise = someValues<std::uint8_t>(copied.size(), k);
                 KpRawData2D view, copy(1, 1, 1, copied.data());
@@ -148,18 +145,15 @@ TEST(Block, ownsOrLooksOn)
     void* mine = kpmalloc(9);
     void* const expected = mine;
     block.swapDataPtr(mine);
-    EXPECT_EQ(block.data(), expected);
-    EXPECT_EQ(block.ownedData(), expected);
+    EXPECT_EQ(std::tuple(block.data(), block.ownedData()), std::tuple(expected, expected));
     block.swapDataPtr(mine);
-    EXPECT_EQ(mine, expected);
-    EXPECT_EQ(block.ownedData(), block.data());
+    EXPECT_EQ(std::tuple(mine, block.ownedData()), std::tuple(expected, block.data()));
     block.commit(1, 1, 9, 1, mine);
     block.init(0, 0, 0, 0);  // memory even for nothing
     EXPECT_NE(block.ownedData(), nullptr);
     for (int n : {1 << 20, INT_MAX}) {
         EXPECT_THROW(block.init(n, n, n, n), KpMemoryException);
-        EXPECT_FALSE(block.data());
-        EXPECT_FALSE(block.ownedData());
+        EXPECT_EQ(std::pair(block.data(), block.ownedData()), nothing);
     }
 }
 
@@ -172,15 +166,13 @@ TEST(TypedViews, sizeOfPixelsFollowsTheType)
         const KpTypedPointer p(memory.data(), type);
         KpTypedData2D slice;
         KpTypedData3D(dims, type, 2).getSlice(3, 2, slice, 0);
-        EXPECT_EQ(slice.nDataVar(), 2);
-        EXPECT_EQ(slice.primType(), type);
-        EXPECT_FALSE(slice.dims()[0]);  // these alone
+        EXPECT_EQ(std::tuple(slice.nDataVar(), slice.primType(), slice.dims()[0]),
+                  std::tuple(2, type, 0));  // these alone
         KpTypedData3D(dims, p, 2).getSlice(1, 2, slice, 0);
         EXPECT_EQ(slice.rowStride(), 12 * type.size());
         for (const KpTypedData2D& image : {slice, {2, 4, type, 2}, {dims, p, 2}, {2, 4, 99, 70, p, 2}}) {
-            EXPECT_EQ(image.primType(), type);
-            EXPECT_EQ(image.nDataVar(), 2);
-            EXPECT_EQ(image.pixelStride(), 2 * type.size());
+            EXPECT_EQ(std::tuple(image.primType(), image.nDataVar(), image.pixelStride()),
+                      std::tuple(type, 2, 2 * type.size()));
         }
     }
 }
