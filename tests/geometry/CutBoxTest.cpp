@@ -82,16 +82,13 @@ TEST(KpCutBoxPlane, cutsEachDividedEdgeInOrder)
 
 TEST(KpCutBoxPlane, countsCornersInThePlaneAsAbove)
 {
-    const struct {
-        KpVec3f normal;
-        float distance;
-        std::size_t count;
-    } cases[] = {{x, 1, 4}, {x, 0, 0}, {x, -1, 0}, {-x, 0, 4}, {{1, 1, 1}, 1, 3}, {{1, 1, 1}, 3, 3}, {x, NaN, 0}};
-    for (const auto& c : cases) {
-        const std::vector<KpVec3f> vertices = KpCutBoxPlane(unit, c.normal).cutPlane(c.distance);
-        EXPECT_EQ(vertices.size(), c.count) << c.normal << c.distance;
+    const std::tuple<KpVec3f, float, std::size_t> cases[] = {
+        {x, 1, 4}, {x, 0, 0}, {x, -1, 0}, {-x, 0, 4}, {{1, 1, 1}, 1, 3}, {{1, 1, 1}, 3, 3}, {x, NaN, 0}};
+    for (const auto& [normal, distance, count] : cases) {
+        const std::vector<KpVec3f> vertices = KpCutBoxPlane(unit, normal).cutPlane(distance);
+        EXPECT_EQ(vertices.size(), count) << normal << distance;
         for (const KpVec3f& v : vertices)
-            EXPECT_EQ(v.dot(c.normal), c.distance);
+            EXPECT_EQ(v.dot(normal), distance);
     }
     KpVec3f vertices[6];
     KpVec3d inDouble[6];

@@ -17,8 +17,7 @@ double determinant(const KpVec3d& a, const KpVec3d& b, const KpVec3d& c)
 TEST(KpLine, withoutLengthIsNaNOrKeepsItsZero)
 {
     KpLine line(x, x);
-    EXPECT_TRUE(isNaN(line.position()));
-    EXPECT_TRUE(isNaN(line.direction()));
+    EXPECT_EQ(std::tuple(isNaN(line.position()), isNaN(line.direction())), std::tuple(true, true));
     EXPECT_EQ(line.setPosDir(x, origin), 0);
     EXPECT_EQ(line.direction(), origin);
     EXPECT_EQ(line.setPosDir(x, x * 4), 4);
@@ -42,8 +41,7 @@ TEST(KpLine, hasClosestPoints)
         EXPECT_LE((onThis - a.getClosestPoint(onOther)).length(), bound);
     }
     EXPECT_FALSE(alongX.getClosestPoints(KpLine(y, y - x), onThis, onOther));
-    EXPECT_TRUE(isNaN(onThis));
-    EXPECT_TRUE(isNaN(onOther));
+    EXPECT_EQ(std::tuple(isNaN(onThis), isNaN(onOther)), std::tuple(true, true));
 }
 
 TEST(KpLine, goesThroughBoxes)
@@ -76,12 +74,8 @@ TEST(KpLine, goesThroughBoxes)
 TEST(KpLine, meetsBoxesAtTheirEdges)
 {
     const KpBox3f box(1, 3, -1, 1, -1, 1);
-    const struct {
-        const char* what;
-        KpBox3f box;
-        KpVec3f position, direction;
-        float tolerance, enter, exit;  // x of the points; NaN is a miss
-    } cases[] = {
+    // A box, position and direction of a line, the tolerance, x of both points; NaN is a miss.
+    const std::tuple<const char*, KpBox3f, KpVec3f, KpVec3f, float, float, float> cases[] = {
         {"against x", box, {9, 0, 0}, -x, 0, 3, 1},
         {"in a face", box, y, x, 0, 1, 3},
         {"beside a face, within the tolerance", box, y * 1.25F, x, 0.5F, 1, 3},
@@ -93,13 +87,13 @@ TEST(KpLine, meetsBoxesAtTheirEdges)
         {"no direction, inside", box, x * 2, origin, 0, 2, 2},
         {"not a number", box, {0, NaN, 0}, x, 0, NaN, NaN},
     };
-    for (const auto& c : cases) {
+    for (const auto& [what, target, position, direction, tolerance, enterX, exitX] : cases) {
         KpLine line;
-        line.setPosDir(c.position, c.direction);
+        line.setPosDir(position, direction);
         KpVec3f enter = untouched, exit = untouched;
-        const bool isHit = line.intersect(c.box, enter, exit, c.tolerance);
-        EXPECT_EQ(isHit, !std::isnan(c.enter)) << c.what;
-        EXPECT_TRUE(isHit ? enter.x() == c.enter && exit.x() == c.exit : isNaN(enter) && isNaN(exit)) << c.what;
+        const bool isHit = line.intersect(target, enter, exit, tolerance);
+        EXPECT_EQ(isHit, !std::isnan(enterX)) << what;
+        EXPECT_TRUE(isHit ? enter.x() == enterX && exit.x() == exitX : isNaN(enter) && isNaN(exit)) << what;
     }
 }
 
@@ -107,23 +101,21 @@ TEST(KpLine, picksWhatIsNearerThanAnAngleOrARadius)
 {
     const KpBox3f box(2, 3, 1, 2, -1, 1);
     const KpVec3f point(2, 1, 0), below(4, 1, -5), above(4, 1, 5), end(4, 1, 3);
-    const struct {
-        float angle;
-        bool box, point, segment, end;  // `end` runs from there on away from the line
-    } cases[] = {
+    // What is hit: box, point, segment, and a segment that runs from `end` away from the line.
+    const std::tuple<float, bool, bool, bool, bool> cases[] = {
         {-1.5F, true, true, true, false},   {-1, true, false, false, false}, {0.3F, true, false, true, false},
         {0.2F, false, false, false, false}, {-3.5F, true, true, true, true}, {0.9F, true, true, true, true},
     };
     KpVec3f out;
-    for (const auto& c : cases) {
-        SCOPED_TRACE(c.angle);
-        EXPECT_EQ(alongX.intersect(c.angle, box), c.box);
-        EXPECT_EQ(alongX.intersect(c.angle, point), c.point);
-        EXPECT_EQ(alongX.intersect(c.angle, below, above, out), c.segment);
-        EXPECT_TRUE(c.segment ? out == KpVec3f(4, 1, 0) : isNaN(out));
-        EXPECT_EQ(alongX.intersect(c.angle, above, end, out), c.end);
-        EXPECT_EQ(alongX.intersect(c.angle, end, above, out), c.end);
-        EXPECT_TRUE(c.end ? out == end : isNaN(out));
+    for (const auto& [angle, hitsBox, hitsPoint, hitsSegment, hitsEnd] : cases) {
+        SCOPED_TRACE(angle);
+        EXPECT_EQ(alongX.intersect(angle, box), hitsBox);
+        EXPECT_EQ(alongX.intersect(angle, point), hitsPoint);
+        EXPECT_EQ(alongX.intersect(angle, below, above, out), hitsSegment);
+        EXPECT_TRUE(hitsSegment ? out == KpVec3f(4, 1, 0) : isNaN(out));
+        EXPECT_EQ(alongX.intersect(angle, above, end, out), hitsEnd);
+        EXPECT_EQ(alongX.intersect(angle, end, above, out), hitsEnd);
+        EXPECT_TRUE(hitsEnd ? out == end : isNaN(out));
     }
     EXPECT_TRUE(alongX.intersect(0, KpBox3f(2, 3, -1, 1, -1, 1))) << "angle 0, and the line crosses";
     EXPECT_FALSE(alongX.intersect(-9, KpBox3f(3, 2, -1, 1, -1, 1)) || alongX.intersect(-9, origin)) << "empty, behind";

@@ -21,18 +21,15 @@ KpPlane raw(const KpVec3f& normal, float distance)
 TEST(KpPlane, isMadeOfPointsAndNormalsOrEmpty)
 {
     const KpVec3f p(1, 2, 3);
-    const struct {
-        const char* what;
-        KpPlane plane, expected;
-    } cases[] = {
+    const std::tuple<const char*, KpPlane, KpPlane> cases[] = {
         {"three points", {p, p + x * 2, p + y * 3}, raw(z, 3)},
         {"points on a line", {p, p + x, p + x * 2}, raw(origin, 0)},
         {"the distance isn't scaled", {z * -2, 3}, raw(-z, 3)},
         {"normal and point", {z * -2, p}, raw(-z, -3)},
         {"a normal whose length underflows", {z * 1e-30F, 3}, raw(origin, 0)},
     };
-    for (const auto& c : cases)
-        EXPECT_EQ(c.plane, c.expected) << c.what;
+    for (const auto& [what, plane, expected] : cases)
+        EXPECT_EQ(plane, expected) << what;
     EXPECT_FALSE(raw(z * 1.0004F, 1).isEmpty() || raw(z * 0.9996F, 1).isEmpty());
     for (const KpPlane& empty : {raw(z * 1.0006F, 1), raw(z * 0.9994F, 1), raw(z, NaN), raw({NaN, 0, 1}, 0)})
         EXPECT_TRUE(empty.isEmpty()) << empty.dump();
@@ -83,8 +80,7 @@ TEST(KpPlane, meetsLinesAndPlanes)
     EXPECT_TRUE(KpPlane({1, -1, 0}, 1.0F).intersect(KpPlane(z, 1), line)) << "of equals";
     EXPECT_EQ(line.position().x(), 0) << "of equals";
     EXPECT_FALSE(KpPlane(z, 1).intersect(KpPlane({1e-6F, 0, 1}, 1.0F), line));
-    EXPECT_TRUE(isNaN(line.position()));
-    EXPECT_TRUE(isNaN(line.direction()));
+    EXPECT_EQ(std::tuple(isNaN(line.position()), isNaN(line.direction())), std::tuple(true, true));
 }
 
 TEST(KpPlane, movesWithMatrices)
@@ -109,8 +105,7 @@ TEST(KpPlane, movesWithMatrices)
     expectNear(skewed.normal() * std::sqrt(5.0F), {1, 0, 2}, 1e-6F);
     flat.transform(scale);
     flatInv.transformInv(scale);
-    EXPECT_EQ(flat, KpPlane::emptyPlane());
-    EXPECT_EQ(flatInv, KpPlane::emptyPlane());
+    EXPECT_EQ(std::tuple(flat, flatInv), std::tuple(KpPlane::emptyPlane(), KpPlane::emptyPlane()));
 }
 
 TEST(KpPlane, tellsParallelAndNearlyEqualOnes)

@@ -57,8 +57,7 @@ TEST(KpRotation, survivesOtherForms)
     EXPECT_TRUE(quarter.equals(KpRotation(0, 0, 1, 0), tight));
 
     KpRotation(x, 1.9e-5F).getValue(axis, angle);
-    EXPECT_EQ(axis, z) << "nearly no turn";
-    EXPECT_EQ(angle, 0) << "nearly no turn";
+    EXPECT_EQ(std::tuple(axis, angle), std::tuple(z, 0.0F)) << "nearly no turn";
     KpRotation(x, 2.1e-5F).getValue(axis, angle);
     EXPECT_EQ(axis, x);
     EXPECT_TRUE(std::isnan(KpRotation(0, 0, 0, 0)[0]));

@@ -61,8 +61,7 @@ TEST(KpViewVolume, takesTheWorldToTheScreenAndBack)
     expectNear(toScreen(v, z * -2), KpVec3f(0.5F, 0.5F, 0.5F));
     EXPECT_FLOAT_EQ(v.projectBox(KpBox3f(-0.5F, 0.5F, -0.25F, 0, -2, -1)).y(), 0.125F);
     v.frustum(-1, 2, -3, 4, 5, 7);
-    EXPECT_EQ(v.llf(), KpVec3f(-1, -3, 5));
-    EXPECT_EQ(v.nearToFar(), 2);
+    EXPECT_EQ(std::tuple(v.llf(), v.nearToFar()), std::tuple(KpVec3f(-1, -3, 5), 2));
 }
 
 TEST(KpViewVolume, alignsByRightAngles)
@@ -94,9 +93,8 @@ TEST(KpViewVolume, shiftsStereoEyesAgainstEachOther)
         Volume transformed = v;
         transformed.transform(KpMat4f::identity());
         for (const Volume& reset : {v.zNarrow(1, 0), transformed}) {
-            EXPECT_EQ(reset.stereoMode(), 0);
-            EXPECT_EQ(reset.stereoEyeScale(), 1);
-            EXPECT_FALSE(reset.isCameraOffsetSet());
+            EXPECT_EQ(std::tuple(reset.stereoMode(), reset.stereoEyeScale(), reset.isCameraOffsetSet()),
+                      std::tuple(0, 1, false));
         }
     }
 }
@@ -109,8 +107,7 @@ TEST(KpViewVolume, changesShape)
         const KpVec3f place(someNumber(random, 0, 1), someNumber(random, 0, 1), 0.5F);
         const float near = someNumber(random, 0.5F, 0.9F), far = someNumber(random, 0, 0.4F), depth = 1 - near;
         const Volume part = v.narrow(KpBox3f(0.1F, 0.6F, 0.2F, 0.9F, far, near));
-        EXPECT_EQ(part.nearDist(), near);
-        EXPECT_EQ(part.nearToFar(), (near - far) * v.nearToFar());
+        EXPECT_EQ(std::tuple(part.nearDist(), part.nearToFar()), std::tuple(near, (near - far) * v.nearToFar()));
         expectNear(part.llf(), toWorld(v, KpVec3f(0.1F, 0.2F, depth)));
         expectNear(part.lrf(), toWorld(v, KpVec3f(0.6F, 0.2F, depth)));
         expectNear(part.projPoint() + part.ulfO(), toWorld(v, KpVec3f(0.1F, 0.9F, depth)));

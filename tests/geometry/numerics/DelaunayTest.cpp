@@ -68,11 +68,10 @@ std::map<std::string, Coordinates> inputs()
         {"clusters within clusters",
          many<Size>(600, [&](int i, int) { return std::pow(4.0, -(i / 60)) * noise(0, 0); })},
         {"far clusters", many<Size>(300, [&](int i, int) { return i % 3 * 1e4 + noise(0, 0) * 1e-2; })},
-        {"lattice", many<Size>(343, [](int i, int axis) { return i /
-                                                                 (axis == 0   ? 1
-                                                                  : axis == 1 ? 7
-                                                                              : 49) %
-                                                                 7; })},
+        {"lattice", many<Size>(343,
+                               [](int i, int axis) {
+                                   return i / std::array{1, 7, 49}[axis] % 7;
+                               })},
         {"twice the same", many<Size>(120, [](int i, int axis) { return (i % 60 * 37 + axis * (i % 60) * 11) % 61; })},
         {"one place", many<Size>(9, [](int, int) { return 0.7; })},
         {"a slanted line", many<Size>(80, [](int i, int axis) { return i * (axis + 1); })},
@@ -91,9 +90,8 @@ std::vector<std::pair<std::string, Finder>> finders()
     std::vector<std::pair<std::string, Finder>> result;
     for (const auto& path : circleScanPaths<Size>())
         if (path.usable) {
-            result.push_back({path.name, {path.run, std::numeric_limits<long>::max()}});
-            result.push_back({std::string("grid and ") + path.name, {path.run, 100}});
-            result.push_back({std::string("early grid and ") + path.name, {path.run, 0}});
+            for (const long gridFrom : {std::numeric_limits<long>::max(), 100L, 0L})
+                result.push_back({path.name + (", grid from " + std::to_string(gridFrom)), {path.run, gridFrom}});
         }
     return result;
 }
@@ -246,8 +244,7 @@ TEST(KpDelaunay, refusesALargeCavity)
     EXPECT_FALSE(KpDelaunay::triangulate2D(reinterpret_cast<KpVec2f*>(fan.data()), 3001, triangles));
     EXPECT_FALSE(KpDelaunay::triangulate3D(reinterpret_cast<KpVec3f*>(ball.data()), 9001, tetrahedra));
     EXPECT_EQ(log.lines(), Lines{"E [] temporary storage exceeded\n"});  // in the plane only
-    EXPECT_EQ(triangles.size(), 1);
-    EXPECT_EQ(tetrahedra.size(), 1);
+    EXPECT_EQ(std::tuple(triangles.size(), tetrahedra.size()), std::tuple(1, 1));
 }
 
 template <int Size>

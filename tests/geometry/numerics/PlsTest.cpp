@@ -3,7 +3,6 @@
 #include <kplib/foundation/KpDArray.h>
 #include <kplib/geometry/KpVec2f.h>
 #include <kplib/geometry/shapes/KpLine2D.h>
-#include <kplib/volume/KpBitfield.h>
 
 #include <gtest/gtest.h>
 

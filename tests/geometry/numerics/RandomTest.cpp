@@ -1,12 +1,11 @@
 #include <kplib/geometry/numerics/KpRandom.h>
 
-#include <support/JoiningThread.h>
-
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <array>
 #include <functional>
+#include <future>
 #include <random>
 #include <vector>
 
@@ -48,9 +47,9 @@ TEST(KpRandom, staysInItsRangeForAnySeed)
 
 TEST(KpRandom, servesManyThreadsFromOneGenerator)
 {
-    std::vector<kplib::test::JoiningThread> threads;
+    std::vector<std::future<void>> threads;
     for (int t = 0; t < 4; ++t)
-        threads.emplace_back([] {
+        threads.push_back(std::async(std::launch::async, [] {
             double sum = 0;
             for (int i = 0; i < 20000; ++i) {
                 const double drawn = KpRandom::rand();
@@ -59,7 +58,7 @@ TEST(KpRandom, servesManyThreadsFromOneGenerator)
                 sum += drawn;
             }
             EXPECT_NEAR(sum / 20000, 0.5, 0.05);
-        });
+        }));
 }
 
 }  // namespace

@@ -90,9 +90,8 @@ TEST(SimulatedAnnealer, findsTheLowestEnergyAndFreezesThere)
     frozen.at = 20;
     const LogCapture log;
     annealer.anneal(&frozen, false);
-    EXPECT_EQ(frozen.proposals - frozen.lastMade, 40);
-    EXPECT_EQ(frozen.at, 17);
-    EXPECT_TRUE(frozen.isChangePending());
+    EXPECT_EQ(std::tuple(frozen.proposals - frozen.lastMade, frozen.at, frozen.isChangePending()),
+              std::tuple(40, 17, true));
     ASSERT_EQ(LogCapture::lines().size(), 2U * static_cast<size_t>(frozen.proposals));
     EXPECT_NE(LogCapture::lines().back().find(" \t 0.000000 \t 1.000000 \t 0 \t 0.000000 "), std::string::npos);
 }

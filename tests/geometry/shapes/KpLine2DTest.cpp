@@ -2,8 +2,6 @@
 
 #include <gtest/gtest.h>
 
-#include <cmath>
-
 namespace {
 
 constexpr float nan = std::numeric_limits<float>::quiet_NaN();
@@ -20,9 +18,7 @@ TEST(KpLine2D, distancesAreSignedAndEndless)
     point.setPosDir({1, 1}, {0, 0});
     EXPECT_FLOAT_EQ(point.getDistanceTo({4, -3}), 5);
     EXPECT_FLOAT_EQ(point.getDistance2To({4, -3}), 25);
-    EXPECT_TRUE(point.isEmpty());
-    EXPECT_TRUE(KpLine2D().isEmpty());
-    EXPECT_TRUE(line.isNotEmpty());
+    EXPECT_EQ(std::tuple(point.isEmpty(), KpLine2D().isEmpty(), line.isNotEmpty()), std::tuple(true, true, true));
     point.setPosDir({nan, 0}, {1, 0});
     EXPECT_TRUE(point.isEmpty());
 }
@@ -42,24 +38,20 @@ TEST(KpLine2D, theClosestPointMayBeKeptInTheSegment)
 TEST(KpLine2D, intersectionsIncludeTheEndsOfSegments)
 {
     const KpLine2D line({0, 0}, {2, 0});
-    const struct {
-        KpVec2f from, to;
-        bool lines, segments;
-        KpVec2f at;
-    } cases[] = {
+    const std::tuple<KpVec2f, KpVec2f, bool, bool, KpVec2f> cases[] = {
         {{1, -1}, {1, 1}, true, true, {1, 0}},  {{2, 0}, {2, 3}, true, true, {2, 0}},
         {{3, -1}, {3, 1}, true, false, {3, 0}}, {{1, 1}, {1, 2}, true, false, {1, 0}},
         {{0, 1}, {2, 1}, false, false, {9, 9}}, {{0, 0}, {2, 0}, false, false, {9, 9}},
         {{1, 1}, {1, 1}, false, false, {9, 9}}, {{nan, 1}, {1, 0}, false, false, {9, 9}},
         {{0, -1}, {4, 1}, true, true, {2, 0}},
     };
-    for (const auto& each : cases) {
-        const KpLine2D other(each.from, each.to);
+    for (const auto& [from, to, lines, segments, meeting] : cases) {
+        const KpLine2D other(from, to);
         KpVec2f at(9, 9);
-        EXPECT_EQ(line.intersects(other, &at), each.lines);
-        EXPECT_EQ(at, each.at);
-        EXPECT_EQ(line.intersectsSegments(other, nullptr), each.segments);
-        EXPECT_EQ(other.intersectsSegments(line, nullptr), each.segments);
+        EXPECT_EQ(line.intersects(other, &at), lines);
+        EXPECT_EQ(at, meeting);
+        EXPECT_EQ(line.intersectsSegments(other, nullptr), segments);
+        EXPECT_EQ(other.intersectsSegments(line, nullptr), segments);
     }
 }
 
