@@ -32,30 +32,26 @@ std::vector<std::string> asVector(const List& list)
 
 TEST(InstanceList, isStoredBehindItsCommonPrefix)
 {
-    const struct {
-        List list;
-        const char *prefix, *first;
-    } cases[] = {
+    const std::tuple<List, const char*, const char*> cases[] = {
         {{"1.2.3.41", "1.2.3.42"}, "1.2.3.4", "1"},
         {{"1.2", "2.2"}, "(none)", "1.2"},
         {{"1.2.3"}, "1.2.3", ""},
         {{"1.2", "1.2"}, "1.2", ""},
         {{"1.2.3", "1.2"}, "1.2", ".3"},
     };
-    for (const auto& each : cases) {
+    for (const auto& [list, prefix, first] : cases) {
         HxParamBundle bundle("SOPInstanceUIDs");
         bundle.set("Old", 1);
-        Utility::setSopUIDList(&bundle, strings(each.list));
-        EXPECT_EQ(stored(bundle, "Prefix"), each.prefix);
-        EXPECT_EQ(stored(bundle, "Image00001"), each.first);
-        EXPECT_EQ(stored(bundle, "Old"), "(none)");
+        Utility::setSopUIDList(&bundle, strings(list));
+        EXPECT_EQ(std::tuple(stored(bundle, "Prefix"), stored(bundle, "Image00001"), stored(bundle, "Old")),
+                  std::tuple(prefix, first, "(none)"));
         List read;
         ASSERT_TRUE(Utility::sopUIDList(&bundle, read));
-        EXPECT_EQ(asVector(read), asVector(each.list));
+        EXPECT_EQ(asVector(read), asVector(list));
         KpDArray<KpString> texts = strings({"old"});
         EXPECT_TRUE(Utility::sopUIDList(&bundle, texts));
         EXPECT_EQ(texts.size(), read.size());
-        EXPECT_EQ(stored(bundle, "MD5Hash"), Utility::sopUIDHash(each.list).c_str());
+        EXPECT_EQ(stored(bundle, "MD5Hash"), Utility::sopUIDHash(list).c_str());
         EXPECT_FALSE(Utility::sopUIDList(&bundle, read));  // not empty any more
     }
     EXPECT_STREQ(Utility::sopUIDHash(List()), "D41D8CD98F00B204E9800998ECF8427E");

@@ -3,7 +3,6 @@
 #include <gtest/gtest.h>
 
 #include <cstdlib>
-#include <ctime>
 #include <random>
 
 namespace {
@@ -41,18 +40,16 @@ TEST(TmgDateTime, timesAreFormattedAndMadeKeys)
         {"123456.789", "12:34:56"}, {"1234567", "1234567"}, {"123456", "12:34:56"}, {"12345", "12345"}, {"", ""}};
     for (const auto& [time, text] : formatted)
         EXPECT_EQ(Tmg::timeReformat(time), text);
-    const struct {
-        const char *time, *key, *inverted;
-    } keys[] = {
+    const std::tuple<const char*, const char*, const char*> keys[] = {
         {"123456", "1123456123456.", "00116544."},
         {"123456.000000", "1123456123456.000000", "00116544.999999"},
         {"003456.25", "1003456003456.25", "00236544.1999874"},
         {"12345", "12345", "12345"},
         {"12345.6", "", ""},
     };
-    for (const auto& each : keys) {
-        EXPECT_EQ(Tmg::timeString(each.time, false), each.key);
-        EXPECT_EQ(Tmg::timeString(each.time, true), each.inverted);
+    for (const auto& [time, key, inverted] : keys) {
+        EXPECT_EQ(Tmg::timeString(time, false), key);
+        EXPECT_EQ(Tmg::timeString(time, true), inverted);
     }
     for (const auto& [zone, time] : {std::pair("XYZ-3", 53206L), std::pair("UTC", 23206L)}) {
         setenv("TZ", zone, 1);
@@ -100,17 +97,14 @@ TEST(TmgText, setsAndValuesAreLists)
     EXPECT_TRUE(Tmg::matchSet("mr\\c*", "ct", "\\"));
     EXPECT_TRUE(Tmg::matchSet("A", "b a", " "));
     EXPECT_FALSE(Tmg::matchSet("mr", "ct", "\\") || Tmg::matchSet(nullptr, "a", " ") || Tmg::matchSet("a", "", " "));
-    const struct {
-        const char *target, *additions, *separators, *result;
-        bool added;
-    } cases[] = {
+    const std::tuple<const char*, const char*, const char*, const char*, bool> cases[] = {
         {"A\\B", "B\\C", "\\", "A\\B\\C", true}, {"A\\B", "A", "\\", "A\\B", false}, {"", "A", ",", "A", true},
         {"A;B", "C,D", ",;", "A;B;C;D", true},   {"A,", "B", ",", "A,B", true},      {"A", "B,B", ",", "A,B", true},
     };
-    for (const auto& each : cases) {
-        KpString target(each.target);
-        EXPECT_EQ(Tmg::addToMultiValueString(target, each.additions, each.separators), each.added);
-        EXPECT_STREQ(target, each.result);
+    for (const auto& [before, additions, separators, result, added] : cases) {
+        KpString target(before);
+        EXPECT_EQ(Tmg::addToMultiValueString(target, additions, separators), added);
+        EXPECT_STREQ(target, result);
     }
 }
 
@@ -118,11 +112,10 @@ TEST(TmgImages, numbersComeFromTheListOrTheHeader)
 {
     HxParamBundle object("Object");
     int number = 5;
-    EXPECT_FALSE(Tmg::imageNumber(object, 0, number));
-    EXPECT_EQ(number, 0);
+    const auto numberOf = [&](int index) { return Tmg::imageNumber(object, index, number) ? number : -1 - number; };
+    EXPECT_EQ(numberOf(0), -1) << "none, and set to 0";
     object.dicomAllCreate()->set("G0020-0013", "Instance Number: 42");
-    EXPECT_TRUE(Tmg::imageNumber(object, 0, number));
-    EXPECT_EQ(number, 42);
+    EXPECT_EQ(numberOf(0), 42);
 
     HxParamBundle* list = object.bundle("ImageNumberList", 1);
     list->set("Old", 1);
@@ -134,12 +127,10 @@ TEST(TmgImages, numbersComeFromTheListOrTheHeader)
         Tmg::imageNumbers3D(object, first, last, numbers);
         EXPECT_EQ(std::vector<int>(numbers.begin(), numbers.end()), expected);
     }
-    EXPECT_TRUE(Tmg::imageNumber(object, 2, number));
-    EXPECT_EQ(number, 9);
+    EXPECT_EQ(numberOf(2), 9);
     for (const int index : {-1, 3, 0x7fffffff})
         EXPECT_FALSE(Tmg::imageNumberFromBundle(list, index, number));
-    EXPECT_TRUE(Tmg::imageNumber(object, 3, number));  // falls back on the header
-    EXPECT_EQ(number, 42);
+    EXPECT_EQ(numberOf(3), 42);  // falls back on the header
     EXPECT_FALSE(list->isSorted());
 }
 
@@ -165,32 +156,26 @@ TEST(TmgImages, tagsOfAnImageAreItsOwnOrTheVolumes)
     HxParamBundle object("Object");
     KpString value("old");
     bool approximate = false;
+    using Answer = std::tuple<bool, bool, std::string>;  // whether it was found, whether it is approximate, the value
     const auto ask = [&](int index, const char* tag) {
-        return Tmg::imageLevelTag(object, index, tag, value, approximate);
+        const bool isFound = Tmg::imageLevelTag(object, index, tag, value, approximate);
+        return Answer(isFound, approximate, value.c_str());
     };
-    EXPECT_FALSE(ask(0, "G0018-0050") || approximate);  // constant in a volume
+    EXPECT_EQ(ask(0, "G0018-0050"), Answer(false, false, "old"));  // constant in a volume
     object.dicomAllCreate()->set("G0008-0032", "Acquisition Time: 0815");
-    EXPECT_TRUE(ask(0, "G0008-0032"));
-    EXPECT_TRUE(approximate);
-    EXPECT_STREQ(value, "0815");
+    EXPECT_EQ(ask(0, "G0008-0032"), Answer(true, true, "0815"));
 
     HxParamBundle* list = object.bundle("ImageNumberList", 1);
     Tmg::setImageTagList(list, KpDArray<KpString>({"1,10.5,", "2"}));
     object.set("ImageLevelTags", "G0020-0013,G0020-1041,G0018-1041");
-    EXPECT_TRUE(ask(0, "G0020-1041"));
-    EXPECT_FALSE(approximate);
-    EXPECT_STREQ(value, "10.5");
-    EXPECT_FALSE(ask(1, "G0020-1041") || approximate);
-    EXPECT_STREQ(value, "10.5");  // no such field: stays
-    EXPECT_FALSE(ask(0, "G0018-1041") || approximate);
-    EXPECT_STREQ(value, "");  // an empty field
-    EXPECT_FALSE(ask(2, "G0020-0013") || approximate);
-    EXPECT_FALSE(ask(0, "1041") || approximate);  // part of a name
-    EXPECT_TRUE(ask(0, "G0008-0032"));
-    EXPECT_TRUE(approximate);
+    EXPECT_EQ(ask(0, "G0020-1041"), Answer(true, false, "10.5"));
+    EXPECT_EQ(ask(1, "G0020-1041"), Answer(false, false, "10.5"));  // no such field: stays
+    EXPECT_EQ(ask(0, "G0018-1041"), Answer(false, false, ""));      // an empty field
+    EXPECT_EQ(ask(2, "G0020-0013"), Answer(false, false, ""));
+    EXPECT_EQ(ask(0, "1041"), Answer(false, false, ""));  // part of a name
+    EXPECT_EQ(ask(0, "G0008-0032"), Answer(true, true, "0815"));
     object.bundle("SOPInstanceUIDs", 1)->set("NumInputImages", 1);
-    EXPECT_TRUE(ask(0, "G0008-0032"));
-    EXPECT_FALSE(approximate);
+    EXPECT_EQ(ask(0, "G0008-0032"), Answer(true, false, "0815"));
 }
 
 TEST(TmgSeries, imagesBelongToWhoHoldsThem)
