@@ -103,10 +103,9 @@ TEST(KpBitfield, answersByItsBitsAndIgnoresWhatLiesBehind)
             ASSERT_EQ(text.c_str(), bits);
             const unsigned long first = std::min(bits.find('1'), n), firstUnset = std::min(bits.find('0'), n);
             EXPECT_EQ(field.nSetBits(), static_cast<unsigned long>(std::count(bits.begin(), bits.end(), '1')));
-            EXPECT_EQ(field.firstSetBit(), first) << bits;
-            EXPECT_EQ(field.isAnyBitSet(), (first < n)) << bits;
-            EXPECT_EQ(field.firstUnsetBit(), firstUnset) << bits;
-            EXPECT_EQ(field.isAnyBitUnset(), (firstUnset < n)) << bits;
+            EXPECT_EQ(std::tuple(field.firstSetBit(), field.isAnyBitSet()), std::tuple(first, first < n)) << bits;
+            EXPECT_EQ(std::tuple(field.firstUnsetBit(), field.isAnyBitUnset()), std::tuple(firstUnset, firstUnset < n))
+                << bits;
             EXPECT_EQ(field.lastSetBit(), std::min(bits.rfind('1'), n)) << bits;
         }
 }
@@ -124,10 +123,8 @@ TEST(KpBitfield, joinsTheWordsAndComparesTheBitsThatBothHave)
                     isContained = isContained && (b.test(i) || !a.test(i));
                     meets = meets || (a.test(i) && b.test(i));
                 }
-                ASSERT_EQ(a.isSuperset(b), contains);
-                ASSERT_EQ(a.isSubset(b), isContained);
-                ASSERT_EQ(a.hasIntersection(b), meets);
-                ASSERT_EQ((a == b), (n == nB && contains && isContained));
+                ASSERT_EQ(std::tuple(a.isSuperset(b), a.isSubset(b), a.hasIntersection(b), a == b),
+                          std::tuple(contains, isContained, meets, n == nB && contains && isContained));
                 KpBitfield both = a, either = a, one = a;
                 both &= b, either |= b, one ^= b;
                 for (unsigned long i = 0; i < a.nWords(); ++i) {
@@ -219,8 +216,7 @@ TEST(KpBitfield, mergesIntoLabelsByPolicy)
         field.toLabels(40, labels.data(), 3, KpBitfield::InsertPolicy(unknown));
     EXPECT_EQ(labels, Labels(41, 7));
     field.toLabels(39, labels.data(), 3, KpBitfield::INSERT_SET);
-    EXPECT_EQ(labels[38], 3);
-    EXPECT_EQ(labels[39], 7);
+    EXPECT_EQ(std::tuple(labels[38], labels[39]), std::tuple(3, 7));
 }
 
 TEST(KpBitfield, filesHoldTheBytesOfTheBits)
@@ -248,20 +244,16 @@ TEST(KpBitfield, filesHoldTheBytesOfTheBits)
 
 TEST(KpBitfield, digestTakesAQuarterOfTheBitsAndTheLastWord)
 {
-    const struct {
-        unsigned long nBits;
-        Words words;
-        const char* digest;
-    } cases[] = {
+    const std::tuple<unsigned long, Words, const char*> cases[] = {
         {64, {0xFFFF6261, 0x12345678, 0x66656463}, "E80B5017098950FC58AAD83C8C14978E"},  // abcdef
         {104, {0xFF636261, 1, 2, 0xFFFFFF64}, "181C9F04920A0CAED5C51A8FF26DD8D1"},       // abcd and three zeros
     };
-    for (const auto& c : cases) {
-        KpBitfield field(c.nBits, KpBitfield::INIT_NONE);
-        std::copy(c.words.begin(), c.words.end(), field.data());
+    for (const auto& [nBits, words, digest] : cases) {
+        KpBitfield field(nBits, KpBitfield::INIT_NONE);
+        std::copy(words.begin(), words.end(), field.data());
         KpString text;
         field.md5(text);
-        EXPECT_STREQ(text.c_str(), c.digest);
+        EXPECT_STREQ(text.c_str(), digest);
     }
 }
 

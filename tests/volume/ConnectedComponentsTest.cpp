@@ -34,9 +34,7 @@ int expectAsDefined(std::vector<T> data, Dims dims, T low, T high, int neighbour
     const int added = CC::dbg_add, cleaned = CC::dbg_clean;
     EXPECT_EQ(CC::do_label(data.data(), labels.data(), table, low, high, dims.of, neighbours, labelMode), count);
     EXPECT_TRUE(labels == expected);
-    EXPECT_EQ(CC::dbg_add, added);
-    EXPECT_EQ(CC::dbg_clean, cleaned);
-    EXPECT_EQ(CC::dbg_merge, 0);
+    EXPECT_EQ(std::tuple(CC::dbg_add, CC::dbg_clean, CC::dbg_merge), std::tuple(added, cleaned, 0));
     EXPECT_EQ(table.size(), expectedTable.size());
     EXPECT_EQ(std::memcmp(table.data(), expectedTable.data(), sizeof(Component) * table.size()), 0);
     if constexpr (std::is_same_v<T, L>) {
@@ -82,23 +80,23 @@ template <typename T, typename L>
 void expectNoiseAsDefined()
 {
     unsigned seed = 0;
-    for (Dims dims : {Dims{{1, 1, 1}},
-                      {{1, 7, 3}},
-                      {{8, 5, 3}},
-                      {{9, 4, 3}},
-                      {{31, 3, 2}},
-                      {{32, 1, 5}},
-                      {{70, 2, 1}},
-                      {{64, 5, 4}},
-                      {{131, 9, 6}}})
+    const int sizes[][3] = {{1, 1, 1},  {1, 7, 3},  {8, 5, 3},  {9, 4, 3},  {31, 3, 2},
+                            {32, 1, 5}, {70, 2, 1}, {64, 5, 4}, {131, 9, 6}};
+    for (const auto& [nx, ny, nz] : sizes)
         for (double density : {0.001, 0.1, 0.5, 0.9, 0.999})
             for (int run : {1, 12})
                 for (int neighbours : {4, 5, 6, 8, 10, 18, 26})
                     for (int labelMode : {0, 1}) {
-                        SCOPED_TRACE(testing::Message() << dims.of[0] << ", " << density << ' ' << run << ' '
-                                                        << neighbours << ' ' << labelMode);
+                        const Dims dims{{nx, ny, nz}};
+                        SCOPED_TRACE(testing::Message()
+                                     << nx << ", " << density << ' ' << run << ' ' << neighbours << ' ' << labelMode);
                         expectAsDefined<T, L>(noise<T>(dims, density, run, ++seed), dims, 1, 3, neighbours, labelMode);
                     }
+}
+
+std::vector<double> valuesOf(const Component& c)
+{
+    return {1. * c.id, 1. * c.nVoxels, 1. * c.nSeeds, c.sum[0], c.sum[1], c.sum[2]};
 }
 
 /// Labels, as digits, of a plane given as text; any but ' ' is foreground.
@@ -167,10 +165,7 @@ TEST(KpConnectedComponents, startsFromZeroAndKeepsScratchSmall)
     ComponentTable table{Component{5, 5, 5, {5, 5, 5}}};
     table.resize(0);
     table.resize(1);
-    EXPECT_EQ(table[0].id, 0);
-    EXPECT_EQ(table[0].nVoxels, 0);
-    EXPECT_EQ(table[0].nSeeds, 0);
-    EXPECT_EQ(table[0].sum[2], 0);
+    EXPECT_EQ(valuesOf(table[0]), std::vector<double>(6));
     for (const int width : {1, 7, 8}) {
         const int dims[] = {width, 100, 1};
         std::vector<unsigned char> data(static_cast<std::size_t>(width) * 100);
@@ -203,9 +198,7 @@ TEST(KpConnectedComponents, measuresComponents)
     EXPECT_EQ(CC::labelCC(data, dims, 4, labels, 0, 0.5, 9, 0, 0, &table), 1);
     ASSERT_NE(labels, nullptr);
     EXPECT_EQ(table.size(), 2);
-    const Component& all = table[1];
-    EXPECT_EQ((std::vector<double>{1. * all.id, 1. * all.nVoxels, 1. * all.nSeeds, all.sum[0], all.sum[1], all.sum[2]}),
-              (std::vector<double>{1, 5, 3, 5, 3, 0}));
+    EXPECT_EQ(valuesOf(table[1]), (std::vector<double>{1, 5, 3, 5, 3, 0}));
     EXPECT_EQ(CC::labelCC(data, empty, 4, labels, 0, 1, 9, 0, 0, &table), 0);
     kpfree(labels);
 
@@ -213,9 +206,7 @@ TEST(KpConnectedComponents, measuresComponents)
     std::vector<int> huge(6);
     EXPECT_EQ(CC::labelLabelsHuge(values, dims, 8, huge.data(), 0, 0, table), 3);
     EXPECT_EQ(huge, (std::vector<int>{1, 1, 2, 3, 3, 2}));
-    EXPECT_EQ(table[1].nSeeds, 0);
-    EXPECT_EQ(table[2].nSeeds, 7);
-    EXPECT_EQ(table[3].nSeeds, 3);
+    EXPECT_EQ(std::tuple(table[1].nSeeds, table[2].nSeeds, table[3].nSeeds), std::tuple(0U, 7U, 3U));
     std::vector<unsigned short> few(6);
     EXPECT_EQ(CC::labelLabels(values, dims, 4, few.data(), 0, 0, table), 3);
     EXPECT_EQ(CC::compareComponents(table[0], table[1]), -1);
@@ -226,12 +217,10 @@ TEST(KpConnectedComponents, measuresComponents)
 TEST(KpConnectedComponents, roundsThresholds)
 {
     const double nan = std::numeric_limits<double>::quiet_NaN();
-    const struct {
-        double low;
-        const char* labels;
-    } cases[] = {{10.4, "0011"}, {10.5, "0001"}, {266, "0011"}, {1e300, "1111"}, {-1e300, "1111"}, {nan, "1111"}};
-    for (const auto& c : cases) {
-        EXPECT_EQ(labelled({0, 9, 10, 11}, 4, 4, c.low), c.labels) << c.low;
+    const std::pair<double, const char*> cases[] = {{10.4, "0011"},  {10.5, "0001"},   {266, "0011"},
+                                                    {1e300, "1111"}, {-1e300, "1111"}, {nan, "1111"}};
+    for (const auto& [low, labels] : cases) {
+        EXPECT_EQ(labelled({0, 9, 10, 11}, 4, 4, low), labels) << low;
     }
 }
 
@@ -257,16 +246,13 @@ TEST(KpConnectedComponents, cleansUpAliasesAndSmallOnes)
     table.resize(6);
     EXPECT_EQ(CC::cleanup_components(table, labels.data(), 6, 3, -1), 3);
     EXPECT_EQ(labels, (std::vector<unsigned short>{2, 1, 1, 0, 0, 0, 5}));
-    EXPECT_EQ(table[2].id, 2);
-    EXPECT_EQ(table[2].nVoxels, 5);
+    EXPECT_EQ(valuesOf(table[2]), (std::vector<double>{2, 5, 5, 0, 0, 0}));
     int huge[] = {5, 3};
     EXPECT_EQ(CC::cleanup_components(another, huge, 2, -1, 5), 2);
     EXPECT_EQ(huge[0] * 10 + huge[1], 10);
 
     Component nonRoot{1, 1, 2, {1, 2, 3}}, other{7, 10, 20, {10, 20, 30}};
     nonRoot.addAlias(other, 1);
-    EXPECT_EQ(other.id, 1);
-    EXPECT_EQ(nonRoot.nSeeds, 2);
-    EXPECT_EQ(nonRoot.nVoxels, 11);
-    EXPECT_EQ(nonRoot.sum[2] + other.sum[2], 33);
+    EXPECT_EQ(valuesOf(nonRoot), (std::vector<double>{1, 11, 2, 11, 22, 33}));
+    EXPECT_EQ(valuesOf(other), (std::vector<double>{1, 0, 0, 0, 0, 0}));
 }

@@ -75,6 +75,8 @@ Field morphed(const Field& src, const KpVec3i& dims, int reach, bool erodes, int
     return dst;
 }
 
+constexpr decltype(&KpMorphology::dilation2D_4) planar[][2] = {{KpMorphology::dilation2D_4, KpMorphology::erosion2D_4},
+                                                               {KpMorphology::dilation2D_8, KpMorphology::erosion2D_8}};
 constexpr double densities[] = {0.001, 0.02, 0.2, 0.5, 0.8, 0.98, 0.999};
 
 TEST(Morphology, equalsTheDefinitionForEveryRowWidth)
@@ -150,14 +152,11 @@ TEST(Morphology, planesAreOnePass)
             Volume volume = noise({width, height, 1}, densities[random() % std::size(densities)], random);
             const Field src = volume.field();
             Field dst;
-            const auto check = [&](auto* operation, int reach, bool erodes) {
-                operation(src, dst, dims);
-                EXPECT_TRUE(dst == volume.pass(reach, erodes).field()) << width << ' ' << height << ' ' << reach;
-            };
-            check(KpMorphology::dilation2D_4, 1, false);
-            check(KpMorphology::dilation2D_8, 2, false);
-            check(KpMorphology::erosion2D_4, 1, true);
-            check(KpMorphology::erosion2D_8, 2, true);
+            for (const int reach : {1, 2})
+                for (const bool erodes : {false, true}) {
+                    planar[reach - 1][erodes](src, dst, dims);
+                    EXPECT_TRUE(dst == volume.pass(reach, erodes).field()) << width << ' ' << height << ' ' << reach;
+                }
         }
 }
 
@@ -193,31 +192,26 @@ TEST(Morphology, nothingToDo)
 
 TEST(Morphology, withoutAWorkAreaSetsAllOrDoesWithout)
 {
-    const struct {
-        int width, reach;
-        bool fillsAll;
-    } cases[] = {{31, 3, false}, {32, 1, false}, {33, 1, true}, {32, 2, true}, {32, 3, true}};
+    const std::tuple<int, int, bool> cases[] = {
+        {31, 3, false}, {32, 1, false}, {33, 1, true}, {32, 2, true}, {32, 3, true}};
     std::mt19937 random(56);
-    for (const auto& c : cases)
+    for (const auto& [width, reach, fillsAll] : cases)
         for (bool erodes : {false, true}) {
-            const KpVec3i dims(c.width, 4, 1);
+            const KpVec3i dims(width, 4, 1);
             const Field src = noise(dims, 0.5, random).field();
-            const Field plain = morphed(src, dims, c.reach, erodes, 1, false);
+            const Field plain = morphed(src, dims, reach, erodes, 1, false);
             Field in3D(src.nBits(), Field::INIT_UNSET), inPlane(in3D);
             {
                 const kplib::test::FailingMalloc failing(0);
-                if (c.reach == 1)
-                    (erodes ? KpMorphology::erosion2D_4 : KpMorphology::dilation2D_4)(src, inPlane, {c.width, 4});
-                else
-                    (erodes ? KpMorphology::erosion2D_8 : KpMorphology::dilation2D_8)(src, inPlane, {c.width, 4});
+                planar[reach > 1][erodes](src, inPlane, {width, 4});
             }
             {
                 const kplib::test::FailingMalloc failing(1);  // the result takes the first
-                in3D = morphed(src, dims, c.reach, erodes, 1, true);
+                in3D = morphed(src, dims, reach, erodes, 1, true);
             }
-            EXPECT_TRUE(c.fillsAll ? !in3D.isAnyBitUnset() : in3D == plain) << c.width << ' ' << c.reach;
-            const bool fillsPlane = c.fillsAll && c.reach == 1;  // 8 neighbours need no area in aligned rows
-            EXPECT_TRUE(c.reach == 2 || (fillsPlane ? !inPlane.isAnyBitUnset() : inPlane == plain)) << c.width;
+            EXPECT_TRUE(fillsAll ? !in3D.isAnyBitUnset() : in3D == plain) << width << ' ' << reach;
+            const bool fillsPlane = fillsAll && reach == 1;  // 8 neighbours need no area in aligned rows
+            EXPECT_TRUE(reach == 2 || (fillsPlane ? !inPlane.isAnyBitUnset() : inPlane == plain)) << width;
         }
 }
 

@@ -33,8 +33,7 @@ void expectWhole(const KpNeighborIterator33& table, const std::vector<Weight>& w
             (d[0] < 0) + 2 * (d[0] > 0) + 4 * (d[1] < 0) + 8 * (d[1] > 0) + 16 * (d[2] < 0) + 32 * (d[2] > 0);
         EXPECT_EQ(table.borders()[i], border);
         const Weight weight = weights[static_cast<std::size_t>(13 + d[0] + 3 * d[1] + 9 * d[2])];
-        EXPECT_EQ(table.fweights()[i], weight);
-        EXPECT_EQ(table.iweights()[i], weight);
+        EXPECT_EQ(std::tuple(table.fweights()[i], table.iweights()[i]), std::tuple(weight, weight));
         offsets.insert(table.offsets()[i]);
     }
     EXPECT_EQ(offsets.size(), static_cast<std::size_t>(table.nNeighbors()));
@@ -44,22 +43,19 @@ void expectWhole(const KpNeighborIterator33& table, const std::vector<Weight>& w
 
 TEST(KpNeighborIterator33, holdsEachNeighborOnceInItsOrder)
 {
-    const struct {
-        int count, mostInPlane, mostSteps;  // absolute offsets of z, and of all
-        int firstOffset, lastOffset;
-    } cases[] = {{4, 0, 1, -10, 1},  {6, 1, 1, -200, 1},  {8, 0, 2, -11, 1},
-                 {10, 1, 2, -11, 1}, {18, 1, 2, -210, 1}, {26, 1, 3, -211, 1}};
-    for (const auto& c : cases) {
-        KpNeighborIterator33 table(c.count, dims);
+    // The count, the most absolute offsets of z and of all, the first and the last offset.
+    const std::tuple<int, int, int, int, int> cases[] = {{4, 0, 1, -10, 1},  {6, 1, 1, -200, 1},  {8, 0, 2, -11, 1},
+                                                         {10, 1, 2, -11, 1}, {18, 1, 2, -210, 1}, {26, 1, 3, -211, 1}};
+    for (const auto& [count, mostInPlane, mostSteps, firstOffset, lastOffset] : cases) {
+        KpNeighborIterator33 table(count, dims);
         const auto weights = randomWeights<short>(1, -5, 5);
         table.setWeights(weights.data(), 0);
         expectWhole(table, weights);
-        EXPECT_EQ(table.offsets()[0], c.firstOffset);
-        EXPECT_EQ(table.offsets()[c.count - 1], c.lastOffset);
-        for (int i = 0; i < c.count; ++i) {
+        EXPECT_EQ(std::tuple(table.offsets()[0], table.offsets()[count - 1]), std::tuple(firstOffset, lastOffset));
+        for (int i = 0; i < count; ++i) {
             const std::int8_t* const d = table.deltas()[i];
-            EXPECT_LE(std::abs(d[2]), c.mostInPlane);
-            EXPECT_LE(std::abs(d[0]) + std::abs(d[1]) + std::abs(d[2]), c.count == 10 && d[2] != 0 ? 1 : c.mostSteps);
+            EXPECT_LE(std::abs(d[2]), mostInPlane);
+            EXPECT_LE(std::abs(d[0]) + std::abs(d[1]) + std::abs(d[2]), count == 10 && d[2] != 0 ? 1 : mostSteps);
         }
     }
 }
@@ -87,11 +83,8 @@ TEST(KpNeighborIterator33, sortsAllByWeightAndTellsTheFirstPositive)
     floats[14] = 0.5F;
     KpNeighborIterator33 table(6, dims);
     table.setWeights(floats, 1);
-    EXPECT_EQ(table.offsets()[0], -1);
-    EXPECT_EQ(table.iweights()[0], INT32_MIN);
-    EXPECT_EQ(table.offsets()[1], 1);
-    EXPECT_EQ(table.iweights()[1], 0);
-    EXPECT_EQ(table.iweights()[5], 2);
+    EXPECT_EQ(std::tuple(table.offsets()[0], table.offsets()[1]), std::tuple(-1, 1));
+    EXPECT_EQ(std::tuple(table.iweights()[0], table.iweights()[1], table.iweights()[5]), std::tuple(INT32_MIN, 0, 2));
     EXPECT_EQ(table.sort_fweights(), 1);
     EXPECT_EQ(table.sort_iweights(), 2);
     KpNeighborIterator33 unlisted(7, dims);

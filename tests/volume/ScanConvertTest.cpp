@@ -87,11 +87,7 @@ TEST(KpScanConvert, agreesWithTheEvenOddRuleAtEachPixel)
 TEST(KpScanConvert, reportsMiddlesOfPixelsWithinTheWindow)
 {
     constexpr float inf = std::numeric_limits<float>::infinity(), NaN = std::numeric_limits<float>::quiet_NaN();
-    const struct {
-        const char* what;
-        Polygon polygon;
-        std::vector<std::string> expected;
-    } cases[] = {
+    const std::tuple<const char*, Polygon, std::vector<std::string>> cases[] = {
         {"between the middles", {{0.6F, 0.6F}, {1.4F, 0.6F}, {1.4F, 1.4F}, {0.6F, 1.4F}}, {"....", "....", "...."}},
         {"two vertices", {{0, 0}, {4, 4}}, {"....", "....", "...."}},
         {"notch from above",
@@ -100,9 +96,9 @@ TEST(KpScanConvert, reportsMiddlesOfPixelsWithinTheWindow)
         {"far beyond", {{-3e9F, -3e9F}, {3e9F, -3e9F}, {3e9F, 3e9F}, {-3e9F, 3e9F}}, {"####", "####", "####"}},
         {"not finite", {{NaN, 0}, {2, NaN}, {inf, 1}, {-inf, 3}, {1, inf}, {1, -inf}}, {}},
     };
-    for (const auto& c : cases) {
-        const Raster raster = scanned(c.polygon, 4, 3);
-        EXPECT_TRUE(c.expected.empty() || raster.rows == c.expected) << c.what;
+    for (const auto& [what, polygon, expected] : cases) {
+        const Raster raster = scanned(polygon, 4, 3);
+        EXPECT_TRUE(expected.empty() || raster.rows == expected) << what;
     }
 }
 
