@@ -46,11 +46,8 @@ TEST(Crc, ofEveryPathEqualsTheDefinition)
         const Bytes bytes = noise(start + n);  // of exact size, so that a read past the end shows
         const auto before = static_cast<std::uint32_t>(n * 0x9E3779B9);
         const std::uint32_t expected = crcOfBits(before, bytes.data() + start, n);
-        for (const auto& path : crcPaths()) {
-            if (path.usable) {
-                ASSERT_EQ(path.run(before, bytes.data() + start, n), expected) << path.name << ' ' << n;
-            }
-        }
+        for (const auto& path : crcPaths())
+            ASSERT_TRUE(!path.usable || path.run(before, bytes.data() + start, n) == expected) << path.name << ' ' << n;
     }
 }
 

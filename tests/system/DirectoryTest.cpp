@@ -13,10 +13,7 @@
 #include <fcntl.h>
 #include <sys/stat.h>
 
-using kplib::test::contentOf;
-using kplib::test::LogCapture;
-using kplib::test::namesIn;
-using kplib::test::TempFolder;
+using namespace kplib::test;
 
 namespace {
 
@@ -77,8 +74,7 @@ TEST_F(KpDirectoryTest, timesCountFrom1601)
     KpDArray<unsigned long long> created;
     names.append(KpString("old"));
     EXPECT_EQ(KpDirectory::scanSortedByCreationTime(tree.c_str(), names, &created, nullptr, false), 8);
-    ASSERT_EQ(names.size(), 8);
-    ASSERT_EQ(created.size(), 8);
+    ASSERT_EQ(std::tuple(names.size(), created.size()), std::tuple(8, 8));
     EXPECT_TRUE(std::is_sorted(created.begin(), created.end()));
 }
 
@@ -96,7 +92,7 @@ TEST_F(KpDirectoryTest, whatIsNoFolderIsOneLine)
         EXPECT_EQ(KpDirectory::scan(path.c_str(), infos, "*", false), 0);
         EXPECT_EQ(KpDirectory::copy(path.c_str(), (temp / "target").c_str()), -1);
         EXPECT_TRUE(infos.empty());
-        EXPECT_EQ(LogCapture::lines(), kplib::test::Lines(4, "E [] Can't open dir " + path + "\n"));
+        EXPECT_EQ(LogCapture::lines(), Lines(4, "E [] Can't open dir " + path + "\n"));
     }
     EXPECT_TRUE(KpDirectory::isDirectory((temp / "tree/link").c_str()));
     EXPECT_FALSE(KpDirectory::isDirectory(nullptr));
@@ -108,8 +104,7 @@ TEST_F(KpDirectoryTest, treesAreCopied)
     chmod((temp / "tree/sub").c_str(), 0700);
     ASSERT_EQ(mkfifo((temp / "tree/pipe").c_str(), 0600), 0);
     ASSERT_EQ(KpDirectory::copy(tree.c_str(), copy.c_str()), 0);
-    EXPECT_EQ(LogCapture::lines(),
-              kplib::test::Lines{"E [] Can't copy " + tree + "/pipe: not a file, folder or link\n"});
+    EXPECT_EQ(LogCapture::lines(), Lines{"E [] Can't copy " + tree + "/pipe: not a file, folder or link\n"});
     ASSERT_EQ(KpDirectory::copy(tree.c_str(), copy.c_str()), 0);
     EXPECT_EQ(KpDirectory::copy(tree.c_str(), copy.c_str()), -1);  // nested already
     for (const std::string& made : {copy, nested}) {
@@ -148,7 +143,7 @@ TEST_F(KpDirectoryTest, treesAreRemovedButNotWhatLinksLeadTo)
     EXPECT_TRUE(!isRoot || seteuid(0) == 0);
     const std::string cannot = "E [] Can't delete " + temp / "closed";
     EXPECT_EQ(LogCapture::lines(),
-              (kplib::test::Lines{cannot + "/within:\nPermission denied\n", cannot + ":\nDirectory not empty\n"}));
+              (Lines{cannot + "/within:\nPermission denied\n", cannot + ":\nDirectory not empty\n"}));
     chmod((temp / "closed/within").c_str(), 0700);
     LogCapture::lines().clear();
     EXPECT_NE(remove_dir("/proc/self/fdinfo"), 0);  // where nothing can be deleted
@@ -161,8 +156,7 @@ TEST_F(KpDirectoryTest, freeSpaceAsksTheFolderOfAPath)
     EXPECT_GT(KpDirectory::freeSpace((temp.path + "\\missing").c_str()), 0);
     EXPECT_EQ(KpDirectory::freeSpace("/proc/x"), 0);
     EXPECT_EQ(KpDirectory::freeSpace("tree"), -1);
-    EXPECT_EQ(LogCapture::lines(),
-              (kplib::test::Lines{warning, warning, warning, "E [] Could not determine free disk space\n"}));
+    EXPECT_EQ(LogCapture::lines(), (Lines{warning, warning, warning, "E [] Could not determine free disk space\n"}));
 }
 
 TEST_F(KpDirectoryTest, theCollectorGoesDownFromTheLastName)
@@ -206,8 +200,7 @@ TEST_F(KpDirectoryTest, temporaryFoldersAreUniqueAndGo)
         KpTmpDir dir("gone", true, true), kept("kept", true, false);
         temp.file("tmp/gone/file");
         EXPECT_FALSE(dir.create(0700));  // is there
-        EXPECT_TRUE(dir.doesExist());
-        EXPECT_TRUE(kept.doesExist());
+        EXPECT_EQ(std::tuple(dir.doesExist(), kept.doesExist()), std::tuple(true, true));
         EXPECT_EQ(kept.remove(), 0);
         EXPECT_FALSE(kept.doesExist());
     }

@@ -8,8 +8,7 @@
 #include <gtest/gtest.h>
 
 namespace fs = std::filesystem;
-using kplib::test::Lines;
-using kplib::test::LogCapture;
+using namespace kplib::test;
 
 namespace {
 
