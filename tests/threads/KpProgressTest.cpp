@@ -51,9 +51,8 @@ TEST(KpProgress, nestedScopesShareOneScaleToTheirEnd)
     progress.setProgressInfo("c");
     progress.stopWorking();
     EXPECT_EQ(gui.take(), "\"c\" c0");
-    EXPECT_EQ(progress.currentProgressValue(), 10);
-    EXPECT_EQ(progress.globalMaximum(), 1);
-    EXPECT_FALSE(progress.isWorking());
+    EXPECT_EQ(std::tuple(progress.currentProgressValue(), progress.globalMaximum(), progress.isWorking()),
+              std::tuple(10, 1, false));
     progress.startWorking(1, "a");
     gui.take();
     progress.setFailed(KpResult(5000, "inner", "inner"), "bad");
@@ -76,8 +75,7 @@ TEST(KpProgress, cancelEndsAllWorkForGood)
     gui.cancelCallback();
     EXPECT_EQ(gui.take(), "\"a\" m4 c11") << "and no more values";
     progress.startWorking(4, "a");
-    EXPECT_TRUE(progress.isCanceled());
-    EXPECT_FALSE(progress.isWorking());
+    EXPECT_EQ(std::tuple(progress.isCanceled(), progress.isWorking()), std::tuple(true, false));
 }
 
 TEST(KpProgressThreads, aWorkerPollsWhatAnotherThreadCancels)

@@ -56,20 +56,18 @@ TEST(KpThreadThreads, runsAgainAfterItsEnd)
         --running;
         ++runs;
     });
-    EXPECT_FALSE(thread.finished());
-    EXPECT_FALSE(thread.running());
+    const auto state = [&] { return std::pair(thread.running(), thread.finished()); };
+    EXPECT_EQ(state(), std::pair(false, false));
     EXPECT_TRUE(thread.wait());
     for (int i = 1; i <= 3; ++i) {
         thread.start();
         begun.acquire();
-        EXPECT_TRUE(thread.running());
-        EXPECT_FALSE(thread.finished());
+        EXPECT_EQ(state(), std::pair(true, false));
         EXPECT_FALSE(thread.wait(0));
         go.release();
         if (i != 2) {  // 3 begins with the start that has to wait
             EXPECT_TRUE(thread.wait());
-            EXPECT_TRUE(thread.finished());
-            EXPECT_FALSE(thread.running());
+            EXPECT_EQ(state(), std::pair(false, true));
             EXPECT_EQ(runs, i);
         }
     }
