@@ -1,9 +1,7 @@
 #include "volume-road/dicom/DicomTree.h"
 
-#include <kplib/foundation/KpDArray.h>
 #include <kplib/foundation/KpString.h>
 #include <kplib/imaging/KpWindowLevel.h>
-#include <kplib/imaging/TmgDateTime.h>
 #include <kplib/imaging/TmgImages.h>
 
 #include <dcmtk/config/osconfig.h>
@@ -12,7 +10,6 @@
 
 #include <gtest/gtest.h>
 
-#include <cctype>
 #include <filesystem>
 #include <iostream>
 #include <memory>
@@ -104,29 +101,6 @@ TEST_F(Headers, windowsAreThoseOfTheFile)
     std::cout << windows << " windows\n";
 }
 
-TEST_F(Headers, datesAndTimesAreFormatted)
-{
-    int dates = 0, times = 0;
-    for (const auto& header : allHeaders()) {
-        SCOPED_TRACE(header->path);
-        std::string date, time;
-        if (textOf(*header, DCM_StudyDate, date) && date.size() == 8 && std::stol(date.substr(4, 2)) >= 1) {
-            const std::string text = Tmg::dateReformat(std::stol(date));
-            EXPECT_EQ(text.substr(0, 5) + text.substr(8), date.substr(0, 4) + "--" + date.substr(6));
-            EXPECT_EQ(Tmg::dateReformat(text), std::stol(date));
-            ++dates;
-        }
-        if (textOf(*header, DCM_StudyTime, time) && (time.size() == 6 || (time.size() > 6 && time[6] == '.'))) {
-            const std::string text = Tmg::timeReformat(time.c_str());
-            EXPECT_EQ(text, time.substr(0, 2) + ':' + time.substr(2, 2) + ':' + time.substr(4, 2));
-            const std::string key = Tmg::timeString(time, true);
-            EXPECT_EQ(key.find('.'), 8U) << key;
-            ++times;
-        }
-    }
-    std::cout << dates << " dates, " << times << " times\n";
-}
-
 TEST_F(Headers, numbersAreThoseOfTheFile)
 {
     int numbers = 0, frames = 0;
@@ -144,25 +118,6 @@ TEST_F(Headers, numbersAreThoseOfTheFile)
         frames += hasFrames;
     }
     std::cout << numbers << " instance numbers, " << frames << " objects of frames\n";
-}
-
-TEST_F(Headers, tagsOfTheVolumeAreApproximateUnlessConstant)
-{
-    for (const auto& header : allHeaders()) {
-        SCOPED_TRACE(header->path);
-        const HxParamBundle& all = *header->root.dicomAll();
-        for (const char* tag : {"G0008-0060", "G0018-0050", "G0020-0013", "G0008-0032", "G0020-1041"}) {
-            KpString value;
-            bool approximate = false;
-            const char* leaf = nullptr;
-            const bool isThere = all.findString(tag, leaf);
-            EXPECT_EQ(Tmg::imageLevelTag(header->root, 0, tag, value, approximate), isThere);
-            EXPECT_EQ(approximate, !Tmg::tagsConstantInVolume.contains(tag));
-            if (isThere && *header->root.findTag(tag, "")) {
-                EXPECT_STREQ(value, header->root.findTag(tag, ""));
-            }
-        }
-    }
 }
 
 /// The creator of the block in which a private element lies; empty without a reservation.
