@@ -19,7 +19,10 @@ namespace {
 
 std::string repeated(const std::string& text, int times)
 {
-    return times > 0 ? text + repeated(text, times - 1) : "";
+    std::string all;
+    while (times-- > 0)
+        all += text;
+    return all;
 }
 
 std::string changed(const std::string& text, void (KpFilename::*change)())
