@@ -218,7 +218,7 @@ KpResult scanSeries(const Choice& choice, KpProgressInterface& progress, Series&
     if (KpResult scanned = scanFolder(choice.folder, progress, scan); scanned.isBad() || progress.isCanceled())
         return scanned;
     SeriesEntry* entry = nullptr;
-    if (KpResult picked = pickSeries(choice, scan, entry); picked.isBad())
+    if (KpResult picked = pickSeries(choice, scan, entry); picked.isBad() || !entry)
         return picked;
     series.volumes = entry->volumes.size();
     series.skippedFiles = scan.otherFiles;

@@ -31,7 +31,10 @@ KpBox2f extentAlong(const Volume& volume, const KpVec3d& middle, const KpVec3d& 
 Picture cut(const Volume& shown, const Space& space, const KpBitfield& outline, const PatientAxis& right,
             const PatientAxis& down)
 {
-    const auto half = [&](int axis) { return static_cast<double>(shown.dims[static_cast<size_t>(axis)] / 2); };
+    const auto half = [&](int axis) {
+        const auto middleVoxel = shown.dims[static_cast<size_t>(axis)] / 2;
+        return static_cast<double>(middleVoxel);
+    };
     const KpVec3d middle = shown.slicePosition(shown.dims[2] / 2) + shown.axes[0] * (shown.spacing[0] * half(0)) +
                            shown.axes[1] * (shown.spacing[1] * half(1));
     const KpBox2f extent = extentAlong(shown, middle, right.direction, down.direction);

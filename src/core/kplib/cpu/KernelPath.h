@@ -14,9 +14,11 @@
 // it. There are none on other processors. KPLIB_PROCESSOR_HEADER is the header of inline code that each family of
 // processors has its own of.
 #if defined(__x86_64__)
+// NOLINTNEXTLINE(bugprone-macro-parentheses): it names a header
 #define KPLIB_PROCESSOR_HEADER(name) <kplib/cpu/name##X86.h>
 #define KPLIB_X86_ROWS(Function, name) std::span<const kplib::detail::KernelPath<Function>> name()
 #else
+// NOLINTNEXTLINE(bugprone-macro-parentheses): it names a header
 #define KPLIB_PROCESSOR_HEADER(name) <kplib/cpu/name##Any.h>
 #define KPLIB_X86_ROWS(Function, name)                                                                                 \
     inline std::span<const kplib::detail::KernelPath<Function>> name()                                                 \
