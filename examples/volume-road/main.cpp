@@ -12,8 +12,15 @@
 #include <dcmtk/config/osconfig.h>
 #include <dcmtk/oflog/oflog.h>
 
+#include <algorithm>
 #include <cmath>
 #include <cstdio>
+#include <cstdlib>
+#include <exception>
+#include <initializer_list>
+#include <iterator>
+#include <stdexcept>
+#include <string>
 
 namespace {
 

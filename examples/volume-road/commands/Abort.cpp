@@ -2,6 +2,7 @@
 
 #include <atomic>
 #include <chrono>
+#include <compare>
 #include <condition_variable>
 #include <csignal>
 #include <cstdio>

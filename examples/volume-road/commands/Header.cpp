@@ -3,6 +3,8 @@
 #include "Commands.h"
 #include "Load.h"
 
+#include <string>
+
 KpResult printHeader(const Job& job)
 {
     if (job.isJson) {

@@ -4,6 +4,10 @@
 
 #include <nlohmann/json.hpp>
 
+#include <array>
+#include <string>
+#include <vector>
+
 using Json = nlohmann::ordered_json;
 
 namespace {

@@ -3,6 +3,9 @@
 #include "Job.h"
 #include "Road.h"
 
+#include <string>
+#include <vector>
+
 /// The two stages that every command on a series begins with: its headers are read and its warnings are printed, then
 /// its voxels are read.
 void loadSeries(const Job& job, Road& road, KpProgressInterface& progress, Series& series, Volume& volume,

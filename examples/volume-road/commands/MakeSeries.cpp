@@ -5,6 +5,9 @@
 #include "Load.h"
 #include "OutputFolder.h"
 
+#include <string>
+#include <vector>
+
 KpResult makeSeries(const Job& job, KpProgressInterface& progress)
 {
     Volume volume;

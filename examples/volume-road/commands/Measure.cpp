@@ -13,6 +13,14 @@
 #include <kplib/geometry/shapes/KpLine2D.h>
 #include <kplib/threads/ProgressScope.h>
 
+#include <algorithm>
+#include <array>
+#include <cmath>
+#include <optional>
+#include <string>
+#include <utility>
+#include <vector>
+
 namespace {
 
 void drawLine(Picture& picture, const std::vector<KpVec2f>& points, double pixel)

@@ -12,6 +12,9 @@
 #include <kplib/threads/ProgressScope.h>
 
 #include <cstdio>
+#include <optional>
+#include <string>
+#include <vector>
 
 namespace {
 

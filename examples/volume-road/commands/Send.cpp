@@ -8,6 +8,7 @@
 
 #include <cstdio>
 #include <netdb.h>
+#include <string>
 
 namespace {
 

@@ -5,6 +5,8 @@
 
 #include <sys/socket.h>
 
+#include <string>
+
 KpResult serve(const Job& job)
 {
     OutputFolder out;

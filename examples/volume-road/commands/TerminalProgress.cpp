@@ -3,6 +3,7 @@
 #include "Abort.h"
 
 #include <cstdio>
+#include <functional>
 #include <unistd.h>
 
 TerminalProgress::TerminalProgress() : isTerminal_(isatty(STDERR_FILENO) != 0) {}

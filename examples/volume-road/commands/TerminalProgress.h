@@ -3,6 +3,8 @@
 #include <kplib/foundation/KpString.h>
 #include <kplib/threads/KpProgressGuiInterface.h>
 
+#include <string>
+
 /// Shows progress on standard error: a bar on a terminal, a line a stage elsewhere. A signal cancels the job at its
 /// next step.
 class TerminalProgress : public KpProgressGuiInterface {

@@ -4,6 +4,8 @@
 #include <dcmtk/dcmdata/dctk.h>
 
 #include <algorithm>
+#include <cmath>
+#include <vector>
 
 namespace {
 

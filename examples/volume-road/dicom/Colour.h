@@ -2,6 +2,8 @@
 
 #include "Image.h"
 
+#include <string>
+
 class DcmItem;
 
 /// The pixels of a colour plane as red, green and blue bytes. `photometric` and `isPlanar` describe `pixels`, a whole

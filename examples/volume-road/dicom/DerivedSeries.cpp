@@ -11,6 +11,9 @@
 #include <dcmtk/dcmdata/dctk.h>
 
 #include <algorithm>
+#include <array>
+#include <initializer_list>
+#include <vector>
 
 namespace {
 

@@ -3,6 +3,9 @@
 #include <dcmtk/config/osconfig.h>
 #include <dcmtk/dcmdata/dctk.h>
 
+#include <array>
+#include <cstdlib>
+
 void put(DcmItem& item, const DcmTag& tag, const char* text)
 {
     item.putAndInsertString(tag, text);

@@ -2,6 +2,8 @@
 
 #include "Image.h"
 
+#include <vector>
+
 class DcmPixelData;
 
 /// The bytes of the compressed frame of a plane: its fragments, joined. Empty if they cannot be found.

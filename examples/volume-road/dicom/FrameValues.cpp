@@ -1,8 +1,11 @@
 #include "FrameValues.h"
 
+#include <algorithm>
 #include <charconv>
 #include <cmath>
 #include <cstdlib>
+#include <initializer_list>
+#include <vector>
 
 namespace {
 

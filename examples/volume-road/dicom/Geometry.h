@@ -2,6 +2,10 @@
 
 #include "Image.h"
 
+#include <array>
+#include <string>
+#include <vector>
+
 /// Where the planes of a volume lie, in order of their places.
 struct Geometry {
     KpVec3d origin{0, 0, 0};

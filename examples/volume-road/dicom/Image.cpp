@@ -4,6 +4,8 @@
 #include "Mosaic.h"
 
 #include <algorithm>
+#include <cmath>
+#include <initializer_list>
 
 namespace {
 

@@ -8,6 +8,7 @@
 #include <dcmtk/dcmdata/dctk.h>
 
 #include <openjpeg.h>
+#include <vector>
 
 #include <algorithm>
 #include <cstring>

@@ -2,6 +2,8 @@
 
 #include "Image.h"
 
+#include <string>
+
 class DcmPixelData;
 
 /// Whether a transfer syntax of this UID holds JPEG 2000 codestreams.

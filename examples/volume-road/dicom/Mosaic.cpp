@@ -2,9 +2,12 @@
 
 #include "FrameValues.h"
 
+#include <algorithm>
 #include <cmath>
+#include <cstdlib>
 #include <cstring>
 #include <optional>
+#include <string>
 
 namespace {
 

@@ -2,6 +2,8 @@
 
 #include "Image.h"
 
+#include <vector>
+
 class DcmItem;
 
 /// The slices of a mosaic: one image in which the slices of a volume stand side by side as tiles. The private header of

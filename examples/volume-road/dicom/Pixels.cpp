@@ -12,6 +12,8 @@
 #include <dcmtk/dcmjpls/djdecode.h>
 
 #include <cstring>
+#include <type_traits>
+#include <utility>
 
 namespace {
 

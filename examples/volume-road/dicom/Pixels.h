@@ -3,6 +3,7 @@
 #include "Image.h"
 
 #include <memory>
+#include <string>
 
 class DcmFileFormat;
 class DcmPixelData;

@@ -9,8 +9,11 @@
 
 #include <algorithm>
 #include <filesystem>
+#include <iterator>
 #include <map>
 #include <system_error>
+#include <tuple>
+#include <utility>
 
 namespace fs = std::filesystem;
 

@@ -4,6 +4,9 @@
 
 #include <kplib/threads/KpProgressInterface.h>
 
+#include <string>
+#include <vector>
+
 /// The images of one series below a folder, in its volumes.
 struct SeriesEntry {
     std::string uid, description, modality;

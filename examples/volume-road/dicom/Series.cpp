@@ -13,6 +13,9 @@
 #include <dcmtk/dcmdata/dctk.h>
 
 #include <algorithm>
+#include <array>
+#include <tuple>
+#include <utility>
 
 namespace {
 

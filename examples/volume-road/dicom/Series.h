@@ -6,6 +6,9 @@
 
 #include <kplib/param/HxParamBundle.h>
 
+#include <string>
+#include <vector>
+
 /// One volume of a series: its planes in order, and what was found about it.
 struct Series {
     std::vector<Image> planes;

@@ -1,10 +1,13 @@
 #include "Split.h"
 
 #include <algorithm>
+#include <compare>
 #include <cstdlib>
 #include <map>
 #include <optional>
 #include <set>
+#include <tuple>
+#include <utility>
 
 namespace {
 

@@ -2,6 +2,9 @@
 
 #include "Image.h"
 
+#include <string>
+#include <vector>
+
 /// The planes of one volume, sorted by their places, and what distinguishes it from others of its series.
 struct Part {
     std::vector<Image> planes;

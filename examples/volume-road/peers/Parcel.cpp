@@ -9,9 +9,12 @@
 #include <kplib/rawdata/TmDataAccess.h>
 
 #include <algorithm>
+#include <array>
 #include <cmath>
 #include <cstring>
+#include <iterator>
 #include <memory>
+#include <vector>
 
 namespace {
 

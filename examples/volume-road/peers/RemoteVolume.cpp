@@ -7,6 +7,7 @@
 #include <kplib/threads/KpWorkerThread.h>
 #include <kplib/threads/ProgressScope.h>
 
+#include <array>
 #include <atomic>
 
 namespace {

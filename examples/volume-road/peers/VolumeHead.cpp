@@ -1,5 +1,8 @@
 #include "VolumeHead.h"
 
+#include <string>
+#include <vector>
+
 namespace {
 
 void writeTexts(TmMsg& msg, const std::vector<std::string>& texts)

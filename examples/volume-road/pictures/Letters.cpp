@@ -1,6 +1,10 @@
 #include "Letters.h"
 
 #include <algorithm>
+#include <initializer_list>
+#include <iterator>
+#include <string>
+#include <utility>
 
 namespace {
 

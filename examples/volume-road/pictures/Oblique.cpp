@@ -7,6 +7,7 @@
 #include <kplib/geometry/KpPlane.h>
 
 #include <algorithm>
+#include <vector>
 
 namespace {
 

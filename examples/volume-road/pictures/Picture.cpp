@@ -5,6 +5,7 @@
 #include <kplib/rawdata/KpRawData.h>
 
 #include <png.h>
+#include <string>
 
 Picture::Picture(long w, long h) : width(w), height(h)
 {

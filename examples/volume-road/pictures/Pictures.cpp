@@ -4,6 +4,9 @@
 
 #include <kplib/geometry/KpMat4f.h>
 
+#include <algorithm>
+#include <cmath>
+
 namespace {
 
 PatientAxis reversed(PatientAxis along)

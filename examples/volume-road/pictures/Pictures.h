@@ -2,6 +2,8 @@
 
 #include "Cut.h"
 
+#include <array>
+
 /// The axes of a volume in the order of the patient's: to the left, the back and the head.
 struct PatientAxis {
     size_t axis;

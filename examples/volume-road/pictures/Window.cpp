@@ -3,7 +3,9 @@
 #include <kplib/rawdata/KpRawData.h>
 
 #include <algorithm>
+#include <array>
 #include <cmath>
+#include <cstdlib>
 #include <cstring>
 
 namespace {

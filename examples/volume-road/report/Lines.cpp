@@ -6,6 +6,7 @@
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
+#include <utility>
 
 void Lines::add(const char* name, const KpString& text, Json value)
 {

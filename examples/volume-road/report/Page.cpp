@@ -8,6 +8,10 @@
 #include <kplib/geometry/KpMat4f.h>
 #include <kplib/rawdata/KpRawData.h>
 
+#include <array>
+#include <cmath>
+#include <string>
+#include <vector>
 #include <zlib.h>
 
 #include <algorithm>

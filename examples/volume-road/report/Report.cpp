@@ -5,6 +5,7 @@
 #include <kplib/imaging/KpSOPInstanceUtility.h>
 #include <kplib/imaging/TmgImages.h>
 
+#include <array>
 #include <fstream>
 
 namespace {

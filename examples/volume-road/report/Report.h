@@ -4,6 +4,9 @@
 #include "../volume/Segment.h"
 #include "Lines.h"
 
+#include <string>
+#include <vector>
+
 /// One stage of the road and how long it took.
 struct Stage {
     const char* name;

@@ -2,6 +2,8 @@
 
 #include <kplib/rawdata/KpRawData.h>
 
+#include <array>
+#include <cstdlib>
 #include <nifti1_io.h>
 
 #include <algorithm>

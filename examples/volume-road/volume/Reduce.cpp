@@ -3,6 +3,7 @@
 #include <kplib/rawdata/KpRawData.h>
 
 #include <algorithm>
+#include <vector>
 
 namespace {
 

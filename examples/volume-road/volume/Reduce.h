@@ -4,6 +4,8 @@
 
 #include <kplib/threads/KpProgressInterface.h>
 
+#include <array>
+
 // Volumes with fewer voxels, by whole factors along the axes; an axis that is shorter than its factor becomes one
 // voxel.
 

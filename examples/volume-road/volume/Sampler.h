@@ -6,6 +6,8 @@
 #include <kplib/geometry/KpVec3f.h>
 
 #include <algorithm>
+#include <array>
+#include <cmath>
 
 /// What the voxels cover in the system of the voxels (see Space), half a voxel around their middles: also a single
 /// slice has a thickness.

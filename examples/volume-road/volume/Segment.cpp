@@ -8,8 +8,11 @@
 #include <kplib/volume/KpMorphology.h>
 
 #include <algorithm>
+#include <array>
 #include <bit>
 #include <cmath>
+#include <cstdint>
+#include <vector>
 
 namespace {
 

@@ -3,6 +3,9 @@
 #include <kplib/geometry/numerics/KpPls.h>
 
 #include <algorithm>
+#include <cmath>
+#include <utility>
+#include <vector>
 
 namespace {
 

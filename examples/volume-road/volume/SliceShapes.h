@@ -7,6 +7,9 @@
 #include <kplib/geometry/shapes/Polygon2D.h>
 #include <kplib/volume/KpBitfield.h>
 
+#include <algorithm>
+#include <array>
+
 /// The middle slice of a volume of bytes with the outline of a region, in mm along its rows and columns.
 class MiddleSlice {
 public:

@@ -2,6 +2,8 @@
 
 #include <kplib/geometry/KpMat4f.h>
 
+#include <array>
+
 Space::Space(const std::string& frameUid, const Volume& volume) : patient(new KpFrameOfReference(frameUid))
 {
     voxels = patient->createChildSystem();

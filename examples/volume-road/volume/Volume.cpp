@@ -3,6 +3,7 @@
 #include <kplib/rawdata/KpRawData.h>
 
 #include <algorithm>
+#include <cmath>
 #include <limits>
 
 double Volume::sliceAt(double height) const
