@@ -64,33 +64,35 @@ void displayLinear(Volume& volume, const Window& window, Volume& shown)
     KpRawData::mapLinear(shown.voxels(), volume.voxels(), static_cast<unsigned long>(volume.count()), offset, scale);
 }
 
-void displaySigmoid(Volume& volume, const Window& window, Volume& shown)
+/// Calls `work(value, shown)` for each stored value, as a number, and the byte that shows it.
+template <typename Work>
+void eachVoxel(Volume& volume, Volume& shown, Work work)
 {
     KpDArray<double> values;
     values.resize(volume.sliceCount());
     for (long z = 0; z < volume.dims[2]; ++z) {
         KpRawData::memcpy({values.data(), KpPrimType::Double}, volume.slice(z), values.size());
         auto* const to = static_cast<unsigned char*>(shown.slice(z).data);
-        for (long i = 0; i < values.size(); ++i) {
-            const double v = values[i] * volume.slope + volume.intercept;
-            const double share = 1 / (1 + std::exp(-4 * (v - window.center) / window.width));
-            to[i] = static_cast<unsigned char>(std::lround(255 * (window.isInverted ? 1 - share : share)));
-        }
+        for (long i = 0; i < values.size(); ++i)
+            work(values[i], to[i]);
     }
+}
+
+void displaySigmoid(Volume& volume, const Window& window, Volume& shown)
+{
+    eachVoxel(volume, shown, [&](double value, unsigned char& to) {
+        const double v = value * volume.slope + volume.intercept;
+        const double share = 1 / (1 + std::exp(-4 * (v - window.center) / window.width));
+        to = static_cast<unsigned char>(std::lround(255 * (window.isInverted ? 1 - share : share)));
+    });
 }
 
 void blackenPadding(Volume& volume, Volume& shown)
 {
-    KpDArray<double> values;
-    values.resize(volume.sliceCount());
-    for (long z = 0; z < volume.dims[2]; ++z) {
-        KpRawData::memcpy({values.data(), KpPrimType::Double}, volume.slice(z), values.size());
-        auto* const to = static_cast<unsigned char*>(shown.slice(z).data);
-        for (long i = 0; i < values.size(); ++i) {
-            if (volume.padding.contains(values[i]))
-                to[i] = 0;
-        }
-    }
+    eachVoxel(volume, shown, [&](double value, unsigned char& to) {
+        if (volume.padding.contains(value))
+            to = 0;
+    });
 }
 
 }  // namespace

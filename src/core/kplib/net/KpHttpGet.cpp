@@ -27,7 +27,7 @@ std::string requestText(const std::string& host, const std::string& path, unsign
 
 }  // namespace
 
-// While one lives the descriptor stays open, so that no call of the system's meets a stranger's of the same number; a
+// While one lives the descriptor stays open, so that no system call meets another descriptor of the same number; a
 // connection that is closed meanwhile is shut down, which wakes the call, and closed in the end.
 class KpHttpGet::SocketInUse {
 public:

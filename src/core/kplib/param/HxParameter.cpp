@@ -74,7 +74,7 @@ void visitNumber(KpPrimType type, const void* values, long i, Work work)
     }
 }
 
-// Toward zero after adding 0.5, negative values too, and that is meant.
+// Toward zero after adding 0.5, negative values too. Intentional: callers depend on it.
 int rounded(double v)
 {
     v += 0.5;

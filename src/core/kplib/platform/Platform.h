@@ -28,7 +28,7 @@ WallTime wallTime();
 // The system's name, as in a build string.
 const char* name();
 
-// The system's version; zeros where it doesn't tell.
+// The system's version; zeros if it is unknown.
 struct Version {
     int major, minor, bugFix;
 };

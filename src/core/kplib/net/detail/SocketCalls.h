@@ -7,7 +7,7 @@ namespace kplib::detail {
 // As recv(). A time-out of the socket holds under a steady row of signals too, if only to within a factor of two.
 long receiveSome(int socket, char* buffer, long size, int flags);
 
-// Receives until `size` bytes have come, of which `received` tells the number so far. The result of the last recv():
+// Receives until `size` bytes have come, and counts them in `received`. The result of the last recv():
 // on failure below 1, 0 at the end of the stream.
 long receiveAll(int socket, char* buffer, long size, long& received);
 

@@ -20,7 +20,7 @@ template <int Size>
 class Mesh {
 public:
     // Holds the simplex of the last Size + 1 of `points`, whose circle contains whatever is put in. The points have to
-    // outlive the mesh; it is told how many there will be, and how far they spread.
+    // outlive the mesh; it receives their number and extent.
     Mesh(const Point<Size>* points, int n, float range, const Finder& finder) :
         points_(points), finder_(finder), expected_(n), range_(range)
     {
