@@ -25,9 +25,14 @@ if(KPLIB_CCACHE)
     set(CMAKE_CXX_COMPILER_LAUNCHER ${KPLIB_CCACHE})
 endif()
 
-# Nobody replaces the library's functions from outside, so they may be inlined.
+# The library's functions are not replaced from outside, so they may be inlined. In Release, paths in the objects start at
+# the source folder: builds in two folders give the same bytes.
 add_compile_options(-fno-math-errno -ffp-contract=off -fno-semantic-interposition -Wall -Wextra -Wpedantic -Wshadow
-                    -Wnon-virtual-dtor -Woverloaded-virtual -Wcast-align -Wundef -Werror)
+                    -Wnon-virtual-dtor -Woverloaded-virtual -Wcast-align -Wundef
+                    "$<$<CONFIG:Release>:-ffile-prefix-map=${PROJECT_SOURCE_DIR}=.>")
+if(KPLIB_WERROR)
+    add_compile_options(-Werror)
+endif()
 
 # What users may turn on for their own code, and so for the public headers.
 set(KPLIB_HEADER_WARNINGS -Wconversion -Wsign-conversion -Wdouble-promotion -Wold-style-cast)

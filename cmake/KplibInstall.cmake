@@ -1,15 +1,32 @@
-# The installed package: library, headers, find_package(kplib) and pkg-config files.
+# The installed package in two components: Runtime (the shared library and what loads with it) and Development (headers,
+# static library, find_package(kplib) and pkg-config files). `uninstall` removes what the last installation wrote.
 
 include(CMakePackageConfigHelpers)
 
-install(TARGETS kplib EXPORT kplibTargets FILE_SET HEADERS)
-install(EXPORT kplibTargets NAMESPACE kplib:: DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/kplib)
+install(TARGETS kplib EXPORT kplibTargets
+        LIBRARY COMPONENT Runtime NAMELINK_COMPONENT Development
+        ARCHIVE COMPONENT Development
+        FILE_SET HEADERS COMPONENT Development)
+install(EXPORT kplibTargets NAMESPACE kplib:: DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/kplib COMPONENT Development)
 
-configure_package_config_file(cmake/kplibConfig.cmake.in kplibConfig.cmake
+configure_package_config_file(${PROJECT_SOURCE_DIR}/cmake/kplibConfig.cmake.in kplibConfig.cmake
                               INSTALL_DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/kplib)
-write_basic_package_version_file(kplibConfigVersion.cmake COMPATIBILITY SameMajorVersion)
-install(FILES ${PROJECT_BINARY_DIR}/kplibConfig.cmake ${PROJECT_BINARY_DIR}/kplibConfigVersion.cmake
-        DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/kplib)
+set(compatibility SameMajorVersion)
+if(PROJECT_VERSION_MAJOR EQUAL 0)
+    set(compatibility SameMinorVersion)
+endif()
+write_basic_package_version_file(kplibConfigVersion.cmake COMPATIBILITY ${compatibility})
+install(FILES ${CMAKE_CURRENT_BINARY_DIR}/kplibConfig.cmake ${CMAKE_CURRENT_BINARY_DIR}/kplibConfigVersion.cmake
+        DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/kplib COMPONENT Development)
 
-configure_file(cmake/kplib.pc.in kplib.pc @ONLY)
-install(FILES ${PROJECT_BINARY_DIR}/kplib.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+# kplib.pc finds its prefix by its own place, so that a moved installation still works.
+set(pc_folder ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig)
+cmake_path(RELATIVE_PATH CMAKE_INSTALL_PREFIX BASE_DIRECTORY ${pc_folder} OUTPUT_VARIABLE to_prefix)
+cmake_path(RELATIVE_PATH CMAKE_INSTALL_FULL_LIBDIR BASE_DIRECTORY ${CMAKE_INSTALL_PREFIX} OUTPUT_VARIABLE libdir)
+cmake_path(RELATIVE_PATH CMAKE_INSTALL_FULL_INCLUDEDIR BASE_DIRECTORY ${CMAKE_INSTALL_PREFIX} OUTPUT_VARIABLE includedir)
+configure_file(${PROJECT_SOURCE_DIR}/cmake/kplib.pc.in kplib.pc @ONLY)
+install(FILES ${CMAKE_CURRENT_BINARY_DIR}/kplib.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT Development)
+
+if(PROJECT_IS_TOP_LEVEL)
+    add_custom_target(uninstall COMMAND ${CMAKE_COMMAND} -P ${PROJECT_SOURCE_DIR}/cmake/Uninstall.cmake VERBATIM)
+endif()

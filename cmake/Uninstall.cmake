@@ -1,0 +1,17 @@
+# cmake -P, in a build folder: removes the files that `cmake --install` listed in its manifests.
+
+file(GLOB manifests install_manifest*.txt)
+if(NOT manifests)
+    message(FATAL_ERROR "uninstall: no install_manifest.txt in this build folder; run cmake --install first")
+endif()
+foreach(manifest ${manifests})
+    file(STRINGS ${manifest} files)
+    foreach(file ${files})
+        set(path "$ENV{DESTDIR}${file}")
+        if(EXISTS ${path} OR IS_SYMLINK ${path})
+            message(STATUS "Removing ${path}")
+            file(REMOVE ${path})
+        endif()
+    endforeach()
+    file(REMOVE ${manifest})
+endforeach()
