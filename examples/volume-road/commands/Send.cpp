@@ -1,4 +1,4 @@
-#include "../peers/Parcel.h"
+#include "../peers/ParcelPictures.h"
 #include "../peers/Socket.h"
 #include "../volume/Reduce.h"
 #include "Commands.h"

@@ -1,4 +1,4 @@
-#include "../peers/Parcel.h"
+#include "../peers/ParcelPictures.h"
 #include "../peers/Socket.h"
 #include "Commands.h"
 #include "Load.h"

@@ -4,6 +4,7 @@
 #include "DicomTree.h"
 #include "Fragments.h"
 #include "Jpeg2000.h"
+#include "StoredValues.h"
 
 #include <dcmtk/config/osconfig.h>
 #include <dcmtk/dcmdata/dcrledrg.h>
@@ -11,73 +12,9 @@
 #include <dcmtk/dcmjpeg/djdecode.h>
 #include <dcmtk/dcmjpls/djdecode.h>
 
-#include <cstring>
-#include <type_traits>
 #include <utility>
 
 namespace {
-
-/// The stored bits as a number: cut out, and with their sign.
-template <typename Word>
-Word cutOut(Word from, const PixelFormat& format)
-{
-    const int unused = static_cast<int>(sizeof(Word)) * 8 - format.bitsStored;
-    const int below = format.highBit + 1 - format.bitsStored;
-    const Word bits = static_cast<Word>(static_cast<Word>(from >> below) << unused);
-    using Signed = std::make_signed_t<Word>;
-    return format.isSigned ? static_cast<Word>(static_cast<Signed>(bits) >> unused) : static_cast<Word>(bits >> unused);
-}
-
-/// The columns and rows of a frame that a plane covers.
-struct Region2D {
-    long left, top, columns, rows, frameColumns;
-
-    explicit Region2D(const Image& plane) : columns(plane.columns), rows(plane.rows)
-    {
-        frameColumns = columns * plane.tilesAcross;
-        left = plane.tile < 0 ? 0 : plane.tile % plane.tilesAcross * columns;
-        top = plane.tile < 0 ? 0 : plane.tile / plane.tilesAcross * rows;
-    }
-};
-
-template <typename Word, typename Stored>
-void copyWords(const unsigned char* pixels, const Image& plane, Stored* to)
-{
-    const Region2D region(plane);
-    for (long y = 0; y < region.rows; ++y) {
-        const auto* const row =
-            reinterpret_cast<const Word*>(pixels) + (region.top + y) * region.frameColumns + region.left;
-        for (long x = 0; x < region.columns; ++x) {
-            const Word bits = cutOut(row[x], plane.format);
-            *to++ = static_cast<Stored>(plane.format.isSigned ? static_cast<std::make_signed_t<Word>>(bits) : bits);
-        }
-    }
-}
-
-void copyValues(const unsigned char* pixels, const Image& plane, void* stored)
-{
-    const PixelFormat& format = plane.format;
-    switch (format.bitsAllocated) {
-    case 16:
-        if (format.isSigned)
-            copyWords<Uint16>(pixels, plane, static_cast<short*>(stored));
-        else
-            copyWords<Uint16>(pixels, plane, static_cast<unsigned short*>(stored));
-        break;
-    case 32:
-        if (format.isSigned)
-            copyWords<Uint32>(pixels, plane, static_cast<int*>(stored));
-        else
-            for (long i = 0; i < static_cast<long>(plane.rows) * plane.columns; ++i)
-                static_cast<double*>(stored)[i] = cutOut(reinterpret_cast<const Uint32*>(pixels)[i], format);
-        break;
-    default:
-        if (format.isSigned)
-            copyWords<Uint8>(pixels, plane, static_cast<short*>(stored));
-        else
-            copyWords<Uint8>(pixels, plane, static_cast<unsigned char*>(stored));
-    }
-}
 
 /// The bits of one frame as bytes. Frames follow each other without a gap, the lowest bit of a byte first.
 bool copyBits(DcmItem& data, const Image& plane, unsigned char* to)
@@ -205,20 +142,6 @@ KpResult PixelReader::read(const Image& plane, void* stored)
                          static_cast<unsigned char*>(stored));
     copyValues(pixels_.data(), plane, stored);
     return KpResult();
-}
-
-KpPrimType storedType(const PixelFormat& format)
-{
-    if (format.isColour())
-        return KpPrimType::Byte;
-    switch (format.bitsAllocated) {
-    case 16:
-        return format.isSigned ? KpPrimType::Short : KpPrimType::UShort;
-    case 32:
-        return format.isSigned ? KpPrimType::Int : KpPrimType::Double;
-    default:
-        return format.isSigned ? KpPrimType::Short : KpPrimType::Byte;
-    }
 }
 
 void registerDecoders()

@@ -36,8 +36,5 @@ private:
     KpDArray<unsigned char> pixels_;  // the frame, in words of its allocated bits
 };
 
-/// The element type that holds all values of a plane.
-KpPrimType storedType(const PixelFormat& format);
-
 /// Makes the decoders known to the DICOM toolkit; once, before the first file is read.
 void registerDecoders();

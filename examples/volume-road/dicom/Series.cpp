@@ -2,6 +2,7 @@
 
 #include "DicomTree.h"
 #include "Pixels.h"
+#include "StoredValues.h"
 
 #include <kplib/imaging/KpSOPInstanceUtility.h>
 #include <kplib/imaging/TmgImages.h>

@@ -1,9 +1,5 @@
 #include "Parcel.h"
 
-#include "../pictures/Oblique.h"
-#include "../pictures/Pictures.h"
-#include "../volume/Space.h"
-
 #include <kplib/foundation/KpHandle.h>
 #include <kplib/param/HxParameter.h>
 #include <kplib/rawdata/TmDataAccess.h>
@@ -261,15 +257,4 @@ KpResult readParcel(TmMsg& msg, Parcel& parcel)
     if (contentHash(parcel.volume) != Kp128{first, second})
         return badInput("the voxels aren't those that were sent: their digests differ");
     return KpResult();
-}
-
-KpResult writePictures(Parcel& parcel, const OutputFolder& out)
-{
-    Volume shown;
-    const Space space(parcel.frameUid, parcel.volume);
-    display(parcel.volume, parcel.window, shown);
-    KpResult written = writePlanes(shown, space, parcel.region.outline, out);
-    written << writeOblique(shown, space, parcel.region.outline, out);
-    written << writeOverview(shown, out, "overview.png");
-    return written;
 }

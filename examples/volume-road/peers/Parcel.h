@@ -1,6 +1,5 @@
 #pragma once
 
-#include "../commands/OutputFolder.h"
 #include "../pictures/Window.h"
 #include "../volume/Segment.h"
 
@@ -35,6 +34,3 @@ std::string hexadecimal(const Kp128& hash);
 void writeParcel(TmMsg& msg, Parcel& parcel);
 /// A failure if the message isn't whole, or if the voxels aren't those that were hashed.
 KpResult readParcel(TmMsg& msg, Parcel& parcel);
-
-/// The pictures of a parcel, which are the same on both sides.
-KpResult writePictures(Parcel& parcel, const OutputFolder& out);
