@@ -58,8 +58,7 @@ void copyValues(const unsigned char* pixels, const Image& plane, void* stored)
         if (format.isSigned)
             copyWords<std::uint32_t>(pixels, plane, static_cast<int*>(stored));
         else
-            for (long i = 0; i < static_cast<long>(plane.rows) * plane.columns; ++i)
-                static_cast<double*>(stored)[i] = cutOut(reinterpret_cast<const std::uint32_t*>(pixels)[i], format);
+            copyWords<std::uint32_t>(pixels, plane, static_cast<double*>(stored));
         break;
     default:
         if (format.isSigned)
