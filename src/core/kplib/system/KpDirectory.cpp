@@ -36,6 +36,13 @@ bool isWanted(const char* name, const char* pattern)
     return std::strcmp(name, ".") != 0 && std::strcmp(name, "..") != 0;
 }
 
+// Null at the end, with errno 0, or on a failure.
+const dirent* nextEntry(const Folder& folder)
+{
+    errno = 0;
+    return readdir(folder.get());
+}
+
 // Calls `visit` with the name of each wanted entry and with a question whether it is a folder.
 template <typename Visit>
 bool walk(const char* dir, const char* pattern, Visit visit)
@@ -45,11 +52,14 @@ bool walk(const char* dir, const char* pattern, Visit visit)
         getTheLogInstance().errorf("Can't open dir %s\n", dir ? dir : "");
         return false;
     }
-    while (const dirent* entry = readdir(folder.get())) {
+    while (const dirent* entry = nextEntry(folder)) {
         if (isWanted(entry->d_name, pattern))
             visit(entry->d_name, [&] { return kplib::platform::isFolder(dirfd(folder.get()), *entry); });
     }
-    return true;
+    const int failure = errno;
+    if (failure != 0)
+        getTheLogInstance().errorf("Can't read dir %s:\n%s\n", dir, std::strerror(failure));
+    return failure == 0;
 }
 
 KpString pathOf(const char* folder, const KpString& name)

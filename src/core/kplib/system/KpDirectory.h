@@ -9,7 +9,8 @@
 /// Lists, copies and measures folders.
 ///
 /// `pattern` is for kpWildMatch(). With one, names that begin with a dot are left out; without (null), only "." and
-/// "..". A link to a folder is no folder here. A folder that can't be opened is a line in the log.
+/// "..". A link to a folder is no folder here. A folder that can't be opened, or not read to its end, is a line in the
+/// log.
 class KPLIB_API KpDirectory {
 public:
     struct FileInfo {
@@ -18,14 +19,15 @@ public:
         unsigned long long modificationTime;  ///< likewise
     };
 
-    /// Appends the names in `dir`, sorts all of `names` by bytes and gives their number, or -1.
+    /// Appends the names in `dir`, sorts all of `names` by bytes and gives their number. -1 if not all can be read;
+    /// those that were are appended.
     static long scanSortedByName(const char* dir, KpDArray<KpString>& names, const char* pattern = nullptr,
                                  bool onlyDirectories = false);
     /// The same with files and folders apart; false for -1.
     static bool scanSortedByName(const char* dir, KpDArray<KpString>& files, KpDArray<KpString>& directories,
                                  const char* pattern = nullptr);
     /// The names in `dir` and their times, in place of the content, sorted by name; those that can't be asked are left
-    /// out. Gives their number, 0 for a folder that can't be opened.
+    /// out. Gives their number, 0 for a folder that can't be opened; of one that can't be read to its end those before.
     static long scan(const char* dir, std::vector<FileInfo>& out, const char* pattern = nullptr,
                      bool onlyDirectories = false);
     /// As scan(), sorted by creationTime, the oldest first; `times`, if not null, receives it.
