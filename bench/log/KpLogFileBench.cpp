@@ -48,12 +48,12 @@ void logLine(benchmark::State& state, Write writeTo)
 {
     const std::unique_ptr<KpLogFile> log(KpLogFile::createInstance());
     KpLogFilePrivate& record = kplib::detail::logRecord(*log);
-    record.file = std::fopen(path, "w");
+    record.file = open(path, O_CREAT | O_TRUNC | O_WRONLY | O_CLOEXEC, 0600);
     log->setMaxLogFileSizeInBytes(0);
     long lines = 0;
     for (auto _ : state) {
         writeTo(*log);
-        rewindNowAndThen(lines, [&] { std::rewind(record.file); });
+        rewindNowAndThen(lines, [&] { lseek(record.file, 0, SEEK_SET); });
     }
     if (record.bytesWritten != line.size() * static_cast<size_t>(state.iterations()))
         state.SkipWithError("wrong number of bytes");

@@ -13,9 +13,10 @@
 #include <memory>
 #include <regex>
 #include <string>
+#include <sys/mman.h>
 #include <thread>
 #include <tuple>
-#include <utility>
+#include <unistd.h>
 
 namespace {
 
@@ -31,23 +32,18 @@ class KpLogFileTest : public testing::Test {
 protected:
     KpLogFileTest()
     {
-        record.file = open_memstream(&text, &size);
+        record.file = memfd_create("log", 0);
         log->setDateTimeFormat(KpLogFile::NoDateTime);
     }
-    ~KpLogFileTest() override
+    // What was written since the last take().
+    std::string take() const
     {
-        log.reset();
-        std::free(text);
-    }
-    // What was flushed since the last take().
-    std::string take()
-    {
-        std::rewind(record.file);
-        return std::string(text, std::exchange(size, 0));
+        std::string text(static_cast<size_t>(lseek(record.file, 0, SEEK_CUR)), ' ');
+        EXPECT_EQ(pread(record.file, text.data(), text.size(), 0), lseek(record.file, 0, SEEK_CUR));
+        lseek(record.file, 0, SEEK_SET);
+        return text;
     }
 
-    char* text = nullptr;
-    size_t size = 0;
     std::unique_ptr<KpLogFile> log{KpLogFile::createInstance()};
     KpLogFilePrivate& record = kplib::detail::logRecord(*log);
 };
@@ -92,9 +88,9 @@ TEST_F(KpLogFileTest, linesGoWhereTheFlagsLead)
         {true, false, false, "E [] x\nraw", ""}, {true, false, true, "E [] x\nraw", "E [] x\nraw"},
         {true, true, false, "raw", "E [] x\n"},  {true, true, true, "raw", "E [] x\nraw"},
         {false, false, false, "", "E [] x\n"},   {false, false, true, "", "E [] x\nraw"}};
-    FILE* const file = record.file;
+    const int file = record.file;
     for (const auto& [hasFile, consoleToLog, logToConsole, toFile, toConsole] : cases) {
-        record.file = hasFile ? file : nullptr;
+        record.file = hasFile ? file : -1;
         record.consoleToLogEnabled = consoleToLog;
         record.logToConsoleEnabled = logToConsole;
         testing::internal::CaptureStdout();

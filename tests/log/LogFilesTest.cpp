@@ -118,6 +118,20 @@ TEST_F(LogFilesTest, whatCantBeOpenedLeavesTheLogUsable)
     EXPECT_TRUE(log->isOpen());
 }
 
+TEST_F(LogFilesTest, theNewFileStaysOpenWhateverTheCleanUpRemoves)
+{
+    clockRuns = 0;
+    ASSERT_TRUE(log->open(false));
+    log->setMaxNumLogFiles(2);
+    std::filesystem::remove(path());
+    std::filesystem::create_symlink(temp.folder("apart"),
+                                    folder + "/0.log");  // goes as the oldest, and the way with it
+    std::filesystem::create_symlink("0.log/file", path());
+    EXPECT_TRUE(log->open(true));
+    log->error(nullptr, "1");
+    EXPECT_EQ(contentOf(temp / "apart/file"), "E [] 1\n");
+}
+
 TEST_F(LogFilesTest, exhaustedMemoryLeavesAFileOpen)
 {
     ASSERT_TRUE(log->open(false));

@@ -3,10 +3,14 @@
 #include <kplib/foundation/KpString.h>
 #include <kplib/log/detail/KpLogFilePrivate.h>
 
+#include <algorithm>
+#include <cerrno>
 #include <cstdarg>
 #include <cstdio>
 #include <initializer_list>
 #include <string_view>
+#include <sys/uio.h>
+#include <unistd.h>
 
 namespace {
 
@@ -42,14 +46,35 @@ void traceFormatted(KpLogFile& log, KpLogLevel level, const char* module, const 
     log.trace(level, module, text);
 }
 
-// As one piece, also for others who write to the same stream.
-void put(std::string_view line, bool addsNewline, FILE* file)
+// Writes both texts in one call as far as the system does so; goes on after a signal and after a part. Gives the number
+// of bytes written, with the cause in errno if some are missing.
+std::size_t writeAll(int file, std::string_view text, std::string_view ending)
 {
-    flockfile(file);
-    std::fwrite(line.data(), 1, line.size(), file);
-    if (addsNewline)
-        putc_unlocked('\n', file);
-    funlockfile(file);
+    std::size_t done = 0;
+    while (done < text.size() + ending.size()) {
+        const std::string_view head = text.substr(std::min(done, text.size()));
+        const std::string_view tail = ending.substr(done - (text.size() - head.size()));
+        const iovec pieces[] = {{const_cast<char*>(head.data()), head.size()},
+                                {const_cast<char*>(tail.data()), tail.size()}};
+        const ssize_t n = writev(file, pieces, 2);
+        if (n > 0)
+            done += static_cast<std::size_t>(n);
+        else if (n == 0 || errno != EINTR)
+            break;
+    }
+    return done;
+}
+
+// As one piece and in order, also for other writers to the stream of standard output.
+std::size_t put(int destination, std::string_view text, std::string_view ending)
+{
+    if (destination != STDOUT_FILENO)
+        return writeAll(destination, text, ending);
+    flockfile(stdout);
+    std::fflush(stdout);
+    const std::size_t done = writeAll(destination, text, ending);
+    funlockfile(stdout);
+    return done;
 }
 
 }  // namespace
@@ -63,22 +88,18 @@ KpString KpLogFilePrivate::formatLine(KpLogLevel level, const char* module, cons
 
 void KpLogFilePrivate::write(std::string_view line)
 {
-    const bool addsNewline = !line.ends_with('\n');
-    const bool goesToFile = file && !consoleToLogEnabled;
-    if (goesToFile)
-        put(line, addsNewline, file);
-    if (!goesToFile || logToConsoleEnabled)
-        put(line, addsNewline, stdout);
-    bytesWritten += line.size() + addsNewline;
-    flush();
+    const std::string_view ending = line.ends_with('\n') ? "" : "\n";
+    const int destination = file >= 0 && !consoleToLogEnabled ? file : STDOUT_FILENO;
+    put(destination, line, ending);
+    bytesWritten += line.size() + ending.size();
+    if (destination != STDOUT_FILENO && logToConsoleEnabled)
+        put(STDOUT_FILENO, line, ending);
 }
 
-void KpLogFilePrivate::flush()
+void KpLogFilePrivate::flush() const
 {
-    if (!file || consoleToLogEnabled || logToConsoleEnabled)
+    if (file < 0 || consoleToLogEnabled || logToConsoleEnabled)
         std::fflush(stdout);
-    if (file)
-        std::fflush(file);
 }
 
 std::string_view KpLogFilePrivate::timeText(KpLogFile::DateTimeFormat format)
@@ -205,13 +226,12 @@ void KpLogFile::writeCharBuffer(const char* text)
 {
     const Lock lock(&record_->mutex);
     const std::string_view bytes = text ? text : "";
-    if (record_->file) {
-        put(bytes, false, record_->file);
+    if (record_->file >= 0) {
+        put(record_->file, bytes, "");
         record_->bytesWritten += bytes.size();
     }
     if (record_->logToConsoleEnabled)
-        put(bytes, false, stdout);
-    record_->flush();
+        put(STDOUT_FILENO, bytes, "");
 }
 
 void KpLogFile::flush()

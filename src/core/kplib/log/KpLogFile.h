@@ -95,8 +95,8 @@ public:
 
     // Files. Their names are time (to the second) and process; where such a file is there already it is continued.
 
-    /// Opens a new file in the base folder, closes the one that is open, and removes old ones. False if one is open
-    /// already, unless `force`, or if it can't be written, which leaves the log as it was.
+    /// Opens a new file in the base folder, closes the one that is open, and then removes old ones. False if one is
+    /// open already, unless `force`, or if the new one can't be written, which leaves the log as it was.
     bool open(bool force);
     /// Lines go to standard output from now on; filePath() stays.
     void close();

@@ -29,18 +29,14 @@ int openAside(const char* path, int mode)
     return descriptor;
 }
 
-// Leads standard output and standard error to a file or a device; leaves them as they are where that can't be opened.
-bool leadConsoleTo(const char* path, int mode)
+// Leads standard output and standard error to what is open at a descriptor, which it closes.
+void leadConsoleTo(int descriptor)
 {
-    const int descriptor = openAside(path, mode);
-    if (descriptor < 0)
-        return false;
     std::fflush(stdout);
     std::fflush(stderr);
     dup2(descriptor, STDOUT_FILENO);
     dup2(descriptor, STDERR_FILENO);
     ::close(descriptor);
-    return true;
 }
 
 }  // namespace
@@ -55,34 +51,33 @@ KpLogFilePrivate::KpLogFilePrivate() : baseFolder(KpTmpDir::getSystemTmpPath())
 
 bool KpLogFilePrivate::chunkIsFull() const
 {
-    return file && maxLogFileSizeInBytes != 0 && bytesWritten > maxLogFileSizeInBytes;
+    return file >= 0 && maxLogFileSizeInBytes != 0 && bytesWritten > maxLogFileSizeInBytes;
 }
 
-// Opens for appending, always: two files of one second have one name, and no line is lost to that.
-bool KpLogFilePrivate::openFile(KpFilename path)
+void KpLogFilePrivate::useFile(int descriptor, KpFilename path)
 {
     if (consoleToLogEnabled)
-        file = leadConsoleTo(path, O_CREAT | O_APPEND) ? stdout : nullptr;
-    else
-        file = std::fopen(path, "ae");
+        leadConsoleTo(descriptor);
+    file = consoleToLogEnabled ? STDOUT_FILENO : descriptor;
     filePath = std::move(path);
     bytesWritten = 0;
-    return file != nullptr;
 }
 
 void KpLogFilePrivate::closeFile()
 {
-    if (!file)
+    if (file < 0)
         return;
     if (consoleToLogEnabled) {
-        leadConsoleTo("/dev/tty", 0);  // where there is none, standard output stays on the file, and usable
+        // Without a terminal standard output stays on the file, and usable.
+        if (const int terminal = openAside("/dev/tty", 0); terminal >= 0)
+            leadConsoleTo(terminal);
         if (consoleFile)
             std::fclose(consoleFile);
         consoleFile = nullptr;
     }
-    if (file != stdout)
-        std::fclose(file);
-    file = nullptr;
+    if (file != STDOUT_FILENO)
+        ::close(file);
+    file = -1;
 }
 
 // Removes the oldest files: names sort by time. Intentional: one more than the excess goes, since open() counts the
@@ -103,24 +98,24 @@ void KpLogFilePrivate::cleanUp(std::string_view kept) const
 bool KpLogFile::open(bool force)
 {
     const Lock lock(&record_->mutex);
-    if (record_->file && !force)
+    if (record_->file >= 0 && !force)
         return false;
     KpString folder, name;
     KpFilename::generateFilePath(folder, name, record_->baseFolder.c_str(), record_->dateFoldersEnabled, false);
     if (folder.isEmpty())
         return false;
     KpFilename path = KpString(0, "%s/%s.log", folder.c_str(), name.c_str());
-    FILE* const test = std::fopen(path, "ae");
-    if (!test)
+    // For appending: two files of one second have one name, and no line is lost to that.
+    const int next = openAside(path, O_CREAT | O_APPEND);
+    if (next < 0)
         return false;
-    std::fclose(test);
-    const bool isContinued = path == record_->filePath;
-    // First, as it may run out of memory. A folder that cannot be read would be logged, into a file that may be full
+    record_->closeFile();
+    record_->useFile(next, std::move(path));
+    // Last, as it may run out of memory. A folder that cannot be read would be logged, into a file that may be full
     // and calls this function again for each line.
     if (KpDirectory::isDirectory(record_->baseFolder.c_str()))
-        record_->cleanUp(isContinued ? path.basename() : "");
-    record_->closeFile();
-    return record_->openFile(std::move(path));
+        record_->cleanUp(record_->filePath.basename());
+    return true;
 }
 
 void KpLogFile::close()
@@ -132,16 +127,17 @@ void KpLogFile::close()
 bool KpLogFile::append(KpString path)
 {
     const Lock lock(&record_->mutex);
-    record_->file = std::fopen(path, "ae");  // what was open stays so: the caller may have plans with it
-    record_->filePath = record_->file ? std::move(path) : KpString();
-    record_->bytesWritten = record_->file ? record_->filePath.fileSize() : 0;
-    return record_->file != nullptr;
+    record_->file = openAside(path, O_CREAT | O_APPEND);  // what was open stays so: the caller may have plans with it
+    const bool isOpen = record_->file >= 0;
+    record_->filePath = isOpen ? std::move(path) : KpString();
+    record_->bytesWritten = isOpen ? record_->filePath.fileSize() : 0;
+    return isOpen;
 }
 
 bool KpLogFile::isOpen() const
 {
     const Lock lock(&record_->mutex);
-    return record_->file != nullptr;
+    return record_->file >= 0;
 }
 
 KpFilename KpLogFile::filePath() const
@@ -224,7 +220,7 @@ void KpLogFile::setConsoleFlag(std::atomic<bool>& flag, bool enabled)
     const Lock lock(&record_->mutex);
     if (flag == enabled)
         return;
-    const bool wasOpen = record_->file != nullptr;
+    const bool wasOpen = record_->file >= 0;
     record_->closeFile();  // by the flag as it was
     flag = enabled;
     if (wasOpen)

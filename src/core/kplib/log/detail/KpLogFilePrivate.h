@@ -21,17 +21,18 @@ struct KpLogFilePrivate {
     KpString formatLine(KpLogLevel level, const char* module, const char* text);
     // Puts out the text, with a newline unless it ends in one.
     void write(std::string_view line);
-    void flush();
+    void flush() const;
     std::string_view timeText(KpLogFile::DateTimeFormat format);
     bool chunkIsFull() const;
-    bool openFile(KpFilename path);
+    // Goes on in the file that is open at `descriptor`; none may be open.
+    void useFile(int descriptor, KpFilename path);
     void closeFile();
     void cleanUp(std::string_view kept) const;
 
     KpMutex mutex{true};
     std::string baseFolder;
     bool dateFoldersEnabled = false;
-    FILE* file = nullptr;
+    int file = -1;  // descriptor; that of standard output when this leads to the file
     FILE* consoleFile = nullptr;
     KpFilename filePath;
     long maxNumLogFiles = 40;
