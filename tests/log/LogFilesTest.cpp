@@ -11,6 +11,7 @@
 
 #include <atomic>
 #include <climits>
+#include <csignal>
 #include <fcntl.h>
 #include <future>
 #include <map>
@@ -20,6 +21,7 @@
 #include <sstream>
 #include <sys/ioctl.h>
 #include <sys/mount.h>
+#include <sys/resource.h>
 #include <thread>
 #include <tuple>
 #include <vector>
@@ -63,6 +65,12 @@ protected:
     const std::string folder = temp / "logs";
     std::unique_ptr<KpLogFile> log{KpLogFile::createInstance()};
 };
+
+void setSizeLimit(rlim_t bytes)
+{
+    const rlimit limit{bytes, RLIM_INFINITY};
+    setrlimit(RLIMIT_FSIZE, &limit);
+}
 
 void say(const std::string& text)  // to standard output and standard error, past their buffers
 {
@@ -303,7 +311,48 @@ TEST_F(LogFilesTest, aFullDiskLosesOnlyWhatItRefuses)
     umount2(folder.c_str(), MNT_DETACH);
 }
 
+TEST_F(LogFilesTest, saysHowManyLinesWereLost)
+{
+    std::signal(SIGXFSZ, SIG_IGN);
+    ASSERT_TRUE(log->append(temp.file("file", "0\n").c_str()));
+    setSizeLimit(8);
+    for (const char* text : {"1", "2", "3"})
+        log->error(nullptr, text);
+    EXPECT_EQ(contentOf(path()), "0\nE [] 1");
+    setSizeLimit(RLIM_INFINITY);
+    log->error(nullptr, "4");
+    log->error(nullptr, "5");
+    EXPECT_EQ(contentOf(path()), "0\nE [] 1\nW [] 3 lines could not be written: File too large\nE [] 4\nE [] 5\n");
+}
+
 using LogFilesThreads = LogFilesTest;
+TEST_F(LogFilesThreads, signalsInterruptNoLine)
+{
+    int ends[2];
+    ASSERT_EQ(pipe(ends), 0);
+    ASSERT_TRUE(log->append(("/proc/self/fd/" + std::to_string(ends[1])).c_str()));
+    std::string received;
+    std::thread reader([&] {
+        sigset_t alarms;
+        sigfillset(&alarms);
+        pthread_sigmask(SIG_BLOCK, &alarms, nullptr);
+        char bytes[1 << 14];
+        for (ssize_t n = 0; (n = read(ends[0], bytes, sizeof(bytes))) > 0; usleep(3000))
+            received.append(bytes, static_cast<size_t>(n));
+    });
+    struct sigaction action {};  // without SA_RESTART
+    action.sa_handler = [](int) {};
+    sigaction(SIGALRM, &action, nullptr);
+    ualarm(1000, 1000);
+    log->error(nullptr, std::string(1 << 20, 'x').c_str());
+    ualarm(0, 0);
+    close(ends[1]);
+    log->close();
+    reader.join();
+    close(ends[0]);
+    EXPECT_EQ(received.size(), (1 << 20) + 6U);
+}
+
 TEST_F(LogFilesThreads, theCallbackRunsWithoutTheLock)
 {
     static KpLogFile* shared;

@@ -7,6 +7,7 @@
 #include <cerrno>
 #include <cstdarg>
 #include <cstdio>
+#include <cstring>
 #include <initializer_list>
 #include <string_view>
 #include <sys/uio.h>
@@ -88,12 +89,41 @@ KpString KpLogFilePrivate::formatLine(KpLogLevel level, const char* module, cons
 
 void KpLogFilePrivate::write(std::string_view line)
 {
+    reportLostLines();
     const std::string_view ending = line.ends_with('\n') ? "" : "\n";
     const int destination = file >= 0 && !consoleToLogEnabled ? file : STDOUT_FILENO;
-    put(destination, line, ending);
+    writeToFile(destination, line, ending);
     bytesWritten += line.size() + ending.size();
     if (destination != STDOUT_FILENO && logToConsoleEnabled)
         put(STDOUT_FILENO, line, ending);
+}
+
+bool KpLogFilePrivate::writeToFile(int destination, std::string_view text, std::string_view ending)
+{
+    const std::size_t done = put(destination, text, ending);
+    if (file < 0 || done == text.size() + ending.size())
+        return true;
+    causeOfLoss = errno;
+    ++linesLost;
+    endsInPart = endsInPart || done > 0;
+    return false;
+}
+
+// One line with the number of lost lines, tried before each line until the file takes it; but not at the head of a
+// file, where the name of the file before stands.
+void KpLogFilePrivate::reportLostLines()
+{
+    if (file < 0 || linesLost == 0 || bytesWritten == 0)
+        return;
+    const KpString text(0, "%ld lines could not be written: %s", linesLost, std::strerror(causeOfLoss));
+    const KpString line = joined({endsInPart ? "\n" : "", formatLine(KpLogWarning, nullptr, text), "\n"});
+    if (!writeToFile(consoleToLogEnabled ? STDOUT_FILENO : file, line, "")) {
+        --linesLost;  // the report is no line of a caller
+        return;
+    }
+    linesLost = 0;
+    endsInPart = false;
+    bytesWritten += static_cast<unsigned long long>(line.length());
 }
 
 void KpLogFilePrivate::flush() const
@@ -227,7 +257,7 @@ void KpLogFile::writeCharBuffer(const char* text)
     const Lock lock(&record_->mutex);
     const std::string_view bytes = text ? text : "";
     if (record_->file >= 0) {
-        put(record_->file, bytes, "");
+        record_->writeToFile(record_->file, bytes, "");
         record_->bytesWritten += bytes.size();
     }
     if (record_->logToConsoleEnabled)

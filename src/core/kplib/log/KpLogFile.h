@@ -21,7 +21,8 @@ KpLogFilePrivate& logRecord(KpLogFile& log);
 ///     14:03:59.120: W [Dicom] text
 ///
 /// An information line has a blank for its letter, and that is meant. Any thread may write; lines don't interleave.
-/// Nothing is reported of a failing file. Exhausted memory is an exception, with the log as good as before.
+/// A line that the open file does not take, as on a full disk, is lost; when writing works again, a warning in the file
+/// says how many were. The callback does not get it. Exhausted memory is an exception, with the log as good as before.
 class KPLIB_API KpLogFile {
 public:
     enum DateTimeFormat : int {

@@ -61,6 +61,7 @@ void KpLogFilePrivate::useFile(int descriptor, KpFilename path)
     file = consoleToLogEnabled ? STDOUT_FILENO : descriptor;
     filePath = std::move(path);
     bytesWritten = 0;
+    endsInPart = false;
 }
 
 void KpLogFilePrivate::closeFile()
@@ -131,6 +132,7 @@ bool KpLogFile::append(KpString path)
     const bool isOpen = record_->file >= 0;
     record_->filePath = isOpen ? std::move(path) : KpString();
     record_->bytesWritten = isOpen ? record_->filePath.fileSize() : 0;
+    record_->endsInPart = false;
     return isOpen;
 }
 

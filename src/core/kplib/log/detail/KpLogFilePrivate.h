@@ -21,6 +21,9 @@ struct KpLogFilePrivate {
     KpString formatLine(KpLogLevel level, const char* module, const char* text);
     // Puts out the text, with a newline unless it ends in one.
     void write(std::string_view line);
+    // False if the text and its ending do not arrive whole in the open file, which counts as a lost line.
+    bool writeToFile(int destination, std::string_view text, std::string_view ending);
+    void reportLostLines();
     void flush() const;
     std::string_view timeText(KpLogFile::DateTimeFormat format);
     bool chunkIsFull() const;
@@ -45,6 +48,9 @@ struct KpLogFilePrivate {
     KpLogFile::DateTimeFormat dateTimeFormat = KpLogFile::TimeOnly;
     KpString defaultModule;
     unsigned long long bytesWritten = 0;
+    long linesLost = 0;       // not reported yet
+    int causeOfLoss = 0;      // code of the last failed write
+    bool endsInPart = false;  // the file ends in the first part of a lost line
     bool timeStampSet = false;
     kplib::platform::WallTime timeStamp{};
 
