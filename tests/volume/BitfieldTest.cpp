@@ -239,7 +239,8 @@ TEST(KpBitfield, filesHoldTheBytesOfTheBits)
     EXPECT_FALSE(field.load(path.c_str(), 96));
     EXPECT_EQ(wordsOf(field), Words(4, 0));
     EXPECT_FALSE(field.save("/no/such/folder/bitfield"));
-    EXPECT_FALSE(KpBitfield(1 << 20, KpBitfield::INIT_SET).save("/dev/full"));
+    for (const unsigned long nBits : {1UL << 20, 9UL})
+        EXPECT_FALSE(KpBitfield(nBits, KpBitfield::INIT_SET).save("/dev/full"));
 }
 
 TEST(KpBitfield, digestTakesAQuarterOfTheBitsAndTheLastWord)

@@ -116,7 +116,7 @@ public:
     void toLabels(unsigned long n, unsigned char* labels, unsigned char label, InsertPolicy policy) const;
 
     /// Writes the (nBits + 7) / 8 bytes of the bits as they stand in memory: bit i in byte i / 8, least significant
-    /// first, and no size. False if the file can't be opened or not all bytes were taken; how closing went isn't asked.
+    /// first, and no size. False if the file can't be opened or the system doesn't take all bytes.
     bool save(const KpString& file) const;
     /// Becomes `nBits` bits as save() wrote them. False if the file can't be opened or is too short; bits that didn't
     /// come from it are unset.

@@ -34,7 +34,7 @@ void KpBitfield::print(KpString& out) const
 bool KpBitfield::save(const KpString& file) const
 {
     const File f(std::fopen(file.c_str(), "wb"));
-    return f && std::fwrite(bits_, 1, bytesFor(nBits_), f.get()) == bytesFor(nBits_);
+    return f && std::fwrite(bits_, 1, bytesFor(nBits_), f.get()) == bytesFor(nBits_) && std::fflush(f.get()) == 0;
 }
 
 bool KpBitfield::load(const KpString& file, unsigned long nBits)
