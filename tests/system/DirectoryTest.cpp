@@ -4,6 +4,7 @@
 #include <kplib/system/KpFilenameCollector.h>
 #include <kplib/system/KpTmpDir.h>
 
+#include <support/FailingMalloc.h>
 #include <support/LogCapture.h>
 #include <support/TempFolder.h>
 
@@ -11,6 +12,7 @@
 
 #include <algorithm>
 #include <fcntl.h>
+#include <memory>
 #include <sys/stat.h>
 
 using namespace kplib::test;
@@ -203,6 +205,15 @@ TEST_F(KpDirectoryTest, temporaryFoldersAreUniqueAndGo)
         EXPECT_EQ(std::tuple(dir.doesExist(), kept.doesExist()), std::tuple(true, true));
         EXPECT_EQ(kept.remove(), 0);
         EXPECT_FALSE(kept.doesExist());
+    }
+    for (long first = 0; first < 40; ++first) {  // without memory the folder may stay
+        auto gone = std::make_unique<KpTmpDir>("gone", true, true);
+        temp.file("tmp/gone/file");
+        {
+            const FailingMalloc failing(first);
+            gone.reset();
+        }
+        std::filesystem::remove_all(tmp + "gone");
     }
     EXPECT_EQ(namesIn(tmp), (std::set<std::string>{"x", "tmp", "tmp.2"}));
     setenv("TEMP", "/temp", 1);

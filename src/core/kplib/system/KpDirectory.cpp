@@ -215,8 +215,8 @@ long long KpDirectory::freeSpace(const char* path)
     return static_cast<long long>(status.f_frsize) * static_cast<long long>(status.f_bavail);
 }
 
-int remove_dir(const char* path)
-{
+int remove_dir(const char* path) noexcept
+try {
     if (!KpDirectory::isDirectory(path) || isLink(path))
         return -1;
     KpDArray<KpString> files, folders;
@@ -233,4 +233,6 @@ int remove_dir(const char* path)
         deleted(unlink(file), file);
     }
     return deleted(rmdir(path), path);
+} catch (...) {  // out of memory, for which destructors have no use
+    return -1;
 }

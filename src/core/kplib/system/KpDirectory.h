@@ -47,5 +47,5 @@ public:
 
 /// Deletes a folder with all that is in it; links are deleted, not followed. 0, or -1 if something stays: each entry
 /// that cannot be deleted and each folder within that cannot be read is an error in the log. A `path` that is no folder
-/// that can be read is -1 without one.
-KPLIB_API int remove_dir(const char* path);
+/// that can be read is -1 without one, and so is exhausted memory, which leaves what was not reached.
+KPLIB_API int remove_dir(const char* path) noexcept;

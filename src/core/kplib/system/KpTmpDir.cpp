@@ -21,8 +21,8 @@ KpTmpDir::KpTmpDir(const char* name, bool createNow, bool removeOnDestruction) :
 
 KpTmpDir::~KpTmpDir()
 {
-    if (removeOnDestruction_ && doesExist())
-        remove();
+    if (removeOnDestruction_)
+        remove_dir(path_);
 }
 
 void KpTmpDir::makeUnique(const char* name)

@@ -7,7 +7,7 @@
 class KPLIB_API KpTmpDir {
 public:
     /// Takes a new name by makeUnique(), and makes the folder if `createNow`; doesExist() tells whether that worked.
-    /// The destructor removes the folder with all that is in it if `removeOnDestruction`.
+    /// The destructor removes the folder by remove_dir() if `removeOnDestruction`.
     KpTmpDir(const char* name, bool createNow, bool removeOnDestruction);
     KpTmpDir(const KpTmpDir&) = delete;
     KpTmpDir& operator=(const KpTmpDir&) = delete;
