@@ -5,6 +5,7 @@
 
 #include <support/ExhaustedMemory.h>
 #include <support/LogCapture.h>
+#include <support/SizeLimit.h>
 #include <support/TempFolder.h>
 
 #include <gtest/gtest.h>
@@ -21,7 +22,6 @@
 #include <sstream>
 #include <sys/ioctl.h>
 #include <sys/mount.h>
-#include <sys/resource.h>
 #include <thread>
 #include <tuple>
 #include <vector>
@@ -65,12 +65,6 @@ protected:
     const std::string folder = temp / "logs";
     std::unique_ptr<KpLogFile> log{KpLogFile::createInstance()};
 };
-
-void setSizeLimit(rlim_t bytes)
-{
-    const rlimit limit{bytes, RLIM_INFINITY};
-    setrlimit(RLIMIT_FSIZE, &limit);
-}
 
 void say(const std::string& text)  // to standard output and standard error, past their buffers
 {
@@ -313,7 +307,6 @@ TEST_F(LogFilesTest, aFullDiskLosesOnlyWhatItRefuses)
 
 TEST_F(LogFilesTest, saysHowManyLinesWereLost)
 {
-    std::signal(SIGXFSZ, SIG_IGN);
     ASSERT_TRUE(log->append(temp.file("file", "0\n").c_str()));
     setSizeLimit(8);
     for (const char* text : {"1", "2", "3"})

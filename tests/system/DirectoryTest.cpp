@@ -6,6 +6,7 @@
 
 #include <support/FailingMalloc.h>
 #include <support/LogCapture.h>
+#include <support/SizeLimit.h>
 #include <support/TempFolder.h>
 
 #include <gtest/gtest.h>
@@ -123,6 +124,13 @@ TEST_F(KpDirectoryTest, treesAreCopied)
     }
     ASSERT_EQ(KpDirectory::copy(tree.c_str(), (temp / "tree/sub/inside").c_str()), 0);
     EXPECT_EQ(namesIn(temp / "tree/sub/inside/sub"), (std::set<std::string>{"deep", "g"}));
+    LogCapture::lines().clear();
+    setSizeLimit(9);
+    EXPECT_EQ(KpDirectory::copy((tree + "/sub").c_str(), (temp / "part").c_str()), 0);
+    setSizeLimit(RLIM_INFINITY);
+    const std::string cannot = "E [] Can't copy " + tree + "/sub/";
+    EXPECT_EQ(LogCapture::lines(), (Lines{cannot + "deep/f\n", cannot + "inside/sub/deep/f\n"}));
+    EXPECT_EQ(namesIn(temp / "part/deep"), std::set<std::string>());
 }
 
 TEST_F(KpDirectoryTest, treesAreRemovedButNotWhatLinksLeadTo)

@@ -2,6 +2,7 @@
 
 #include <kplib/system/KpTmpDir.h>
 
+#include <support/SizeLimit.h>
 #include <support/TempFolder.h>
 
 #include <gtest/gtest.h>
@@ -203,6 +204,14 @@ TEST(KpFilename, whatCantBeHadIsFalseOrNothing)
     EXPECT_TRUE(folder.isWriteable());
     EXPECT_EQ(std::tuple(folder.isDirectory(), file.isDirectory()), std::tuple(true, false));
     EXPECT_FALSE(folder.unlink() || folder.create(0600) || file.copy(folder) || file.copy((temp / "no/x").c_str()));
+    setSizeLimit(1);
+    EXPECT_FALSE(KpFilename("/proc/self/status").copy((temp / "half").c_str()));  // a write error
+    setSizeLimit(RLIM_INFINITY);
+    EXPECT_FALSE(KpFilename("/proc/self/mem").copy((temp / "half").c_str()));  // a read error
+    EXPECT_FALSE(file.copy("/dev/full") || !KpFilename("/dev/full").doesExist());
+    std::filesystem::create_symlink("led to", temp / "link");
+    EXPECT_FALSE(KpFilename("/proc/self/mem").copy((temp / "link").c_str()));
+    EXPECT_EQ(namesIn(temp.path), (std::set<std::string>{"dangling", "file", "led to", "link"}));
     const timespec times[] = {{111, 0}, {222, 999999999}};
     utimensat(AT_FDCWD, file, times, 0);
     EXPECT_EQ(std::tuple(file.getAccessTime(), file.getModTime()), std::tuple(111L, 222L));

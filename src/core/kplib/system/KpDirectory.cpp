@@ -73,21 +73,21 @@ unsigned long long since1601(std::time_t seconds)
     return static_cast<unsigned long long>(seconds) * unitsPerSecond + from1601To1970;
 }
 
+bool copyLink(const char* source, const char* target)
+{
+    char text[PATH_MAX] = "";
+    return readlink(source, text, sizeof(text) - 1) > 0 && symlink(text, target) == 0;
+}
+
 // Copies a file, or a link as a link. To open a pipe or a device might block for ever.
 void copyEntry(const KpString& source, const KpString& target)
 {
     struct stat status {};
-    if (lstat(source, &status) != 0)
-        return;
-    if (S_ISREG(status.st_mode)) {
-        KpFilename(source).copy(target);
-    } else if (S_ISLNK(status.st_mode)) {
-        char text[PATH_MAX] = "";
-        if (readlink(source, text, sizeof(text) - 1) > 0)
-            static_cast<void>(symlink(text, target) == 0);  // as with files, nothing says that one entry failed
-    } else {
+    const bool isKnown = lstat(source, &status) == 0;
+    if (isKnown && !S_ISREG(status.st_mode) && !S_ISLNK(status.st_mode))
         getTheLogInstance().errorf("Can't copy %s: not a file, folder or link\n", source.c_str());
-    }
+    else if (!isKnown || !(S_ISLNK(status.st_mode) ? copyLink(source, target) : KpFilename(source).copy(target)))
+        getTheLogInstance().errorf("Can't copy %s\n", source.c_str());
 }
 
 // Copies what is in `source` to the folder `target`, which it makes; `newFolder`, the outermost such one, is no part
@@ -109,8 +109,8 @@ int copyTree(const char* source, const char* target, const struct stat* newFolde
         const KpString path = pathOf(source, name);
         const bool isNew = newFolder && stat(path, &status) == 0 && status.st_dev == newFolder->st_dev &&
                            status.st_ino == newFolder->st_ino;
-        if (!isNew)
-            copyTree(path, pathOf(target, name), newFolder);
+        if (!isNew && copyTree(path, pathOf(target, name), newFolder) != 0)
+            getTheLogInstance().errorf("Can't copy %s\n", path.c_str());
     }
     return 0;
 }

@@ -38,8 +38,8 @@ public:
     /// Whether it can be opened as a folder, also by way of a link.
     static bool isDirectory(const char* path);
     /// Copies the folder `source` with all that is in it: as `target`, or into `target` where that is a folder. Links
-    /// are copied as links. Pipes, sockets and devices are left out, with one error in the log each. 0, also if single
-    /// entries fail, or -1 if the new folder cannot be made.
+    /// are copied as links. Pipes, sockets and devices are left out. 0, also if single entries are left out or fail,
+    /// each with an error in the log, or -1 if the new folder cannot be made.
     static int copy(const char* source, const char* target);
     /// Bytes that a user can write where the file `path` lies (its folder is asked); -1 if unknown.
     static long long freeSpace(const char* path);

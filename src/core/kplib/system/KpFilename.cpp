@@ -1,10 +1,11 @@
 #include <kplib/system/KpFilename.h>
 
+#include <cerrno>
 #include <cstdio>
 #include <fcntl.h>
-#include <memory>
 #include <sys/stat.h>
 #include <unistd.h>
+#include <utility>
 
 namespace {
 
@@ -18,19 +19,58 @@ struct Status : stat {
     bool isKnown;
 };
 
-struct CloseFile {
-    void operator()(FILE* file) const { std::fclose(file); }
-};
-using File = std::unique_ptr<FILE, CloseFile>;
+class Descriptor {
+public:
+    explicit Descriptor(int number) : number_(number) {}
+    Descriptor(const Descriptor&) = delete;
+    Descriptor& operator=(const Descriptor&) = delete;
+    ~Descriptor() { close(); }
+    operator int() const { return number_; }
+    // False if the system reports only now that something was not written.
+    bool close() { return number_ < 0 || ::close(std::exchange(number_, -1)) == 0; }
 
-void copyContents(FILE* from, FILE* to)
+private:
+    int number_;
+};
+
+// The call, again for as long as signals interrupt it.
+template <typename Call>
+ssize_t despiteSignals(Call call)
 {
-    char buffer[4096];
-    std::size_t count = 0;
-    do {
-        count = std::fread(buffer, 1, sizeof buffer, from);
-        std::fwrite(buffer, 1, count, to);
-    } while (count == sizeof buffer);
+    for (;;) {
+        const ssize_t n = call();
+        if (n >= 0 || errno != EINTR)
+            return n;
+    }
+}
+
+bool writeAll(int file, const char* bytes, ssize_t size)
+{
+    for (ssize_t done = 0, n = 0; done < size; done += n) {
+        n = despiteSignals([&] { return write(file, bytes + done, static_cast<std::size_t>(size - done)); });
+        if (n < 1)
+            return false;
+    }
+    return true;
+}
+
+bool copyContents(int from, int to)
+{
+    char buffer[1 << 16];
+    for (;;) {
+        const ssize_t n = despiteSignals([&] { return read(from, buffer, sizeof buffer); });
+        if (n < 1 || !writeAll(to, buffer, n))
+            return n == 0;
+    }
+}
+
+// Leaves no part of a copy: where a link leads to it, the file is empty.
+void removePart(const char* name)
+{
+    struct stat status {};
+    static_cast<void>(truncate(name, 0) == 0);
+    if (lstat(name, &status) == 0 && S_ISREG(status.st_mode))
+        unlink(name);
 }
 
 }  // namespace
@@ -112,16 +152,20 @@ bool KpFilename::rename(const char* newName)
 
 bool KpFilename::copy(const char* target) const
 {
-    const File from(std::fopen(c_str(), "rbe"));
-    if (!from)
+    const Descriptor from(open(c_str(), O_RDONLY | O_CLOEXEC));
+    if (from < 0)
         return false;
     if (Status(c_str()).isSameFile(Status(target)))
         return true;  // to open it for writing would lose it
-    File to(std::fopen(target, "wbe"));
-    if (!to)
+    Descriptor to(target ? open(target, O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666) : -1);
+    if (to < 0)
         return false;
-    copyContents(from.get(), to.get());
-    to.reset();
-    KpFilename(target).setMode(getMode());
-    return true;
+    struct stat status {};
+    const bool isWhole = copyContents(from, to) && fstat(from, &status) == 0;
+    if (isWhole)
+        fchmod(to, status.st_mode & 07777);
+    if (isWhole && to.close())
+        return true;
+    removePart(target);
+    return false;
 }

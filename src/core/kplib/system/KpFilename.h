@@ -49,8 +49,8 @@ public:
     bool unlink() const;
     /// The object takes `newName` whether or not the renaming works; the result tells.
     bool rename(const char* newName);
-    /// Copies contents and rights to the file `target`; false if either can't be opened. Failed writes are not noticed.
-    /// A file copied onto itself stays.
+    /// Copies contents and rights to the file `target`; false if either can't be opened, or not all can be read and
+    /// written, which leaves no `target`. A file copied onto itself stays.
     bool copy(const char* target) const;
 
     // The text alone; the static ones are for any path, null counts as empty.
