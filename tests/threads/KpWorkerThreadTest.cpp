@@ -195,6 +195,18 @@ TEST(KpWorkerThreadThreads, oneThreadServesFromConstructorToDestructor)
     EXPECT_STREQ(puppet.nativeName, "sixteen letters");
 }
 
+TEST(KpWorkerThreadThreads, startsLaterIfNoThreadCanBeMade)
+{
+    const kplib::test::LogCapture log;
+    Puppet worker("");
+    kplib::test::noNewThreads = true;
+    EXPECT_FALSE(worker.start(true) || worker.start(false) || worker.wait() || worker.terminate());
+    kplib::test::noNewThreads = false;
+    EXPECT_TRUE(worker.start(true));
+    EXPECT_EQ(worker.journal, "(C");
+    EXPECT_EQ(log.lines().size(), 2U);
+}
+
 TEST(KpWorkerThreadThreads, aSuspendedPassGoesOnAndACallerMayGoBeforeTheEnd)
 {
     for (bool isCanceled : {false, true}) {

@@ -40,7 +40,8 @@ struct KpThreadPrivate {
 
     pthread_attr_t attributes{};
     pthread_t threadId{};
-    std::atomic<int> state = NeverStarted;  // written under the mutex
+    std::atomic<int> state = NeverStarted;  // written under the mutex, as the next
+    std::atomic<bool> isMade = false;       // the last start() had a thread
     KpMutex mutex{false};
     KpWaitCondition finishedCondition;
     KpString name;
@@ -87,20 +88,22 @@ KpThread::~KpThread()
 void KpThread::start()
 {
     const Lock lock(&record_->mutex);
-    while (running())
+    while (hasThread())
         record_->finishedCondition.wait(&record_->mutex, ULONG_MAX);
-    if (const int error = pthread_create(&record_->threadId, &record_->attributes, KpThreadPrivate::startIt, this))
+    const int error = pthread_create(&record_->threadId, &record_->attributes, KpThreadPrivate::startIt, this);
+    if (error)
         // The text names the destructor; tools that read logs know it so.
         getTheLogInstance().warnf("KpThread::~KpThread() failed (error code: %d)\n", error);
     else
         pthread_detach(record_->threadId);
+    record_->isMade.store(error == 0, std::memory_order_relaxed);  // before the state, which publishes it
     record_->state.store(Running, std::memory_order_release);
 }
 
 bool KpThread::wait(unsigned long milliseconds)
 {
     const Lock lock(&record_->mutex);
-    return !running() || record_->finishedCondition.wait(&record_->mutex, milliseconds);
+    return !running() || (hasThread() && record_->finishedCondition.wait(&record_->mutex, milliseconds));
 }
 
 bool KpThread::finished() const
@@ -111,6 +114,11 @@ bool KpThread::finished() const
 bool KpThread::running() const
 {
     return record_->state.load(std::memory_order_acquire) == Running;
+}
+
+bool KpThread::hasThread() const
+{
+    return running() && record_->isMade.load(std::memory_order_relaxed);
 }
 
 void KpThread::yield()

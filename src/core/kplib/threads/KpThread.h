@@ -25,12 +25,13 @@ public:
     /// What the thread does.
     virtual void run() = 0;
 
-    /// Runs run() on a new thread; when one runs already, blocks until that has ended. The platform is taken to have a
-    /// thread to give: when it hasn't, the object counts as running for good.
+    /// Runs run() on a new thread; when one runs already, blocks until that has ended. If no thread can be made, a
+    /// warning is in the log, and the object counts as running until a later start() has a thread that ends.
     void start();
 
-    /// Waits for the end of the run, at most `milliseconds`, ULONG_MAX for no limit. False if that was too short, true
-    /// if there was nothing to wait for. Waits once: a wake-up without a cause counts as the end.
+    /// Waits for the end of the run, at most `milliseconds`, ULONG_MAX for no limit. False if that was too short, and
+    /// at once if start() could make no thread; true if there was nothing to wait for. Waits once: a wake-up without a
+    /// cause counts as the end.
     bool wait(unsigned long milliseconds = ULONG_MAX);
 
     /// Whether a run has ended, and none has begun since. What run() wrote is then visible.
@@ -51,6 +52,10 @@ public:
 
     /// Names the calling thread for the tools of the platform, which may keep its first characters only.
     void setThreadNameNative(const char* name);
+
+protected:
+    /// Whether a run is under way: running(), but false if start() could make no thread.
+    bool hasThread() const;
 
 private:
     friend struct KpThreadPrivate;

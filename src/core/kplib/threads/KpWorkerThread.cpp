@@ -37,7 +37,8 @@ public:
     void endPass();
     void enter(int next);
 
-    void makeThread();
+    using KpThread::hasThread;
+    bool makeThread();
     void awaitHandshake();
     void releaseHandshake();
 
@@ -103,12 +104,16 @@ void KpWorkerThreadPrivate::enter(int next)
     callerCondition.wakeOne();
 }
 
-void KpWorkerThreadPrivate::makeThread()
+// False if the platform has no thread.
+bool KpWorkerThreadPrivate::makeThread()
 {
     KpThread::start();
+    if (!hasThread())
+        return false;
     const Lock lock(&stateMutex);
     while (now() != KpWorkerThread::Idle)
         callerCondition.wait(&stateMutex, ULONG_MAX);
+    return true;
 }
 
 void KpWorkerThreadPrivate::awaitHandshake()
@@ -139,8 +144,8 @@ void KpWorkerThread::computeDtor() {}
 bool KpWorkerThread::start(bool waitForCaller)
 {
     ++record_->startCount;
-    if (!record_->running())
-        record_->makeThread();
+    if (!record_->hasThread() && !record_->makeThread())
+        return false;
     {
         const Lock lock(&record_->stateMutex);
         if (!acceptsStart(record_->now()))
@@ -206,7 +211,7 @@ bool KpWorkerThread::cancel()
 
 bool KpWorkerThread::terminate()
 {
-    if (!record_->running())
+    if (!record_->hasThread())
         return false;
     wait();
     while (resume())

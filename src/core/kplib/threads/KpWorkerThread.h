@@ -46,7 +46,8 @@ public:
     virtual void computeDtor();
 
     /// Hands over one pass; the first one makes the thread, and waits for computeCtor(). With `waitForCaller` it
-    /// returns when the pass has ended, or has called wakeCaller(). False, and nothing is done, if a pass is under way.
+    /// returns when the pass has ended, or has called wakeCaller(). False, and nothing is done, if a pass is under way,
+    /// or if no thread can be made, which is a warning in the log.
     bool start(bool waitForCaller);
 
     /// Waits until the pass has ended or sleeps in suspended(). False at once if there was none. With `timedOut` it is
