@@ -4,6 +4,7 @@
 
 #include <kplib/net/KpHttpGet.h>
 
+#include <chrono>
 #include <climits>
 #include <cstring>
 #include <gtest/gtest.h>
@@ -203,6 +204,33 @@ TEST(KpHttpGetThreads, cancelIsRememberedWhileConnecting)
     }
     EXPECT_TRUE(get.request(server.url().c_str()));
     get.cancel();
+}
+
+TEST(KpHttpGetThreads, cancelEndsAConnectionThatNothingAnswers)
+{
+    const Listener full(0);
+    sockaddr_in address{};
+    address.sin_family = AF_INET;
+    address.sin_port = htons(static_cast<uint16_t>(full.port));
+    int waiting[4];  // one has room, and the others wait for it
+    for (int& each : waiting) {
+        each = socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK, 0);
+        connect(each, reinterpret_cast<sockaddr*>(&address), sizeof(address));
+    }
+    KpHttpGet get;
+    std::atomic<bool> isDone = false;
+    std::thread other([&] {
+        for (; !isDone; usleep(10'000))
+            get.cancel();
+    });
+    const auto begin = std::chrono::steady_clock::now();
+    EXPECT_FALSE(get.request(("http://127.0.0.1:" + std::to_string(full.port)).c_str()));
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(20));
+    EXPECT_EQ(get.state(), KpHttpGet::NotConnected);
+    isDone = true;
+    other.join();
+    for (const int each : waiting)
+        close(each);
 }
 
 TEST(KpHttpGetThreads, cancelEndsAReadThatWaitsAndMixesNoResponses)

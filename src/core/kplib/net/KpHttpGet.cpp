@@ -132,21 +132,32 @@ bool KpHttpGet::isCanceled()
 
 bool KpHttpGet::connect()
 {
-    const int socket = KpSocket::connect(host_.c_str(), port_, 0, bufferSize, bufferSize);
-    if (socket < 0) {
-        const KpString cause = KpSocket::lastError();
+    using kplib::detail::Connection;
+    const int opened = kplib::detail::openSocket(bufferSize, bufferSize);
+    if (opened < 0) {
         if (!isCanceled())
-            setError(cause.c_str());
+            setError(nullptr);
+        return false;
+    }
+    socket_ = opened;
+    const SocketInUse socket(*this);
+    KpSocket::nonBlocking(socket);
+    const Connection connection = kplib::detail::beginConnecting(socket, host_.c_str(), port_);
+    // cancel() ends the wait for a connection that is under way; if it came before, it is seen here.
+    const bool isMade = connection == Connection::Made ||
+                        (connection == Connection::UnderWay && !isCanceled() && kplib::detail::awaitConnection(socket));
+    const KpString cause = isMade ? KpString() : KpSocket::lastError();
+    if (isCanceled()) {
+        closeConnection(NotConnected);
+        return false;
+    }
+    if (!isMade) {
+        setError(cause.c_str());
         return false;
     }
     KpSocket::blocking(socket);
     KpSocket::setNoDelay(socket, true);
-    const KpScopedLockT<KpMutex> lock(&closing_);
-    if (canceled_)
-        KpSocket::close(socket);
-    else
-        socket_ = socket;
-    return !canceled_;
+    return true;
 }
 
 bool KpHttpGet::readResponse()

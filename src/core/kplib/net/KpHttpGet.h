@@ -56,8 +56,8 @@ public:
     long long bytesRead() const { return bytesReadSoFar_; }
 
     /// Closes the connection. From another thread this ends a read() that waits, which then fails, and a request(),
-    /// which then returns false in the state NotConnected. A request() that is connecting ends when the system has
-    /// connected.
+    /// which then returns false in the state NotConnected; a request() that is connecting too, once the name of the
+    /// host is resolved.
     void cancel();
 
     /// Waits for the head of the response. False in any state but RequestSent, or on failure. read() calls this.

@@ -55,31 +55,6 @@ bool resolve(const char* host, in_addr_t& address)
     return address != 0;
 }
 
-// An interrupted connect() goes on by itself and can't be called again: its end is waited for.
-bool connectTo(int socket, const sockaddr_in& address)
-{
-    if (::connect(socket, reinterpret_cast<const sockaddr*>(&address), sizeof(address)) == 0)
-        return true;
-    if (errno != EINTR)
-        return false;
-    pollfd connected{socket, POLLOUT, 0};
-    while (poll(&connected, 1, -1) < 0 && errno == EINTR) {
-    }
-    int error = 0;
-    socklen_t length = sizeof(error);
-    getsockopt(socket, SOL_SOCKET, SO_ERROR, &error, &length);
-    errno = error;
-    return error == 0;
-}
-
-bool connectByName(int socket, const char* host, int port)
-{
-    sockaddr_in address{};
-    address.sin_family = AF_INET;
-    address.sin_port = htons(static_cast<std::uint16_t>(port));
-    return resolve(host, address.sin_addr.s_addr) && connectTo(socket, address);
-}
-
 // For what is no longer of use; errno keeps telling why.
 int closeFailed(int socket)
 {
@@ -105,20 +80,56 @@ void KpSocket::initSocketLayer()
     socketLayerInitialized = 1;
 }
 
-int KpSocket::connect(const char* host, int port, int /*ignored*/, int receiveBufferSize, int sendBufferSize)
+int kplib::detail::openSocket(int receiveBufferSize, int sendBufferSize)
 {
     if (!socketLayerInitialized)
-        initSocketLayer();
+        KpSocket::initSocketLayer();
     const int socket = ::socket(AF_INET, SOCK_STREAM, IPPROTO_TCP);
     if (socket < 0)
         return -1;
     if (setOption(socket, SOL_SOCKET, SO_REUSEADDR, 1) != 0)
         return closeFailed(socket);
     if (receiveBufferSize > 0 && setOption(socket, SOL_SOCKET, SO_RCVBUF, receiveBufferSize) != 0)
-        getTheLogInstance().errorf("Could not set TCP receive buffer size: %s", lastError().c_str());
-    if (sendBufferSize > 0 && resizeSendBuffer(socket, sendBufferSize) != 0)
-        getTheLogInstance().errorf("Could not set TCP send buffer size: %s", lastError().c_str());
-    return connectByName(socket, host, port) ? socket : closeFailed(socket);
+        getTheLogInstance().errorf("Could not set TCP receive buffer size: %s", KpSocket::lastError().c_str());
+    if (sendBufferSize > 0 && KpSocket::resizeSendBuffer(socket, sendBufferSize) != 0)
+        getTheLogInstance().errorf("Could not set TCP send buffer size: %s", KpSocket::lastError().c_str());
+    return socket;
+}
+
+kplib::detail::Connection kplib::detail::beginConnecting(int socket, const char* host, int port)
+{
+    sockaddr_in address{};
+    address.sin_family = AF_INET;
+    address.sin_port = htons(static_cast<std::uint16_t>(port));
+    if (!resolve(host, address.sin_addr.s_addr))
+        return Connection::Failed;
+    if (::connect(socket, reinterpret_cast<const sockaddr*>(&address), sizeof(address)) == 0)
+        return Connection::Made;
+    return errno == EINTR || errno == EINPROGRESS ? Connection::UnderWay : Connection::Failed;
+}
+
+bool kplib::detail::awaitConnection(int socket)
+{
+    pollfd connected{socket, POLLOUT, 0};
+    while (poll(&connected, 1, -1) < 0 && errno == EINTR) {
+    }
+    int error = 0;
+    socklen_t length = sizeof(error);
+    getsockopt(socket, SOL_SOCKET, SO_ERROR, &error, &length);
+    errno = error;
+    return error == 0;
+}
+
+int KpSocket::connect(const char* host, int port, int /*ignored*/, int receiveBufferSize, int sendBufferSize)
+{
+    using kplib::detail::Connection;
+    const int socket = kplib::detail::openSocket(receiveBufferSize, sendBufferSize);
+    if (socket < 0)
+        return -1;
+    const Connection connection = kplib::detail::beginConnecting(socket, host, port);
+    const bool isMade = connection == Connection::Made ||
+                        (connection == Connection::UnderWay && kplib::detail::awaitConnection(socket));
+    return isMade ? socket : closeFailed(socket);
 }
 
 int KpSocket::close(int socket)

@@ -1,8 +1,20 @@
 #pragma once
 
-// Receiving calls that go on after a signal.
+// Steps of a connection, and receiving calls; all go on after a signal.
 
 namespace kplib::detail {
+
+// A socket with the options of KpSocket::connect(); -1 on failure.
+int openSocket(int receiveBufferSize, int sendBufferSize);
+
+// Resolves the name and calls connect(). The connection is under way on a non-blocking socket, and after a signal,
+// since an interrupted connect() goes on by itself and can't be called again.
+enum class Connection { Failed, UnderWay, Made };
+Connection beginConnecting(int socket, const char* host, int port);
+
+// Waits for the end of what is under way; a shutdown() by another thread ends the wait. False with the cause
+// in errno.
+bool awaitConnection(int socket);
 
 // As recv(). A time-out of the socket holds under a steady row of signals too, if only to within a factor of two.
 long receiveSome(int socket, char* buffer, long size, int flags);
