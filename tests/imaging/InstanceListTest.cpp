@@ -2,6 +2,8 @@
 
 #include <kplib/param/HxParamBundle.h>
 
+#include <support/LogCapture.h>
+
 #include <gtest/gtest.h>
 
 #include <random>
@@ -141,6 +143,28 @@ TEST(InstanceList, referencesAreExpandedToFrames)
     EXPECT_EQ(expanded.size(), 6);
     EXPECT_EQ(expanded[1], (Utility::SopUIDAndFrame{"1.2.0", 1}));
     EXPECT_EQ(Utility::getReferencedSOPUIDsAndFrameNumbers(object, false, &ok), (Entries{{"1.2", 0}, {"1.2", 1}}));
+}
+
+TEST(InstanceList, framesThatTheHeaderCannotHoldAreNotListed)
+{
+    List list;
+    for (int i = 0; i < 1025; ++i)
+        list.append("1.2." + std::to_string(i));
+    HxParamBundle object("Object");
+    Utility::setSopUIDList(object.bundle("SOPInstanceUIDs", 1), list);
+    for (const char* frames : {"2147483647", "1025"}) {
+        const kplib::test::LogCapture log;
+        bool ok = true;
+        object.setTag("G0028-0008", frames);
+        EXPECT_TRUE(Utility::getReferencedSOPUIDsAndFrameNumbers(object, true, &ok).empty());
+        EXPECT_FALSE(ok);
+        EXPECT_EQ(log.lines(), kplib::test::Lines{std::string("E [] The header can't hold ") + frames +
+                                                  " frames for each of 1025 instances"});
+    }
+    HxParamBundle* const items = object.dicomAllCreate()->bundle("G5200-9230", 1);
+    for (int i = 0; i < 1025; ++i)
+        items->insert(new HxParamBundle(("Item_" + std::to_string(i)).c_str()), 0);
+    EXPECT_EQ(Utility::getReferencedSOPUIDsAndFrameNumbers(object, true, nullptr).size(), 1025U * 1025);
 }
 
 }  // namespace

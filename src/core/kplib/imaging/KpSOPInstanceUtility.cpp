@@ -1,6 +1,7 @@
 #include <kplib/imaging/KpSOPInstanceUtility.h>
 
 #include <kplib/imaging/detail/BundleTexts.h>
+#include <kplib/log/KpLogFile.h>
 #include <kplib/system/KpCoder.h>
 
 #include <algorithm>
@@ -93,6 +94,16 @@ std::string prefixOf(const HxParamBundle& bundle)
             prefix = textOf(*parameter);
     }
     return prefix;
+}
+
+// Whether so many frames for each instance are believed. Beyond a list that fits into memory at ease, the header has to
+// show an item for each frame, in the Per-Frame Functional Groups Sequence: a damaged number alone takes no gigabytes.
+bool canHold(const HxParamBundle& object, long frames, long instances)
+{
+    constexpr long mostEntries = 1L << 20;
+    const HxParamBundle* const all = object.dicomAll();
+    const HxParamBundle* const items = all ? all->bundle("G5200-9230") : nullptr;
+    return frames * instances <= mostEntries || (items && frames <= items->size());
 }
 
 // An entry whose frame is the number behind its last point.
@@ -207,6 +218,12 @@ KpSOPInstanceUtility::getReferencedSOPUIDsAndFrameNumbers(const HxParamBundle& o
         return entries;
     const int frames = std::atoi(object.findTag("G0028-0008", "0"));
     const char* prefix = nullptr;
+    long instances = 0;
+    forEachImage(*bundle, [&](int, const char*) { return ++instances > 0; });
+    if (expandFrames && !canHold(object, frames, instances)) {
+        getTheLogInstance().errorf("The header can't hold %d frames for each of %ld instances", frames, instances);
+        return entries;
+    }
     bundle->findString(prefixName, prefix);
     forEachImage(*bundle, [&](int, const char* text) {
         const std::string uid = std::string(prefix ? prefix : "").append(text);

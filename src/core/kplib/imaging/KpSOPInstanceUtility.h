@@ -53,7 +53,9 @@ public:
 
     /// The instances that `object` refers to in its SOPInstanceUIDs. If the object has frames (two or more), each entry
     /// stands for all of them with `expandFrames`; without, the number behind its last point is its frame, and entries
-    /// without one are left out. `ok`, if given, tells whether there was a list. The order of the bundle counts.
+    /// without one are left out. `ok`, if given, is set to whether there was a list. The order of the bundle counts.
+    /// More than 2^20 entries are expanded only if (5200,9230) has an item for each frame: otherwise the number is
+    /// taken for damaged, with an error in the log, an empty result and false in `ok`.
     static std::vector<SopUIDAndFrame> getReferencedSOPUIDsAndFrameNumbers(const HxParamBundle& object,
                                                                            bool expandFrames, bool* ok);
 };
