@@ -768,7 +768,7 @@ def serving():
     server = http.server.HTTPServer(("127.0.0.1", 0), Closing)
     threading.Thread(target=server.serve_forever, daemon=True).start()
     road("run", "--http", f"http://127.0.0.1:{server.server_port}/raw", folder("fetched"))
-    assert len(connections) == len(set(connections)) == 8, connections  # prefix, head and six slices
+    assert len(connections) == len(set(connections)) == 9, connections  # prefix, head, last byte and six slices
     server.shutdown()
     report(path)
     for name in ("axial.png", "oblique.png", "index.html", "overview-mean.png"):

@@ -122,7 +122,12 @@ KpResult readRemote(const std::string& url, int timeout, KpProgressInterface& pr
         return read;
     if (!readHead(head, series, volume, root))
         return badInput("the head of '%s' is damaged", url.c_str());
+    const unsigned long offset = sizeof prefix + prefix.headSize;
+    const auto size = static_cast<unsigned long>(volume.dims[2] * volume.sliceBytes());
+    char last = 0;  // a server that has it has them all: the head alone does not decide on the memory that is taken
+    if (KpResult read = readRange(http, url, offset + size - 1, 1, &last); read.isBad())
+        return read;
     volume.allocate();
-    SliceReader reader(url, sizeof prefix + prefix.headSize, http, volume);
+    SliceReader reader(url, offset, http, volume);
     return readSlices(reader, volume.dims[2], progress, silence);
 }
