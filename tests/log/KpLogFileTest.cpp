@@ -9,7 +9,6 @@
 #include <gtest/gtest.h>
 
 #include <cstdlib>
-#include <future>
 #include <memory>
 #include <regex>
 #include <string>
@@ -141,18 +140,4 @@ TEST_F(KpLogFileTest, exhaustedMemoryLeavesNoLockBehind)
     kplib::test::failAtEachAllocation(
         [&] { log->tracef(KpLogError, nullptr, "%0100d", 1); },
         [&] { std::thread([&] { EXPECT_TRUE(record.mutex.tryLock() && (record.mutex.unlock(), true)); }).join(); });
-}
-
-using KpLogFileThreads = KpLogFileTest;
-TEST_F(KpLogFileThreads, linesOfManyThreadsDontInterleave)
-{
-    for (std::future<void> threads[3]; std::future<void> & thread : threads) {
-        thread = std::async(std::launch::async, [&] {
-            for (int k = 0; k < 200; ++k) {
-                log->errorf("%0500d", 0);
-                log->setDefaultModule(k % 2 ? "a" : "b");
-            }
-        });
-    }
-    EXPECT_EQ(std::regex_replace(take(), std::regex("E \\[[ab]?\\] 0{500}\n"), "."), std::string(600, '.'));
 }

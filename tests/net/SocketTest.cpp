@@ -1,5 +1,6 @@
 #include "net/Servers.h"
 #include "support/LogCapture.h"
+#include "support/SteadySignal.h"
 #include "support/TempFolder.h"
 
 #include <kplib/net/KpSocket.h>
@@ -8,7 +9,6 @@
 #include <algorithm>
 #include <cerrno>
 #include <chrono>
-#include <csignal>
 #include <cstring>
 #include <gtest/gtest.h>
 #include <vector>
@@ -26,26 +26,6 @@ struct Pair {
     void hangUp() const { close(peer); }
     int ends[2] = {-1, -1};
     const int &mine = ends[0], &peer = ends[1];
-};
-
-/// While one lives, a signal a millisecond that interrupts the calls of this thread.
-struct SteadySignal {
-    SteadySignal()
-    {
-        struct sigaction action {};
-        action.sa_handler = [](int) {};
-        sigaction(SIGALRM, &action, nullptr);
-        ualarm(1000, 1000);
-    }
-    ~SteadySignal() { ualarm(0, 0); }
-    /// To be called by other threads, before they begin.
-    static void block()
-    {
-        sigset_t set;
-        sigemptyset(&set);
-        sigaddset(&set, SIGALRM);
-        pthread_sigmask(SIG_BLOCK, &set, nullptr);
-    }
 };
 
 template <typename T = int>

@@ -1,11 +1,13 @@
 #pragma once
 
+#include <csignal>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <set>
 #include <string>
+#include <sys/resource.h>
 
 namespace kplib::test {
 
@@ -52,6 +54,14 @@ inline std::set<std::string> namesIn(const std::string& folder)
     for (const auto& entry : std::filesystem::directory_iterator(folder))
         names.insert(entry.path().filename());
     return names;
+}
+
+/// Files that this process writes fail to grow beyond `bytes`, as on a full disk, until the limit is RLIM_INFINITY.
+inline void setSizeLimit(rlim_t bytes)
+{
+    std::signal(SIGXFSZ, SIG_IGN);
+    const rlimit limit{bytes, RLIM_INFINITY};
+    setrlimit(RLIMIT_FSIZE, &limit);
 }
 
 }  // namespace kplib::test

@@ -6,7 +6,6 @@
 
 #include <support/FailingMalloc.h>
 #include <support/LogCapture.h>
-#include <support/SizeLimit.h>
 #include <support/TempFolder.h>
 
 #include <gtest/gtest.h>

@@ -2,7 +2,6 @@
 
 #include <kplib/system/KpTmpDir.h>
 
-#include <support/SizeLimit.h>
 #include <support/TempFolder.h>
 
 #include <gtest/gtest.h>
