@@ -1,3 +1,4 @@
+#include "support/ExhaustedMemory.h"
 #include "support/LogCapture.h"
 #include "support/TempFolder.h"
 
@@ -136,4 +137,9 @@ TEST_F(SharedObject, tellsInTheLogThatThereWasSomething)
     EXPECT_EQ(object.tryOpen(missing.c_str(), message), -1);
     EXPECT_EQ(std::string(message).find("Couldn't open " + missing + ":\n" + missing), 0U) << message;
     EXPECT_FALSE(object.isOpen());
+}
+
+TEST_F(SharedObject, leavesNothingWhereItsOpeningThrows)
+{
+    failAtEachAllocation([] { const KpDSO missing("/missing.so"); }, [] {});
 }

@@ -191,6 +191,10 @@ TEST(KpDMatrixSolve, leavesTheSidesWhereItFails)
         }
         EXPECT_EQ(log.lines(), lines);
         EXPECT_EQ(side[1], 6);
+        const FailingMalloc failing(failsAt);
+        if (failsAt >= 0) {
+            EXPECT_ANY_THROW(a.solveLRdecomp(rhs, 1)) << "no memory for the line either";
+        }
     }
 }
 

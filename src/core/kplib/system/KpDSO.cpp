@@ -26,16 +26,13 @@ void tell(const char* format, const char* text)
 
 }  // namespace
 
-KpDSO::KpDSO(const char* name) : private_(new Private)
+KpDSO::KpDSO(const char* name) : private_(std::make_unique<Private>())
 {
     if (name)
         open(name, false);
 }
 
-KpDSO::~KpDSO()
-{
-    delete private_;
-}
+KpDSO::~KpDSO() = default;
 
 void KpDSO::close()
 {

@@ -5,6 +5,7 @@
 #include <kplib/foundation/KpString.h>
 
 #include <concepts>
+#include <memory>
 
 class KpFilename;
 
@@ -73,5 +74,5 @@ private:
     int load(const KpFilename& name, KpString& messages);
     void initPackage(const KpFilename& name) const;
 
-    Private* private_;
+    std::unique_ptr<Private> private_;
 };

@@ -96,9 +96,9 @@ bool KpDMatrix<T>::SVD(KpDMatrix& U, T* w, KpDMatrix& V, int maxIterations) cons
 template <typename T>
 int KpDMatrix<T>::solveLRdecomp(T** rhs, int count) const
 {
-    const kplib::detail::SolverRows rows(rows_);
+    kplib::detail::SolverRows rows(rows_);
     T sign = 1;
-    return rows.isComplete() ? solveLRdecomp(rows.get(), rhs, count, sign) : 1;
+    return rows.allocate() ? solveLRdecomp(rows.get(), rhs, count, sign) : 1;
 }
 
 template <typename T>

@@ -16,7 +16,7 @@ namespace {
 constexpr int maxRounds = 10;
 
 template <typename T>
-T* allocate(int count)
+T* allocated(int count)
 {
     return static_cast<T*>(std::malloc(static_cast<std::size_t>(count) * sizeof(T)));
 }
@@ -69,19 +69,21 @@ std::span<const KernelPath<EliminateLoop>> eliminatePaths()
     return paths;
 }
 
-SolverRows::SolverRows(int n) : n_(n), rows_(allocate<float*>(n))
+bool SolverRows::allocate()
 {
+    rows_.reset(allocated<float*>(n_));
     if (!rows_) {
         logExhausted();
-        return;
+        return false;
     }
     for (; count_ < n_; ++count_) {
-        rows_[count_] = allocate<float>(n);
+        rows_[count_] = allocated<float>(n_);
         if (!rows_[count_]) {
             getTheLogInstance().errorf("KpDMatrix::solveLRdecomp: Not Enough Memory (%d).\n", count_);
-            return;
+            return false;
         }
     }
+    return true;
 }
 
 SolverRows::~SolverRows()
@@ -91,7 +93,7 @@ SolverRows::~SolverRows()
 }
 
 LinearSolver::LinearSolver(const float* a, int n, float** lr) :
-    a_(a), n_(n), lr_(lr), work_(allocate<float>(4 * n)), permutation_(allocate<int>(n))
+    a_(a), n_(n), lr_(lr), work_(allocated<float>(4 * n)), permutation_(allocated<int>(n))
 {
     if (!isComplete()) {
         logExhausted();

@@ -11,13 +11,13 @@ namespace kplib::detail {
 // Room for the factors of an n by n matrix, one block a row.
 class SolverRows {
 public:
-    // Logs it as an error when the memory is exhausted.
-    explicit SolverRows(int n);
+    explicit SolverRows(int n) : n_(n) {}
     SolverRows(const SolverRows&) = delete;
     SolverRows& operator=(const SolverRows&) = delete;
     ~SolverRows();
 
-    bool isComplete() const { return rows_ && count_ == n_; }
+    // False, with an error in the log, when the memory is exhausted; what there is of it is freed with the object.
+    bool allocate();
     float** get() const { return rows_.get(); }
 
 private:
