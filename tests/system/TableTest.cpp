@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <climits>
 #include <malloc.h>
 #include <map>
 #include <memory>
@@ -290,6 +291,7 @@ TEST(KpTable, refusesColumnsThatTheRowFormHasNoPlaceFor)
     EXPECT_EQ(table.columnAdd(1, KpTable::Relation, 0, &table), -1);  // the table's id has to stand there
     EXPECT_EQ(table.columnAdd(1, KpTable::Plain, 2, nullptr), -1);
     EXPECT_EQ(table.columnAdd(16, KpTable::Plain, 8, nullptr), -1);
+    EXPECT_EQ(table.columnAdd(1, KpTable::Plain, INT_MAX, nullptr), -1);  // 4 bytes more than an int counts
     EXPECT_EQ(table.columnAdd(5, KpTable::Plain, 508, nullptr), 1);
     EXPECT_EQ(table.columnAdd(5, KpTable::Plain, 8, nullptr), 1);     // is there: nothing is done
     EXPECT_EQ(table.columnAdd(6, KpTable::Relation, 0, &table), -1);  // would start at 512

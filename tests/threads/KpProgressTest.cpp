@@ -7,6 +7,7 @@
 
 #include <gtest/gtest.h>
 
+#include <climits>
 #include <memory>
 #include <string>
 #include <thread>
@@ -59,6 +60,28 @@ TEST(KpProgress, nestedScopesShareOneScaleToTheirEnd)
     EXPECT_EQ(gui.take(), "c5000bad");
     progress.setFailed(KpResult(KpResult::Interrupted, "", ""), nullptr);
     EXPECT_EQ(log.lines(), (kplib::test::Lines{"E [] Operation failed: 'bad'", "E [] Operation failed: ''"}));
+}
+
+TEST(KpProgress, scalesBeyondAnIntEndAtItsLargestValue)
+{
+    KpProgressInterface progress;
+    const auto state = [&] { return std::pair(progress.currentProgressValue(), progress.globalMaximum()); };
+    const auto openScopes = [&](int count, int maximum) {
+        for (; count > 0; --count) {
+            progress.startWorking(maximum, "a");
+            progress.setProgressValue(maximum);
+        }
+    };
+    openScopes(5, 2000);
+    EXPECT_EQ(state(), std::pair(INT_MAX, INT_MAX));
+    for (int i = 0; i < 3; ++i)
+        progress.stopWorking();
+    EXPECT_EQ(state(), std::pair(4002001, 4000000)) << "outer scopes keep their place";
+    openScopes(20, 2000);
+    openScopes(1, INT_MAX);
+    progress.nextStep();
+    EXPECT_EQ(state(), std::pair(INT_MAX, INT_MAX));
+    progress.stopWorking();
 }
 
 TEST(KpProgress, cancelEndsAllWorkForGood)

@@ -1,4 +1,5 @@
 #include <kplib/foundation/KpMemory.h>
+#include <kplib/foundation/KpMemoryException.h>
 #include <kplib/volume/KpConnectedComponents.h>
 #include <kplib/volume/detail/FloatSums.h>
 #include <kplib/volume/detail/LabelPlainly.h>
@@ -227,7 +228,9 @@ TEST(KpConnectedComponents, roundsThresholds)
 TEST(KpConnectedComponents, refusesWhatIsNoNumber)
 {
     const kplib::test::LogCapture log(KpLogError);
-    const int dims[] = {1, 1, 1};
+    const int dims[] = {1, 1, 1}, huge[] = {1 << 22, 1 << 22, 1 << 22};  // 2^66 voxels are not none
+    unsigned short* none = nullptr;
+    EXPECT_THROW(CC::labelCC({none, KpPrimType::Short}, huge, 6, none, 0, 0, 0, 0, 0, nullptr), KpMemoryException);
     unsigned short label = 0, *labels = &label;
     ComponentTable table{Component{5, 5, 5, {5, 5, 5}}};
     EXPECT_EQ(CC::labelCC({&label, KpPrimType::Complex}, dims, 4, labels, 0, 1, 1, 0, 0, &table), -1);

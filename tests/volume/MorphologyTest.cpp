@@ -1,3 +1,4 @@
+#include <kplib/foundation/KpMemoryException.h>
 #include <kplib/volume/KpMorphology.h>
 #include <kplib/volume/detail/MorphologyKernels.h>
 
@@ -188,6 +189,8 @@ TEST(Morphology, nothingToDo)
     Field dst;
     KpMorphology::dilation2D_8(src, dst, {-4, -10});
     EXPECT_EQ(dst.nBits(), 0UL);
+    const KpVec3i huge(1 << 22, 1 << 22, 1 << 22);  // 2^66 voxels are not none
+    EXPECT_THROW(KpMorphology::erosion3D(src, dst, huge, 0, true), KpMemoryException);
 }
 
 TEST(Morphology, withoutAWorkAreaSetsAllOrDoesWithout)

@@ -87,6 +87,9 @@ TEST(KpNeighborIterator33, sortsAllByWeightAndTellsTheFirstPositive)
     EXPECT_EQ(std::tuple(table.iweights()[0], table.iweights()[1], table.iweights()[5]), std::tuple(INT32_MIN, 0, 2));
     EXPECT_EQ(table.sort_fweights(), 1);
     EXPECT_EQ(table.sort_iweights(), 2);
+    const int largest[] = {65536, 65536, 2};  // a slice is 2^32 voxels, of which an int keeps nothing
+    EXPECT_EQ(KpNeighborIterator33(6, largest).offsets()[4], 65536);
+    EXPECT_EQ(KpNeighborIterator33(6, largest).offsets()[3], 0);
     KpNeighborIterator33 unlisted(7, dims);
     unlisted.setWeights(floats, 1);
     EXPECT_EQ(unlisted.sort_fweights(), 26);

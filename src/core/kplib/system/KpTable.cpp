@@ -6,6 +6,7 @@
 #include <kplib/system/detail/TableCheckSkipped.h>
 
 #include <algorithm>
+#include <climits>
 
 using namespace kplib::detail;
 
@@ -73,6 +74,8 @@ bool KpTable::canAdd(int columnId, ColumnType type, int size, const KpTable* tar
         return false;  // there are as many ids as places for columns
     if (columnCount_ == 1 && (type != Plain || size < rowHeadSize - idColumnSize))
         return false;  // it has to hold the table's id
+    if (sizeOf(type, size) > INT_MAX - rowSize_)
+        return false;
     if (type == Plain)
         return size > 0;
     return target && (type == RowPointer || (type == Relation && rowSize_ < maxRelationOffset));

@@ -4,6 +4,7 @@
 #include <kplib/threads/KpProgressGuiInterface.h>
 
 #include <algorithm>
+#include <climits>
 #include <functional>
 #include <utility>
 
@@ -11,9 +12,26 @@ namespace {
 
 // Drops the offset of a scope that closes, last of all and whatever the calls before it throw.
 struct OffsetDropper {
-    std::vector<int>& offsets;
+    std::vector<long>& offsets;
     ~OffsetDropper() { offsets.pop_back(); }
 };
+
+// Places on the scale of all scopes are longs within 2^62, to which any int can be added, and what user interfaces see
+// of them is cut to an int. So a scope whose own scale is beyond an int leaves the places of those around it right.
+
+long product(long place, int maximum)
+{
+    constexpr long limit = 1L << 62;
+    long result = 0;
+    if (__builtin_mul_overflow(place, maximum, &result))
+        result = place < 0 ? -limit : limit;
+    return std::clamp(result, -limit, limit);
+}
+
+int toInt(long place)
+{
+    return static_cast<int>(std::clamp<long>(place, INT_MIN, INT_MAX));
+}
 
 }  // namespace
 
@@ -44,7 +62,7 @@ void KpProgressInterface::startWorking(int maximum, std::string text)
         beforeStartWorking();
     }
     steps_.push_back(std::move(step));
-    value_ *= maximum;
+    value_ = product(value_, maximum);
     offsets_.push_back(value_);
     setMaximumGlobal(globalMaximum());
     setProgressText(text.c_str());  // not that of the scope: a user interface may have canceled by now
@@ -70,7 +88,7 @@ void KpProgressInterface::stopWorking()
     value_ = offsets_.back() / maximum + 1;
     setProgressText(steps_.back().text.c_str());
     setMaximumGlobal(globalMaximum());
-    setProgressValueGlobal(value_);
+    setProgressValueGlobal(toInt(value_));
 }
 
 void KpProgressInterface::setProgressValue(int value)
@@ -78,7 +96,7 @@ void KpProgressInterface::setProgressValue(int value)
     if (canceled_ || steps_.empty())
         return;
     value_ = std::min(value, steps_.back().maximum) + offsets_.back();
-    setProgressValueGlobal(value_);
+    setProgressValueGlobal(toInt(value_));
 }
 
 void KpProgressInterface::cancel()
@@ -126,7 +144,7 @@ void KpProgressInterface::setProgressValueGlobal(int value)
 
 int KpProgressInterface::currentProgressValue() const
 {
-    return value_;
+    return toInt(value_);
 }
 
 void KpProgressInterface::setMaximumGlobal(int maximum)
@@ -164,7 +182,7 @@ void KpProgressInterface::setCompleted(const KpResult& result)
 void KpProgressInterface::nextStep()
 {
     if (!canceled_ && !offsets_.empty())
-        setProgressValue(value_ + 1 - offsets_.back());
+        setProgressValue(toInt(value_ + 1 - offsets_.back()));
 }
 
 void KpProgressInterface::terminate()
@@ -175,8 +193,8 @@ void KpProgressInterface::terminate()
 
 int KpProgressInterface::globalMaximum() const
 {
-    int product = 1;
+    long scale = 1;
     for (const Step& step : steps_)
-        product *= step.maximum;
-    return product;
+        scale = product(scale, step.maximum);
+    return toInt(scale);
 }

@@ -16,7 +16,7 @@
 /// Open scopes through a ProgressScope, so that they are closed whatever way the computation leaves.
 ///
 /// Cancelling closes all scopes; the computation polls isCanceled(). An object that was canceled stays so and ignores
-/// further work: new work takes a new object. Scales beyond an int are not guarded against.
+/// further work: new work takes a new object. On a scale beyond an int, values and maxima are at most INT_MAX.
 ///
 /// Threads: any thread may poll isCanceled() and canCancel(). All else belongs to one thread at a time. cancel() also
 /// closes the scopes, which are not guarded: call it on the thread of the work, or while the work opens and closes none
@@ -72,7 +72,7 @@ public:
     void disableCancel() { cancelable_ = false; }
     void setProgressInfo(const char* text) { setProgressText(text); }
 
-    /// The product of the maxima of all open scopes; 1 without one.
+    /// The product of the maxima of all open scopes, at most INT_MAX; 1 without one.
     int globalMaximum() const;
     bool isWorking() const { return working_; }
     bool canCancel() const { return cancelable_; }
@@ -91,8 +91,8 @@ private:
     bool working_ = false;
     std::atomic<bool> cancelable_ = true;
     std::atomic<bool> canceled_ = false;  // what cancel() of another thread writes and the computation polls
-    int value_ = 0;
+    long value_ = 0;
     KpResult result_;
-    std::vector<Step> steps_;   // the open scopes, innermost last
-    std::vector<int> offsets_;  // the global value at which each of them starts, on its own scale
+    std::vector<Step> steps_;    // the open scopes, innermost last
+    std::vector<long> offsets_;  // the global value at which each of them starts, on its own scale
 };

@@ -1,5 +1,6 @@
 #include <kplib/volume/KpMorphology.h>
 
+#include <kplib/cpu/ByteCount.h>
 #include <kplib/volume/detail/MorphologyKernels.h>
 
 #include <algorithm>
@@ -18,12 +19,12 @@ struct Operation {
     bool fast = true;
 };
 
+// At most LONG_MAX, for which there is no memory.
 unsigned long voxels(const KpVec3i& dims)
 {
     if (*std::min_element(dims.begin(), dims.end()) <= 0)
         return 0;
-    return static_cast<unsigned long>(dims[0]) * static_cast<unsigned long>(dims[1]) *
-           static_cast<unsigned long>(dims[2]);
+    return static_cast<unsigned long>(byteCount({dims[0], dims[1], dims[2]}));
 }
 
 void byVoxel(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long passes, const Operation& operation)

@@ -78,7 +78,7 @@ KpNeighborIterator33::KpNeighborIterator33(int nNeighbors, const int* dims) :
 {
     int i = 0;
     forEachNeighbor(nNeighbors, [&](const Delta& d) {
-        offsets_[i] = d.x + d.y * dims_[0] + d.z * dims_[0] * dims_[1];
+        offsets_[i] = static_cast<int>(d.x + long{dims_[0]} * (d.y + long{dims_[1]} * d.z));
         deltas_[i][0] = d.x;
         deltas_[i][1] = d.y;
         deltas_[i][2] = d.z;

@@ -7,8 +7,8 @@
 /// The neighbours of a voxel in a 3x3x3 window of a dense volume, x fastest: a table of offsets, directions and weights
 /// that a loop over neighbours walks without arithmetic on coordinates.
 ///
-/// It serves volumes of one size, with slices of fewer than 2^31 voxels. Once weights are set, any number of threads
-/// may read it.
+/// It serves volumes of one size. Offsets are ints: those of slices of 2^31 voxels and more are cut to their low 32
+/// bits. Once weights are set, any number of threads may read it.
 class KPLIB_API KpNeighborIterator33 {
 public:
     static constexpr int maxNeighbors = 26;

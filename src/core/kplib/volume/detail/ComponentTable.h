@@ -1,5 +1,6 @@
 #pragma once
 
+#include <kplib/cpu/ByteCount.h>
 #include <kplib/volume/KpConnectedComponents.h>
 
 #include <cstdint>
@@ -19,10 +20,10 @@ int cleanUpComponents(ComponentTable& components, L* labels, long nLabelled, int
 // Zeroes the counters and leaves nothing but the background in the table.
 void startComponents(ComponentTable& components);
 
-// The voxels of an image; 0 if a size is below 1.
+// The voxels of an image, at most LONG_MAX, for which there is no memory; 0 if a size is below 1.
 inline long nVoxelsOf(const int* dims)
 {
-    return dims[0] < 1 || dims[1] < 1 || dims[2] < 1 ? 0 : static_cast<long>(dims[0]) * dims[1] * dims[2];
+    return dims[0] < 1 || dims[1] < 1 || dims[2] < 1 ? 0 : byteCount({dims[0], dims[1], dims[2]});
 }
 
 // The value of a region as its seeds: integers modulo 2^32; real numbers cut off to 64 bits before, and 0 outside.
