@@ -12,23 +12,28 @@ TEST(RowTools, scaledRowsAreRoundedAfterEachStep)
         for (float factor : {0.1f, -3e30f})
             for (bool adds : {false, true}) {
                 SCOPED_TRACE(testing::Message() << n << " by " << factor << (adds ? " added" : " stored"));
-                const long start = n % 4;
-                auto src = someValues<float>(n + start, 1);
-                const auto dst = someValues<float>(n + start, 2);
-                std::vector<float> expected = dst, result = dst;
-                for (long i = start; i < n + start; ++i) {
+                const auto src = someValues<float>(n, 1), dst = someValues<float>(n, 2);
+                std::vector<float> expected = dst;
+                for (long i = 0; i < n; ++i) {
                     volatile float product = src[i] * factor;
                     expected[i] = adds ? dst[i] + product : product;
                 }
-                auto* const run = adds ? TmSSETools::multiplyAndAddUnaligned : TmSSETools::multiplyAndStoreUnaligned;
-                EXPECT_EQ(run(src.data() + start, factor, n, result.data() + start), result.data() + n + start);
-                EXPECT_TRUE(areSame(result, expected));
+                const auto expectOf = [&](const char* name, auto run) {
+                    for (long start = 0; start < 8; ++start)
+                        worked(src, 3 * start % 8, [&](void* from) {
+                            const auto result = worked(dst, start, [&](void* to) {
+                                run(static_cast<float*>(from), factor, n, static_cast<float*>(to));
+                            });
+                            EXPECT_TRUE(areSame(result, expected)) << name << '+' << start;
+                        });
+                };
+                auto* const chosen = adds ? TmSSETools::multiplyAndAddUnaligned : TmSSETools::multiplyAndStoreUnaligned;
+                expectOf("chosen", [&](auto* from, float by, long count, auto* to) {
+                    EXPECT_EQ(chosen(from, by, count, to), to + count);
+                });
                 for (const auto& path : adds ? multiplyAndAddPaths() : multiplyAndStorePaths())
-                    if (path.usable) {
-                        result = dst;
-                        path.run(src.data() + start, factor, n, result.data() + start);
-                        EXPECT_TRUE(areSame(result, expected)) << path.name;
-                    }
+                    if (path.usable)
+                        expectOf(path.name, path.run);
             }
 }
 

@@ -44,10 +44,14 @@ TEST(SwapDims, putsEachVoxelWhereItsCoordinatesAre)
                 std::array<int, 3> dims = size;
                 const int voxelSize = type.size() * nDataVar;
                 const Bytes before = noise(long{size[0]} * size[1] * size[2] * voxelSize);
-                Bytes data = before;
-                ASSERT_TRUE(KpRawData::swapDims({data.data(), type}, dims.data(), perm, nDataVar));
-                ASSERT_EQ(data, permuted(before, size.data(), perm, voxelSize)) << type.name() << perm[0] << perm[1];
-                EXPECT_EQ(dims, (std::array{size[perm[0]], size[perm[1]], size[perm[2]]}));
+                const Bytes expected = permuted(before, size.data(), perm, voxelSize);
+                for (int start = 0; start < 8; ++start, dims = size) {
+                    const Bytes data = worked(before, start, [&, type = type, n = nDataVar](void* at) {
+                        EXPECT_TRUE(KpRawData::swapDims({at, type}, dims.data(), perm, n));
+                    });
+                    ASSERT_EQ(data, expected) << type.name() << perm[0] << perm[1] << '+' << start;
+                    EXPECT_EQ(dims, (std::array{size[perm[0]], size[perm[1]], size[perm[2]]}));
+                }
             }
 }
 
@@ -80,9 +84,11 @@ TEST(TransposeKernels, agreeWithTheDefinition)
             for (const int rows : {1, 2, 7, 16, 33, 70})
                 for (const int columns : {1, 3, 8, 31, 32, 65}) {
                     const Bytes from = noise(long{rows} * columns * size);
-                    Bytes to(from.size());
-                    path.run(from.data(), to.data(), rows, columns);
-                    const int dims[] = {columns, rows, 1};
-                    ASSERT_EQ(to, permuted(from, dims, perms[2], size)) << path.name << size;
+                    const int dims[] = {columns, rows, 1}, start = (rows + columns) % 8;
+                    worked(from, start, [&](void* at) {
+                        const auto run = [&](void* to) { path.run(at, to, rows, columns); };
+                        const Bytes to = worked(Bytes(from.size()), 7 - start, run);
+                        ASSERT_EQ(to, permuted(from, dims, perms[2], size)) << path.name << size;
+                    });
                 }
 }

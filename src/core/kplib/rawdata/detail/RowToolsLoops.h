@@ -1,5 +1,6 @@
 #pragma once
 
+#include <kplib/cpu/Loose.h>
 #include <kplib/rawdata/detail/RowToolsKernels.h>
 
 #include <utility>
@@ -9,16 +10,20 @@ namespace kplib::detail {
 struct MultiplyAndStore {
     KPLIB_KERNEL_BODY static void run(const float* src, float factor, long long n, float* dst)
     {
+        const auto* from = reinterpret_cast<const Loose<float>*>(src);
+        auto* to = reinterpret_cast<Loose<float>*>(dst);
         for (long long i = 0; i < n; ++i)
-            dst[i] = src[i] * factor;
+            to[i].value = from[i].value * factor;
     }
 };
 
 struct MultiplyAndAdd {
     KPLIB_KERNEL_BODY static void run(const float* src, float factor, long long n, float* dst)
     {
+        const auto* from = reinterpret_cast<const Loose<float>*>(src);
+        auto* to = reinterpret_cast<Loose<float>*>(dst);
         for (long long i = 0; i < n; ++i)
-            dst[i] += src[i] * factor;
+            to[i].value += from[i].value * factor;
     }
 };
 

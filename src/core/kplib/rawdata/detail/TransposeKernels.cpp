@@ -1,5 +1,7 @@
 #include <kplib/rawdata/detail/TransposeKernels.h>
 
+#include <kplib/cpu/Loose.h>
+
 #include <algorithm>
 #include <cstdint>
 #include <cstring>
@@ -8,15 +10,15 @@
 namespace kplib::detail {
 namespace {
 
-// The tile of a matrix from (row, column) on.
+// The tile of a matrix from (row, column) on, at any address.
 template <typename T>
 struct Tile {
-    const T* from;
-    T* to;
+    const Loose<T>* from;
+    Loose<T>* to;
     long rows, columns;
 
-    const T* source(long row, long column) const { return from + row * columns + column; }
-    T* target(long row, long column) const { return to + column * rows + row; }
+    const Loose<T>* source(long row, long column) const { return from + row * columns + column; }
+    Loose<T>* target(long row, long column) const { return to + column * rows + row; }
 
     void transposePlain(long row, long rowEnd, long column, long columnEnd) const
     {
@@ -32,7 +34,7 @@ template <typename T, typename Block>
 void blockwise(const void* from, void* to, long rows, long columns, Block block)
 {
     constexpr long side = 32;
-    const Tile<T> tile{static_cast<const T*>(from), static_cast<T*>(to), rows, columns};
+    const Tile<T> tile{static_cast<const Loose<T>*>(from), static_cast<Loose<T>*>(to), rows, columns};
     for (long i = 0; i < rows; i += side) {
         for (long j = 0; j < columns; j += side)
             block(tile, i, std::min(i + side, rows), j, std::min(j + side, columns));
