@@ -139,6 +139,32 @@ TEST(Slice, equalsVoxelsOneByOne)
         }
 }
 
+TEST(Slice, isRefusedWhereItsStridesAreBeyondAnInt)
+{
+    char voxel = 0;
+    void* p = &voxel;
+    int strides[2];
+    const std::string line = "E KpRawData3D: the strides of a slice are 2147483648 bytes or more\n";
+    const KpTypedData3D flat(1 << 15, 1 << 14, 2, {&voxel, KpPrimType::Int}, 1),
+        wide(1 << 29, 2, 2, {&voxel, KpPrimType::Int}, 1);
+    for (int orientation : {0, 1, 2}) {
+        KpTypedData2D slice(1, 1, {&voxel, KpPrimType::Int}, 1);
+        const bool isFine = orientation == 2;
+        EXPECT_EQ(logged([&] { flat.getSlice(orientation, 0, slice, 0); }), isFine ? "" : line);
+        EXPECT_EQ(std::pair(slice.data(), slice.dims()[0]), isFine ? std::pair(p, 1 << 15) : std::pair(nullptr, 0));
+        EXPECT_EQ(logged([&] { wide.accessSlice(orientation, 0, p, strides[0], strides[1]); }), line);
+        EXPECT_EQ(std::exchange(p, &voxel), nullptr);
+    }
+    const std::string rows = "E KpRawData2D: rows of 2147483648 bytes are too long\n";
+    KpRawData2D image;
+    EXPECT_EQ(logged([&] { image.init(1 << 29, 1, 4, &voxel); }), rows);
+    EXPECT_EQ(std::pair(image.data(), image.ownedData()), nothing);
+    EXPECT_EQ(logged([&] { image.init(1 << 29, 1, 4, 4, 0, &voxel); }), "") << "strides of their own";
+    EXPECT_EQ(logged([&] { image.commit(1 << 29, 1, 4, std::malloc(1)); }), rows);
+    EXPECT_EQ(logged([&] { image.init(1 << 29, 1, 4); }), rows);
+    EXPECT_EQ(std::pair(image.data(), image.ownedData()), nothing);
+}
+
 TEST(Block, ownsOrLooksOn)
 {
     KpRawData3D block(2, 3, 4, 5);

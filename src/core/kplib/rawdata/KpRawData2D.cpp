@@ -1,8 +1,10 @@
 #include <kplib/rawdata/KpRawData2D.h>
 
 #include <kplib/cpu/ByteCount.h>
+#include <kplib/log/KpLogFile.h>
 #include <kplib/rawdata/detail/PlaneCopy.h>
 
+#include <cstdint>
 #include <cstdlib>
 
 using namespace kplib::detail;
@@ -49,28 +51,32 @@ KpRawData2D& KpRawData2D::operator=(const KpRawData2D& other)
 void KpRawData2D::init(int w, int h, int bytesPerPixel)
 {
     cleanup();
-    setShape(w, h, bytesPerPixel);
-    if (bytesOf(shapeOf(*this)) != 0)
+    if (!setDenseShape(w, h, bytesPerPixel))
+        data_ = nullptr;
+    else if (bytesOf(shapeOf(*this)) != 0)
         ownedData_ = data_ = allocated(shapeOf(*this));
 }
 
 void KpRawData2D::init(int w, int h, int bytesPerPixel, void* data)
 {
     cleanup();
-    setShape(w, h, bytesPerPixel);
-    data_ = data;
+    data_ = setDenseShape(w, h, bytesPerPixel) ? data : nullptr;
 }
 
 void KpRawData2D::init(int w, int h, int bytesPerPixel, int rowStride, void* data)
 {
-    init(w, h, bytesPerPixel, data);
-    rowStride_ = rowStride;
+    init(w, h, bytesPerPixel, bytesPerPixel, rowStride, data);
 }
 
 void KpRawData2D::init(int w, int h, int bytesPerPixel, int pixelStride, int rowStride, void* data)
 {
-    init(w, h, bytesPerPixel, rowStride, data);
+    cleanup();
+    dims_[0] = w;
+    dims_[1] = h;
+    bytesPerPixel_ = bytesPerPixel;
     pixelStride_ = pixelStride;
+    rowStride_ = rowStride;
+    data_ = data;
 }
 
 void KpRawData2D::cleanup()
@@ -83,6 +89,8 @@ void KpRawData2D::commit(int w, int h, int bytesPerPixel, void* data)
 {
     init(w, h, bytesPerPixel, data);
     ownedData_ = data;
+    if (!data_)
+        cleanup();
 }
 
 bool KpRawData2D::copyData(const KpRawData2D& from)
@@ -108,12 +116,17 @@ void KpRawData2D::clear()
     clearPlane(planeOf(*this), shapeOf(*this));
 }
 
-// Sizes and the strides of pixels without gaps.
-void KpRawData2D::setShape(int w, int h, int bytesPerPixel)
+// Sizes and the strides of pixels without gaps. False, with an error in the log, if the rows are too long for them.
+bool KpRawData2D::setDenseShape(int w, int h, int bytesPerPixel)
 {
+    const std::int64_t rowBytes = std::int64_t{w} * bytesPerPixel;
+    const bool fits = rowBytes <= INT32_MAX || h < 1;
     dims_[0] = w;
     dims_[1] = h;
     bytesPerPixel_ = bytesPerPixel;
     pixelStride_ = bytesPerPixel;
-    rowStride_ = static_cast<std::int32_t>(std::int64_t{w} * bytesPerPixel);
+    rowStride_ = fits ? static_cast<std::int32_t>(rowBytes) : 0;
+    if (!fits)
+        getTheLogInstance().errorf("KpRawData2D: rows of %lld bytes are too long\n", static_cast<long long>(rowBytes));
+    return fits;
 }

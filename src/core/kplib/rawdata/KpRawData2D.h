@@ -8,8 +8,9 @@
 ///
 /// Pixels are bags of bytes: only their size counts. Pixel (x, y) lies at data() + x * pixelStride() + y * rowStride(),
 /// strides in bytes. A view costs nothing and is valid as long as the memory is. Memory comes from malloc; when there
-/// is none, the object holds a null pointer. Sizes are not checked. A plain value: one thread may change it, or any
-/// number read it.
+/// is none, the object holds a null pointer. Sizes are not checked, but strides are 32 bits: pixels without gaps whose
+/// rows have 2^31 bytes or more are refused with an error in the log, and the object holds a null pointer. A plain
+/// value: one thread may change it, or any number read it.
 class KPLIB_API KpRawData2D {
 public:
     /// Empty: sizes, strides and pointers are 0.
@@ -44,7 +45,8 @@ public:
     /// Frees the block of an owner. data() stays and is not to be used.
     void cleanup();
 
-    /// Makes this the owner of `data`, a block of malloc that holds the pixels without gaps.
+    /// Makes this the owner of `data`, a block of malloc that holds the pixels without gaps. One that is refused is
+    /// freed.
     void commit(int w, int h, int bytesPerPixel, void* data);
 
     /// Copies the pixels of `from`, whatever the strides; false and nothing copied if the sizes are not the same.
@@ -73,7 +75,7 @@ public:
     void* ownedData() const { return ownedData_; }
 
 private:
-    void setShape(int w, int h, int bytesPerPixel);
+    bool setDenseShape(int w, int h, int bytesPerPixel);
 
     std::int32_t dims_[2] = {0, 0};
     std::int32_t bytesPerPixel_ = 0;

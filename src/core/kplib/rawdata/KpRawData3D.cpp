@@ -2,9 +2,11 @@
 
 #include <kplib/cpu/ByteCount.h>
 #include <kplib/foundation/KpMemory.h>
+#include <kplib/log/KpLogFile.h>
 #include <kplib/rawdata/KpRawData2D.h>
 #include <kplib/rawdata/detail/PlaneCopy.h>
 
+#include <climits>
 #include <utility>
 
 using namespace kplib::detail;
@@ -40,6 +42,15 @@ PlaneShape shapeOf(const KpRawData3D& block, int orientation)
 {
     const Axes axes = axesOf(orientation);
     return {block.dims()[axes.row], block.dims()[axes.column], block.bytesPerVoxel()};
+}
+
+// Whether the strides are what views have room for; an error in the log if not.
+bool hasIntStrides(const Plane& plane)
+{
+    const bool fits = plane.pixelStride <= INT_MAX && plane.rowStride <= INT_MAX;
+    if (!fits)
+        getTheLogInstance().errorf("KpRawData3D: the strides of a slice are 2147483648 bytes or more\n");
+    return fits;
 }
 
 bool isOrientation(int number)
@@ -99,7 +110,9 @@ void KpRawData3D::getDims(int orientation, int& d0, int& d1, int& d2) const
 
 void KpRawData3D::accessSlice(int orientation, int k, void*& p, int& stride0, int& stride1) const
 {
-    const Plane plane = planeOf(*this, orientation, k);
+    Plane plane = planeOf(*this, orientation, k);
+    if (!hasIntStrides(plane))
+        plane = {};
     p = plane.data;
     stride0 = static_cast<int>(plane.pixelStride);
     stride1 = static_cast<int>(plane.rowStride);
@@ -111,12 +124,13 @@ void KpRawData3D::getSlice(int orientation, int k, KpRawData2D& out, int copy) c
         return;
     const Plane plane = planeOf(*this, orientation, k);
     const PlaneShape shape = shapeOf(*this, orientation);
-    if (copy != 0) {
+    if (copy != 0)
         copyPlane(densePlane(out.data(), shape), plane, shape);
-        return;
-    }
-    out.init(static_cast<int>(shape.width), static_cast<int>(shape.height), bytesPerVoxel_,
-             static_cast<int>(plane.pixelStride), static_cast<int>(plane.rowStride), plane.data);
+    else if (hasIntStrides(plane))
+        out.init(static_cast<int>(shape.width), static_cast<int>(shape.height), bytesPerVoxel_,
+                 static_cast<int>(plane.pixelStride), static_cast<int>(plane.rowStride), plane.data);
+    else
+        out.init(0, 0, bytesPerVoxel_, nullptr);
 }
 
 void KpRawData3D::putSlice(int orientation, int k, const KpRawData2D& slice)

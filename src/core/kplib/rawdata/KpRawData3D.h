@@ -45,11 +45,13 @@ public:
     void getDims(int orientation, int& d0, int& d1, int& d2) const;
 
     /// First voxel of slice `k`, and the bytes from voxel to voxel in a row and from row to row. Other orientations
-    /// than 1 and 2 count as 0.
+    /// than 1 and 2 count as 0. Strides are 32 bits: if one is 2^31 bytes or more, null and zeros, with an error in the
+    /// log; copies of such slices are still to be had by getSlice() and putSlice().
     void accessSlice(int orientation, int k, void*& p, int& stride0, int& stride1) const;
 
-    /// Makes `out` a view on slice `k`; or, with `copy`, fills the memory that `out` has to have, without gaps and
-    /// whatever its sizes and strides say. Other orientations than 0, 1 and 2 do nothing.
+    /// Makes `out` a view on slice `k`, without pixels or data if accessSlice() refuses it; or, with `copy`, fills the
+    /// memory that `out` has to have, without gaps and whatever its sizes and strides say. Other orientations than 0, 1
+    /// and 2 do nothing.
     void getSlice(int orientation, int k, KpRawData2D& out, int copy) const;
 
     /// Overwrites slice `k` by the pixels of `slice`, which lie without gaps, whatever its sizes and strides say. Other
