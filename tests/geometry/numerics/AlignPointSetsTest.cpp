@@ -4,6 +4,8 @@
 #include <kplib/geometry/KpRotation.h>
 #include <kplib/geometry/numerics/KpDMatrix.h>
 
+#include <support/ExhaustedMemory.h>
+
 #include <Eigen/Dense>
 #include <gtest/gtest.h>
 
@@ -185,6 +187,18 @@ TEST(KpAlignPointSets, appliesTheInitialMatrixToWhateverThereIs)
     KpMat4f result = initial;
     kpAlignPointSets(result, p, p, 0, 0, &result);
     EXPECT_EQ(result, initial);
+}
+
+TEST(KpAlignPointSets, leavesTheResultWithoutMemory)
+{
+    const Points points1 = cloud(9, KpVec3f(1, 2, 3)), points2 = cloud(9, KpVec3f(1, 2, 3));
+    for (const int mode : {0, 1, 2}) {
+        KpMat4f result = KpMat4f::identity(), expected;
+        kpAlignPointSets(expected, points1.data(), points2.data(), 9, mode);
+        kplib::test::failAtEachAllocation(
+            [&] { kpAlignPointSets(result, points1.data(), points2.data(), 9, mode); },
+            [&] { EXPECT_TRUE(result == KpMat4f::identity() || result == expected) << mode; });
+    }
 }
 
 TEST(KpAlignPointSets, keepsItsAccuracyOverManyDistantPairs)

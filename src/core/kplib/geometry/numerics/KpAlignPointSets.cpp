@@ -1,9 +1,11 @@
 #include <kplib/geometry/numerics/KpAlignPointSets.h>
 
+#include <kplib/foundation/KpMemoryException.h>
 #include <kplib/geometry/KpMat3f.h>
 #include <kplib/geometry/KpMat4f.h>
 #include <kplib/geometry/numerics/KpDMatrix.h>
 #include <kplib/geometry/numerics/detail/CentredRows.h>
+#include <kplib/geometry/numerics/detail/LinearSolver.h>
 
 #include <algorithm>
 
@@ -124,11 +126,16 @@ template <typename Rows>
 KpMat4f fitAffine(const Rows& rows, const Centroids& centroids)
 {
     const KpMat3f normal = sumOfProducts(rows, [](Row4 a, Row4) { return a; });
-    KpMat3f sides = sumOfProducts(rows, [](Row4, Row4 b) { return b; }).transpose();
-    KpDMatrix<float> equations(3, 3);
-    std::copy_n(normal.data(), 9, equations.data());
-    float* columns[] = {sides[0], sides[1], sides[2]};
-    equations.solveLRdecomp(columns, 3);
+    KpMat3f sides = sumOfProducts(rows, [](Row4, Row4 b) { return b; }).transpose(), factors = normal;
+    float* lr[] = {factors[0], factors[1], factors[2]};
+    kplib::detail::LinearSolver solver(normal.data(), 3, lr);
+    if (!solver.isComplete())
+        throw KpMemoryException();  // else the sides would pass for the solution, as those of a plane do
+    float sign = 1;
+    if (solver.decompose(sign)) {
+        for (int i = 0; i < 3; ++i)
+            solver.solve(sides[i]);
+    }
     return between(centroids.list2, sides.transpose(), centroids.list1);
 }
 

@@ -11,8 +11,8 @@
 // `initial`, if given, is applied after what was found: `result` becomes result * initial at the end in any case. It
 // may be the address of `result`, whose value at the call counts. `n`: count of pairs; with none (for lists with
 // weights: or fewer), or with weights whose sum is exactly 0, the identity. Mirrored and flat sets give a proper
-// rotation; the scale of points that are all one is not a number. O(n), in two or three walks over the lists without a
-// copy. Safe from any thread.
+// rotation; the scale of points that are all one is not a number. Exhausted memory is a KpMemoryException, and `result`
+// stays. O(n), in two or three walks over the lists without a copy. Safe from any thread.
 //
 // Accuracy: sums are pairwise, so that the number of pairs hardly matters; the distance of the points from the origin
 // does. 1,000,000 pairs at 2000 units from the origin are aligned to 0.01 of a unit.
