@@ -20,7 +20,8 @@ namespace {
 
 std::atomic<std::time_t> fakeTime;
 
-/// Local time is UTC, and the clock stands at what `fakeTime` says.
+/// Local time is UTC, and the clock stands at what `fakeTime` says: at first later than in all tests before, since the
+/// numbers that a process gives only rise.
 class CreateUIDs : public testing::Test {
 protected:
     void SetUp() override
@@ -28,10 +29,12 @@ protected:
         setenv("TZ", "UTC", 1);
         tzset();
         kplib::detail::uidClock = [] { return fakeTime.load(); };
+        fakeTime = start += 1000000;
     }
     void TearDown() override { kplib::detail::uidClock = realClock; }
 
 private:
+    static inline std::time_t start = 4102542245;  // in 2100
     std::time_t (*realClock)() = kplib::detail::uidClock;
 };
 
@@ -49,14 +52,16 @@ long long counterOf(const KpString& uid)
 
 TEST_F(CreateUIDs, theTextIsMadeOfItsParts)
 {
-    fakeTime = 4102542245;  // 2100-01-02 03:04:05, later than what other tests take
+    const std::time_t now = fakeTime;
+    char time[20];  // years count from 2000
+    std::strftime(time, sizeof time, "1%y%m%d%H%M%S", std::gmtime(&now));
     KpCreateUIDs creator;
     KpString uid;
     ASSERT_TRUE(creator.createUID(KpCreateUIDs::UIDtype0, uid));
     const auto pieces = parts(uid);
     ASSERT_EQ(pieces.size(), 10);
     EXPECT_TRUE(std::string(uid.c_str()).starts_with("1.2.276.0.77.7.2.8432031"));
-    EXPECT_TRUE(std::string(pieces[8].c_str()).starts_with("1000102030405"));
+    EXPECT_TRUE(std::string(pieces[8].c_str()).starts_with(time));
     EXPECT_EQ(std::strlen(pieces[8].c_str()), 18U);
     EXPECT_EQ(std::atoi(pieces[9].c_str()), kplib::detail::uidProcessPart(getpid()));
 
@@ -85,7 +90,6 @@ TEST_F(CreateUIDs, theCounterRisesWhenTheClockGoesBack)
     KpCreateUIDs creator;
     KpString uid;
     long long last = 0;
-    fakeTime = 4102542245 + 10;
     for (const int step : {0, 0, -100000, 0, 50, 100, -50}) {
         fakeTime += step;
         ASSERT_TRUE(creator.createUID(KpCreateUIDs::UIDtype1, uid));
@@ -99,7 +103,6 @@ TEST_F(CreateUIDs, theCounterRisesWhenTheClockGoesBack)
 
 TEST_F(CreateUIDs, ThreadsNeverGetTheSame)
 {
-    fakeTime = 4102542245 + 10000;
     constexpr size_t count = 20000;  // together more than a second has numbers
     std::vector<std::vector<long long>> taken(8);
     {
