@@ -6,6 +6,8 @@
 
 // The linker leads malloc, realloc and calloc of the library's objects here (-Wl,--wrap); the operators new of this
 // binary serve what they and the standard library's inline code allocate. Those for arrays lead to these by default.
+// valgrind puts its own operators new in their place, so that no allocation by new fails, unless it is started where
+// .valgrindrc forbids that; then it watches the malloc that they call.
 
 namespace {
 
