@@ -24,6 +24,11 @@ set(pc_folder ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig)
 cmake_path(RELATIVE_PATH CMAKE_INSTALL_PREFIX BASE_DIRECTORY ${pc_folder} OUTPUT_VARIABLE to_prefix)
 cmake_path(RELATIVE_PATH CMAKE_INSTALL_FULL_LIBDIR BASE_DIRECTORY ${CMAKE_INSTALL_PREFIX} OUTPUT_VARIABLE libdir)
 cmake_path(RELATIVE_PATH CMAKE_INSTALL_FULL_INCLUDEDIR BASE_DIRECTORY ${CMAKE_INSTALL_PREFIX} OUTPUT_VARIABLE includedir)
+# A program that links a sanitizer's build links the sanitizer's runtime itself.
+set(KPLIB_PC_LINK_OPTIONS)
+if(KPLIB_SANITIZE)
+    set(KPLIB_PC_LINK_OPTIONS " -fsanitize=${KPLIB_SANITIZE}")
+endif()
 configure_file(${PROJECT_SOURCE_DIR}/cmake/kplib.pc.in kplib.pc @ONLY)
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/kplib.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT Development)
 

@@ -1,5 +1,7 @@
-// Asked by the sanitizers at start-up, so that a test binary runs the same from a script, from ctest or by hand.
+// Asked by the sanitizers at start-up, so that a test binary runs the same from a script, from ctest or by hand. The
+// runtime of a sanitizer may be a shared object, which sees only what the binary exports.
 
+#pragma GCC visibility push(default)
 extern "C" {
 const char* __asan_default_options();
 const char* __tsan_default_options();
@@ -21,3 +23,4 @@ const char* __ubsan_default_options()
     return "print_stacktrace=1";
 }
 }
+#pragma GCC visibility pop
