@@ -9,7 +9,7 @@ class KPLIB_API KpException {
 public:
     KpException() = default;
     KpException(const KpString& message) : message_(message) {}
-    KpException(const char* format, ...);
+    KpException(const char* format, ...) KPLIB_PRINTF(2, 3);
     KpException(const KpException&) = default;
     KpException& operator=(const KpException&) = default;
     virtual ~KpException();

@@ -14,7 +14,7 @@ void dropReallocationText(unsigned long size)
 {
     try {
         KpString text{KpString::NoMemory()};
-        text.printf("could not reallocate %Id bytes", size);
+        text.printf("could not reallocate %lu bytes", size);
     } catch (const KpMemoryException&) {
         return;  // there isn't even memory for the text
     }

@@ -27,7 +27,7 @@ public:
     /// The `count` bytes from `s + start`, without a look at the length of `s`.
     KpString(const char* s, int start, int count);
     /// Formatted as by printf(); the leading int only selects this constructor.
-    KpString(int ignored, const char* format, ...);
+    KpString(int ignored, const char* format, ...) KPLIB_PRINTF(3, 4);
     explicit KpString(std::string_view text);
     /// An array of size 0: for what must not allocate.
     explicit KpString(NoMemory) noexcept {}
@@ -83,8 +83,8 @@ public:
 
     /// Replaces the content by the formatted text and returns it. The string itself must not be among the arguments. If
     /// there is no memory, the content is undefined text.
-    char* printf(const char* format, ...);
-    char* vprintf(const char* format, va_list args);
+    char* printf(const char* format, ...) KPLIB_PRINTF(2, 3);
+    char* vprintf(const char* format, va_list args) KPLIB_PRINTF(2, 0);
 
     /// The number in decimal, in place of the content or as a new string.
     void setInt64(long long v);

@@ -48,15 +48,15 @@ public:
     /// One line; a null `module` stands for the default module. A message below all thresholds is still formatted:
     /// where that costs, ask debugEnabled() first.
     void trace(KpLogLevel level, const char* module, const char* text);
-    void tracef(KpLogLevel level, const char* module, const char* format, ...);
+    void tracef(KpLogLevel level, const char* module, const char* format, ...) KPLIB_PRINTF(4, 5);
 
     /// Information.
     void print(const char* module, const char* text);
-    void printf(const char* format, ...);
+    void printf(const char* format, ...) KPLIB_PRINTF(2, 3);
     void warn(const char* module, const char* text);
-    void warnf(const char* format, ...);
+    void warnf(const char* format, ...) KPLIB_PRINTF(2, 3);
     void error(const char* module, const char* text);
-    void errorf(const char* format, ...);
+    void errorf(const char* format, ...) KPLIB_PRINTF(2, 3);
 
     /// A finished line: to file or console if `level` reaches logLevel(), with a newline added if it has none at its
     /// end, and as it is to the callback if `level` reaches writeCallbackLogLevel().

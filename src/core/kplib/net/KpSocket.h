@@ -48,7 +48,7 @@ public:
 
     /// Sends the text that printf() would make of it, of which only the first 4095 characters go out. One call of the
     /// system's, which may take less than all; gives its result.
-    static int send(int socket, const char* format, ...);
+    static int send(int socket, const char* format, ...) KPLIB_PRINTF(2, 3);
 
     /// Sends all `size` bytes and gives `size`; what the call that failed gave, below 0; or, where the system takes
     /// nothing more, the bytes sent so far. Nothing to send gives 0.

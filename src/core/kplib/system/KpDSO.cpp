@@ -8,6 +8,9 @@
 #include <dlfcn.h>
 #include <string>
 
+// The log takes the first text of each call as its format, so "DSO" is all that it shows of most of them. It stays so.
+#pragma GCC diagnostic ignored "-Wformat-extra-args"
+
 KpDArray<char*> KpDSO::dsoSearchPath;
 int KpDSO::verbose = 0;
 
@@ -16,8 +19,6 @@ struct KpDSO::Private {
 };
 
 namespace {
-
-// The log takes the first text of each call as its format, so "DSO" is all that it shows of most of them. It stays so.
 
 void tell(const char* format, const char* text)
 {

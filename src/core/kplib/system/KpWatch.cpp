@@ -118,8 +118,11 @@ void KpWatch::dump(int index)
     KpString line = index != 0 ? KpString(0, " --- %s [%02d]: %d msec", name_->c_str(), index, ms)
                                : KpString(0, " --- %s: %d msec", name_->c_str(), ms);
     if (lastDump_ >= 0)
-        line += KpString(0, "  (+ %d ms)", truncated((t - lastDump_) * 1000));
-    getTheLogInstance().printf(line);  // as the format, and that is meant
+        line += KpString(0, "  (+ %d ms)", truncated((t - static_cast<double>(lastDump_)) * 1000));
+#pragma GCC diagnostic push
+#pragma GCC diagnostic ignored "-Wformat-security"
+    getTheLogInstance().printf(line);  // intentional: the name is a format
+#pragma GCC diagnostic pop
     lastDump_ = static_cast<float>(t);
 }
 
