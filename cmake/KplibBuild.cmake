@@ -37,6 +37,14 @@ endif()
 # What users may turn on for their own code, and so for the public headers.
 set(KPLIB_HEADER_WARNINGS -Wconversion -Wsign-conversion -Wdouble-promotion -Wold-style-cast)
 
+# What ships is hardened: overwritten stacks and buffers of known size end the process, and tables of addresses are
+# read-only. The sanitizers have checks of their own.
+if(NOT KPLIB_SANITIZE)
+    add_compile_options($<$<CONFIG:Release>:-fstack-protector-strong>
+                        "$<$<CONFIG:Release>:SHELL:-U_FORTIFY_SOURCE -D_FORTIFY_SOURCE=2>")
+    add_link_options($<$<CONFIG:Release>:-Wl,-z,relro,-z,now>)
+endif()
+
 if(KPLIB_SANITIZE)
     set(CMAKE_CXX_FLAGS_RELEASE "-O1 -DNDEBUG")  # half the time to build, and another level for results to hold on
     add_compile_options(-fsanitize=${KPLIB_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer -g1)
