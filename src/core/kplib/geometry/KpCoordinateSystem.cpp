@@ -75,9 +75,10 @@ void KpCoordinateSystem::setAxesByRotation(const KpRotation& rotation)
 
 void KpCoordinateSystem::makePerpendicular(int axis, bool keepDirection)
 {
-    const KpVec3f kept = axes_[axis];
-    KpVec3f& second = axes_[(axis + 1) % 3];
-    KpVec3f& third = axes_[(axis + 2) % 3];
+    const auto first = static_cast<std::size_t>(axis);
+    const KpVec3f kept = axes_[first];
+    KpVec3f& second = axes_[(first + 1) % 3];
+    KpVec3f& third = axes_[(first + 2) % 3];
     const KpVec3f newThird = kept.cross(second);
     const KpVec3f newSecond = newThird.cross(kept);
     const auto replace = [&](KpVec3f& old, const KpVec3f& value) {

@@ -51,7 +51,7 @@ bool KpMat4f::factor(KpMat4f& r, KpVec3f& s, KpMat4f& u, KpVec3f& t, KpMat4f& pr
 
     const float det = a.det3();
     const float sign = det < 0 ? -1.0F : 1.0F;
-    if (det * sign < 1e-12)
+    if (static_cast<double>(det * sign) < 1e-12)
         return false;
 
     float evalues[3];
@@ -62,7 +62,7 @@ bool KpMat4f::factor(KpMat4f& r, KpVec3f& s, KpMat4f& u, KpVec3f& t, KpMat4f& pr
                KpVec3f(evectors[1][0], evectors[1][1], evectors[1][2]),
                KpVec3f(evectors[2][0], evectors[2][1], evectors[2][2]), KpVec3f(0, 0, 0));
     for (int i = 0; i < 3; ++i)
-        s[i] = static_cast<float>(std::sqrt(static_cast<double>(evalues[i])) * sign);
+        s[i] = static_cast<float>(std::sqrt(static_cast<double>(evalues[i])) * static_cast<double>(sign));
     u = r * scaleBy(KpVec3f(1, 1, 1) / s) * r.transpose() * a;
     return true;
 }

@@ -170,7 +170,7 @@ std::pair<bool, float> KpPlane::getDistance(const KpPlane& other) const
 
 bool KpPlane::isParallel(const KpPlane& other) const
 {
-    const double cosine = normal_.dot(other.normal_);
+    const auto cosine = static_cast<double>(normal_.dot(other.normal_));
     return std::abs(std::abs(cosine) - 1) <= 0.0001;
 }
 

@@ -23,8 +23,8 @@ double root(float x)
 
 KpRotation KpRotation::withAxis(const KpVec3f& unit, double sine, double cosine)
 {
-    return asStored(static_cast<float>(unit.x() * sine), static_cast<float>(unit.y() * sine),
-                    static_cast<float>(unit.z() * sine), static_cast<float>(cosine));
+    const auto times = [sine](float component) { return static_cast<float>(static_cast<double>(component) * sine); };
+    return asStored(times(unit.x()), times(unit.y()), times(unit.z()), static_cast<float>(cosine));
 }
 
 void KpRotation::setValue(float x, float y, float z, float w)
@@ -110,7 +110,7 @@ void KpRotation::getValue(KpVec3f& axis, float& angle) const
 {
     const KpVec3f vector(q_[0], q_[1], q_[2]);
     const float length = vector.length();
-    const bool turns = length > 1e-5;
+    const bool turns = static_cast<double>(length) > 1e-5;
     axis = turns ? vector / length : KpVec3f(0, 0, 1);
     const float cosine = std::clamp(q_[3], -1.0F, 1.0F);  // a product of small turns may be slightly greater than 1
     angle = turns ? static_cast<float>(2 * std::acos(static_cast<double>(cosine))) : 0;
@@ -129,7 +129,10 @@ void KpMat4f::setRotate(const KpRotation& rotation)
 KpMat3f KpRotation::toMat3f() const
 {
     const auto& [x, y, z, w] = q_;
-    const auto diagonal = [](double a, double b) { return static_cast<float>(1 - 2 * (a * a + b * b)); };
+    const auto diagonal = [](float p, float q) {
+        const auto a = static_cast<double>(p), b = static_cast<double>(q);
+        return static_cast<float>(1 - 2 * (a * a + b * b));
+    };
     return {diagonal(y, z),      2 * (x * y + z * w), 2 * (z * x - y * w), 2 * (x * y - z * w), diagonal(x, z),
             2 * (x * w + y * z), 2 * (y * w + z * x), 2 * (y * z - x * w), diagonal(x, y)};
 }
@@ -138,7 +141,7 @@ void KpRotation::normalize()
 {
     const double length = root(norm());
     for (float& component : q_)
-        component = static_cast<float>(component / length);
+        component = static_cast<float>(static_cast<double>(component) / length);
 }
 
 void KpRotation::invert()
@@ -185,8 +188,8 @@ KpRotation KpRotation::slerp(const KpRotation& a, const KpRotation& b, float t)
 {
     const float product = a.q_[0] * b.q_[0] + a.q_[1] * b.q_[1] + a.q_[2] * b.q_[2] + a.q_[3] * b.q_[3];
     const float cosine = std::abs(product);
-    double scaleA = 1 - static_cast<double>(t), scaleB = t;
-    if (1 - cosine > 1e-5) {
+    double scaleB = static_cast<double>(t), scaleA = 1 - scaleB;
+    if (static_cast<double>(1 - cosine) > 1e-5) {
         const double omega = std::acos(static_cast<double>(cosine));
         scaleA = std::sin(scaleA * omega) / std::sin(omega);
         scaleB = std::sin(scaleB * omega) / std::sin(omega);
@@ -195,6 +198,7 @@ KpRotation KpRotation::slerp(const KpRotation& a, const KpRotation& b, float t)
         scaleB = -scaleB;
     KpRotation result;
     for (int i = 0; i < 4; ++i)
-        result.q_[i] = static_cast<float>(scaleA * a.q_[i] + scaleB * b.q_[i]);
+        result.q_[i] =
+            static_cast<float>(scaleA * static_cast<double>(a.q_[i]) + scaleB * static_cast<double>(b.q_[i]));
     return result;
 }

@@ -71,7 +71,8 @@ bool KpSphereSheetProjector::meetsSphere(const KpLine& line, KpVec3f& onSphere, 
         toPlane.setPosDir(intersectFront_ ? enter : exit, planeDir_);
     onSphere = intersectFront_ ? enter : exit;
     tolPlane_.intersect(toPlane, onPlane);
-    return static_cast<float>(sphere_.radius() * 0.7071067811865476) > (onPlane - planePoint_).length();
+    return static_cast<float>(static_cast<double>(sphere_.radius()) * 0.7071067811865476) >
+           (onPlane - planePoint_).length();
 }
 
 // The height r^2 / (2 d) and its slope are the sphere's where they meet.

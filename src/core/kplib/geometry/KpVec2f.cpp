@@ -20,7 +20,7 @@ float KpVec2f::angle(const KpVec2f& other) const
 {
     const double lengths = std::hypot(static_cast<double>(x()), static_cast<double>(y())) *
                            std::hypot(static_cast<double>(other.x()), static_cast<double>(other.y()));
-    const double cosine = dot(other) / lengths;
+    const double cosine = static_cast<double>(dot(other)) / lengths;
     if (cosine < -1)
         return std::numbers::pi_v<float>;
     if (cosine > 1)

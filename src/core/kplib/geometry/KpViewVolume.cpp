@@ -20,7 +20,7 @@ void KpViewVolume::ortho(float left, float right, float bottom, float top, float
 
 void KpViewVolume::perspective(float fovy, float aspect, float near, float far)
 {
-    const float h = static_cast<float>(near * std::tan(static_cast<double>(fovy) / 2));
+    const float h = static_cast<float>(static_cast<double>(near) * std::tan(static_cast<double>(fovy) / 2));
     const float w = h * aspect;
     setShape(Perspective, {-w, -h, -near}, {w, -h, -near}, {-w, h, -near}, near, far);
 }
@@ -107,14 +107,14 @@ float KpViewVolume::stereoShift(float width) const
 {
     if (stereoMode_ == 0)
         return 0;
-    const double middle = nearDist_ + static_cast<double>(nearToFar_) / 2;
-    double offset = cameraOffset_;
+    const auto near = static_cast<double>(nearDist_), middle = near + static_cast<double>(nearToFar_) / 2;
+    auto offset = static_cast<double>(cameraOffset_);
     if (!isCameraOffsetSet()) {
-        offset = width * (middle / nearDist_) * 0.035 * stereoEyeScale_;
+        offset = static_cast<double>(width) * (middle / near) * 0.035 * static_cast<double>(stereoEyeScale_);
         if (stereoMode_ == 1)
             offset = -offset;
     }
-    return static_cast<float>(offset * stereoOffsetScale_ * (nearDist_ / middle) * -2);
+    return static_cast<float>(offset * static_cast<double>(stereoOffsetScale_) * (near / middle) * -2);
 }
 
 KpMat4f KpViewVolume::getMatrix() const

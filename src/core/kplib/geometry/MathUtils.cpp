@@ -20,7 +20,8 @@ float MathUtils::angleBetweenVectors(const KpVec3f& a, const KpVec3f& b, const K
     const KpVec3f from = normalized(a);
     const KpVec3f to = normalized(b);
     // In double: the C library's functions of float differ in their last bit between processors.
-    const double sine = from.cross(to).dot(normalized(reference)), cosine = from.dot(to);
+    const auto sine = static_cast<double>(from.cross(to).dot(normalized(reference)));
+    const auto cosine = static_cast<double>(from.dot(to));
     auto angle = static_cast<float>(std::atan2(sine, cosine));
     if (angle < 0)
         angle += twoPi;
@@ -44,7 +45,7 @@ bool MathUtils::areLinearlyIndependent(const KpVec3f& a, const KpVec3f& b, const
 
 bool MathUtils::arePerpendicular(const KpVec3f& a, const KpVec3f& b)
 {
-    const double product = a.dot(b);
+    const auto product = static_cast<double>(a.dot(b));
     return -1e-6 < product && product < 1e-6;
 }
 

@@ -19,7 +19,7 @@ extern const std::uint8_t cuts[128][7];
 template <typename Vector, typename Number>
 void fillCorners(Vector (&corners)[8], std::span<const Number, 6> box)
 {
-    for (int i = 0; i < 8; ++i)
+    for (std::size_t i = 0; i < 8; ++i)
         corners[i] = {box[i & 1], box[2 + (i >> 1 & 1)], box[4 + (i >> 2)]};
 }
 

@@ -143,8 +143,8 @@ namespace {
 constexpr bool holdsDividedEdges(unsigned set)
 {
     const std::uint8_t* const row = kplib::detail::cuts[set];
-    const unsigned divided = std::popcount((set ^ set >> 1) & 0x55) + std::popcount((set ^ set >> 2) & 0x33) +
-                             std::popcount((set ^ set >> 4) & 0x0F);
+    const int divided = std::popcount((set ^ set >> 1) & 0x55) + std::popcount((set ^ set >> 2) & 0x33) +
+                        std::popcount((set ^ set >> 4) & 0x0F);
     for (int i = 1; i <= row[0]; ++i) {
         const unsigned a = row[i] >> 4, b = row[i] & 15;
         if (std::popcount(a ^ b) != 1 || (set >> a & 1) == (set >> b & 1))

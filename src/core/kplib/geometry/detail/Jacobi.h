@@ -20,7 +20,9 @@ public:
     // that the eigenvalues don't feel.
     Jacobi(const float* rows, int stride, int thresholdSweeps, int skipSweep) :
         evalues{rows[0], rows[stride + 1], rows[2 * stride + 2]}, thresholdSweeps_(thresholdSweeps),
-        skipSweep_(skipSweep), off_{rows[stride + 2], rows[2], rows[1]}, sums_{evalues[0], evalues[1], evalues[2]}
+        skipSweep_(skipSweep), off_{Real(rows[stride + 2]), Real(rows[2]), Real(rows[1])}, sums_{Real(evalues[0]),
+                                                                                                 Real(evalues[1]),
+                                                                                                 Real(evalues[2])}
     {
     }
 
@@ -58,7 +60,10 @@ private:
     }
 
     // An eigenvalue is a float, so that is what it has to be lost in.
-    static bool isLostIn(float value, Real g) { return static_cast<float>(g + std::abs(value)) == std::abs(value); }
+    static bool isLostIn(float value, Real g)
+    {
+        return static_cast<float>(g + static_cast<Real>(std::abs(value))) == std::abs(value);
+    }
 
     template <int P, int Q>
     [[gnu::always_inline]] void rotate(Real g, Real (&shifts)[3])
@@ -71,8 +76,8 @@ private:
         const Real shift = t * element;
         shifts[P] -= shift;
         shifts[Q] += shift;
-        evalues[P] = static_cast<float>(evalues[P] - shift);
-        evalues[Q] = static_cast<float>(evalues[Q] + shift);
+        evalues[P] = static_cast<float>(static_cast<Real>(evalues[P]) - shift);
+        evalues[Q] = static_cast<float>(static_cast<Real>(evalues[Q]) + shift);
         element = 0;
         turn(off_[Q], off_[P], s, tau);
         for (int row = 0; row < 3; ++row)
@@ -87,15 +92,16 @@ private:
             return element / h;
         const Real theta = h / 2 / element;
         // The root is a double in either case.
-        const auto t = static_cast<Real>(1 / (std::abs(theta) + std::sqrt(static_cast<double>(theta * theta + 1))));
+        const auto t = static_cast<Real>(
+            1 / (static_cast<double>(std::abs(theta)) + std::sqrt(static_cast<double>(theta * theta + 1))));
         return theta < 0 ? -t : t;
     }
 
     template <typename Element>
     [[gnu::always_inline]] static void turn(Element& first, Element& second, Real s, Real tau)
     {
-        const Real g = first;
-        const Real h = second;
+        const Real g = static_cast<Real>(first);
+        const Real h = static_cast<Real>(second);
         first = static_cast<Element>(g - s * (h + g * tau));
         second = static_cast<Element>(h + s * (g - h * tau));
     }

@@ -12,7 +12,7 @@ bool invertPlain(const float* in, float* out)
     double a[3][3];
     for (int i = 0; i < 3; ++i) {
         for (int j = 0; j < 3; ++j)
-            a[i][j] = in[4 * i + j];
+            a[i][j] = static_cast<double>(in[4 * i + j]);
     }
     double positive = 0, negative = 0;
     for (const double term : {a[0][0] * a[1][1] * a[2][2], a[0][1] * a[1][2] * a[2][0], a[0][2] * a[1][0] * a[2][1],

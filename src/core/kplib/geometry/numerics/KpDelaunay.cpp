@@ -34,7 +34,7 @@ template <int Size>
 Box<Size> boxOf(const KpDArray<Point<Size>>& points, int n)
 {
     Box<Size> box;
-    for (int axis = 0; n > 0 && axis < Size; ++axis) {
+    for (std::size_t axis = 0; n > 0 && axis < Size; ++axis) {
         float low = points[0][axis], high = low;
         for (int i = 1; i < n; ++i) {
             low = std::min(low, points[i][axis]);
@@ -50,9 +50,9 @@ Box<Size> boxOf(const KpDArray<Point<Size>>& points, int n)
 template <int Size>
 float volume(const KpDArray<Point<Size>>& points, const Simplex<Size>& simplex)
 {
-    std::array<Point<Size>, Size> sides;
-    for (int k = 0; k < Size; ++k)
-        for (int axis = 0; axis < Size; ++axis)
+    std::array<Point<Size>, std::size_t{Size}> sides;
+    for (std::size_t k = 0; k < Size; ++k)
+        for (std::size_t axis = 0; axis < Size; ++axis)
             sides[k][axis] = points[simplex[k]][axis] - points[simplex[Size]][axis];
     return determinant(sides);
 }
@@ -98,10 +98,10 @@ PointSet<Size> shifted(const float* coordinates, int n)
     set.range = *std::max_element(box.range.begin(), box.range.end());
     for (int i = 0; i < set.n; ++i)
         for (float& x : set.points[i])
-            x += static_cast<float>((0.5 - KpRandom::rand()) * 1e-8 * set.range);
-    for (int k = 0; k <= Size; ++k)
-        for (int axis = 0; axis < Size; ++axis)
-            set.points[set.n + k][axis] =
+            x += static_cast<float>((0.5 - KpRandom::rand()) * 1e-8 * static_cast<double>(set.range));
+    for (std::size_t k = 0; k <= Size; ++k)
+        for (std::size_t axis = 0; axis < Size; ++axis)
+            set.points[set.n + static_cast<long>(k)][axis] =
                 k == axis ? box.low[axis] + far(Size) * box.range[axis] : box.low[axis] - near(Size) * box.range[axis];
     return set;
 }

@@ -11,11 +11,17 @@ struct Close {
     void operator()(FILE* f) const { std::fclose(f); }
 };
 
+template <typename... Floats>
+void print(FILE* f, const char* format, Floats... values)
+{
+    std::fprintf(f, format, static_cast<double>(values)...);
+}
+
 void writeFrame(FILE* f, const KpVec2f& range)
 {
     const float dx = range.x(), dy = range.y(), m = std::max(dx, dy);
     const KpVec2f offset = dx > dy ? KpVec2f(0, (1 - dy / dx) / 2) : KpVec2f((1 - dx / dy) / 2, 0);
-    std::fprintf(f, "%g %g translate\n%g %g scale\n", offset.x(), offset.y(), 1 / m, 1 / m);
+    print(f, "%g %g translate\n%g %g scale\n", offset.x(), offset.y(), 1 / m, 1 / m);
 }
 
 void writeTriangles(FILE* f, const KpVec2f* points, int n, const KpDArray<KpDelaunay::Triangle>& triangles)
@@ -30,7 +36,7 @@ void writeTriangles(FILE* f, const KpVec2f* points, int n, const KpDArray<KpDela
     std::fprintf(f, "0 setlinewidth\n");
     for (const KpDelaunay::Triangle& t : triangles) {
         const KpVec2f a = points[t[0]] - low, b = points[t[1]] - low, c = points[t[2]] - low;
-        std::fprintf(f, "%g %g M %g %g L %g %g L CS\n", a.x(), a.y(), b.x(), b.y(), c.x(), c.y());
+        print(f, "%g %g M %g %g L %g %g L CS\n", a.x(), a.y(), b.x(), b.y(), c.x(), c.y());
     }
 }
 

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <array>
+#include <cstddef>
 #include <cstdint>
 
 namespace kplib::detail::delaunay {
@@ -8,13 +9,13 @@ namespace kplib::detail::delaunay {
 // In the plane (Size 2) a simplex is a triangle, its faces are edges and its sphere is a circle.
 
 template <int Size>
-using Point = std::array<float, Size>;
+using Point = std::array<float, std::size_t{Size}>;
 template <int Size>
-using Position = std::array<double, Size>;
+using Position = std::array<double, std::size_t{Size}>;
 template <int Size>
-using Face = std::array<std::int32_t, Size>;
+using Face = std::array<std::int32_t, std::size_t{Size}>;
 template <int Size>
-using Simplex = std::array<std::int32_t, Size + 1>;
+using Simplex = std::array<std::int32_t, std::size_t{Size} + 1>;
 
 template <int Size>
 struct Circle {
@@ -28,7 +29,7 @@ template <int Size>
 bool contains(const Circle<Size>& circle, const Position<Size>& point)
 {
     double rest = circle.squaredRadius;
-    for (int axis = 0; axis < Size; ++axis) {
+    for (std::size_t axis = 0; axis < Size; ++axis) {
         const double d = point[axis] - circle.center[axis];
         rest -= d * d;
         if (rest < 0)
@@ -55,22 +56,22 @@ template <int Size>
 Circle<Size> circleThrough(const Point<Size>* points, const Face<Size>& face, int last)
 {
     const Point<Size>& p = points[last];
-    std::array<Position<Size>, Size> sides;
+    std::array<Position<Size>, std::size_t{Size}> sides;
     Position<Size> right{};
-    for (int k = 0; k < Size; ++k)
-        for (int axis = 0; axis < Size; ++axis) {
-            const double corner = points[face[k]][axis];
-            sides[k][axis] = corner - p[axis];
-            right[k] += (corner + p[axis]) * sides[k][axis] / 2;
+    for (std::size_t k = 0; k < Size; ++k)
+        for (std::size_t axis = 0; axis < Size; ++axis) {
+            const auto corner = static_cast<double>(points[face[k]][axis]), origin = static_cast<double>(p[axis]);
+            sides[k][axis] = corner - origin;
+            right[k] += (corner + origin) * sides[k][axis] / 2;
         }
     const double all = determinant(sides);
     Circle<Size> circle{};
-    for (int axis = 0; axis < Size; ++axis) {
+    for (std::size_t axis = 0; axis < Size; ++axis) {
         auto replaced = sides;  // Cramer's rule
-        for (int k = 0; k < Size; ++k)
+        for (std::size_t k = 0; k < Size; ++k)
             replaced[k][axis] = right[k];
         circle.center[axis] = determinant(replaced) / all;
-        const double d = circle.center[axis] - p[axis];
+        const double d = circle.center[axis] - static_cast<double>(p[axis]);
         circle.squaredRadius += d * d;
     }
     return circle;

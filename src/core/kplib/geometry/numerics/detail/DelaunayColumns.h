@@ -21,7 +21,7 @@ public:
 
     void set(long i, const Circle<Size>& circle)
     {
-        for (int axis = 0; axis < Size; ++axis)
+        for (std::size_t axis = 0; axis < Size; ++axis)
             columns_[axis][i] = circle.center[axis];
         columns_[Size][i] = circle.squaredRadius;
     }
@@ -29,7 +29,7 @@ public:
     Circle<Size> operator[](long i) const
     {
         Circle<Size> circle;
-        for (int axis = 0; axis < Size; ++axis)
+        for (std::size_t axis = 0; axis < Size; ++axis)
             circle.center[axis] = columns_[axis][i];
         circle.squaredRadius = columns_[Size][i];
         return circle;
@@ -38,14 +38,14 @@ public:
     // Which of the first `count` contain `point`.
     long scan(CircleScan* run, long count, const Position<Size>& point, std::int32_t* hits) const
     {
-        const double* columns[Size + 1];
+        const double* columns[std::size_t{Size} + 1];
         for (int k = 0; k <= Size; ++k)
             columns[k] = columns_[k].data();
         return run(columns, count, point.data(), hits);
     }
 
 private:
-    KpDArray<double> columns_[Size + 1];
+    KpDArray<double> columns_[std::size_t{Size} + 1];
 };
 
 }  // namespace kplib::detail::delaunay

@@ -21,7 +21,7 @@ template <int Size>
 class CircleGrid {
 public:
     // For about that many circles, of points that spread over `range`.
-    CircleGrid(long circles, float range, CircleScan* scan) : widest_(range / 4.0), scan_(scan)
+    CircleGrid(long circles, float range, CircleScan* scan) : widest_(static_cast<double>(range) / 4), scan_(scan)
     {
         const int bits = std::max(8, static_cast<int>(std::bit_width(static_cast<unsigned long>(circles))));
         shift_ = 64 - bits;
@@ -62,7 +62,7 @@ public:
     long find(const Position<Size>& point, long most, std::int32_t* hits) const
     {
         for (const double x : point)
-            if (!(std::abs(x) <= std::numeric_limits<float>::max()))
+            if (!(std::abs(x) <= static_cast<double>(std::numeric_limits<float>::max())))
                 return -1;
         Search search{point, most, hits, wide_.scan(scan_, wideSlots_.size(), point, hits)};
         for (long i = 0; i < search.found; ++i)
@@ -141,7 +141,7 @@ private:
     }
 
     // Adds the share of the cell that holds `x`, along `axis`, to the hash; false for cells beyond number `last`.
-    static bool addCell(double x, int level, int axis, double last, std::uint64_t& hash)
+    static bool addCell(double x, int level, std::size_t axis, double last, std::uint64_t& hash)
     {
         const double cell = x * scale(level);
         if (!(std::abs(cell) < last))
@@ -158,7 +158,7 @@ private:
         const double radius = std::sqrt(circle.squaredRadius);
         Position<Size> low;
         double width = 0;
-        for (int axis = 0; axis < Size; ++axis) {
+        for (std::size_t axis = 0; axis < Size; ++axis) {
             const double center = circle.center[axis];
             const double half = radius + (std::abs(center) + radius) * 1e-14 + 1e-150;
             low[axis] = center - half;
@@ -166,7 +166,7 @@ private:
         }
         const int level = levelFor(width);
         std::uint64_t hash = static_cast<std::uint64_t>(level) * levelFactor;
-        for (int axis = 0; axis < Size; ++axis)
+        for (std::size_t axis = 0; axis < Size; ++axis)
             if (width > widest_ || level >= levels || !addCell(low[axis], level, axis, lastCell, hash))
                 return {none, none};
         return {level, bucketOf(hash)};
@@ -175,7 +175,7 @@ private:
     void visitLevel(int level, Search& search) const
     {
         std::uint64_t hash = static_cast<std::uint64_t>(level) * levelFactor;
-        for (int axis = 0; axis < Size; ++axis)
+        for (std::size_t axis = 0; axis < Size; ++axis)
             if (!addCell(search.point[axis], level, axis, lastCell + reach, hash))
                 return;
         for (int cell = 0; cell < cells; ++cell) {

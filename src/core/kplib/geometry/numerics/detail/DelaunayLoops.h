@@ -13,11 +13,11 @@ template <int Size>
 long scanFrom(long i, long count, const double* const* columns, long n, const double* point, std::int32_t* hits)
 {
     Position<Size> at;
-    for (int axis = 0; axis < Size; ++axis)
+    for (std::size_t axis = 0; axis < Size; ++axis)
         at[axis] = point[axis];
     for (; i < n; ++i) {
         Circle<Size> circle;
-        for (int axis = 0; axis < Size; ++axis)
+        for (std::size_t axis = 0; axis < Size; ++axis)
             circle.center[axis] = columns[axis][i];
         circle.squaredRadius = columns[Size][i];
         if (contains<Size>(circle, at))

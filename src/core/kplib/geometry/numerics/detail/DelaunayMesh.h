@@ -4,6 +4,7 @@
 #include <kplib/geometry/numerics/detail/DelaunayRim.h>
 
 #include <algorithm>
+#include <numeric>
 #include <optional>
 
 namespace kplib::detail::delaunay {
@@ -26,9 +27,8 @@ public:
     {
         reserve(1);
         Simplex<Size> corners;
-        for (int k = 0; k <= Size; ++k)
-            corners[k] = n + k;
-        take(corners, {{}, std::numeric_limits<float>::max()});
+        std::iota(corners.begin(), corners.end(), n);
+        take(corners, {{}, static_cast<double>(std::numeric_limits<float>::max())});
     }
 
     // Puts point `i` in; false if its cavity has too many faces, and the mesh is of no more use.

@@ -77,8 +77,9 @@ bool SolverRows::allocate()
         return false;
     }
     for (; count_ < n_; ++count_) {
-        rows_[count_] = allocated<float>(n_);
-        if (!rows_[count_]) {
+        float*& row = rows_.get()[count_];
+        row = allocated<float>(n_);
+        if (!row) {
             getTheLogInstance().errorf("KpDMatrix::solveLRdecomp: Not Enough Memory (%d).\n", count_);
             return false;
         }
@@ -89,7 +90,7 @@ bool SolverRows::allocate()
 SolverRows::~SolverRows()
 {
     for (int i = 0; i < count_; ++i)
-        std::free(rows_[i]);
+        std::free(rows_.get()[i]);
 }
 
 LinearSolver::LinearSolver(const float* a, int n, float** lr) :
@@ -113,7 +114,7 @@ bool LinearSolver::decompose(float& sign)
         const int pivot = pivotOf(column);
         if (pivot != column) {
             std::swap_ranges(lr_[pivot], lr_[pivot] + n_, lr_[column]);
-            std::swap(permutation_[pivot], permutation_[column]);
+            std::swap(permutation_.get()[pivot], permutation_.get()[column]);
             sign = -sign;
         }
         if (lr_[column][column] == 0) {
@@ -158,7 +159,7 @@ void LinearSolver::correct()
 {
     float* const y = correction_;
     for (int i = 0; i < n_; ++i)
-        y[i] = residual_[permutation_[i]];
+        y[i] = residual_[permutation_.get()[i]];
     for (int i = 0; i < n_; i += together) {
         const int count = std::min(together, n_ - i);
         subtractProducts<1>([&](int r) { return lr_[i + r]; }, count, y, 0, i, y + i);

@@ -15,7 +15,7 @@ inline float pythag(float a, float b)
     const float magnitudeA = std::abs(a), magnitudeB = std::abs(b);
     const auto [smaller, greater] = std::minmax(magnitudeA, magnitudeB);  // a NaN is one of the two
     const float ratio = smaller / greater;
-    return static_cast<float>(greater * std::sqrt(1.0 + static_cast<double>(ratio * ratio)));
+    return static_cast<float>(static_cast<double>(greater) * std::sqrt(1.0 + static_cast<double>(ratio * ratio)));
 }
 
 // The work of KpDMatrix::SVD() on a matrix that stands in `u`, with `v` of its size: Householder reflections to a
