@@ -197,7 +197,7 @@ void XYZ2CIELab(float* xyz, float* lab)
 {
     double terms[3];
     for (int i = 0; i < 3; ++i) {
-        const double t = std::clamp(xyz[i] / white[i], 0.0, 1.0);
+        const double t = std::clamp(static_cast<double>(xyz[i]) / white[i], 0.0, 1.0);
         terms[i] = t > 0.008856 ? cubeRoot(t) : 7.787 * t + 0.13793103;
     }
     lab[0] = static_cast<float>(116 * terms[1] - 16);
@@ -207,8 +207,8 @@ void XYZ2CIELab(float* xyz, float* lab)
 
 void CIELab2XYZ(float* lab, float* xyz)
 {
-    const double y = (lab[0] + 16.0) / 116;
-    const double terms[] = {lab[1] / 500.0 + y, y, y - lab[2] / 200.0};
+    const double y = (static_cast<double>(lab[0]) + 16) / 116;
+    const double terms[] = {static_cast<double>(lab[1]) / 500 + y, y, y - static_cast<double>(lab[2]) / 200};
     for (int i = 0; i < 3; ++i) {
         const double cube = terms[i] * terms[i] * terms[i];
         const double t = cube > 0.008856 ? cube : (terms[i] - 0.13793103) / 7.787;

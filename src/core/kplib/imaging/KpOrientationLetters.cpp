@@ -154,7 +154,8 @@ std::string KpOrientationLetters::computeOrientationLettersXY(const KpMat4f& mat
         if (taken >= 0)
             sizes[taken] = 0;
         taken = largestComponent(sizes);
-        letters += sAlphabet[2 * taken + (image[taken] < 0)];
+        const int letter = 2 * taken + (image[taken] < 0);
+        letters += sAlphabet[static_cast<std::size_t>(letter)];
     }
     return letters;
 }

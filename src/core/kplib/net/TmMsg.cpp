@@ -27,9 +27,9 @@ void TmMsg::take(TmMsg& other)
 {
     buffer_.swap(other.buffer_);
     // Whose storage it is goes with the storage.
-    const unsigned char external = externalData_;
+    const bool external = externalData_ != 0;
     externalData_ = other.externalData_;
-    other.externalData_ = external;
+    other.externalData_ = external ? 1 : 0;
 }
 
 void TmMsg::setRawData(unsigned long size, unsigned char* data)

@@ -25,14 +25,14 @@ void fill(Loose<T>* to, long n, T value)
 template <typename T>
 void fillAll(void* dst, T value, long n)
 {
-    constexpr long perBlock = 4096 / sizeof(T);
+    constexpr long perBlock = 4096 / long{sizeof(T)};
     auto* to = static_cast<Loose<T>*>(dst);
     if (sizeof(T) == 1) {
         std::memset(dst, static_cast<int>(value), static_cast<unsigned long>(n));
     } else if (!isStreamed(dst, n, sizeof(T))) {
         fill(to, n, value);
     } else {
-        Loose<T> block[perBlock];
+        Loose<T> block[4096 / sizeof(T)];
         fill(block, perBlock, value);
         const long head = toCacheLine(dst, sizeof(T));
         fill(to, head, value);

@@ -53,7 +53,7 @@ double KpTypedElement::length() const
     kpVisitNumberType(type_, [&]<typename T>(KpElementTag<T>) {
         auto* components = static_cast<const Loose<T>*>(data_);
         for (std::int32_t i = 0; i < n_; ++i) {
-            const double component = components[i].value;
+            const auto component = static_cast<double>(components[i].value);
             sum += component * component;
         }
     });

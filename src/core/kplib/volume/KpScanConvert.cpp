@@ -92,7 +92,8 @@ public:
     template <typename Span>
     void concave(Span span)
     {
-        const double lowest = points_[order_.front()].y(), highest = sortKey(points_[order_.back()].y());
+        const auto lowest = static_cast<double>(points_[order_.front()].y());
+        const auto highest = static_cast<double>(sortKey(points_[order_.back()].y()));
         const int first = clampedTo(std::ceil(lowest - 0.5), window_[1], INT_MAX);
         const int last = clampedTo(std::floor(highest - 0.5), INT_MIN, window_[3]);
         for (long y = first; y <= last; ++y) {
@@ -110,7 +111,8 @@ private:
     // Takes up the vertices up to the middle of the scanline: each starts, ends or passes over its two edges.
     void meetVertices(int y)
     {
-        for (; next_ < n_ && points_[order_[static_cast<std::size_t>(next_)]].y() <= y + 0.5; ++next_) {
+        const auto isMet = [&](int i) { return static_cast<double>(points_[i].y()) <= y + 0.5; };
+        for (; next_ < n_ && isMet(order_[static_cast<std::size_t>(next_)]); ++next_) {
             const int i = order_[static_cast<std::size_t>(next_)];
             meetEdge(before(i), before(i), y);
             meetEdge(i, behind(i), y);
@@ -118,7 +120,7 @@ private:
     }
     void meetEdge(int edge, int otherEnd, int y)
     {
-        const double other = points_[otherEnd].y();
+        const auto other = static_cast<double>(points_[otherEnd].y());
         if (other <= y - 0.5)
             cdelete(edge);
         else if (other > y + 0.5)
@@ -148,7 +150,8 @@ private:
     template <typename Span>
     void reportBetween(Active& left, Active& right, int y, Span span) const
     {
-        const float first = std::ceil(left.x - 0.5F), last = std::floor(right.x - 0.5F);
+        const auto first = static_cast<double>(std::ceil(left.x - 0.5F));
+        const auto last = static_cast<double>(std::floor(right.x - 0.5F));
         if (first <= last) {
             const int xLeft = clampedTo(first, window_[0], INT_MAX), xRight = clampedTo(last, INT_MIN, window_[2]);
             if (xLeft <= xRight)

@@ -25,7 +25,11 @@ struct Mean {
     using Element = T;
     using State = Sum;
 
-    KPLIB_KERNEL_BODY static State seed(T) { return 0; }
+    template <typename Item>  // a voxel, or the sum of some
+    KPLIB_KERNEL_BODY static State seed(Item)
+    {
+        return 0;
+    }
     KPLIB_KERNEL_BODY static State next(State sum, T value) { return next(sum, static_cast<State>(value)); }
     KPLIB_KERNEL_BODY static State next(State sum, State other) { return static_cast<State>(sum + other); }
 

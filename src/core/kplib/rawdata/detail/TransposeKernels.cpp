@@ -58,7 +58,7 @@ void transposeTile(const Tile<T>& tile, long row, long column, std::integer_sequ
 {
     typedef T Row __attribute__((vector_size(16)));
     constexpr int side = sizeof...(I);
-    Row rows[side], next[side];
+    Row rows[sizeof...(I)], next[sizeof...(I)];
     for (int k = 0; k < side; ++k)
         std::memcpy(&rows[k], tile.source(row + k, column), sizeof(Row));
     for (int round = 1; round < side; round *= 2) {

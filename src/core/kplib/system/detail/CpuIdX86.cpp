@@ -32,10 +32,10 @@ bool KpCPUInfo::hasCPUID() const
 
 unsigned KpCPUInfo::getMaxCPUIDFunc() const
 {
-    return __get_cpuid_max(0, nullptr);
+    return static_cast<unsigned>(__get_cpuid_max(0, nullptr));
 }
 
 unsigned KpCPUInfo::getMaxCPUIDExtFunc() const
 {
-    return __get_cpuid_max(extended, nullptr);
+    return static_cast<unsigned>(__get_cpuid_max(extended, nullptr));
 }

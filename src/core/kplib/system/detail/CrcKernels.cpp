@@ -19,10 +19,11 @@ using Tables = std::array<std::array<std::uint32_t, 256>, 8>;
 constexpr Tables makeTables()
 {
     Tables tables{};
-    for (int k = 0; k < 8; ++k) {
+    for (std::size_t k = 0; k < 8; ++k) {
         for (std::uint32_t b = 1; b < 256; ++b) {
             const std::uint32_t top = b & (b - 1);  // b without its lowest bit; the entry is linear in its bits
-            tables[k][b] = tables[k][top] ^ (top ? tables[k][b ^ top] : power(32 + 8 * k + std::countr_zero(b)));
+            tables[k][b] =
+                tables[k][top] ^ (top ? tables[k][b ^ top] : power(32 + 8 * static_cast<int>(k) + std::countr_zero(b)));
         }
     }
     return tables;
@@ -47,7 +48,7 @@ std::uint32_t crc::crcSlicing(std::uint32_t crc, const unsigned char* data, long
         std::memcpy(&bytes, data, 8);
         bytes = __builtin_bswap64(bytes) ^ static_cast<std::uint64_t>(crc) << 32;
         crc = 0;
-        for (int k = 0; k < 8; ++k)
+        for (std::size_t k = 0; k < 8; ++k)
             crc ^= tables[k][bytes >> 8 * k & 0xFF];
     }
     return crcPlain(crc, data, n);

@@ -12,8 +12,9 @@ bool isAround(const KpBitfield& field, const KpVec3i& dims, int x, int y, int z,
     for (int dz = -std::min(z, 1); dz <= std::min(dims[2] - 1 - z, 1); ++dz)
         for (int dy = -std::min(y, 1); dy <= std::min(dims[1] - 1 - y, 1); ++dy)
             for (int dx = -std::min(x, 1); dx <= std::min(dims[0] - 1 - x, 1); ++dx) {
-                const unsigned long i = (static_cast<unsigned long>(z + dz) * dims[1] + y + dy) * dims[0] + x + dx;
-                if (std::abs(dx) + std::abs(dy) + std::abs(dz) <= reach && field.test(i) == value)
+                const long i = (static_cast<long>(z + dz) * dims[1] + y + dy) * dims[0] + x + dx;
+                if (std::abs(dx) + std::abs(dy) + std::abs(dz) <= reach &&
+                    field.test(static_cast<unsigned long>(i)) == value)
                     return true;
             }
     return false;
