@@ -34,8 +34,11 @@ if(KPLIB_WERROR)
     add_compile_options(-Werror)
 endif()
 
+# For the library and the examples; the tests compare numbers of all types.
+set(KPLIB_CONVERSION_WARNINGS -Wconversion -Wsign-conversion -Wdouble-promotion)
+
 # What users may turn on for their own code, and so for the public headers.
-set(KPLIB_HEADER_WARNINGS -Wconversion -Wsign-conversion -Wdouble-promotion -Wold-style-cast)
+set(KPLIB_HEADER_WARNINGS ${KPLIB_CONVERSION_WARNINGS} -Wold-style-cast)
 
 # What ships is hardened: overwritten stacks and buffers of known size end the process, and tables of addresses are
 # read-only. The sanitizers have checks of their own.

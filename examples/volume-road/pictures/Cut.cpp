@@ -9,7 +9,7 @@ Picture cutByPlane(const Volume& shown, const Space& space, const KpBitfield& ou
                    const KpBox2f& extent, double pixel)
 {
     const KpMat4f toVoxels = plane.transformationTo(*space.voxels);
-    const double width = extent.size().x(), height = extent.size().y();
+    const auto width = static_cast<double>(extent.size().x()), height = static_cast<double>(extent.size().y());
     Picture picture(pixelsFor(width, pixel), pixelsFor(height, pixel));
     const Sampler<unsigned char> sampler(shown);
     const auto step = static_cast<float>(pixel);

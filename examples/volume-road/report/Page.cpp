@@ -65,7 +65,7 @@ Grid gridOf(const Volume& volume)
     grid.origin = KpVec3d(0, 0, 0);
     for (int p = 0; p < 3; ++p) {
         const PatientAxis& axis = along[static_cast<size_t>(p)];
-        double low = INFINITY, high = -INFINITY;
+        double low = HUGE_VAL, high = -HUGE_VAL;
         for (int corner = 0; corner < 8; ++corner) {
             const double at = cornerOf(volume, corner).dot(axis.direction);
             low = std::min(low, at);

@@ -115,7 +115,7 @@ void takeVoxels(KpTypedPointer source, Volume& volume)
     KpDArray<double> values;
     values.resize(n);
     KpRawData::memcpy({values.data(), KpPrimType::Double}, source, n);
-    double low = INFINITY, high = -INFINITY;
+    double low = HUGE_VAL, high = -HUGE_VAL;
     bool isWhole = true;
     for (const double v : values) {
         if (!std::isfinite(v))
