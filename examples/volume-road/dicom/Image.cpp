@@ -126,7 +126,7 @@ std::string bValue(const FrameValues& values)
         text = privateText(values.dataSet(), 0x2001, "Philips Imaging DD 001", 0x03);
     if (text.empty()) {
         text = privateText(values.dataSet(), 0x0043, "GEMS_PARM_01", 0x39);
-        text = text.substr(0, text.find('\\'));
+        text.resize(std::min(text.find('\\'), text.size()));
     }
     return text;
 }

@@ -100,12 +100,11 @@ void forEachSetBit(const KpBitfield& mask, Visit visit)
 
 /// The slices, rows and columns around the set voxels of a mask.
 struct Crop {
-    std::array<long, 3> low{}, dims{};
+    std::array<long, 3> low, dims{};
 
-    Crop(const KpBitfield& mask, const std::array<long, 3>& size)
+    Crop(const KpBitfield& mask, const std::array<long, 3>& size) : low(size)
     {
         std::array<long, 3> high{-1, -1, -1};
-        low = size;
         forEachSetBit(mask, [&](unsigned long bit) {
             const auto i = static_cast<long>(bit);
             const std::array<long, 3> at{i % size[0], i / size[0] % size[1], i / size[0] / size[1]};
