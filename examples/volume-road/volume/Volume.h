@@ -83,9 +83,4 @@ std::array<double, 2> displayedRange(Volume& volume);
 Volume luminanceOf(const Volume& colour);
 
 /// A failure whose text is one line for the user, formatted as by printf.
-template <typename... Arguments>
-KpResult badInput(const char* format, Arguments... arguments)
-{
-    const KpString text(0, format, arguments...);
-    return KpResult(KpResult::InvalidArgument, text, nullptr);
-}
+KpResult badInput(const char* format, ...) KPLIB_PRINTF(1, 2);
