@@ -24,6 +24,7 @@
 
 namespace {
 
+constexpr int exitDifference = 1;
 constexpr int exitBadInput = 2;
 constexpr int usualTimeout = 60;
 
@@ -140,9 +141,14 @@ void addServe(CLI::App& app, Job& job)
 
 void addHeader(CLI::App& app, Job& job)
 {
-    CLI::App& command =
-        addCommand(app, "header", "print the header of one DICOM file as a tree", "header image.dcm --json");
-    command.add_option("FILE", job.source)->required();
+    CLI::App& command = addCommand(app, "header", "print the header of one DICOM file as a tree",
+                                   "header image.dcm --json\n  volume-road header old.dcm new.dcm --diff");
+    command.add_option("FILE", job.source, "a DICOM file; - is standard input")->required();
+    CLI::Option* const other = command.add_option("OTHER", job.other, "a second file to compare it with");
+    CLI::Option* const diff =
+        command.add_flag("--diff", job.isDiff, "print what differs from OTHER; exit 1 if something does");
+    other->needs(diff);
+    diff->needs(other);
     command.add_flag("--json", job.isJson, "as JSON, with VR, keyword and private creator of each tag");
 }
 
@@ -150,6 +156,8 @@ int report(const KpResult& result)
 {
     if (result.isOk())
         return 0;
+    if (result.code() == KpResult::False)  // what differs is printed
+        return exitDifference;
     std::fprintf(stderr, "volume-road: %s\n", result.text());
     return result.code() == KpResult::Interrupted ? exitCodeOfSignal() : exitBadInput;
 }
@@ -177,7 +185,7 @@ const struct {
     {"export", exportSeries},
     {"send", send},
     {"serve", [](const Job& job, KpProgressInterface&) { return serve(job); }},
-    {"header", [](const Job& job, KpProgressInterface&) { return printHeader(job); }},
+    {"header", [](const Job& job, KpProgressInterface&) { return job.isDiff ? diffHeaders(job) : printHeader(job); }},
 };
 
 int start(const CLI::App& app, Job& job)
@@ -210,7 +218,14 @@ int parseAndStart(int argc, char** argv)
     CLI::App app("Reads DICOM series and takes them down the road: header tree, volume, pictures, measures, page.",
                  "volume-road");
     app.require_subcommand(1);
-    app.footer("volume-road COMMAND --help explains a command and gives an example.");
+    app.set_version_flag("--version", "volume-road (kplib) " KPLIB_VERSION, "Print the version and exit");
+    app.set_help_all_flag("--help-all", "Print the help of all commands and exit");
+    app.footer(
+        "volume-road COMMAND --help explains a command and gives an example.\n\n"
+        "Exit codes: 0 fine, 1 headers that differ, 2 an error, 128 and the number of a signal that ended it.\n\n"
+        "Examples:\n"
+        "  $ volume-road list archive\n"
+        "  $ volume-road run archive/patient7 out");
     for (auto* const add : {addMakeSeries, addRun, addMeasure, addList, addExport, addSend, addServe, addHeader})
         add(app, job);
     if (isUnknownCommand(argc, argv)) {
@@ -244,5 +259,5 @@ int main(int argc, char** argv)
     } catch (const std::exception& e) {
         std::fprintf(stderr, "volume-road: %s\n", e.what());
     }
-    return 1;
+    return exitBadInput;
 }

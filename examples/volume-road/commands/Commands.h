@@ -29,5 +29,9 @@ KpResult serve(const Job& job);
 /// Prints the header of one file as a tree.
 KpResult printHeader(const Job& job);
 
+/// Prints the tags that differ between the headers of two files. Private tags are compared by their creators, and long
+/// binary values by their size. KpResult::False if some do.
+KpResult diffHeaders(const Job& job);
+
 /// Prints every series and volume below a folder.
 KpResult list(const Job& job, KpProgressInterface& progress);

@@ -14,6 +14,8 @@ struct Job {
     std::string target;               ///< folder or file to write
     std::string describe;             ///< file for a description of an exported volume; none if empty
     std::string source;               ///< a file to read
+    std::string other;                ///< a file to compare the source with
+    bool isDiff = false;              ///< whether it is compared
     int sourceVolume = 1;             ///< of a source with several volumes
     std::string address;              ///< of the peer, or to listen at
     int port = 0;

@@ -101,15 +101,25 @@ void makePrintable(KpString& text)
     }
 }
 
-KpString descriptionOf(DcmElement& element)
+KpString descriptionOf(DcmItem& parent, DcmElement& element)
 {
     DcmTag tag = element.getTag();
     KpString description = tag.isPrivateReservation() ? "PrivateCreator" : tag.getTagName();
+    if (const std::string creator = creatorOf(parent, tag); !creator.empty())
+        description = KpString(0, "[%s] %s", creator.c_str(), description.c_str());
     description.replaceSubStr(":", "");  // a colon ends the description
     return description;
 }
 
 }  // namespace
+
+std::string creatorOf(DcmItem& parent, const DcmTag& tag)
+{
+    OFString creator;
+    if (tag.isPrivate() && !tag.isPrivateReservation())
+        parent.findAndGetOFString(DcmTagKey(tag.getGTag(), static_cast<Uint16>(tag.getETag() >> 8)), creator);
+    return creator.c_str();
+}
 
 KpString valueText(DcmElement& element)
 {
@@ -146,7 +156,7 @@ void fillTree(HxParamBundle& all, DcmItem& dataSet)
         if (element.ident() == EVR_SQ) {
             addSequence(all, name, static_cast<DcmSequenceOfItems&>(element));
         } else {
-            const KpString text = descriptionOf(element) + ": " + valueText(element);
+            const KpString text = descriptionOf(dataSet, element) + ": " + valueText(element);
             all.insert(HxParameter::create(name, text), 0);
         }
     }

@@ -50,11 +50,8 @@ Json nodeOf(DcmItem& parent, DcmElement& element)
 {
     DcmTag tag = element.getTag();
     Json node{{"vr", DcmVR(element.getVR()).getValidVRName()}};
-    OFString creator;
-    if (tag.isPrivate() && !tag.isPrivateReservation())
-        parent.findAndGetOFString(DcmTagKey(tag.getGTag(), static_cast<Uint16>(tag.getETag() >> 8)), creator);
-    if (!creator.empty())
-        node["creator"] = creator.c_str();
+    if (const std::string creator = creatorOf(parent, tag); !creator.empty())
+        node["creator"] = creator;
     else
         node["keyword"] = tag.isPrivateReservation() ? "PrivateCreator" : tag.getTagName();
     if (element.ident() != EVR_SQ) {
