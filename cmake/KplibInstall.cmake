@@ -1,5 +1,6 @@
-# The installed package in two components: Runtime (the shared library and what loads with it) and Development (headers,
-# static library, find_package(kplib) and pkg-config files). `uninstall` removes what the last installation wrote.
+# The installed package in three components: Runtime (the shared library and what loads with it), Development (headers,
+# static library, find_package(kplib) and pkg-config files, printers for gdb) and Tools (see KplibTool.cmake). `uninstall`
+# removes what the last installation wrote.
 
 include(CMakePackageConfigHelpers)
 
@@ -31,6 +32,17 @@ if(KPLIB_SANITIZE)
 endif()
 configure_file(${PROJECT_SOURCE_DIR}/cmake/kplib.pc.in kplib.pc @ONLY)
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/kplib.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT Development)
+
+# gdb loads the printers with the library: it looks for the full name of the library's file below its auto-load folder. The
+# prefix is known at installation only.
+if(BUILD_SHARED_LIBS)
+    cmake_path(RELATIVE_PATH CMAKE_INSTALL_FULL_LIBDIR BASE_DIRECTORY ${CMAKE_INSTALL_PREFIX} OUTPUT_VARIABLE lib_in_prefix)
+    cmake_path(RELATIVE_PATH CMAKE_INSTALL_FULL_DATADIR BASE_DIRECTORY ${CMAKE_INSTALL_PREFIX} OUTPUT_VARIABLE data_in_prefix)
+    install(CODE "
+        file(INSTALL \"${PROJECT_SOURCE_DIR}/tools/gdb/kplib_printers.py\" RENAME libkplib.so.${PROJECT_VERSION}-gdb.py
+             DESTINATION \"\${CMAKE_INSTALL_PREFIX}/${data_in_prefix}/gdb/auto-load\${CMAKE_INSTALL_PREFIX}/${lib_in_prefix}\")"
+            COMPONENT Development)
+endif()
 
 if(PROJECT_IS_TOP_LEVEL)
     add_custom_target(uninstall COMMAND ${CMAKE_COMMAND} -P ${PROJECT_SOURCE_DIR}/cmake/Uninstall.cmake VERBATIM)
