@@ -33,6 +33,7 @@ TEST(KpString, keepsItsCapacityRules)
         text.printf("%0*d", length, 7);
         EXPECT_EQ(std::tuple(text.length(), text.capacity()), std::tuple(length, capacity));
     }
+    EXPECT_EQ(KpString(0, "%d %s", 7, "b"), "7 b");
     added += 'x';
     EXPECT_EQ(added.capacity(), 24);
     joined += "x";

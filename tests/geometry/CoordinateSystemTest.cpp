@@ -71,6 +71,7 @@ TEST(KpCoordinateSystem, tellsWhatItsAxesAre)
         << "only the place is lost";
     system.setSystemByPlane(KpPlane(z, 3.0F));
     EXPECT_TRUE(system.isValid());
+    EXPECT_FALSE(unit.equalsAxis(KpCoordinateSystem(origin, {x, y, -z})));
     EXPECT_TRUE(system.equals(KpCoordinateSystem(z * 3, {y, -x, z}), 1e-6F));
     EXPECT_FALSE(system.equals(KpCoordinateSystem(z * 2, {y, -x, z}), 1)) << "the limit is outside";
     for (const auto& [axis, matches] :

@@ -200,7 +200,8 @@ TEST(KpMat4f, measuresPivotsByTheirRowsAndPrefersTheLater)
     m.LUDecomposition(index, sign);
     EXPECT_EQ(index[0], 2);
     EXPECT_EQ(m[3][3], 1e-6F);
-    m = KpMat4f(0, 1, 100, 0, 0, 0.5F, 0, 1, 1, 0, 0, 0, 0, 0, 0, 1);  // the first row keeps its measure as it moves
+    const float rows[4][4] = {{0, 1, 100, 0}, {0, 0.5F, 0, 1}, {1, 0, 0, 0}, {0, 0, 0, 1}};
+    m = rows;  // the first row keeps its measure as it moves
     m.LUDecomposition(index, sign);
     EXPECT_EQ(std::tuple(index[0], index[1]), std::tuple(2, 1));
 }

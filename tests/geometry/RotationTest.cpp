@@ -61,6 +61,8 @@ TEST(KpRotation, survivesOtherForms)
     KpRotation(x, 2.1e-5F).getValue(axis, angle);
     EXPECT_EQ(axis, x);
     EXPECT_TRUE(std::isnan(KpRotation(0, 0, 0, 0)[0]));
+    KpRotation(1, -1, -1, 1).getValue(axis[0], axis[1], axis[2], angle);
+    EXPECT_EQ(std::tuple(axis, angle), std::tuple(KpVec3f(0.5F, -0.5F, -0.5F), 0.5F));
 
     int beyond = 0;  // products of small turns with a w above 1
     for (float a = 1e-5F; a < 3e-3F; a += 1e-5F) {

@@ -44,6 +44,7 @@ const std::pair<const char*, Matrix> decomposed[] = {
     {"empty", Matrix(0, 0)},
     {"no rows", Matrix(0, 2)},
     {"nothing", Matrix::Zero(3, 3)},
+    {"one element", from(1, 1, {5})},
     {"rank one", from(3, 1, {1, 2, 3}) * from(1, 3, {3, -1, 2})},
     {"only a superdiagonal", from(3, 3, {0, 1, 0, 0, 0, 2, 0, 0, 0})},
     {"a zero before the last value", from(3, 2, {0.75F, -1, 0, 0, 0, 1})},
@@ -94,6 +95,14 @@ TEST(KpDMatrixSvd, tellsWhatDoesNotConverge)
         const std::string line = "W [] no convergence in " + std::to_string(maxIterations) + " svd iterations \n";
         EXPECT_EQ(log.lines(), isFine ? Lines{} : Lines{line});
     }
+    const LogCapture quiet;
+    int fast = 0;
+    for (int i = 0; i < 1000; ++i) {
+        KpDMatrix<float> u, v;
+        float w[3];
+        fast += toKp(noise(3, 3)).SVD(u, w, v, 4);
+    }
+    EXPECT_GT(fast, 850) << "with any other shift all converge too, but later";
 }
 
 TEST(KpDMatrix, multipliesAndTransposesAnyShape)

@@ -276,14 +276,14 @@ TEST(KpDelaunay, drawsItsTriangles)
 {
     const TempFolder folder;
     const std::string path = folder / "mesh.eps";
-    KpVec2f points[] = {{1, 1}, {5, 1}, {5, 3}, {1, 3}}, upright[] = {{1, 1}, {1, 5}, {3, 5}, {3, 1}};
+    KpVec2f points[] = {{5, 3}, {1, 3}, {1, 1}, {5, 1}}, upright[] = {{1, 1}, {1, 5}, {3, 5}, {3, 1}};
     KpDArray<KpDelaunay::Triangle> triangles{{0, 1, 2}, {0, 2, 3}};
     const std::string head = "%!PS-Adobe-2.0 EPSF-2.0\n%%BoundingBox: 84 207 511 634\n/M  { moveto } bind def\n"
                              "/L { lineto } bind def\n/CS { closepath stroke } bind def\n85 208 translate\n"
                              "425 425 scale\n";
     ASSERT_TRUE(KpDelaunay::writeEPS(path.c_str(), points, 4, triangles));
     EXPECT_EQ(contentOf(path), head + "0 0.25 translate\n0.25 0.25 scale\n0 setlinewidth\n"
-                                      "0 0 M 4 0 L 4 2 L CS\n0 0 M 4 2 L 0 2 L CS\nshowpage\n");
+                                      "4 2 M 0 2 L 0 0 L CS\n4 2 M 0 0 L 4 0 L CS\nshowpage\n");
     triangles.clear();
     ASSERT_TRUE(KpDelaunay::writeEPS(path.c_str(), upright, 4, triangles));
     EXPECT_EQ(contentOf(path), head + "0.25 0 translate\n0.25 0.25 scale\n0 setlinewidth\nshowpage\n");

@@ -70,8 +70,8 @@ TEST(Pls, endsThatCoincideNeedTheLoop)
     EXPECT_EQ(result.size(), 0);
     KpPls::DouglasPeuckerInLoop(loop, 0.5F, result);
     EXPECT_EQ(asVector(result), (std::vector<KpVec2f>{{0, 0}, {4, 0}, {4, 4}, {0, 4}, {0, 0}}));
-    KpPls::DouglasPeuckerInLoop(Points({{0, 0}, {3, 4}, {5, 0}, {0, 0}}), 9, result);
-    EXPECT_EQ(asVector(result), (std::vector<KpVec2f>{{0, 0}, {3, 4}, {0, 0}}));  // the first of those 5 away
+    KpPls::DouglasPeuckerInLoop(Points({{-3, -4}, {0, 0}, {2, -4}, {-3, -4}}), 9, result);
+    EXPECT_EQ(asVector(result), (std::vector<KpVec2f>{{-3, -4}, {0, 0}, {-3, -4}}));  // the first of those 5 away
     for (const Points& few : {Points(), Points({{1, 1}}), Points({{1, 1}, {1, 1}})}) {
         KpPls::DouglasPeuckerInLoop(few, 0.5F, result);
         EXPECT_EQ(result.size(), 0);

@@ -67,6 +67,9 @@ TEST(Ellipse2D, pointsAndMeasures)
     }
     EXPECT_EQ(std::tuple(Ellipse2D().isEmpty(), Ellipse2D().circumference()), std::tuple(true, 0));
     EXPECT_FALSE(Ellipse2D({0, 0}, std::nanf(""), 0).isEmpty());
+    Ellipse2D resized({3, 2}, 1, 2);
+    resized.setRadius({3, 1});
+    EXPECT_TRUE(resized == ellipse);
     EXPECT_EQ(Ellipse2D({0, 0}, 0, 2).closestPoint({0, 7}).second.y(), 2);
 }
 
