@@ -52,6 +52,7 @@ TEST(KpHttpGet, sendsOneRequestAConnectionUnlessAllWasRead)
         EXPECT_TRUE(all());
         EXPECT_STREQ(buffer, "body");
         EXPECT_TRUE(get.request(url.c_str(), 0, 99));
+        EXPECT_EQ(get.status(), 0);
         EXPECT_TRUE(all());
         EXPECT_TRUE(get.request(url.c_str(), 5, 5));
         EXPECT_EQ(get.read(buffer, 2), 2);
@@ -97,6 +98,7 @@ TEST(KpHttpGet, takesWhatServersSend)
         {"the last length counts", ok + "Content-Length: 3\r\n" + ten + "\r\n" + body, 10, "", 200},
         {"more than the length", ok + ten + "\r\n" + body + "more", 10, "", 200},
         {"length 0", ok + "Content-Length: 0\r\n\r\n", 0, "All data read", 200},
+        {"many fields", ok + fields.substr(0, 6000) + ten + "\r\n" + body, 10, "", 200},
         {"no length", ok + "Date: 10:10\r\nContent-Length\r\n\r\n" + body, -1, missing},
         {"blank in the name", ok + "Content-Length : 10\r\n\r\n" + body, -1, missing},
         {"negative length", ok + "Content-Length: -10\r\n\r\n" + body, -1, missing},

@@ -3,8 +3,10 @@
 #include "support/SteadySignal.h"
 #include "support/TempFolder.h"
 
+#include <kplib/net/KpHttpGet.h>
 #include <kplib/net/KpSocket.h>
 #include <kplib/net/KpSocketTools.h>
+#include <kplib/net/detail/SocketCalls.h>
 
 #include <algorithm>
 #include <cerrno>
@@ -89,8 +91,20 @@ TEST(KpSocket, tellsWhyThereIsNoConnection)
     refusedOptions = {SO_REUSEADDR};
     EXPECT_EQ(KpSocket::connect("127.0.0.1", listener.port, 0, 0, 0), -1);
     EXPECT_EQ(KpSocket::lastError(), "No buffer space available");
+    KpHttpGet get;
+    EXPECT_FALSE(get.request("http://127.0.0.1"));
+    EXPECT_EQ(get.errorText(), "No buffer space available");
     refusedOptions.clear();
     EXPECT_EQ(static_cast<int>(namesIn("/proc/self/fd").size()), descriptors + 1);  // the listener
+
+    const Listener other;
+    const int broken = KpSocket::connect("127.0.0.1", other.port, 0, 0, 0);
+    const int peer = accept(other.socket, nullptr, nullptr);
+    resetAtClose(peer);
+    close(peer);
+    EXPECT_FALSE(kplib::detail::awaitConnection(broken));
+    EXPECT_EQ(KpSocket::lastErrorCode(), ECONNRESET);
+    close(broken);
 }
 
 TEST(KpSocket, readsLinesAndNothingBehindThem)
@@ -98,7 +112,8 @@ TEST(KpSocket, readsLinesAndNothingBehindThem)
     const std::string longLine(5000, 'x'), text = "a\r\n\n" + longLine + "\nab" + std::string("\0c\nrest", 7);
     for (size_t step : {text.size(), size_t{1}, size_t{513}}) {
         Pair pair;
-        KpSocket::nonBlocking(pair.mine);
+        for (const auto& [socket, result] : {std::pair(pair.mine, 0), {pair.mine, 0}, {-1, -1}})
+            EXPECT_EQ(KpSocket::nonBlocking(socket), result);
         EXPECT_TRUE(KpSocket::isNonBlocking(pair.mine));
         std::thread writer([&] {
             usleep(10000);  // so that a socket that isn't blocking would show
@@ -162,8 +177,10 @@ TEST(KpSocket, goesOnThroughSignalsAndStillTimesOut)
     KpSocket::setTimeout(pair.mine, 50);
     put(pair.peer, "part");
     KpString line;
+    const auto start = std::chrono::steady_clock::now();
     EXPECT_EQ(KpSocket::readLine(pair.mine, line), -1);
     EXPECT_EQ(std::tuple(KpSocket::lastErrorCode(), line), std::tuple(EAGAIN, "part"));
+    EXPECT_GE(std::chrono::steady_clock::now() - start, std::chrono::milliseconds(40));
     for (int socket : {first, second, pair.peer})
         KpSocket::close(socket);
 }
