@@ -127,11 +127,13 @@ TEST(TmgImages, numbersComeFromTheListOrTheHeader)
         Tmg::imageNumbers3D(object, first, last, numbers);
         EXPECT_EQ(std::vector<int>(numbers.begin(), numbers.end()), expected);
     }
-    EXPECT_EQ(numberOf(2), 9);
+    EXPECT_EQ(std::pair(numberOf(0), numberOf(2)), std::pair(7, 9));
     for (const int index : {-1, 3, 0x7fffffff})
         EXPECT_FALSE(Tmg::imageNumberFromBundle(list, index, number));
     EXPECT_EQ(numberOf(3), 42);  // falls back on the header
     EXPECT_FALSE(list->isSorted());
+    list->set("NumImageNumbers", 0);
+    EXPECT_FALSE(Tmg::imageNumberFromBundle(list, 0, number));
 }
 
 TEST(TmgImages, framesAreNumberedInObjectsOfSeveral)

@@ -42,7 +42,9 @@ TEST(WindowLevel, tagsKeepTheTextsAndTheirPlaces)
 
 TEST(WindowLevel, equalityIsThatOfNumbers)
 {
-    const KpWindowLevel preset(40.0F, 0.1F, "A");
+    KpWindowLevel preset("1", "2", "A");
+    preset.setCenter(40);
+    preset.setWidth(0.1F);
     EXPECT_EQ(shown({preset}), "40.000000/0.100000/A ");
     for (const auto& [width, text] : {std::pair("1e-1", "A"), {"0.1", "B"}, {"0.2", "A"}})
         EXPECT_EQ(preset == KpWindowLevel("40", width, text), *width == '1') << width << text;

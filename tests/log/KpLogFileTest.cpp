@@ -9,6 +9,7 @@
 #include <gtest/gtest.h>
 
 #include <cstdlib>
+#include <future>
 #include <memory>
 #include <regex>
 #include <string>
@@ -95,6 +96,8 @@ TEST_F(KpLogFileTest, linesGoWhereTheFlagsLead)
         testing::internal::CaptureStdout();
         log->error(nullptr, "x");
         log->writeCharBuffer("raw");
+        const auto isFree = [] { return ftrylockfile(stdout) == 0 && (funlockfile(stdout), true); };
+        EXPECT_TRUE(std::async(std::launch::async, isFree).get());
         EXPECT_EQ(testing::internal::GetCapturedStdout(), toConsole);
         record.file = file;
         EXPECT_EQ(take(), toFile);

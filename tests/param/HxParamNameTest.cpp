@@ -115,7 +115,16 @@ TEST(ParamNode, asksTheNearestEditCheck)
     root.setEditCheck(&never);
     EXPECT_EQ(child->editCheck(), &never);
     EXPECT_EQ(HxParamBundle(root).editCheck(), &check);
-    child->setFlag(HxParamBase::FlagNoInsertParam, 1);
-    EXPECT_FALSE(check.checkInsertParam(child, "x"));
-    EXPECT_TRUE(check.checkInsertBundle(child, "x"));
+    HxParameter leaf("leaf", 1);
+    for (int flag = HxParamBase::FlagNoDelete; flag <= HxParamBase::FlagNoSetValue; flag *= 2) {
+        for (HxParamBase* const node : std::initializer_list<HxParamBase*>{child, &leaf}) {
+            node->setFlag(255, 0);
+            node->setFlag(flag, 1);
+        }
+        const bool allowed[] = {check.checkDelete(child), check.checkInsertBundle(child, "x"),
+                                check.checkInsertParam(child, "x"), check.checkRename(child, "x"),
+                                check.checkSetValue(&leaf, "x")};
+        for (int i = 0; i < 5; ++i)
+            EXPECT_EQ(allowed[i], flag != HxParamBase::FlagNoDelete << i) << i;
+    }
 }

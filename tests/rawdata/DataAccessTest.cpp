@@ -82,6 +82,7 @@ TEST(Volume, worksOutStrides)
         {"y too short", size543, {0L, 29L, 0L}, false, {6L, 29L, 116L}, false, false},
         {"z too short", size543, {0L, 0L, 119L}, false, {6L, 30L, 119L}, false, false},
         {"below nothing", {5L, 0L, -1L}, dense, false, {6L, 30L, 0L}, false, true},
+        {"no columns", {0L, 4L, 3L}, dense, false, {6L, 0L, 0L}, true, true},
         {"sliced", size543, dense, true, {6L, 30L, 0L}, true, false},
         {"slices and z", size543, {0L, 0L, 120L}, true, {6L, 30L, 120L}, false, true},
         {"one slice", {5L, 4L, 1L}, dense, true, {6L, 30L, 120L}, true, true}};
@@ -154,6 +155,9 @@ TEST(Volume, subBoxLooksOnAndCloneCopies)
         EXPECT_EQ(source.clone(copy, none).isOk(), (n < 6));
         EXPECT_EQ(copy->hasData(), (n < 6));
     }
+    const TmDataAccess byte({1L, 1L, 1L}, dense, nullptr, KpPrimType::Byte, 1, none);
+    const FailingMalloc failing(2, 1);  // the block
+    EXPECT_TRUE(byte.clone(copy, none).isBad());
 }
 
 TEST(Volume, linesEqualTheirVoxelsOneByOne)
@@ -247,7 +251,8 @@ TEST(Volume, doubtfulMessages)
     const struct { const char* what; KpVec3l dims; int nDataVar, type; long come; bool isRead; } cases[] = {
         {"all there", {3L, 2L, 1L}, 2, 0, 12, true}, {"one byte short", {3L, 2L, 1L}, 2, 0, 11, false},
         {"none", {0L, big, big}, 2, 0, 0, true}, {"no such type", {big, 2L, 1L}, 2, 12, 0, true},
-        {"no components", {big, 2L, 1L}, 0, 0, 0, true}, {"below nothing", {-3L, -2L, 1L}, 2, 0, 12, false},
+        {"no components", {big, 2L, 1L}, 0, 0, 0, true}, {"slices below nothing", {3L, 2L, -1L}, 2, 0, 0, false},
+        {"below nothing", {-3L, -2L, 1L}, 2, 0, 12, false},
         {"components below nothing", {0L, 2L, 1L}, -2, 0, 0, false},
         {"product of 2^64 + 8", {3L, (big + 2) / 3, 4L}, 1, 0, 12, false},
         {"half a header", {3L, 2L, 1L}, 2, 0, -20, false}, {"nothing", {3L, 2L, 1L}, 2, 0, -33, false}};

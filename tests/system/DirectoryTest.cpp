@@ -172,9 +172,10 @@ TEST_F(KpDirectoryTest, theCollectorGoesDownFromTheLastName)
 {
     KpDArray<KpString> found;
     temp.file("tree/.hidden/e");
+    temp.file("tree/sub/deep/e");
     KpFilenameCollector::collect(found, "*e*", tree.c_str());
     std::string expected;
-    for (const char* const path : {"to nowhere", "new\nline", "sub/deep", "link/kept"})
+    for (const char* const path : {"to nowhere", "new\nline", "sub/deep", "sub/deep/e", "link/kept"})
         expected += tree + "/" + path + "|";
     KpFilenameCollector::collect(found, nullptr, tree.c_str());
     KpFilenameCollector::collect(found, "*", (tree + "/b").c_str());

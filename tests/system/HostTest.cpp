@@ -45,6 +45,9 @@ TEST(KpCPUInfo, dividesTheTotalsThatDoNotContradictEachOther)
 
 TEST(KpCPUInfo, agreesWithTheKernel)
 {
+    kplib::platform::ProcessorCounts counts{};
+    const bool isKnown = kplib::platform::processorCounts(counts);
+    EXPECT_EQ(counts.logicalProcessors, isKnown ? sysconf(_SC_NPROCESSORS_ONLN) : 0);
     const KpCPUInfo& info = KpCPUInfo::instance();
     if (info.hasCPUID()) {
         EXPECT_EQ(info.vendor(), told("vendor_id"));

@@ -18,7 +18,8 @@ TEST(KpWatch, addsUpItsRuns)
     const double first = watch.stop2();
     pauseALittle();
     EXPECT_GE(first, 0.01);
-    EXPECT_EQ(std::tuple(watch.isRunning(), watch.getTime2()), std::tuple(false, first));
+    EXPECT_EQ(std::tuple(watch.isRunning(), watch.getTime2(), watch.getTime()),
+              std::tuple(false, first, static_cast<float>(first)));
     watch.cont();
     pauseALittle();
     EXPECT_GE(watch.stop2(), first + 0.01);

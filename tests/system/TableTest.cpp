@@ -280,6 +280,12 @@ TEST(KpTable, movesOnlyWhenThereIsNoRoomLeft)
     table.relationReserve(513, list);
     addWithoutMove(512);
     table.relationRemoveAll(row, list);
+    KpDataBase copies;
+    database.clone(copies);
+    {
+        const kplib::test::FailingMalloc failing(0);
+        EXPECT_NO_THROW(copies.table(table.tableId())->relationReserve(2048, list)) << "free cells are cloned";
+    }
     addWithoutMove(1024);
 }
 

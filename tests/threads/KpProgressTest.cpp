@@ -102,6 +102,19 @@ TEST(KpProgress, cancelEndsAllWorkForGood)
     EXPECT_EQ(std::tuple(progress.isCanceled(), progress.isWorking()), std::tuple(true, false));
 }
 
+TEST(KpProgress, aStartThatFailsEndsOnce)
+{
+    struct Failing : KpProgressInterface {
+        void beforeStartWorking() override { throw 1; }
+        void afterStopWorking() override { ++ends; }
+        int ends = 0;
+    } failing;
+    EXPECT_THROW(failing.startWorking(1, ""), int);
+    failing.stopWorking();
+    failing.stopWorking();
+    EXPECT_EQ(failing.ends, 1);
+}
+
 TEST(KpProgressThreads, aWorkerPollsWhatAnotherThreadCancels)
 {
     KpProgressInterface progress;
