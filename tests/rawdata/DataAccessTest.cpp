@@ -251,7 +251,8 @@ TEST(Volume, doubtfulMessages)
     const struct { const char* what; KpVec3l dims; int nDataVar, type; long come; bool isRead; } cases[] = {
         {"all there", {3L, 2L, 1L}, 2, 0, 12, true}, {"one byte short", {3L, 2L, 1L}, 2, 0, 11, false},
         {"none", {0L, big, big}, 2, 0, 0, true}, {"no such type", {big, 2L, 1L}, 2, 12, 0, true},
-        {"no components", {big, 2L, 1L}, 0, 0, 0, true}, {"slices below nothing", {3L, 2L, -1L}, 2, 0, 0, false},
+        {"no components", {big, 2L, 1L}, 0, 0, 0, true}, {"slices below nothing", {0L, 2L, -1L}, 2, 0, 0, false},
+        {"columns", {-1L, 0L, 2L}, 2, 0, 0, false}, {"rows", {0L, -1L, 2L}, 2, 0, 0, false},
         {"below nothing", {-3L, -2L, 1L}, 2, 0, 12, false},
         {"components below nothing", {0L, 2L, 1L}, -2, 0, 0, false},
         {"product of 2^64 + 8", {3L, (big + 2) / 3, 4L}, 1, 0, 12, false},
