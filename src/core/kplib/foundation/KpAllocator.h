@@ -4,14 +4,15 @@
 
 #include <functional>
 
-/// A value that names a pair of functions to allocate and free with, so that a buffer can be given back the way it was
-/// obtained. Copied by value, never throws: failure is a null result.
+/// A value that names a pair of functions to allocate and free with, so that a buffer is freed the
+/// way it was allocated. Copied by value, never throws: failure is a null result.
 class KPLIB_API KpAllocator {
 public:
+    /// Which pair of functions.
     enum AllocatorType : int {
-        AllocatorNone = 0,     ///< allocates and frees nothing: the memory belongs to somebody else
+        AllocatorNone = 0,     ///< allocates and frees nothing: the memory is owned elsewhere
         AllocatorMalloc = 1,   ///< malloc and free
-        AllocatorMalloc2 = 2,  ///< the same pair as AllocatorMalloc, and that is meant
+        AllocatorMalloc2 = 2,  ///< the same pair as AllocatorMalloc
         AllocatorNew = 3,      ///< array new and delete of bytes
     };
 
@@ -24,13 +25,15 @@ public:
     /// `size` bytes or null. On a first failure the callback below runs, if one is set, and one more attempt is made.
     void* allocate(unsigned long size) const;
 
-    /// Gives memory of allocate() back; null is ignored.
+    /// Frees memory of allocate(); null is ignored.
     void deallocate(void* ptr) const;
 
+    /// Whether both functions are the same.
     bool operator==(const KpAllocator& other) const = default;
 
-    /// Sets what to run when an allocation fails, for the owner of a cache that can be dropped: process-wide, unlocked,
-    /// so to be set before other threads start. An empty function takes it away.
+    /// Sets the function to run when an allocation fails, for the owner of a cache that can be
+    /// dropped. It is process-wide and unlocked: set it before other threads start. An empty
+    /// function removes it.
     static void setFreeUnusedUncompressedDataCB(std::function<void()> callback);
 
 private:

@@ -18,10 +18,11 @@ enum class KpElementKind : int {
     Managed,  ///< all others: constructed, copied and destroyed one by one
 };
 
-/// What the array has to know of an element type. The default is sound for all types that may be moved as bytes;
-/// specialise it for a type of your own that points into itself, with `movesAsBytes` false.
+/// What the array has to know of an element type. The default suits all types that may be moved as
+/// bytes; specialise it for a type of your own that points into itself, with `movesAsBytes` false.
 template <typename T>
 struct KpElementTraits {
+    /// How elements of type T are treated.
     static constexpr KpElementKind kind = std::is_scalar_v<T>               ? KpElementKind::Bytes
                                           : std::is_trivially_copyable_v<T> ? KpElementKind::Plain
                                                                             : KpElementKind::Managed;
@@ -31,22 +32,30 @@ struct KpElementTraits {
 
 /// The growable array of the library: three words, no allocator, no virtual operations.
 ///
-/// Elements are moved as bytes when the array grows or opens a gap (KpElementTraits tells the exceptions), so nothing
-/// may hold the address of an element across a growth. The array grows by half its size, and only resize(), remax() and
-/// the insertions change it; positions are not checked. Exhausted memory is a KpMemoryException. If copying or making a
-/// managed element throws, the array is as before, without the new elements; if the storage itself can't grow in
-/// insertMemory() and what stands on it, the capacity is already changed and the array is good for destruction only.
-/// T may be incomplete where an array is only declared, as within T itself. One thread at a time.
+/// Elements are moved as bytes when the array grows or opens a gap (the exceptions are those of
+/// KpElementTraits), so an address of an element is valid only until the next growth. The array
+/// grows by half its size, and only resize(), remax() and the insertions change it; positions are
+/// not checked. Exhausted memory is a KpMemoryException. If copying or making a managed element
+/// throws, the array is as before, without the new elements; if the storage itself cannot grow in
+/// insertMemory() or a function that calls it, the capacity is already changed and only the
+/// destructor may follow. T may be incomplete where an array is only declared, as within T itself.
+/// One thread at a time.
 template <typename T>
 class KpDArray {
 public:
+    /// As in standard containers.
     using value_type = T;
+    /// As in standard containers.
     using iterator = T*;
+    /// As in standard containers.
     using const_iterator = const T*;
 
     KpDArray() noexcept = default;
+    /// Copies the elements, not the capacity.
     KpDArray(const KpDArray& other) : KpDArray() { insert(0, other.size_, other.data_); }
+    /// Takes the storage; `other` is left empty.
     KpDArray(KpDArray&& other) noexcept { swap(other); }
+    /// Copies the items.
     KpDArray(std::initializer_list<T> items) : KpDArray() { insert(0, static_cast<long>(items.size()), items.begin()); }
     ~KpDArray()
     {
@@ -54,18 +63,21 @@ public:
         kpfree(data_);
     }
 
+    /// Copies the elements one by one; storage that is large enough is kept.
     KpDArray& operator=(const KpDArray& other);
+    /// Frees the old elements and takes the storage of `other`.
     KpDArray& operator=(KpDArray&& other) noexcept
     {
         KpDArray(std::move(other)).swap(*this);
         return *this;
     }
 
-    /// Sets the capacity to the larger of `newMax` and `newSize`, and the size to `newSize`; -1 stands for the size as
-    /// it is. The only operation that gives storage back. Returns the old capacity less the new one.
+    /// Sets the capacity to the larger of `newMax` and `newSize`, and the size to `newSize`; -1
+    /// stands for the size as it is. The only operation that frees storage. Returns the old
+    /// capacity less the new one.
     long remax(long newMax = -1, long newSize = -1);
 
-    /// Sets the size (negative counts as 0) and returns it. Storage is never given back.
+    /// Sets the size (negative counts as 0) and returns it. Storage is never freed.
     long resize(long newSize);
 
     /// Ensures room for one more element, growing as append() does. If memory runs out, throws KpMemoryException and
@@ -93,16 +105,18 @@ public:
         ++size_;
     }
 
-    /// Inserts a copy behind all elements that `compare` tells to be less or equal, by binary search in ]lo, hi[; -1
-    /// and -1 search the whole array. Returns its index. O(log n) comparisons, and the move of what follows.
+    /// Inserts a copy after all elements that `compare` finds less or equal, by binary search in
+    /// ]lo, hi[; -1 and -1 search the whole array. Returns its index. O(log n) comparisons, and
+    /// the move of what follows.
     long insertSorted(const T& item, int (*compare)(const T&, const T&), long lo = -1, long hi = -1);
 
-    /// Takes the element at `pos` out; what follows moves down.
+    /// Removes the element at `pos`; those after it move down.
     void remove(long pos);
 
     /// Size 0; the storage stays.
     void clear() noexcept { destroyFrom(0); }
 
+    /// Exchanges the storage; no element is moved.
     void swap(KpDArray& other) noexcept
     {
         std::swap(size_, other.size_);
@@ -110,24 +124,31 @@ public:
         std::swap(data_, other.data_);
     }
 
+    /// Number of elements.
     long size() const noexcept { return size_; }
+    /// Number of elements that the storage holds.
     long capacity() const noexcept { return capacity_; }
+    /// The storage; null as long as nothing was allocated.
     T* data() noexcept { return data_; }
+    /// The storage; null as long as nothing was allocated.
     const T* data() const noexcept { return data_; }
+    /// The element at `i`, in [0, size()); unchecked in release builds.
     T& operator[](long i) noexcept
     {
         KPLIB_CHECK(i >= 0 && i < size_, "KpDArray: the index is not in [0, size())");
         return data_[i];
     }
+    /// As above.
     const T& operator[](long i) const noexcept
     {
         KPLIB_CHECK(i >= 0 && i < size_, "KpDArray: the index is not in [0, size())");
         return data_[i];
     }
+    /// The elements as a range; an insertion or a growth invalidates the iterators.
     T* begin() noexcept { return data_; }
-    T* end() noexcept { return data_ + size_; }
-    const T* begin() const noexcept { return data_; }
-    const T* end() const noexcept { return data_ + size_; }
+    T* end() noexcept { return data_ + size_; }              ///< as begin()
+    const T* begin() const noexcept { return data_; }        ///< as above
+    const T* end() const noexcept { return data_ + size_; }  ///< as begin()
 
 protected:
     /// For derived arrays that fill raw storage themselves.

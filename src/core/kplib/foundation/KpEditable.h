@@ -5,9 +5,10 @@
 
 class KpEditable;
 
-/// Hears of changes. It must not remove itself while it is called.
+/// Receives the changes of a KpEditable. It must not remove itself during a call.
 class KPLIB_API KpEditingListener {
 public:
+    /// A change of `object` starts; its flags are set already.
     virtual void editingStarted(KpEditable* object) = 0;
     /// The object still has the flags of the change.
     virtual void editingFinished(KpEditable* object) = 0;
@@ -16,22 +17,23 @@ protected:
     ~KpEditingListener() = default;
 };
 
-/// An object that announces its changes; flags tell what is being changed, and their meaning is the object's own. One
-/// thread at a time.
+/// An object that announces its changes; flags name what is being changed, and the class of the
+/// object defines them. One thread at a time.
 class KPLIB_API KpEditable {
 public:
-    /// Sets the flags, in place of what was there, and tells the listeners, first to last.
+    /// Replaces the flags and calls the listeners in the order of their addition.
     virtual void startEditing(int flags);
-    /// Tells the listeners, first to last, and then clears the flags.
+    /// Calls the listeners in the order of their addition and then clears the flags.
     virtual void finishEditing();
     /// Whether any bit of `mask` is being edited.
     virtual bool isEdited(int mask);
     /// Whether all bits of `mask` are being edited.
     virtual bool isAllEdited(int mask);
+    /// All flags of the change, 0 between changes.
     virtual int getEditingFlags() const;
     virtual ~KpEditable();
 
-    /// Adds a listener, which stays the caller's; one that is added twice is told twice.
+    /// Adds a listener, which stays the caller's; one that is added twice is called twice.
     void addEditingListener(KpEditingListener* listener);
     /// Removes the first entry of that listener, if there is one.
     void removeEditingListener(KpEditingListener* listener);

@@ -2,33 +2,41 @@
 
 #include <kplib/foundation/KpString.h>
 
-/// Base of the library's exceptions: a message. doClone() and doRaise() let a handler keep an exception and raise it
-/// later, on another thread for example; a derived class that doesn't override them comes back as a plain KpException
-/// with the text it had then, and KpMemoryException is meant to.
+/// Base of the library's exceptions: a message. doClone() and doRaise() let a handler keep an
+/// exception and raise it later, on another thread for example; a derived class that does not
+/// override them, such as KpMemoryException, comes back as a plain KpException with the text it
+/// had then.
 class KPLIB_API KpException {
 public:
     KpException() = default;
+    /// With that message.
     KpException(const KpString& message) : message_(message) {}
+    /// With a message formatted as by printf().
     KpException(const char* format, ...) KPLIB_PRINTF(2, 3);
+    /// @{
+    /// Copies the message.
     KpException(const KpException&) = default;
     KpException& operator=(const KpException&) = default;
+    /// @}
+
     virtual ~KpException();
 
     /// The message; valid as long as this object, and until its next what().
     virtual const char* what();
 
-    /// A plain KpException of the same text, on the heap and the caller's.
+    /// A plain KpException of the same text on the heap, which the caller deletes.
     virtual KpException* doClone();
 
     /// Throws a copy of this as KpException.
     [[noreturn]] virtual void doRaise();
 
-    /// As above, for those who catch by const reference.
+    /// As above, for handlers that catch by const reference.
     const char* what() const { return const_cast<KpException*>(this)->what(); }
 
 protected:
     /// A message that holds no memory yet.
     explicit KpException(KpString::NoMemory none) : message_(none) {}
 
+    /// What what() returns.
     KpString message_;
 };

@@ -2,21 +2,28 @@
 
 #include <kplib/foundation/KpExport.h>
 
-/// Base of objects that KpHandle counts, for one thread; KpHandableThreaded is for objects that travel between threads.
+/// Base of objects that KpHandle counts, for one thread; KpHandableThreaded is for objects that
+/// threads share.
 ///
-/// The count is the number of handles, 0 for a new object. An object that no handle ever holds lives and dies as any
-/// other; one that a handle has held is deleted with its last handle, never by hand. A copy of an object is an object
-/// of its own, with a count of 0. Constant objects are counted too, so that handles may be to const.
+/// The count is the number of handles, 0 for a new object. An object that no handle ever holds is
+/// an ordinary object; one that a handle has held is deleted with its last handle, never by its
+/// owner. A copy of an object is an object of its own, with a count of 0. Constant objects are
+/// counted too, so that handles may be to const.
 class KPLIB_API KpHandable {
 public:
     KpHandable() = default;
+    /// @{
+    /// Leaves the count alone: it belongs to the object, not to its value.
     KpHandable(const KpHandable&) noexcept {}
     KpHandable& operator=(const KpHandable&) noexcept { return *this; }
+    /// @}
+
     virtual ~KpHandable();
 
     /// Runs once before the object is deleted, while it is whole. It may take and drop handles to the object.
     virtual void notifyDelete();
 
+    /// Counts one handle more.
     void ref() const
     {
         if (!destructionInProgress_)
@@ -30,6 +37,7 @@ public:
             unrefLast();
     }
 
+    /// Number of handles.
     int refCount() const { return refCount_; }
 
 private:

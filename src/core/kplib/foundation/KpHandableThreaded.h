@@ -4,13 +4,14 @@
 
 #include <atomic>
 
-/// Base of objects that KpHandle counts and that travel between threads; otherwise as KpHandable.
+/// Base of objects that KpHandle counts and that threads share; otherwise as KpHandable.
 ///
 /// Any thread that has a handle may copy and drop it. Whatever a thread did with the object before it dropped its
 /// handle is seen by the destructor.
 class KPLIB_API KpHandableThreaded {
 public:
     KpHandableThreaded() = default;
+    /// As the assignment below: a copy has a count of 0.
     KpHandableThreaded(const KpHandableThreaded&) noexcept {}
     /// Does nothing: the count belongs to the object, not to its value.
     KpHandableThreaded& operator=(const KpHandableThreaded&) noexcept { return *this; }
@@ -42,9 +43,11 @@ public:
         const int n = refCount_.load(std::memory_order_relaxed);
         return n < destructionCount ? n : 0;
     }
+    /// Whether the last reference is gone and the destruction has begun.
     bool isDestructionInProgress() const { return refCount_.load(std::memory_order_relaxed) >= destructionCount; }
 
-    /// Whether nobody holds a reference: never has, or no longer does. Takes the spin lock.
+    /// Whether there is no reference: none was ever taken, or all are dropped. Takes the spin
+    /// lock.
     bool isVirgin() const;
 
 private:

@@ -12,23 +12,27 @@ template <typename T>
 class KpHandle {
 public:
     KpHandle() noexcept = default;
+    /// Holds `object`, which may be null.
     KpHandle(T* object) : pointer_(object)
     {
         if (pointer_)
             pointer_->ref();
     }
+    /// Holds the same object.
     KpHandle(const KpHandle& other) : KpHandle(other.pointer_) {}
+    /// Takes the reference; `other` is null then.
     KpHandle(KpHandle&& other) noexcept : pointer_(std::exchange(other.pointer_, nullptr)) {}
 
-    /// The pointer is cleared before the object goes, so that what the object does in its end doesn't find it here.
+    /// The pointer is cleared before the reference is dropped, so that the destructor of the
+    /// object finds no handle to itself here.
     ~KpHandle()
     {
         if (T* const old = std::exchange(pointer_, nullptr))
             old->unref();
     }
 
-    /// Nothing happens when the pointer is the same. The new object is held before the old one is let go, so that a
-    /// chain survives in which the old one holds the new one.
+    /// Does nothing if the pointer is the same. References the new object before it drops the old
+    /// one, so that a new object that only the old one holds survives.
     KpHandle& operator=(T* object)
     {
         if (object == pointer_)
@@ -40,17 +44,23 @@ public:
             old->unref();
         return *this;
     }
+    /// As the assignment of the pointer.
     // NOLINTNEXTLINE(bugprone-unhandled-self-assignment): the same pointer is left alone
     KpHandle& operator=(const KpHandle& other) { return *this = other.pointer_; }
+    /// Drops the old object and takes the reference of `other`.
     KpHandle& operator=(KpHandle&& other) noexcept
     {
         KpHandle(std::move(other)).swap(*this);
         return *this;
     }
 
+    /// Exchanges the pointers without counting.
     void swap(KpHandle& other) noexcept { std::swap(pointer_, other.pointer_); }
 
+    /// The object or null.
     T* get() const noexcept { return pointer_; }
+    /// @{
+    /// The object; the handle must not be null, which release builds do not check.
     T* operator->() const noexcept
     {
         KPLIB_CHECK(pointer_ != nullptr, "KpHandle: dereferenced while null");
@@ -61,11 +71,16 @@ public:
         KPLIB_CHECK(pointer_ != nullptr, "KpHandle: dereferenced while null");
         return *pointer_;
     }
+    /// Whether there is an object.
+    /// @}
+
     explicit operator bool() const noexcept { return pointer_ != nullptr; }
 
+    /// @{
+    /// Whether both point to the same object.
     bool operator==(const KpHandle& other) const noexcept { return pointer_ == other.pointer_; }
     bool operator==(const T* object) const noexcept { return pointer_ == object; }
-
+    /// @}
 private:
     T* pointer_ = nullptr;
 };

@@ -12,8 +12,8 @@
 
 /// An identifier that is a number of type T on the wire; `empty` is the number that means that there is none.
 ///
-/// Each kind of identifier is a type of its own, so that one can't be taken for another. A plain value of the size of
-/// T.
+/// Each kind of identifier is a type of its own, so that they cannot be mixed up. A plain value of
+/// the size of T.
 template <typename T, T empty>
 class KpID {
 public:
@@ -22,18 +22,25 @@ public:
 
     /// No id.
     constexpr KpID() = default;
+    /// The id of that number.
     constexpr explicit KpID(const T& value) : value_(value) {}
 
+    /// The number.
     constexpr const T& value() const { return value_; }
+    /// Replaces the number.
     constexpr void valueSet(const T& value) { value_ = value; }
 
+    /// Whether there is no id.
     constexpr bool isEmpty() const { return value_ == empty; }
+    /// Whether there is an id.
     constexpr bool isNotEmpty() const { return value_ != empty; }
+    /// Becomes no id.
     constexpr void makeEmpty() { value_ = empty; }
 
     /// The order of the numbers; an empty id has no place of its own in it.
     friend constexpr auto operator<=>(const KpID& a, const KpID& b) = default;
 
+    /// Prints the number.
     template <typename Traits>
     friend std::basic_ostream<char, Traits>& operator<<(std::basic_ostream<char, Traits>& out, const KpID& id)
     {
@@ -50,13 +57,18 @@ class KpID_C {
 public:
     /// Not valid.
     constexpr KpID_C() = default;
+    /// The id of that value.
     constexpr explicit KpID_C(const T& value) : value_(value) {}
 
+    /// The value.
     constexpr const T& value() const { return value_; }
+    /// Replaces the value.
     constexpr void valueSet(const T& value) { value_ = value; }
 
+    /// Whether a bit of it is set.
     constexpr bool isValid() const { return words() != Words{}; }
 
+    /// Whether all bits are equal.
     friend constexpr bool operator==(const KpID_C& a, const KpID_C& b) { return a.words() == b.words(); }
     /// The first word decides, then the second, both unsigned and in the machine's byte order.
     friend constexpr std::strong_ordering operator<=>(const KpID_C& a, const KpID_C& b)
@@ -79,10 +91,13 @@ private:
 template <typename ID>
 requires std::derived_from<ID, typename ID::IDType>
 struct std::hash<ID> {
+    /// The number itself.
     std::size_t operator()(const ID& id) const { return static_cast<std::size_t>(id.value()); }
 };
 
+/// The words of an id, combined.
 template <typename T>
 struct std::hash<KpID_C<T>> {
+    /// Exclusive or of the words.
     std::size_t operator()(const KpID_C<T>& id) const { return id.words()[0] ^ id.words()[1]; }
 };

@@ -9,6 +9,7 @@
 /// thread at a time.
 class KPLIB_API KpInterfaceOwner : public KpTypedObject {
 public:
+    /// Who deletes a registered interface.
     enum MemoryPolicy : int {
         StaticMemory = 0,  ///< the owner only lists the interface
         OwnerDeletes = 1,  ///< the owner also deletes it, in notifyDelete()
@@ -21,22 +22,29 @@ public:
     const KpTypeInfo* getTypeId() const override;
     ~KpInterfaceOwner() override;
 
-    /// Count one handle more or less.
+    /// Counts one handle more.
     virtual void ref() = 0;
+    /// Counts one handle less.
     virtual void unref() = 0;
 
-    /// Runs before the owner goes: forgets all interfaces, deletes those it owns, the last one first, and drops what it
-    /// keeps alive.
+    /// Runs before the owner is destroyed: empties the list of interfaces, deletes those it owns,
+    /// the last one first, and drops the handles of addHandle().
     virtual void notifyDelete();
 
+    /// @{
+    /// The registered type of the class; initClass() registers it.
     static KpTypeInfo* getClassTypeId();
     static void initClass() { getClassTypeId(); }
+    /// @}
 
-    /// Adds an interface to the list; with OwnerDeletes it becomes the owner's, without memory it stays the caller's.
+    /// Adds an interface to the list. With OwnerDeletes the owner takes it over, unless memory is
+    /// exhausted: then the caller keeps it.
     void registerInterface(KpTypedObject* object, MemoryPolicy policy);
+    /// As registerInterface() with StaticMemory.
     void registerInterfaceStaticMemory(KpTypedObject* object);
 
-    /// Sets what runs once, with `data`, at the first query, to attach interfaces only when somebody asks.
+    /// Sets what runs once, with `data`, at the first query, to attach interfaces only when one is
+    /// needed.
     void registerAttachInterfacesOnceCB(void (*callback)(void*), void* data);
 
     /// Keeps the object alive as long as this owner.

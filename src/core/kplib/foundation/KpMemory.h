@@ -11,18 +11,19 @@ KPLIB_API void* kpmalloc(unsigned long size);
 /// KpMemoryException(size) when there is no memory; `ptr` then stays as it was.
 KPLIB_API void* kprealloc(void* ptr, unsigned long size);
 
-/// Gives a block back; null is ignored.
+/// Frees a block; null is ignored.
 KPLIB_API void kpfree(void* ptr);
 
 /// Deleter for blocks of kpmalloc: `std::unique_ptr<char, KpFree>`.
 struct KpFree {
+    /// Frees `block`; null is ignored.
     void operator()(void* block) const { kpfree(block); }
 };
 
-/// `size` bytes with the heap's own alignment (16 here) or null; `alignment` is ignored, and that is meant.
+/// `size` bytes with the heap's own alignment (16 here) or null; `alignment` is ignored.
 KPLIB_API void* KpAlignedMalloc(unsigned long size, unsigned long alignment);
 
-/// Gives a block of KpAlignedMalloc back.
+/// Frees a block of KpAlignedMalloc.
 KPLIB_API void KpAlignedFree(void* ptr);
 
 /// Whether `ptr` is a multiple of `alignment`, a power of two.

@@ -2,13 +2,17 @@
 
 #include <kplib/foundation/KpException.h>
 
-/// Exhausted memory. It can be made, thrown and asked when there is no memory left at all.
+/// Exhausted memory. Making, throwing and reading it needs no memory.
 class KPLIB_API KpMemoryException : public KpException {
 public:
     /// `size`: the bytes that were asked for, 0 when unknown.
     explicit KpMemoryException(unsigned long size = 0);
+    /// @{
+    /// Copies the size.
     KpMemoryException(const KpMemoryException&) = default;
     KpMemoryException& operator=(const KpMemoryException&) = default;
+    /// @}
+
     ~KpMemoryException() override;
 
     using KpException::what;
@@ -16,6 +20,7 @@ public:
     /// memory for the text. Writes into this object: one thread at a time.
     const char* what() override;
 
+    /// Number of bytes that were asked for, 0 if unknown.
     unsigned long size() const { return size_; }
 
 private:

@@ -13,8 +13,9 @@ KPLIB_API void kpSetLockFailureReport(KpLockFailureReport report);
 
 /// Mutual exclusion, recursive on request.
 ///
-/// Failures of the platform don't throw: unlock() writes them to the log, the others keep silent. The caller sees to it
-/// that a mutex is unlocked when it is destroyed, and that a plain one is unlocked by the thread that holds it.
+/// Failures of the platform do not throw: unlock() writes them to the log, the others ignore them.
+/// The caller ensures that a mutex is unlocked when it is destroyed, and that a plain one is
+/// unlocked by the thread that holds it.
 class KPLIB_API KpMutex {
 public:
     /// An unlocked mutex. With `recursive` its holder may lock it again, and unlocks it as often.
@@ -23,12 +24,13 @@ public:
     KpMutex& operator=(const KpMutex&) = delete;
     virtual ~KpMutex();
 
+    /// Whether its holder may lock it again.
     bool isRecursive() const;
 
     /// Blocks until the mutex is held.
     void lock();
 
-    /// Takes the mutex if that can be done at once, and tells whether it did.
+    /// Locks the mutex if it is free, and returns whether it did.
     bool tryLock();
 
     /// Gives up one lock. A failure is one error line in the log.
@@ -44,6 +46,7 @@ private:
 template <typename Lock>
 class KpScopedLockT {
 public:
+    /// Locks `lock`.
     explicit KpScopedLockT(Lock* lock) : lock_(lock)
     {
         if (lock_)
@@ -64,6 +67,7 @@ private:
     Lock* lock_;
 };
 
-/// One recursive lock for all modules of the system, to guard the making of singletons on first use. Valid from static
-/// initialisation until exit. Its name is older than the rule that reserves it.
+/// One recursive lock for all modules of the system, to guard the making of singletons on first
+/// use. Valid from static initialisation until exit. The name is a reserved one for compatibility
+/// with existing modules.
 extern KPLIB_API KpMutex _KpSingleton_Mutex;  // NOLINT(bugprone-reserved-identifier)

@@ -7,6 +7,7 @@
 /// Type of the elements of typed memory. The numbers stand on the wire and in files and never change.
 class KPLIB_API KpPrimType {
 public:
+    /// The element types.
     enum Type : std::int32_t {
         Byte = 0,     ///< unsigned 8 bit
         Short = 1,    ///< signed 16 bit
@@ -15,16 +16,19 @@ public:
         Double = 4,   ///< IEEE 754 double
         Complex = 5,  ///< two singles, real and imaginary
         String = 6,   ///< a reference to text
-        UShort = 7,   ///< unsigned 16 bit; behind String, and that is meant
-        UInt = 8,     ///< unsigned 32 bit: named, sized and sent only, no typed operation serves it
-        SByte = 9,    ///< signed 8 bit: likewise
+        UShort = 7,   ///< unsigned 16 bit; after String, since the number is part of the wire format
+        UInt = 8,     ///< unsigned 32 bit: has a name, a size and a wire form, but no typed operation
+        SByte = 9,    ///< signed 8 bit: as UInt
     };
+    /// Number of element types.
     static constexpr int NumTypes = 10;
 
     /// Names ("byte", "short" ...) and sizes in bytes, indexed by the value; valid for 0 to 9 only.
     static const char* const primTypeName[NumTypes];
+    /// Sizes in bytes, as above.
     static const std::int32_t primTypeSize[NumTypes];
 
+    /// Of that type.
     constexpr KpPrimType(Type type = Byte) : type_(type) {}
 
     /// From a number, as read from a message; any number is held as it is.
@@ -33,6 +37,7 @@ public:
     /// The type of that exact name into `type`; false for an unknown name, and `type` stays.
     static bool nameToType(const char* name, Type& type);
 
+    /// The enumerator, for switches and comparisons.
     constexpr operator Type() const { return type_; }
 
     /// Whether this is one of the ten types.
@@ -41,8 +46,9 @@ public:
     /// Whether the library computes with elements of this type: byte, short, int, float, double and ushort.
     constexpr bool isNumber() const;
 
-    /// Name and size that may be asked of any value: "unknown" and 0 outside the ten types.
+    /// Name of any value: "unknown" outside the ten types, with a size of 0.
     const char* name() const { return isValid() ? primTypeName[type_] : "unknown"; }
+    /// As name(), the size in bytes.
     int size() const { return isValid() ? primTypeSize[type_] : 0; }
 
 private:

@@ -4,9 +4,10 @@
 
 #include <cstdint>
 
-/// Stands for an element type in calls: `typename decltype(tag)::Type`.
+/// Passes an element type to a callable: a member of the tag is the C++ type.
 template <typename T>
 struct KpElementTag {
+    /// The C++ type of an element.
     using Type = T;
 };
 

@@ -12,9 +12,9 @@
 
 /// The library's string: an array of char whose last element is the NUL, so size() is length() + 1.
 ///
-/// Text is bytes, of whatever encoding. Only raw array operations, a move away from it and a format that the platform
-/// refuses leave a string without its NUL (an array of size 0); it then reads as "". No positions are checked. One
-/// thread at a time.
+/// Text is bytes, of whatever encoding. Only raw array operations, a move from it and a format
+/// that the platform refuses leave a string without its NUL (an array of size 0), which reads as
+/// "". No positions are checked. One thread at a time.
 class KPLIB_API KpString : public KpDArray<char> {
 public:
     /// Selects the constructor that takes no memory.
@@ -24,30 +24,43 @@ public:
     KpString();
     /// A copy of the text; null gives an empty string.
     KpString(const char* s);
-    /// The `count` bytes from `s + start`, without a look at the length of `s`.
+    /// The `count` bytes from `s + start`; the length of `s` is not checked.
     KpString(const char* s, int start, int count);
     /// Formatted as by printf(); the leading int only selects this constructor.
     KpString(int ignored, const char* format, ...) KPLIB_PRINTF(3, 4);
+    /// A copy of the text, NUL characters included.
     explicit KpString(std::string_view text);
-    /// An array of size 0: for what must not allocate.
+    /// An array of size 0, for code that must not allocate.
     explicit KpString(NoMemory) noexcept {}
 
+    /// @{
+    /// Copies the text.
     KpString(const KpString&) = default;
     KpString(KpString&&) noexcept = default;
+    /// @}
+
+    /// Copy and move as for arrays; a string that was moved from reads as "".
     KpString& operator=(const KpString&) = default;
+    /// As above.
     KpString& operator=(KpString&&) noexcept = default;
     /// A copy of the text, which may lie in this string; null makes the string empty.
     KpString& operator=(const char* s);
 
     /// Number of characters.
     int length() const noexcept { return size() > 0 ? static_cast<int>(size() - 1) : 0; }
+    /// Whether there are no characters.
     bool isEmpty() const noexcept { return size() < 2; }
+    /// The text, never null; valid until the string changes.
     const char* c_str() const noexcept { return size() > 0 ? data() : ""; }
+    /// @{
+    /// The text without a copy; valid until the string changes.
     operator const char*() const noexcept { return c_str(); }
     operator std::string_view() const noexcept { return {c_str(), size() > 0 ? static_cast<size_t>(size() - 1) : 0}; }
+    /// @}
 
     /// Appends; null is ignored. `s` may lie in this string.
     KpString& operator+=(const char* s);
+    /// Appends one character.
     KpString& operator+=(char c)
     {
         append(c);
@@ -70,42 +83,54 @@ public:
     bool operator==(const KpString& other) const;
     /// As !=, turned round.
     bool operator==(const char* s) const { return !(*this != s); }
-    /// True when the texts differ; a string without a NUL differs from every text, "" too. A null `s` differs only from
-    /// such a one, not from any proper string, empty or not: odd, and meant.
+    /// True when the texts differ; a string without a NUL differs from every text, "" too. A null
+    /// `s` differs only from such a one, not from any proper string, empty or not. Intentional:
+    /// existing callers depend on it.
     bool operator!=(const char* s) const;
+    /// @{
+    /// As above, for other kinds of null and text.
     bool operator!=(char* s) const { return *this != static_cast<const char*>(s); }
     bool operator!=(std::nullptr_t) const { return *this != static_cast<const char*>(nullptr); }
     friend bool operator==(const char* s, const KpString& text) { return text == s; }
+    /// @}
 
     /// The order of strcmp, so that no comparison ever falls back on the addresses of the texts.
     std::weak_ordering operator<=>(const KpString& other) const { return *this <=> other.c_str(); }
+    /// As above; `s` is not null.
     std::weak_ordering operator<=>(const char* s) const { return std::strcmp(c_str(), s) <=> 0; }
 
     /// Replaces the content by the formatted text and returns it. The string itself must not be among the arguments. If
     /// there is no memory, the content is undefined text.
     char* printf(const char* format, ...) KPLIB_PRINTF(2, 3);
+    /// As printf(), with the arguments in `args`, which are used up.
     char* vprintf(const char* format, va_list args) KPLIB_PRINTF(2, 0);
 
     /// The number in decimal, in place of the content or as a new string.
     void setInt64(long long v);
+    /// The number in decimal.
     static KpString fromInt64(long long v);
     /// The decimal number at the start of the text; without one, 0.
     static long long toInt64(const char* s);
+    /// As above, of this text.
     long long toInt64() const;
     /// The number at the start of the text, by sscanf with "%f" or "%d"; 0 and `ok` false without one.
     float toFloat(bool& ok) const;
+    /// As above, with "%d".
     int toInt(bool& ok) const;
 
     /// Whether all characters are ASCII letters or digits; true for an empty string.
     bool isAlnum() const;
+    /// @{
+    /// As isAlnum(), for letters or for digits alone.
     bool isAlpha() const;
     bool isDigit() const;
+    /// @}
 
     /// The characters `from` to `to`, both inclusive; `to` = `from` - 1 gives an empty string.
     KpString substr(unsigned from, unsigned to) const;
 
-    /// Replaces each occurrence of `from`, left to right; what was put in is not searched again. An empty or null
-    /// `from` changes nothing.
+    /// Replaces each occurrence of `from`, left to right; inserted text is not searched again. An
+    /// empty or null `from` changes nothing.
     void replaceSubStr(const char* from, const char* to);
 
     /// Splits at each separator, empty pieces included: always one piece more than there are separators. `out` must not

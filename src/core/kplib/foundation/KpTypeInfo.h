@@ -9,21 +9,28 @@
 /// Types are made during static initialisation or with the loading of a shared object: the registry has no lock.
 class KPLIB_API KpTypeInfo {
 public:
+    /// Makes an object of the class on the heap.
     using Factory = KpTypedObject* (*)();
 
     /// A key to search with; it is not registered. The name is not copied, here and below.
     explicit KpTypeInfo(const char* name);
-    /// A type, which is registered behind those of an equal name. `create`, the factory, and the parents may be null.
+    /// A type, which is registered after those of an equal name. `create`, the factory, and the
+    /// parents may be null.
     KpTypeInfo(const char* name, Factory create, const KpTypeInfo* parent1, const KpTypeInfo* parent2);
     KpTypeInfo(const KpTypeInfo&) = delete;
     KpTypeInfo& operator=(const KpTypeInfo&) = delete;
-    /// Takes this very object out of the registry, if it is there.
+    /// Removes this object from the registry, if it is there.
     ~KpTypeInfo();
 
+    /// The name of the class.
     const char* name() const { return name_; }
+    /// The factory or null.
     Factory factory() const { return factory_; }
+    /// @{
+    /// A parent or null.
     const KpTypeInfo* parent1() const { return parent1_; }
     const KpTypeInfo* parent2() const { return parent2_; }
+    /// @}
 
     /// Whether this is `other` or has it among its ancestors. Names are not compared.
     bool isOfType(const KpTypeInfo* other) const;
@@ -31,7 +38,7 @@ public:
     /// The registered type of that name, the last of several, or null. O(log n).
     static KpTypeInfo* fromName(const char* name);
 
-    /// Takes the type that fromName() finds out of the registry; the object stays.
+    /// Removes the type that fromName() finds from the registry; the object stays.
     static void removeType(const char* name);
 
     /// The registry, sorted by name in the order of strcmp.

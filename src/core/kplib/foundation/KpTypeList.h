@@ -7,8 +7,10 @@
 /// A list of types, for overloads and tables that several classes share.
 template <typename... Types>
 struct KpTypeList {
+    /// Number of types.
     static constexpr unsigned long size = sizeof...(Types);
 
+    /// Whether T is one of the types.
     template <typename T>
     static constexpr bool contains = (std::is_same_v<T, Types> || ...);
 

@@ -3,7 +3,7 @@
 #include <kplib/foundation/KpExport.h>
 #include <kplib/foundation/KpTypeInfo.h>
 
-/// Base of objects that can be asked for their class.
+/// Base of objects that know their class at run time.
 ///
 /// A typed class has its own getClassTypeId() with a static KpTypeInfo that names the class and its parent, a
 /// getTypeId() that returns it, and an initClass(); a static initialiser in its source calls getClassTypeId(), so that
@@ -14,8 +14,9 @@ public:
     virtual const KpTypeInfo* getTypeId() const;
     virtual ~KpTypedObject();
 
+    /// The registered type of the class.
     static KpTypeInfo* getClassTypeId();
 
-    /// Registers the class if that hasn't happened yet.
+    /// Registers the class if it is not registered yet.
     static void initClass() { getClassTypeId(); }
 };
