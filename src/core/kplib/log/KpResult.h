@@ -42,7 +42,7 @@ public:
         GlStackUnderflow = 1284,
         GlOutOfMemory = 1285,
 
-        // 4096 and the classic errno numbers, as the Microsoft runtime has them.
+        // 4096 and the classic errno numbers, with the values of Windows.
         SysNoEntry = 4096 + 2,
         SysArgumentListTooLong = 4096 + 7,
         SysExecFormat = 4096 + 8,
@@ -63,31 +63,44 @@ public:
     };
 
     class Error;
-    /// Told of a failure; true when it has dealt with it, so that nobody else is asked.
+    /// Receives a failure; true ends the notification, so that no further callback runs.
     using NotificationCallback = bool (*)(const KpResult&);
 
     KpResult() noexcept = default;
 
-    /// A failure with its texts and perhaps its place in the source; null texts are empty. Without `data` the code's
-    /// own text is taken. Code 0 is a success, and the texts go nowhere.
+    /// A failure with its texts and perhaps its place in the source; null texts are empty. Without
+    /// `data` the code's own text is taken. Code 0 is a success; the texts are ignored.
     KpResult(Code code, const char* text, const char* data);
+    /// As above, with the place in the source; `file` may be null.
     KpResult(Code code, int line, const char* file, const char* text, const char* data);
+    /// As above, for any number.
     KpResult(int code, const char* text, const char* data);
+    /// As above, for any number.
     KpResult(int code, int line, const char* file, const char* text, const char* data);
 
+    /// Whether this is a success.
     bool isOk() const { return !error_; }
+    /// Whether this is a failure.
     bool isBad() const { return !isOk(); }
 
+    /// @{
+    /// The code of the failure, Ok for a success.
     Code code() const;
     int codeValue() const { return code(); }
+    /// @}
 
     /// 0 when not given.
     int line() const;
 
     /// The texts of the failure, "" where there is none, never null. Valid as long as a copy of this result.
     const char* file() const;
+    /// @{
+    /// The texts as above: what the caller gave, and the details.
     const char* text() const;
     const char* data() const;
+    /// Whether data() has characters.
+    /// @}
+
     bool hasData() const;
 
     /// Makes this a success.
@@ -96,7 +109,8 @@ public:
     /// Keeps the first failure: takes `other` only when this is a success.
     KpResult& operator<<(const KpResult& other);
 
-    /// Tells a failure to the callbacks, from the last added to the first, until one returns true.
+    /// Calls the callbacks with a failure, from the last added to the first, until one returns
+    /// true.
     void notify() const;
 
     /// Throws a copy of a failure, as KpResult.
@@ -106,6 +120,7 @@ public:
     static void notificationCallbackAdd(NotificationCallback callback);
     /// Removes the entry of `callback` that was added last, if there is one.
     static void notificationCallbackRemove(NotificationCallback callback);
+    /// Removes all callbacks.
     static void notificationCallbackRemoveAll();
 
 private:
@@ -126,12 +141,16 @@ public:
     /// Writes the record as one debug line.
     void trace() const;
 
+    /// As KpResult::code().
     Code code() const { return static_cast<Code>(code_); }
+    /// As KpResult::line().
     int line() const { return line_; }
+    /// @{
+    /// The texts as KpResult returns them, as strings.
     const KpString& file() const { return file_; }
     const KpString& text() const { return text_; }
     const KpString& data() const { return data_; }
-
+    /// @}
 private:
     int code_ = Ok;
     int line_ = 0;

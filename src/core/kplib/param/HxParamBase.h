@@ -12,15 +12,17 @@ class NameKey;
 
 /// A named node of the parameter tree: an HxParameter with a value, or an HxParamBundle with children.
 ///
-/// A node is made outside a tree, without a parent; the bundle that takes it owns it from then on. Names follow the
-/// rules of setName(). A tree belongs to one thread at a time (HxParamBundle tells the one exception). Exhausted memory
-/// is a KpMemoryException, the node then being as before. Nodes live in blocks of kpmalloc().
+/// A node is made outside a tree, without a parent; the bundle that takes it owns it from then on.
+/// Names follow the rules of setName(). A tree belongs to one thread at a time (for the one
+/// exception see HxParamBundle). Exhausted memory is a KpMemoryException, the node then being as
+/// before. Nodes live in blocks of kpmalloc().
 class KPLIB_API HxParamBase {
 public:
+    /// The two kinds of nodes.
     enum Type : std::uint8_t { TypeParameter = 0, TypeBundle = 1 };
 
-    /// Rules for a node. The setters of the tree don't ask them, but for what is said here: they serve the editors
-    /// above, through HxParamEditCheck.
+    /// Rules for a node. The setters of the tree ignore them, except as stated here: they are for
+    /// editors, through HxParamEditCheck.
     enum Flag : int {
         FlagNoSave = 1,          ///< left out when a tree is written to a file
         FlagNoCopy = 2,          ///< left out by HxParamBundle::copy()
@@ -32,7 +34,7 @@ public:
         FlagHidden = 128,  ///< never part of the text form
     };
 
-    /// What changed at a node or below it; for clients, nothing in the tree reads it.
+    /// What changed at a node or below it; for clients: the tree itself does not read it.
     enum TouchMask : int {
         TouchName = 1,
         TouchValue = 2,  ///< of a bundle: its list of children
@@ -44,11 +46,11 @@ public:
     /// A new node with the same content, outside any tree, owned by the caller.
     virtual HxParamBase* duplicate() const = 0;
 
-    /// Drops the node; its parent isn't told.
+    /// Destroys the node; its parent is not notified.
     virtual ~HxParamBase();
 
-    /// Takes over flags and name. What was touched is forgotten, a change of the name is recorded afresh; kind, parent
-    /// and edit check stay.
+    /// Takes over flags and name. The record of changes is cleared before a change of the name is
+    /// recorded; kind, parent and edit check stay.
     HxParamBase& operator=(const HxParamBase& other);
 
     /// Names the node. A leading digit gets a `_` in front; letters, digits and `-` stay, some Latin-1 letters lose
@@ -71,18 +73,23 @@ public:
 
     /// The bundle that holds the node, null outside a tree.
     HxParamBundle* parent() const { return parent_; }
+    /// The kind of the node.
     Type type() const { return type_; }
+    /// Whether the node is an HxParamBundle.
     bool isBundle() const { return type_ == TypeBundle; }
     int touched() const { return touched_; }    ///< bits of TouchMask
     int flags() const { return flags_; }        ///< bits of Flag
     const char* name() const { return name_; }  ///< valid until the name changes
 
+    /// @{
+    /// Nodes live in blocks of kpmalloc(); placement works as usual.
     static void* operator new(std::size_t size);
     static void* operator new(std::size_t, void* where) noexcept { return where; }
     static void operator delete(void* node) noexcept;
     static void operator delete(void*, void*) noexcept {}
-
+    /// @}
 protected:
+    /// A node of that name outside any tree.
     HxParamBase(Type type, const char* name);
     /// A node outside any tree and without an edit check; marks and flags are copied.
     HxParamBase(const HxParamBase& other);

@@ -11,13 +11,14 @@
 /// The inner node of the parameter tree: a container of sub-bundles, which stand first and in the order of insertion,
 /// and of parameters. It owns its children.
 ///
-/// Lookups ignore the case of ASCII letters and put a `_` in front of a leading digit, as names have it. A name with a
-/// blank in it also matches what is named by the part before, but for titles and sorted parameters. A bundle answers to
-/// its name and to the first 16 words of its parameter `Name`, its title. What isn't there is never an error: lookups
-/// give null or false and leave what they should fill as it is.
+/// Lookups ignore the case of ASCII letters and put a `_` in front of a leading digit, as names
+/// have it. A name with a blank in it also matches what is named by the part before, but for
+/// titles and sorted parameters. A bundle answers to its name and to the first 16 words of its
+/// parameter `Name`, its title. A missing node is never an error: lookups return null or false and
+/// leave their output unchanged.
 ///
-/// One thread at a time uses a tree, but any number may look parameters up by findSorted() and what stands on it:
-/// the first lookup sorts, under a lock of its own.
+/// One thread at a time uses a tree, but any number may look parameters up by findSorted() and the
+/// functions that use it: the first lookup sorts, under a lock of its own.
 ///
 /// Exhausted memory is a KpMemoryException. A node that couldn't be inserted is deleted; operations on many children,
 /// and those that make bundles or reservations on their way, stop at the failure and keep what they did so far, the
@@ -32,10 +33,12 @@ public:
 
     /// Copies flags, name and children, as copy() does.
     HxParamBundle(const HxParamBundle& other);
+    /// As copy() into a bundle without children, with flags and name.
     HxParamBundle& operator=(const HxParamBundle& other);
 
     /// Copies flags and name and takes the children. Assignment leaves flags and name as they are.
     HxParamBundle(HxParamBundle&& other);  // NOLINT(performance-noexcept-move-constructor): the name needs memory
+    /// Takes the children, dropping those that are here.
     HxParamBundle& operator=(HxParamBundle&& other) noexcept;
 
     HxParamBundle* duplicate() const override;
@@ -45,9 +48,9 @@ public:
     /// sub-bundles that are found here by name are merged and parameters of the same name replaced.
     void copy(const HxParamBase& src);
 
-    /// As copy(), but always merging and replacing, heedless of FlagNoCopy in `src` and in its children, with their
-    /// edit checks. Copies of whole sub-bundles still leave out what has FlagNoCopy inside them, and those with the
-    /// flag themselves come without children.
+    /// As copy(), but always merging and replacing, regardless of FlagNoCopy in `src` and in its
+    /// children, with their edit checks. Copies of whole sub-bundles still leave out what has
+    /// FlagNoCopy inside them, and those with the flag themselves come without children.
     void copyAll(const HxParamBase& src);
 
     /// Takes all children out of `other` and inserts them here, replacing those of the same name. O(1) if empty.
@@ -63,6 +66,7 @@ public:
 
     /// Deletes a child, unless it has FlagNoDelete; the form with a name takes what findBase() finds.
     void remove(HxParamBase* node);
+    /// Removes the child that findBase() finds.
     void remove(const char* name);
 
     /// Deletes all children, with FlagNoDelete too, and records no change.
@@ -70,33 +74,46 @@ public:
 
     /// The sub-bundle of that name or title; if there is none, a new one when `create` is not 0, else null. O(n).
     HxParamBundle* bundle(const char* name, int create);
+    /// As bundle(name, 0).
     HxParamBundle* bundle(const char* name) { return bundle(name, 0); }
+    /// @{
+    /// As bundle(name, 0).
     const HxParamBundle* bundle(const char* name) const;
+    /// @}
+
     /// The sub-bundle at an index, null outside.
     HxParamBundle* bundle(int i) { return const_cast<HxParamBundle*>(std::as_const(*this).bundle(i)); }
+    /// The sub-bundle at an index, null outside.
     const HxParamBundle* bundle(int i) const;
+    /// Number of sub-bundles.
     int nBundles() const { return static_cast<int>(counts_.load(std::memory_order_relaxed) & ~sortedBit); }
 
     /// Sets the parameter of that name that find() gives, of whatever type, or adds one. Null text is empty text.
     void set(const char* name, const char* text);
+    /// @{
+    /// Sets a number or `n` numbers, as above.
     void set(const char* name, int v);
     void set(const char* name, double v);
     void set(const char* name, int n, const int* values);
     void set(const char* name, int n, const float* values);
     void set(const char* name, int n, const double* values);
+    /// @}
+
     /// The values in decimal as one text; `values` needs one element, which is written, even if `n` is 0.
     void setAsString(const char* name, int n, const int* values);
     /// Three floats from 0 to 1, as the parameter `Color`.
     void setColor(const float* rgb);
 
-    /// The first parameter of that name, if it has `dimension` values (any number if below 1) and a type that fits
-    /// into one of `typeMask`: 1 byte, 2 short, 4 int, 8 float, 16 double, 64 text. Complex, "uint" and "sbyte" are
-    /// never found, and that is meant. O(n), O(log n) if sorted.
+    /// The first parameter of that name, if it has `dimension` values (any number if below 1) and
+    /// a type that fits into one of `typeMask`: 1 byte, 2 short, 4 int, 8 float, 16 double, 64
+    /// text. Complex, "uint" and "sbyte" are never found. O(n), O(log n) if sorted.
     HxParameter* find(const char* name, int dimension, int typeMask);
+    /// As above.
     const HxParameter* find(const char* name, int dimension, int typeMask) const;
 
     /// The first child of that name, or else the sub-bundle of that title. O(n).
     HxParamBase* findBase(const char* name) { return const_cast<HxParamBase*>(std::as_const(*this).findBase(name)); }
+    /// As above.
     const HxParamBase* findBase(const char* name) const;
 
     /// The parameter of that name, taken as it stands, by binary search, after sorting if need be. O(log n). Which one
@@ -105,11 +122,13 @@ public:
     {
         return const_cast<HxParameter*>(std::as_const(*this).findSorted(name));
     }
+    /// As above.
     const HxParameter* findSorted(const char* name) const;
 
     /// Sorts the parameters by name, once, until the next insertion. A new name doesn't move a parameter: lookups may
     /// miss those that were renamed in between.
     void sortParameters() const;
+    /// Whether findSorted() can search without sorting.
     bool isSorted() const { return (counts() & sortedBit) != 0; }
 
     /// A text, or a single number as text, see HxParameter::getString().
@@ -119,6 +138,7 @@ public:
     bool findNum(const char* name, int n, int* out) const;
     /// `n` numbers: all values of a parameter, or the one number of a text. `n` below 1 asks for the parameter only.
     bool findReal(const char* name, int n, float* out) const;
+    /// As above, in double precision.
     bool findReal(const char* name, int n, double* out) const;
     /// Three floats by KpColor::setValue().
     bool findColor(const char* name, float* rgb) const;
@@ -143,8 +163,13 @@ public:
     // "description: value"; a sequence is a bundle of that name with bundles Item_0, Item_1 ... All of it lies in the
     // bundle `All` in the bundle `DICOM`. Texts that are returned lie in the tree (see HxParameter::getString()).
 
+    /// @{
+    /// The bundle `All` in the bundle `DICOM`, null if there is none.
     HxParamBundle* dicomAll() { return const_cast<HxParamBundle*>(std::as_const(*this).dicomAll()); }
     const HxParamBundle* dicomAll() const;
+    /// The same, made as needed.
+    /// @}
+
     HxParamBundle* dicomAllCreate();
 
     /// Sets a tag of dicomAllCreate(), with an empty description.
@@ -152,9 +177,12 @@ public:
 
     /// findTagInAll() of dicomAll(). The form with a number gives NaN when it gives false.
     const char* findTag(const char* tag, const char* defaultValue) const;
+    /// @{
+    /// As findTagInAll() or findPrivateTagInAll() of dicomAll().
     bool findTag(const char* tag, float& out) const;
     bool findTag(const char* tag, KpDArray<float>& out) const;
     const char* findPrivateTag(const char* creator, const char* tag, const char* defaultValue) const;
+    /// @}
 
     // The rest is for the bundle `All` itself.
 
@@ -162,8 +190,12 @@ public:
     /// the first items of the per-frame and then of the shared functional groups. A leaf without a value gives the
     /// default.
     const char* findTagInAll(const char* tag, const char* defaultValue) const;
+    /// @{
+    /// The first number of a value; false, and `out` stays, without one.
     bool findTagInAll(const char* tag, int& out) const;
     bool findTagInAll(const char* tag, float& out) const;
+    /// @}
+
     /// All numbers of a value, separated by backslashes; false if one is missing. `out` stays if the tag is missing.
     bool findTagInAll(const char* tag, KpDArray<float>& out) const;
 
@@ -178,6 +210,7 @@ public:
     {
         return const_cast<HxParameter*>(std::as_const(*this).findRecursive(name));
     }
+    /// As above.
     const HxParameter* findRecursive(const char* name) const;
 
     /// The tag that holds in enhanced objects what `tag` holds in classic ones; false, and `mapped` stays, if the tag
@@ -204,15 +237,25 @@ public:
 
     // The children as a container: sub-bundles first, then parameters.
 
+    /// The children; valid until one is added or removed.
     const KpDArray<HxParamBase*>& children() const { return children_; }
+    /// Number of children.
     long size() const { return children_.size(); }
+    /// @{
+    /// The child at an index in [0, size()).
     HxParamBase* operator[](long i) { return children_[i]; }
     const HxParamBase* operator[](long i) const { return children_[i]; }
+    /// @}
+
+    /// All children.
     HxParamBase* const* begin() { return children_.begin(); }
+    /// As above.
     HxParamBase* const* end() { return children_.end(); }
+    /// As above.
     const HxParamBase* const* begin() const { return children_.begin(); }
+    /// As above.
     const HxParamBase* const* end() const { return children_.end(); }
-    /// Position of a child, -1 for null and strangers.
+    /// Position of a child, -1 for null and other nodes.
     int index(const HxParamBase* node) const;
 
 private:

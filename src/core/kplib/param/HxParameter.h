@@ -14,17 +14,22 @@ public:
 
     /// A text, a number, or `n` numbers, copied; n = 0 leaves the value null.
     HxParameter(const char* name, const char* text);
+    /// @{
+    /// As above.
     HxParameter(const char* name, int v);
     HxParameter(const char* name, double v);
     HxParameter(const char* name, int n, const int* values);
     HxParameter(const char* name, int n, const float* values);
     HxParameter(const char* name, int n, const double* values);
+    /// @}
+
     /// `n` values of any type. With null `data` they are uninitialised, to be filled through value(). For a text,
     /// `data` is the text, copied, and null gives a null value.
     HxParameter(const char* name, int n, KpPrimType type, const void* data);
 
+    /// As HxParamBase: a copy outside any tree.
     HxParameter(const HxParameter& other);
-    /// Copies name, flags and value. Only the bundles above keep the mark of the changed value, and that is meant.
+    /// Copies name, flags and value. Only the bundles above keep the mark of the changed value.
     HxParameter& operator=(const HxParameter& other);
 
     HxParameter* duplicate() const override;
@@ -32,17 +37,22 @@ public:
 
     /// Sets a text (null: the empty one) or `n` numbers, and records TouchValue. The source may lie in the old value.
     void set(const char* text);
+    /// @{
+    /// As above.
     void set(int n, const int* values);
     void set(int n, const float* values);
     void set(int n, const double* values);
+    /// @}
 
     int dimension() const { return dimension_; }  ///< number of values, 1 for a text
+    /// Type of the values.
     KpPrimType primType() const { return primType_; }
     void* value() { return value_; }  ///< dimension() elements or the text; null if there is no storage
+    /// As above.
     const void* value() const { return value_; }
 
-    /// The stored text; numbers are written into one of four process-wide, unlocked strings that take turns, so that
-    /// the last four results are valid. Null only for a text built from null.
+    /// The stored text; numbers are written into one of four process-wide, unlocked strings in
+    /// rotation, so that the last four results are valid. Null only for a text built from null.
     const char* getString() const
     {
         return primType_ == KpPrimType::String ? static_cast<const char*>(value_) : numbersAsString();
@@ -56,14 +66,16 @@ public:
     /// Element `i`; floating-point numbers are truncated after adding 0.5, negative ones too, and what no int holds
     /// gives INT_MIN. Of complex numbers the real part; of a text the number at its start, whatever `i`; else 0.
     int getNum(int i) const;
+    /// As getNum(), without rounding.
     double getReal(int i) const;
 
     /// All elements into an array of dimension() elements.
     void getNum(int* out) const;
+    /// As above, in double precision.
     void getReal(double* out) const;
 
-    /// Whether the stored block is `data`, or holds the same `n` bytes with `type` Byte. Any other type differs, even
-    /// from itself, and that is meant: it is what makes each set() a change.
+    /// Whether the stored block is `data`, or holds the same `n` bytes with `type` Byte. Any other
+    /// type differs, even from itself, so that each set() is a change.
     bool isEqual(int n, KpPrimType type, const void* data) const;
 
     /// Equal names, and a value that isEqual() to that of `other`.
