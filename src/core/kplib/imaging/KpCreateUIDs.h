@@ -6,9 +6,10 @@
 /// Makes DICOM unique identifiers for new objects (PS3.5, 9): root, version, a number for the kind of object, the node,
 /// a counter and the process, separated by dots.
 ///
-/// The counter is the time of day and counts on where the clock stands still or goes back: within a process it never
-/// repeats, whatever object or thread asks. That the text stays within the 64 characters of DICOM is up to the root.
-/// createUID() may be called on one object by many threads, for types that there are; all else is for one thread.
+/// The counter is the time of day and counts on where the clock stands still or goes back: within
+/// a process it never repeats, for all objects and threads. That the text stays within the 64
+/// characters of DICOM is up to the root. createUID() may be called on one object by many threads,
+/// for types that there are; all else is for one thread.
 class KPLIB_API KpCreateUIDs {
 public:
     /// What the identifier is for; the values of the layer above, which stand in the UID as 2 to 6.
@@ -21,8 +22,10 @@ public:
 
     /// False for an empty text (or null), which is an error and changes nothing.
     bool setRootUID(const char* root);
+    /// Likewise for the version.
     bool setVersion(const char* version);
 
+    /// Replaces the text of lastError().
     void setLastError(const KpString& text) { lastError_ = text; }
     /// The text of the last failure, "" at first; valid until the next one.
     const char* lastError() const { return lastError_.c_str(); }

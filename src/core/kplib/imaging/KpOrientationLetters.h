@@ -24,10 +24,13 @@ public:
     /// identity. Other than with one matrix, y points to the top.
     KpOrientationLetters(const KpMat4f& first, const KpMat4f& second, const KpMat4f& third);
 
+    /// @{
+    /// The letters at that edge.
     const std::string& right() const { return right_; }
     const std::string& top() const { return top_; }
     const std::string& left() const { return left_; }
     const std::string& bottom() const { return bottom_; }
+    /// @}
 
     /// All four strings are valid, and the right and the bottom edge don't name one axis as a whole: L and R do, LP and
     /// A don't.
@@ -35,9 +38,12 @@ public:
     /// Whether `letter` stands neither at the right nor at the bottom.
     bool unusedLabel(char letter) const;
     // Whether the view shows one kind of slice. With no letters at all it shows every kind.
+    /// @{
+    /// Whether the letters allow that kind of slice.
     bool isAxial() const { return unusedLabel('F') && unusedLabel('H'); }
     bool isCoronal() const { return unusedLabel('A') && unusedLabel('P'); }
     bool isSagittal() const { return unusedLabel('R') && unusedLabel('L'); }
+    /// @}
 
     /// Right, top, left and bottom, with `separator` between them.
     std::string join(char separator) const;
@@ -47,11 +53,12 @@ public:
     /// nothing written, if this is not isValid().
     bool getViewDirection(KpVec3f& view, KpVec3f& up, const KpMat4f& matrix, bool snap) const;
 
+    /// Whether all four strings are equal.
     friend bool operator==(const KpOrientationLetters& a, const KpOrientationLetters& b) = default;
 
     /// Zero for what is no letter of the alphabet; lower case is not.
     static KpVec3f letterToDirection(char letter);
-    /// One or more letters of the alphabet and nothing else.
+    /// Whether the text is one or more letters of the alphabet and nothing else.
     static bool isValidOrientationString(const std::string& letters);
     /// Each letter's opposite; what is no letter of the alphabet stays.
     static std::string oppositeString(const std::string& letters);

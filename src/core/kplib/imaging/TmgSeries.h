@@ -9,22 +9,29 @@
 #include <string>
 #include <vector>
 
-// What a loader notes of a series and its images. What the texts mean is up to the loader; here they are kept.
+// Records of a loader for a series and its images. The loader defines what the texts mean; here
+// they are kept.
 
 namespace Tmg {
 
 /// One image.
 class KPLIB_API ImageInfo {
 public:
+    /// Of two texts.
     ImageInfo(const std::string& first, const std::string& second) : first_(first), second_(second) {}
     ImageInfo(const ImageInfo&) = delete;
     ImageInfo& operator=(const ImageInfo&) = delete;
     virtual ~ImageInfo();
 
+    /// @{
+    /// A text of the image.
     const std::string& first() const { return first_; }
     const std::string& second() const { return second_; }
+    /// @}
+
     /// A word for the loader, 0 at first.
     long long word() const { return word_; }
+    /// Sets that word.
     void setWord(long long word) { word_ = word; }
 
 private:
@@ -36,17 +43,24 @@ private:
 /// A series, which owns its images.
 class KPLIB_API SeriesInfo : public KpHandable {
 public:
+    /// Without images.
     explicit SeriesInfo(const std::string& series) : series_(series) {}
     SeriesInfo(const SeriesInfo&) = delete;
     SeriesInfo& operator=(const SeriesInfo&) = delete;
     /// Deletes the images.
     ~SeriesInfo() override;
 
+    /// The text of the series.
     const std::string& series() const { return series_; }
+    /// @{
+    /// The images, owned by this.
     std::vector<ImageInfo*>& images() { return images_; }
     const std::vector<ImageInfo*>& images() const { return images_; }
+    /// @}
+
     /// A flag for the loader, false at first.
     bool isFlagged() const { return flag_; }
+    /// Sets that flag.
     void setFlagged(bool flag) { flag_ = flag; }
 
 private:
@@ -58,6 +72,7 @@ private:
 /// Collects the images of a series while they come in.
 class KPLIB_API ImageSeriesHelper {
 public:
+    /// Without images.
     explicit ImageSeriesHelper(const std::string& series) : series_(series) {}
     ImageSeriesHelper(const ImageSeriesHelper&) = delete;
     ImageSeriesHelper& operator=(const ImageSeriesHelper&) = delete;
@@ -69,9 +84,12 @@ public:
     /// create2DImageSet(), and a new image of the two texts.
     void processImage(const std::string& a, const std::string& b);
 
+    /// The text of the series.
     const std::string& series() const { return series_; }
-    /// The images so far; who moves them on, as into the images of the SeriesInfo, takes them out of here.
+    /// The images so far. Code that moves them, for example into the images of the SeriesInfo,
+    /// removes them from here.
     std::vector<ImageInfo*>& images() { return images_; }
+    /// The series, null before create2DImageSet().
     const KpHandle<SeriesInfo>& seriesInfo() const { return seriesInfo_; }
 
 private:
@@ -85,7 +103,8 @@ using VolumeCachePrecache = bool (*)(KpDArray<KpString>& names, bool flag1, bool
 
 /// Calls the installed function.
 KPLIB_API bool volumeCachePrecache(KpDArray<KpString>& names, bool flag1, bool flag2);
-/// Installs a function, null the default one: process-wide and unlocked, to be set before other threads start.
+/// Installs a function, null the default one: process-wide and unlocked: set it before other
+/// threads start.
 KPLIB_API void volumeCacheSetFuncPrecache(VolumeCachePrecache function);
 /// Does nothing and gives false.
 KPLIB_API bool volumeCachePrecache_default(KpDArray<KpString>& names, bool flag1, bool flag2);

@@ -11,6 +11,7 @@
 /// pass; exhausted memory is a KpMemoryException. When made, any number of threads may read it.
 class KPLIB_API KpPackedIndexing {
 public:
+    /// Positions of a block.
     static constexpr int blockSize = 256;
 
     /// A position is flagged if its byte isn't 0.

@@ -20,9 +20,9 @@ class KPLIB_API KpRawData {
 public:
     KpRawData() = delete;
 
+    /// @{
     /// @name Conversion and mapping
     /// Source and target may be one buffer, or overlap with the target first, if target elements are no larger.
-    /// @{
 
     /// Copies `n` elements into the type of `dst`; none if `n` is below 1. Equal types, of any kind, are copied as
     /// bytes.
@@ -50,8 +50,6 @@ public:
     /// @}
 
     /// @name Questions
-    /// @{
-
     /// Smallest and largest of `n` elements, rounded to float; the first one is always read. The parts of complex
     /// numbers share one range. NaN is skipped, but stays in both results if it comes first. For other types the
     /// results are left as they were.
@@ -60,10 +58,8 @@ public:
     /// Whether no element, and no part of a complex one, is less or greater than the first; true if `n` is 0. NaN at
     /// the head gives false, later NaN is skipped. False for other types. Stops at the first difference.
     static bool isConstant(KpTypedPointer data, unsigned long n);
-    /// @}
-
-    /// @name Byte order, in place
     /// @{
+    /// @name Byte order, in place
 
     /// Reverses the bytes of each element; of the two halves of complex numbers and string references each by itself.
     static void swapBytes(KpTypedPointer data, unsigned long n);
@@ -75,19 +71,21 @@ public:
     /// @}
 
     /// @name Files
-    /// @{
-
     /// Reads or writes `count` items of `size` bytes, at least 1, by pieces of 1 MiB up to the first short one. The
     /// number of whole items transferred.
     static unsigned long fread(void* data, unsigned long size, unsigned long count, FILE* f);
+    /// As above.
     static unsigned long fwrite(const void* data, unsigned long size, unsigned long count, FILE* f);
 
     /// Elements in a file of the named byte order; the number of whole ones transferred. readBigEndian() swaps all `n`
     /// elements in memory, however few it read. writeBigEndian() swaps the caller's buffer for the time of the call:
     /// nobody may look at it meanwhile.
     static long readBigEndian(KpTypedPointer data, unsigned long n, FILE* f);
+    /// As above.
     static long writeBigEndian(KpTypedPointer data, unsigned long n, FILE* f);
+    /// As above.
     static long readLittleEndian(KpTypedPointer data, unsigned long n, FILE* f);
+    /// As above.
     static long writeLittleEndian(KpTypedPointer data, unsigned long n, FILE* f);
 
     /// Reads from a descriptor until `size` bytes have come or it ends, by calls of 4 MiB at most if `limitChunkSize`
@@ -96,10 +94,8 @@ public:
 
     /// Writes all `size` bytes to a descriptor and returns their number; all bits set at the first failure.
     static unsigned long write(int fd, const void* data, unsigned long size);
-    /// @}
-
-    /// @name Blocks in memory
     /// @{
+    /// @name Blocks in memory
 
     /// Mirrors a block of `dims` voxels in place along `axis`, 0 to 2. False, and nothing changes, for another axis, an
     /// empty block, null, or if there is no memory for the exchange.
@@ -125,10 +121,10 @@ public:
     /// by dy / fy by dz / fz voxels and is the caller's. What is left over at the far edges is never read. Factors and
     /// `nDataVar` are at least 1; nothing is written for others, or for factors above their sizes.
     ///
+    /// @{
     /// `progress` may be null. It gets a scope of `dz` steps, closed on return, and after each layer of voxels the step
     /// reached, unless it is canceled: then the rest of the target is left as it was. An error is logged if the
     /// elements are no numbers.
-    /// @{
 
     /// The mean of each block, cut towards zero for integers. Sums run along x, then y, then z: those of real numbers
     /// are kept in the element's own precision and so depend on that order.

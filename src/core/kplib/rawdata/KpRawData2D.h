@@ -4,7 +4,8 @@
 
 #include <cstdint>
 
-/// A rectangle of pixels, either an owner of its memory or a view on somebody else's.
+/// A rectangle of pixels, either an owner of its memory or a view on memory that is owned
+/// elsewhere.
 ///
 /// Pixels are bags of bytes: only their size counts. Pixel (x, y) lies at data() + x * pixelStride() + y * rowStride(),
 /// strides in bytes. A view costs nothing and is valid as long as the memory is. Memory comes from malloc; when there
@@ -18,6 +19,8 @@ public:
 
     // Each constructor does what the init() of its arguments does.
 
+    /// @{
+    /// As init().
     KpRawData2D(int w, int h, int bytesPerPixel) { init(w, h, bytesPerPixel); }
     KpRawData2D(int w, int h, int bytesPerPixel, void* data) { init(w, h, bytesPerPixel, data); }
     KpRawData2D(int w, int h, int bytesPerPixel, int rowStride, void* data)
@@ -28,21 +31,27 @@ public:
     {
         init(w, h, bytesPerPixel, pixelStride, rowStride, data);
     }
+    /// As the assignment.
+    /// @}
+
     KpRawData2D(const KpRawData2D& other) { *this = other; }
     ~KpRawData2D() { cleanup(); }
 
     /// A copy of an owner owns a copy of its block, without gaps; a copy of a view is one more view on the same memory.
     KpRawData2D& operator=(const KpRawData2D& other);
 
-    /// An owner of `w` * `h` pixels without gaps, not set to anything. For a size of 0 nothing is allocated, and data()
-    /// stays what it was, even if that is freed; this is meant.
+    /// An owner of `w` * `h` pixels without gaps, not initialised. For a size of 0 nothing is
+    /// allocated, and data() keeps its value, even if that block is freed.
     void init(int w, int h, int bytesPerPixel);
     /// A view on pixels without gaps, or with gaps between rows, or between pixels too.
     void init(int w, int h, int bytesPerPixel, void* data);
+    /// @{
+    /// As above; strides are in bytes.
     void init(int w, int h, int bytesPerPixel, int rowStride, void* data);
     void init(int w, int h, int bytesPerPixel, int pixelStride, int rowStride, void* data);
+    /// @}
 
-    /// Frees the block of an owner. data() stays and is not to be used.
+    /// Frees the block of an owner. data() keeps its value and must not be used.
     void cleanup();
 
     /// Makes this the owner of `data`, a block of malloc that holds the pixels without gaps. One that is refused is
@@ -60,8 +69,11 @@ public:
 
     /// Pixels in a row, rows.
     const std::int32_t* dims() const { return dims_; }
+    /// Size of a pixel.
     int bytesPerPixel() const { return bytesPerPixel_; }
+    /// Bytes from a pixel to the next one in its row.
     int pixelStride() const { return pixelStride_; }
+    /// Bytes from a row to the next one.
     int rowStride() const { return rowStride_; }
     /// Whether there are no gaps between pixels and between rows.
     bool isContiguous() const

@@ -5,19 +5,21 @@
 
 #include <cstdint>
 
-/// A block of voxels without gaps, x fastest, either an owner of its memory or a view on somebody else's.
+/// A block of voxels without gaps, x fastest, either an owner of its memory or a view on memory
+/// that is owned elsewhere.
 ///
-/// Voxels are bags of bytes: only their size counts. Memory comes from kpmalloc; exhausted memory is a
-/// KpMemoryException, after which the object holds none. Slices have an orientation: 0 is the plane of constant x with
-/// rows along y, 1 that of constant y and 2 that of constant z, both with rows along x. Positions and sizes are not
-/// checked. It cannot be copied: who wants a second block asks for one. One thread may change it, or any number read
-/// it.
+/// Voxels are bags of bytes: only their size counts. Memory comes from kpmalloc; exhausted memory
+/// is a KpMemoryException, after which the object holds none. Slices have an orientation: 0 is the
+/// plane of constant x with rows along y, 1 that of constant y and 2 that of constant z, both with
+/// rows along x. Positions and sizes are not checked. It cannot be copied: use init() for a second
+/// block. One thread may change it, or any number read it.
 class KPLIB_API KpRawData3D {
 public:
     /// Empty: sizes and pointers are 0.
     KpRawData3D() = default;
     /// As init().
     KpRawData3D(int nx, int ny, int nz, int bytesPerVoxel) { init(nx, ny, nz, bytesPerVoxel); }
+    /// As init().
     KpRawData3D(int nx, int ny, int nz, int bytesPerVoxel, void* data) { init(nx, ny, nz, bytesPerVoxel, data); }
     KpRawData3D(const KpRawData3D&) = delete;
     KpRawData3D& operator=(const KpRawData3D&) = delete;
@@ -28,7 +30,7 @@ public:
     /// A view.
     void init(int nx, int ny, int nz, int bytesPerVoxel, void* data);
 
-    /// Frees the block of an owner. data() stays and is not to be used.
+    /// Frees the block of an owner. data() keeps its value and must not be used.
     void cleanup();
 
     /// Exchanges the owned block for `p`, also a block of kpmalloc or null; data() is what is owned then.
@@ -42,6 +44,7 @@ public:
 
     /// Width, height and number of the slices. Other orientations than 1 and 2 count as 0.
     void getDims(int* dims, int orientation) const { getDims(orientation, dims[0], dims[1], dims[2]); }
+    /// The same into three numbers.
     void getDims(int orientation, int& d0, int& d1, int& d2) const;
 
     /// First voxel of slice `k`, and the bytes from voxel to voxel in a row and from row to row. Other orientations
@@ -58,7 +61,9 @@ public:
     /// orientations than 0, 1 and 2 do nothing.
     void putSlice(int orientation, int k, const KpRawData2D& slice);
 
+    /// Voxels along x, y and z.
     const std::int32_t* dims() const { return dims_; }
+    /// Size of a voxel.
     int bytesPerVoxel() const { return bytesPerVoxel_; }
     /// The first voxel; a view hands out its memory for writing, too.
     void* data() const { return data_; }

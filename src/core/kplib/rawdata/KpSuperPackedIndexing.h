@@ -6,8 +6,8 @@
 /// Dense numbers for a sparse set of flagged positions, as KpPackedIndexing, but from run lengths and growing at its
 /// end: one byte a run, and two bytes and two longs at most for each block of 255 positions.
 ///
-/// Exhausted memory is a KpMemoryException, after which the index is good for destruction only. One thread at a time
-/// may append, or any number read.
+/// Exhausted memory is a KpMemoryException, after which only the destructor may follow. One thread
+/// at a time may append, or any number read.
 class KPLIB_API KpSuperPackedIndexing {
 public:
     /// Not 256, so that a run, which never crosses the end of a block, fits one byte.
@@ -28,7 +28,9 @@ public:
     const KpDArray<long>& blockStarts() const { return blockStarts_; }
     /// Lengths of runs, unflagged and flagged ones by turns; 0 where two of one kind meet.
     const KpDArray<unsigned char>& runs() const { return runs_; }
+    /// Number of flagged positions.
     long nFlagged() const { return nFlagged_; }
+    /// Number of positions.
     long nPositions() const { return nPositions_; }
     /// What the last run consists of; 1 as long as there is none.
     unsigned char currentValue() const { return currentValue_; }

@@ -13,6 +13,8 @@ public:
 
     // Each constructor does what the init() of its arguments does.
 
+    /// @{
+    /// As init().
     KpTypedData2D(int w, int h, KpPrimType type, int nDataVar) { init(w, h, type, nDataVar); }
     KpTypedData2D(int w, int h, KpTypedPointer p, int nDataVar) { init(w, h, p, nDataVar); }
     KpTypedData2D(const int* dims, KpTypedPointer p, int nDataVar) { init(dims, p, nDataVar); }
@@ -20,6 +22,9 @@ public:
     {
         init(w, h, ignored, rowStride, p, nDataVar);
     }
+    /// As the assignment.
+    /// @}
+
     KpTypedData2D(const KpTypedData2D& other) = default;
 
     /// As that of KpRawData2D.
@@ -29,13 +34,15 @@ public:
     void init(int w, int h, KpPrimType type, int nDataVar);
     /// A view on pixels without gaps.
     void init(int w, int h, KpTypedPointer p, int nDataVar);
+    /// As above, with width and height in an array.
     void init(const int* dims, KpTypedPointer p, int nDataVar) { init(dims[0], dims[1], p, nDataVar); }
-    /// A view with gaps between rows, `rowStride` in bytes. The third number is ignored: nobody may tell another size
-    /// of a pixel than type and components give.
+    /// A view with gaps between rows, `rowStride` in bytes. The third number is ignored: the size
+    /// of a pixel always follows from type and components.
     void init(int w, int h, int ignored, int rowStride, KpTypedPointer p, int nDataVar);
 
     /// Components a pixel.
     int nDataVar() const { return nDataVar_; }
+    /// Type of the components.
     KpPrimType primType() const { return primType_; }
 
 private:

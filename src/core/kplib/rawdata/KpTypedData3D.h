@@ -5,17 +5,20 @@
 
 #include <cstdint>
 
-/// A KpRawData3D whose voxels are a number of components of one element type. The size of a voxel follows from the two.
-/// It cannot be copied either.
+/// A KpRawData3D whose voxels are a number of components of one element type. The size of a voxel
+/// follows from the two. It cannot be copied.
 class KPLIB_API KpTypedData3D : public KpRawData3D {
 public:
     /// Empty: no components, of bytes.
     KpTypedData3D() = default;
     /// As init().
     KpTypedData3D(int nx, int ny, int nz, KpPrimType type, int nDataVar) { init(nx, ny, nz, type, nDataVar); }
+    /// @{
+    /// As init().
     KpTypedData3D(const int* dims, KpPrimType type, int nDataVar) { init(dims[0], dims[1], dims[2], type, nDataVar); }
     KpTypedData3D(int nx, int ny, int nz, KpTypedPointer p, int nDataVar) { init(nx, ny, nz, p, nDataVar); }
     KpTypedData3D(const int* dims, KpTypedPointer p, int nDataVar) { init(dims[0], dims[1], dims[2], p, nDataVar); }
+    /// @}
 
     /// An owner of voxels that are not set to anything.
     void init(int nx, int ny, int nz, KpPrimType type, int nDataVar);
@@ -28,6 +31,7 @@ public:
 
     /// Components a voxel.
     int nDataVar() const { return nDataVar_; }
+    /// Type of the components.
     KpPrimType primType() const { return primType_; }
 
 private:

@@ -7,11 +7,12 @@
 
 /// A short vector of components of one type that lie elsewhere: it owns nothing, and copies of it share them.
 ///
-/// Complex, string, uint and sbyte components are carried, but not computed with. No lock: what it points at is guarded
-/// by the owner of the buffer.
+/// Complex, string, uint and sbyte components are carried, but not computed with. No lock: the
+/// owner of the buffer guards the memory.
 class KPLIB_API KpTypedElement {
 public:
     KpTypedElement() = default;
+    /// The `count` components that start at an address.
     KpTypedElement(KpTypedPointer components, std::int32_t count) :
         data_(components.data), type_(components.type), n_(count)
     {
@@ -20,14 +21,18 @@ public:
     /// Adds or subtracts component by component in the arithmetic of this element's type: integers wrap. Type and count
     /// of `other` are taken to be this one's, unchecked. A type that isn't a number: nothing happens.
     KpTypedElement& operator+=(const KpTypedElement& other);
+    /// As above.
     KpTypedElement& operator-=(const KpTypedElement& other);
 
     /// Square root of the sum of the squares, in double and in the order of the components; 0 without components and
     /// for a type that isn't a number.
     double length() const;
 
+    /// The first component.
     void* data() const { return data_; }
+    /// Type of the components.
     KpPrimType type() const { return type_; }
+    /// Number of components.
     std::int32_t n() const { return n_; }
 
 private:

@@ -15,16 +15,18 @@
 #include <cstddef>
 #include <cstdint>
 
-/// A volume in memory: sizes, element type, components, strides and the memory itself. Goes around as
-/// KpHandle<TmDataAccess>.
+/// A volume in memory: sizes, element type, components, strides and the memory itself. It is
+/// passed as KpHandle<TmDataAccess>.
 ///
-/// The memory is one block (linear; strides()[2] is above 0) or one block a slice (sliced; strides()[2] is 0). Voxel
-/// (x, y, z) lies at its slice's address + x * strides()[0] + y * strides()[1], in bytes. The object gives its blocks
-/// back through its allocator; with an allocator that frees nothing it is a view, which is valid as long as the memory
-/// is. Coordinates are never checked. Handles may be copied and dropped on any thread; all else has no lock: the fields
-/// of a lock on a region are only kept here, what they mean is up to their users.
+/// The memory is one block (linear; strides()[2] is above 0) or one block a slice (sliced;
+/// strides()[2] is 0). Voxel (x, y, z) lies at its slice's address + x * strides()[0] + y *
+/// strides()[1], in bytes. The object frees its blocks through its allocator; with an allocator
+/// that frees nothing it is a view, which is valid as long as the memory is. Coordinates are never
+/// checked. Handles may be copied and dropped on any thread; all else has no lock: the fields of a
+/// lock on a region are only stored here; their users define what they mean.
 class KPLIB_API TmDataAccess : public KpHandableThreaded {
 public:
+    /// Runs first in the destructor; `data` is that of setDeleteCallback().
     using DeleteCallback = void (*)(TmDataAccess* object, void* data);
 
     /// Empty: all sizes are 0; frees with free().
@@ -37,6 +39,7 @@ public:
     /// Over one block, or without data if it is null. What `allocator` frees is the object's from now on.
     TmDataAccess(const KpVec3l& dims, const KpVec3l& strides, void* data, KpPrimType type, int nDataVar,
                  KpAllocator allocator);
+    /// Without data.
     TmDataAccess(const KpVec3l& dims, const KpVec3l& strides, std::nullptr_t, KpPrimType type, int nDataVar,
                  KpAllocator allocator) :
         TmDataAccess(dims, strides, static_cast<void*>(nullptr), type, nDataVar, allocator)
@@ -51,28 +54,33 @@ public:
     /// Runs the delete callback, then dataRelease(). An exception out of either ends the process.
     ~TmDataAccess() override;
 
-    /// Gives the memory back and keeps the description.
+    /// Frees the memory and keeps the description.
     void dataRelease();
 
     /// What the destructor runs first; null for nothing.
     void setDeleteCallback(DeleteCallback callback, void* data);
     void setPrimType(KpPrimType type) { primType_ = type; }  ///< converts nothing
+    /// Replaces what dataRelease() frees with.
     void setAllocator(KpAllocator allocator) { allocator_ = allocator; }
 
     /// Voxels along x, y and z.
     KpVec3l dims() const { return dims_; }
+    /// Type of the components.
     KpPrimType primType() const { return primType_; }
     /// Components a voxel.
     int nDataVar() const { return nDataVar_; }
     /// Bytes from one voxel to the next along x, y and z.
     KpVec3l strides() const { return strides_; }
+    /// What dataRelease() frees with.
     KpAllocator allocator() const { return allocator_; }
 
     /// Bytes of all voxels, without gaps; the largest number where that is out of range.
     long size() const;
     /// Whether sizes, strides and the number of blocks go together.
     bool isValid() const;
+    /// Whether the memory is one block.
     bool isLinear() const { return strides_[2] > 0; }
+    /// Whether there is memory.
     bool hasData() const { return dataPtrs_.size() > 0; }
     /// Whether there are no gaps between voxels, rows and slices; never for sliced data.
     bool isContiguous() const;
@@ -98,12 +106,14 @@ public:
     template <typename Run>
     void eachVoxelRun(Run run) const;
 
-    /// Makes `out` a view on the voxels of `box`, both bounds inside; null without data. The bounds are not checked,
-    /// and the view doesn't keep this object alive. One slice of sliced data gives a linear view.
+    /// Makes `out` a view on the voxels of `box`, both bounds inside; null without data. The
+    /// bounds are not checked, and the view does not keep this object alive. One slice of sliced
+    /// data gives a linear view.
     void subBox(KpHandle<TmDataAccess>& out, const KpBox3i& box) const;
 
-    /// Makes `out` a copy whose memory comes from malloc, whatever `allocator` says; that is meant. Fails, with `out`
-    /// null, if the data aren't contiguous, and, with `out` a copy without data, if there is no memory.
+    /// Makes `out` a copy whose memory comes from malloc, whatever `allocator` is. Fails, with
+    /// `out` null, if the data aren't contiguous, and, with `out` a copy without data, if there is
+    /// no memory.
     KpResult clone(KpHandle<TmDataAccess>& out, KpAllocator allocator) const;
 
     // A line of voxels, along the first axis of which the coordinate is -1, or along z if that of neither x nor y is.
@@ -122,17 +132,23 @@ public:
 
     // The lock that a thread holds on a region.
 
+    /// Sets the holder, 0 for none.
     void setLockerThreadId(unsigned long id) { lockerThreadId_ = id; }
     /// 0 for none.
     unsigned long lockerThreadId() const { return lockerThreadId_; }
     /// Makes the calling thread the holder.
     void moveToCurrentThread();
+    /// Whether the holder may write.
     bool isLockedWritable() const { return lockedWritable_; }
+    /// Sets that flag.
     void lockWritable(bool on) { lockedWritable_ = on; }
+    /// Whether the memory is being filled.
     bool isMapDataToMemoryInProgress() const { return mapDataToMemoryInProgress_; }
+    /// Sets that flag.
     void setMapDataToMemoryInProgress(bool on) { mapDataToMemoryInProgress_ = on; }
     /// Empty at first.
     const KpBox3i& lockedROI() const { return lockedROI_; }
+    /// Sets the locked region.
     void setLockedROI(const KpBox3i& box) { lockedROI_ = box; }
 
 private:

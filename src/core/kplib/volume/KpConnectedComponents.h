@@ -18,8 +18,10 @@
 /// or a multiple of 64 voxels; rows below 8 voxels need none. Exhausted memory is a KpMemoryException.
 class KPLIB_API KpConnectedComponents {
 public:
+    /// What the table holds of a component.
     struct KPLIB_API Component {
         int id = 0;  ///< its own index, or that of the entry it is an alias of
+        /// Number of its voxels.
         unsigned nVoxels = 0;
         unsigned nSeeds = 0;       ///< voxels at or above the upper threshold; of labels, the value of the region
         float sum[3] = {0, 0, 0};  ///< of the voxels' x, y and z, one added after the other; over nVoxels: the centre
@@ -33,17 +35,19 @@ public:
     template <typename L>
     static constexpr int maxComponents = sizeof(L) == 2 ? 64999 : 9999999;
 
-    /// Regions of voxels at or above `low` (NaN counts as that), with the count of those at or above `high` as seeds.
-    /// For integers both are rounded, and cut to the element type. If `labels` is null, it gets an image of kpmalloc,
-    /// which the caller then owns, whatever the result; labels may take the place of unsigned shorts of `data`.
-    /// `components` may be null. Returns the number of components; -1 with an error in the log, if the elements aren't
-    /// numbers or there are too many components (the labels are half done then).
+    /// Regions of voxels at or above `low` (NaN counts as that), with the count of those at or
+    /// above `high` as seeds. For integers both are rounded, and cut to the element type. If
+    /// `labels` is null, it gets an image of kpmalloc, which the caller then owns, whatever the
+    /// result; labels may take the place of unsigned shorts of `data`. `components` may be null.
+    /// Returns the number of components; -1 with an error in the log, if the elements are not
+    /// numbers or there are too many components (the labels are incomplete then).
     static int labelCC(KpTypedPointer data, const int* dims, int neighbours, unsigned short*& labels, int, double low,
                        double high, int, int, KpDArray<Component>* components);
 
     /// Regions of equal value in an image of labels, those of value 0 among them. Returns as labelCC().
     static int labelLabels(unsigned char* data, const int* dims, int neighbours, unsigned short* labels, int, int,
                            KpDArray<Component>& components);
+    /// As above, for more components.
     static int labelLabelsHuge(unsigned char* data, const int* dims, int neighbours, int* labels, int, int,
                                KpDArray<Component>& components);
 
@@ -54,8 +58,9 @@ public:
     /// their offsets in elements. The arrays hold 13 at least.
     static void mknbtableprev(int neighbours, const int* dims, int& n, int* offsets, int (*deltas)[3]);
 
-    /// Adds a zeroed entry and returns its index. At the limit, aliases are cleaned out first, in the first `nLabelled`
-    /// labels too; if that makes no room, -1 with an error in the log. L is unsigned short or int.
+    /// Adds a zeroed entry and returns its index. At the limit, aliases are cleaned out first, in
+    /// the first `nLabelled` labels too; if that frees no entry, -1 with an error in the log. L is
+    /// unsigned short or int.
     template <typename L>
     static int addNewComponent(KpDArray<Component>& components, L* labels, int nLabelled);
 
@@ -65,9 +70,10 @@ public:
     static int cleanup_components(KpDArray<Component>& components, L* labels, int nLabelled, int minVoxels,
                                   int minSeeds);
 
-    /// The pass behind all: regions of voxels not below `low`, or, with `labelMode`, of equal value among them. T is
-    /// unsigned char, short, unsigned short, int, float or double with L unsigned short, or unsigned char with int.
-    /// Time is linear in the voxels; far less than a nanosecond is spent on one in the background.
+    /// The pass of all of these: regions of voxels not below `low`, or, with `labelMode`, of equal
+    /// value among them. T is unsigned char, short, unsigned short, int, float or double with L
+    /// unsigned short, or unsigned char with int. Time is linear in the voxels; far less than a
+    /// nanosecond is spent on one in the background.
     template <typename T, typename L>
     static int do_label(T* data, L* labels, KpDArray<Component>& components, T low, T high, const int* dims,
                         int neighbours, int labelMode);
@@ -81,6 +87,8 @@ public:
 /// Components are made by their constructor, so that an array has no uninitialised ones.
 template <>
 struct KpElementTraits<KpConnectedComponents::Component> {
+    /// Constructed, copied and destroyed one by one.
     static constexpr KpElementKind kind = KpElementKind::Managed;
+    /// May be moved as bytes.
     static constexpr bool movesAsBytes = true;
 };

@@ -26,34 +26,45 @@ public:
     /// `iterations` passes; none copies.
     static void dilation3D(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, unsigned int iterations,
                            bool fast);
+    /// @{
+    /// As above, with 18 or 26 neighbours.
     static void dilation3D_18(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, unsigned int iterations,
                               bool fast);
     static void dilation3D_26(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, unsigned int iterations,
                               bool fast);
+    /// @}
 
     /// `iterations` passes, at least one; less copies.
     static void erosion3D(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, int iterations, bool fast);
+    /// @{
+    /// As above, with 18 or 26 neighbours.
     static void erosion3D_18(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, int iterations, bool fast);
     static void erosion3D_26(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, int iterations, bool fast);
+    /// @}
 
     // One fast pass over a plane.
 
+    /// @{
+    /// With 4 or 8 neighbours.
     static void dilation2D_4(const KpBitfield& src, KpBitfield& dst, const KpVec2i& dims);
     static void erosion2D_4(const KpBitfield& src, KpBitfield& dst, const KpVec2i& dims);
     static void dilation2D_8(const KpBitfield& src, KpBitfield& dst, const KpVec2i& dims);
     static void erosion2D_8(const KpBitfield& src, KpBitfield& dst, const KpVec2i& dims);
+    /// @}
 
     /// Sets in `dst` what is connected with a seed by faces through voxels whose bit in `src` is `value`; gives the
     /// number of voxels filled. `dims` are three sizes.
     ///
-    /// What `dst` holds, resized first if it is of another size, counts as visited and stops the fill. A run along x
-    /// that is entered where `dst` is clear is filled as a rule from end to end, and visited voxels in it count again.
-    /// `box`, if not null, becomes xmin, xmax, ymin, ymax, zmin, zmax of what was filled and of all seeds, also those
-    /// outside or on a wrong value; without seeds it stays. If `src` isn't of the size that `dims` tell, or a size is
-    /// above 32768 (one error in the log), the result is 0 and nothing changes. Time grows with the number of runs.
+    /// What `dst` holds, resized first if it is of another size, counts as visited and stops the
+    /// fill. A run along x that is entered where `dst` is clear is filled as a rule from end to
+    /// end, and visited voxels in it count again. `box`, if not null, becomes xmin, xmax, ymin,
+    /// ymax, zmin, zmax of what was filled and of all seeds, also those outside or on a wrong
+    /// value; without seeds it stays. If `src` is not of the size of `dims`, or a size is above
+    /// 32768 (one error in the log), the result is 0 and nothing changes. Time grows with the
+    /// number of runs.
     static unsigned long floodfill(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpVec3i>& seeds, bool value,
                                    const int* dims, int* box);
 
-    /// Whether the operations on planes equal what each pixel's neighbours ask for, on a set of patterns.
+    /// Whether the operations on planes are right for each pixel of a set of patterns.
     static bool unitTest2D();
 };

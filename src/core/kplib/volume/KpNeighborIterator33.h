@@ -11,6 +11,7 @@
 /// bits. Once weights are set, any number of threads may read it.
 class KPLIB_API KpNeighborIterator33 {
 public:
+    /// Largest number of neighbours.
     static constexpr int maxNeighbors = 26;
 
     /// Which directions a neighbour lies in. A voxel at the volume's border has those bits set that lead outside; a
@@ -25,21 +26,27 @@ public:
     /// one in the middle unread; sorts by them unless `sort` is 0. Integers are kept as floats too, and floats as
     /// integers, cut off toward zero. chars are signed.
     void setWeights(const char* w, int sort);
+    /// @{
+    /// As above.
     void setWeights(const short* w, int sort);
     void setWeights(const int* w, int sort);
     void setWeights(const float* w, int sort);
+    /// @}
 
     /// Sorts all by ascending weight, by the integers rounded to float or by the floats, and gives the index of the
     /// first positive one; 26 if there is none.
     int sort_iweights();
+    /// As above, by the floats.
     int sort_fweights();
 
+    /// The number that the constructor got.
     int nNeighbors() const { return nNeighbors_; }
+    /// The three sizes that the constructor got.
     const int* dims() const { return dims_; }
     // One a neighbour, nNeighbors() of them.
-    const int* offsets() const { return offsets_; }  ///< in elements: dx + dy * dims[0] + dz * dims[0] * dims[1]
-    const int* iweights() const { return iweights_; }
-    const float* fweights() const { return fweights_; }
+    const int* offsets() const { return offsets_; }      ///< in elements: dx + dy * dims[0] + dz * dims[0] * dims[1]
+    const int* iweights() const { return iweights_; }    ///< weights as integers
+    const float* fweights() const { return fweights_; }  ///< weights as floats
     const std::int8_t (*deltas() const)[3] { return deltas_; }  ///< dx, dy, dz, each -1, 0 or 1
     const unsigned char* borders() const { return borders_; }   ///< of Border
 

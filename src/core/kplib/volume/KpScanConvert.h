@@ -10,19 +10,23 @@
 /// callback may render with another object.
 class KPLIB_API KpScanConvert {
 public:
+    /// Receives the pixels from `xLeft` to `xRight`, both included, of row `y`.
     using SpanCB = void (*)(void* userData, int xLeft, int xRight, int y);
+    /// Receives one pixel.
     using PixelCB = void (*)(void* userData, int x, int y);
 
     /// Reports pixels from (x0, y0) to (x1, y1), both included.
     KpScanConvert(int x0, int y0, int x1, int y1) : window_{x0, y0, x1, y1} {}
 
-    /// What gets each span, its ends included, in place of the pixel callback; and the first argument of both.
+    /// Sets the receiver of each span, its ends included, in place of the pixel callback; and the
+    /// first argument of both.
     void setSpanCB(SpanCB callback, void* userData)
     {
         spanCB_ = callback;
         userData_ = userData;
     }
-    /// What gets each pixel, from left to right, while no span callback is set; and the first argument of both.
+    /// Sets the receiver of each pixel, from left to right, used while no span callback is set;
+    /// and the first argument of both.
     void setPixelCB(PixelCB callback, void* userData)
     {
         pixelCB_ = callback;
@@ -34,9 +38,11 @@ public:
     /// std::bad_alloc.
     void render(int n, const KpVec2f* points);
 
-    /// The span callback at the start: hands the pixels on to the pixel callback of the object that renders.
+    /// The span callback at the start: passes the pixels to the pixel callback of the object that
+    /// renders.
     static void defaultSpanCB(void* userData, int xLeft, int xRight, int y);
-    /// Hands a span on to the span callback of the object that renders. Both do nothing if none does on this thread.
+    /// Passes a span to the span callback of the object that renders. Both do nothing if none does
+    /// on this thread.
     static void concaveCB(int y, int xLeft, int xRight);
 
 private:
