@@ -13,13 +13,15 @@ class HttpHead;
 
 /// Reads ranges of a file from an HTTP server, one after the other over a connection that stays open.
 ///
-/// Understands http:// only, and responses with a Content-Length; no redirects and no chunked transfer. A response of
-/// any status is delivered: look at status() where it matters. Nothing throws but exhausted memory, and nothing is
-/// logged: errorText() says what failed. After a failure the next request() connects anew.
+/// Understands http:// only, and responses with a Content-Length; no redirects and no chunked
+/// transfer. A response of any status is delivered: check status() where it matters. Only
+/// exhausted memory throws, and nothing is logged: errorText() describes a failure. After a
+/// failure the next request() connects anew.
 ///
 /// Belongs to one thread, but for cancel().
 class KPLIB_API KpHttpGet {
 public:
+    /// Where the request stands.
     enum State : int {
         NotConnected = 0,  ///< no request under way
         Failed = 1,        ///< the last operation failed
@@ -33,8 +35,9 @@ public:
     KpHttpGet& operator=(const KpHttpGet&) = delete;
     ~KpHttpGet();
 
-    /// Takes server and path from "http://HOST[:PORT][/PATH]". Closes the connection if the server is another one.
-    /// False for another scheme, which closes it too and forgets the host. request() calls this.
+    /// Takes server and path from "http://HOST[:PORT][/PATH]". Closes the connection if the server
+    /// is another one. False for another scheme, which closes it too and clears the host.
+    /// request() calls this.
     ///
     /// The first colon is taken for the port's, even one in the path: a URL with a colon there is not understood.
     bool setURL(const char* url);
@@ -45,12 +48,13 @@ public:
     /// of the response before is dropped, with its connection.
     bool request(const char* url, unsigned long first, unsigned long last);
 
-    /// Waits for the next `size` bytes of the body and gives their number, less only at its end; 0 behind the end. A
-    /// failure is -1, or the number of bytes that came before it (0 if the server closed), and then -1 in the next
-    /// call.
+    /// Waits for the next `size` bytes of the body and returns their number, less only at its end;
+    /// 0 after the end. A failure is -1, or the number of bytes that came before it (0 if the
+    /// server closed), and then -1 in the next call.
     long read(void* buffer, unsigned long size);
 
-    /// Length of the response's body, for which its head is waited for where that is still to come; 0 if that fails.
+    /// Length of the response's body, for which it waits for the head if necessary; 0 if that
+    /// fails.
     long long contentLength();
     /// Bytes of the body delivered so far.
     long long bytesRead() const { return bytesReadSoFar_; }
@@ -63,12 +67,17 @@ public:
     /// Waits for the head of the response. False in any state but RequestSent, or on failure. read() calls this.
     bool readResponse();
 
-    /// Closes the connection with `text` for the cause; null stands for what the system tells of its last error.
+    /// Closes the connection with `text` for the cause; null stands for the system's text of its
+    /// last error.
     void setError(const char* text);
 
+    /// Where the request stands.
     State state() const { return state_; }
+    /// The port of setURL(), 80 without one there.
     int port() const { return port_; }
+    /// The host of setURL().
     const std::string& host() const { return host_; }
+    /// The path of setURL().
     const std::string& path() const { return path_; }
     /// Of the last failure.
     const std::string& errorText() const { return errorText_; }

@@ -11,11 +11,13 @@ public:
 
     /// The first IPv4 address of a host, by name or dotted, in network byte order; 0 if there is none.
     static unsigned int getIPV4Address(const char* host);
+    /// As above.
     static unsigned int getIPV4Address(const KpString& host);
     /// That of this machine, by its name.
     static unsigned int getIPV4Address();
 
     /// The same as "192.0.2.1"; "0.0.0.0" if there is none.
     static KpString getIPV4AddressString(const KpString& host);
+    /// The same for this machine.
     static KpString getIPV4AddressString();
 };

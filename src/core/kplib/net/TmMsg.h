@@ -36,12 +36,13 @@ KPLIB_API void makeBools(unsigned char* bytes, long count);
 
 /// The byte buffer of the client/server protocol: written by appending with `<<`, read by moving an offset with `>>`.
 ///
-/// A message is a plain memory image: packed, in the host's byte order (little-endian), without tags, version or
-/// length. Who reads must do what the writer did, in its order. The two ends are independent: reading may follow
-/// writing. Counts on the wire have 32 bits; larger ones lose their upper bits. Peers are trusted: nothing tells that a
-/// message ended too early, but no read leaves the message. Past its end values are of zero bytes, text is null or
-/// empty, fields and views are empty. To read from a stranger, ask bytesAvailable() first. Exhausted memory is a
-/// KpMemoryException. One thread at a time.
+/// A message is a plain memory image: packed, in the host's byte order (little-endian), without
+/// tags, version or length. The reader must read the same types in the order in which they were
+/// written. The two ends are independent: reading may follow writing. Counts on the wire have 32
+/// bits; larger ones lose their upper bits. A truncated message is not reported, but no read
+/// leaves the message: past its end values are of zero bytes, text is null or empty, fields and
+/// views are empty. Check bytesAvailable() before reading data from an untrusted peer. Exhausted
+/// memory is a KpMemoryException. One thread at a time.
 class KPLIB_API TmMsg {
 public:
     /// Empty; takes no memory.
@@ -58,16 +59,22 @@ public:
     /// Exchanges the storage of two messages, without copying; the read offsets stay.
     void take(TmMsg& other);
 
-    /// Makes this a message over bytes of the caller, as the constructor does. Bytes that the message owned are not
-    /// freed: they are the caller's, who has their address from dataPtr(). That is meant. What is appended doesn't go
-    /// into the caller's bytes: the message goes on with a copy of its own.
+    /// Makes this a message over bytes of the caller, as the constructor does. Bytes that the
+    /// message owned are not freed: the caller, which has their address from dataPtr(), owns them
+    /// from then on. Appending does not change the caller's bytes: the message continues with a
+    /// copy of its own.
     void setRawData(unsigned long size, unsigned char* data);
 
     /// Equal bytes, and read up to the same offset.
     bool operator==(const TmMsg& other) const;
 
+    /// @{
+    /// The bytes of the message, valid until it is written to; null if it has none.
     unsigned char* dataPtr() { return buffer_.data(); }
     const unsigned char* dataPtr() const { return buffer_.data(); }
+    /// Number of bytes.
+    /// @}
+
     unsigned long size() const { return static_cast<unsigned long>(buffer_.size()); }
     /// The next byte to read; after a failed array it may lie past the end.
     unsigned long readOffset() const { return readOffset_; }
@@ -105,13 +112,14 @@ public:
     /// Whether `count` more bytes can be read.
     bool holds(unsigned long count) const { return readOffset_ <= size() && count <= size() - readOffset_; }
 
-    /// Two marks, 0 and 1, for the protocol that uses the messages: unset at first, copied by the copy constructor
-    /// alone, and without meaning here.
+    /// Two marks, 0 and 1, for the protocol that uses the messages: unset at first and copied by
+    /// the copy constructor only. This class does not interpret them.
     bool isMarked(int mark) const { return (marks_ >> mark & 1) != 0; }
+    /// Sets or clears a mark.
     void setMarked(int mark, bool on);
 
-    /// Writes "TmMsg" to the log: once if there is a title, and twice more. Neither the title nor the bytes show, and
-    /// that is meant.
+    /// Writes "TmMsg" to the log: once if there is a title, and twice more. Neither the title nor
+    /// the bytes are shown.
     void print(const char* title) const;
 
 private:
@@ -236,8 +244,9 @@ KPLIB_API TmMsg& operator<<(TmMsg& msg, TmDataAccess const* const& object);
 /// impossible; no memory is requested then.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, TmDataAccess*& object);
 
-/// Sixteen bytes that aren't looked at when they are read, and all bytes of `inner` as an array. How far `inner` was
-/// read doesn't travel: reading starts at its first byte. If the message holds fewer bytes than announced, that is one
-/// error line in the log, and `inner` has the announced size with bytes of 0.
+/// Sixteen bytes that are ignored when they are read, and all bytes of `inner` as an array. The
+/// read offset of `inner` is not sent: reading starts at its first byte. If the message holds
+/// fewer bytes than announced, that is one error line in the log, and `inner` has the announced
+/// size with bytes of 0.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const TmMsg& inner);
 KPLIB_API TmMsg& operator>>(TmMsg& msg, TmMsg& inner);

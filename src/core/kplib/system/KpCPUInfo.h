@@ -4,9 +4,10 @@
 
 #include <cstdint>
 
-/// The machine's processors: counts and features. Read once on first use; any thread may ask.
+/// The machine's processors: counts and features. Read once on first use. Any thread may call it.
 class KPLIB_API KpCPUInfo {
 public:
+    /// Bits of detectCPUFeatures(), each named after an extension of the x86 instruction set.
     enum Feature : unsigned {
         MMX = 1,
         MMXExtensions = 2,
@@ -22,19 +23,23 @@ public:
         AVX = 8192,
     };
 
+    /// The machine's processors, read by the first call.
     static const KpCPUInfo& instance();
 
     /// Whether the counts were read from the system; else each is 1.
     bool cpuInfoSucceed() const { return succeeded_; }
     /// Packages, cores of a package, logical processors of a core.
     int getCPUCount() const { return cpuCount_; }
+    /// As above.
     int getCoreCount() const { return coreCount_; }
+    /// As above.
     int getLPUCount() const { return lpuCount_; }
 
     /// Whether the processor has the CPUID instruction.
     bool hasCPUID() const;
     /// The highest function of CPUID, and of its extended ones.
     unsigned getMaxCPUIDFunc() const;
+    /// As above.
     unsigned getMaxCPUIDExtFunc() const;
     /// The features as a mask of Feature.
     unsigned detectCPUFeatures() const;

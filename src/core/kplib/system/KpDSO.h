@@ -20,7 +20,7 @@ public:
     /// Other than 0 for more lines in the log.
     static int verbose;
 
-    /// Opens `name`, if it isn't null; isOpen() tells whether that worked.
+    /// Opens `name` unless it is null; check isOpen() for success.
     explicit KpDSO(const char* name);
     KpDSO(const KpDSO&) = delete;
     KpDSO& operator=(const KpDSO&) = delete;
@@ -31,13 +31,14 @@ public:
     /// being the file's name without "lib" and what follows its last dot. 0, or -1 with a line in the log unless
     /// `quiet`.
     int open(const char* name, bool quiet);
-    /// Forgets the object, which stays loaded.
+    /// Closes the object, which stays loaded.
     void close();
+    /// Whether an object is open.
     bool isOpen() const;
 
     /// Makes "libNAME.so" of a bare NAME, and leaves what has a dot.
     static void fixPath(KpFilename& name);
-    /// Loads the file `path`; 0, or -1. Either way `message` tells.
+    /// Loads the file `path`; 0, or -1. `message` receives the outcome in words.
     int tryOpen(const char* path, KpString& message);
 
     /// The address of a symbol, also if it has a '_' in front there; null if there is none or nothing is open.
@@ -46,16 +47,19 @@ public:
     // Call a function of the object with zero to five pointers. Without an object or such a symbol nothing is called,
     // and the result is 0.
 
+    /// Calls a function without a result.
     template <std::convertible_to<void*>... Arguments>
     requires(sizeof...(Arguments) <= 5) void execute(const char* name, Arguments... arguments) const
     {
         call<void>(name, static_cast<void*>(arguments)...);
     }
+    /// Calls a function that returns an int.
     template <std::convertible_to<void*>... Arguments>
     requires(sizeof...(Arguments) <= 5) int executeInt(const char* name, Arguments... arguments) const
     {
         return call<int>(name, static_cast<void*>(arguments)...);
     }
+    /// Calls a function that returns a pointer.
     template <std::convertible_to<void*>... Arguments>
     requires(sizeof...(Arguments) <= 5) void* executePtr(const char* name, Arguments... arguments) const
     {

@@ -5,8 +5,8 @@
 
 class KpTable;
 
-/// A small relational store in memory: tables whose rows point at each other, and stay right when rows move. See
-/// KpTable. One thread at a time.
+/// A small relational store in memory: tables whose rows point to each other; the pointers are
+/// updated when rows move. See KpTable. One thread at a time.
 class KPLIB_API KpDataBase {
 public:
     KpDataBase() = default;
@@ -19,16 +19,20 @@ public:
     int createTable();
     /// The table of an id, owned by the database; null if there is none.
     KpTable* table(int tableId) const;
+    /// All tables in the order of their making.
     const KpDArray<KpTable*>& tables() const { return tables_; }
 
-    /// Whether all tables hold together; true while skipCheck() is raised.
+    /// Whether all tables are consistent; true while skipCheck() is in effect.
     bool check() const;
+    /// Makes check() return true; may be nested.
     void skipCheck() { ++skipCheck_; }
+    /// Ends one skipCheck().
     void unskipCheck() { --skipCheck_; }
+    /// Whether a skipCheck() is not ended yet.
     bool isCheckSkipped() const { return skipCheck_ > 0; }
 
-    /// Copies all tables into an empty database, with their ids, where rows and relations lead to the copies. Client
-    /// variables that follow the rows stay with this one.
+    /// Copies all tables into an empty database, with their ids; rows and relations there point to
+    /// the copies. Client variables that follow the rows stay with this database.
     void clone(KpDataBase& target) const;
 
 private:

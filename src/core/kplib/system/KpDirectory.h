@@ -8,11 +8,12 @@
 
 /// Lists, copies and measures folders.
 ///
-/// `pattern` is for kpWildMatch(). With one, names that begin with a dot are left out; without (null), only "." and
-/// "..". A link to a folder is no folder here. A folder that can't be opened, or not read to its end, is a line in the
-/// log.
+/// `pattern` is for kpWildMatch(). With one, names that begin with a dot are left out; without
+/// (null), only "." and "..". A link to a folder is no folder here. A folder that cannot be opened
+/// or read to its end is a line in the log.
 class KPLIB_API KpDirectory {
 public:
+    /// A directory entry with its times.
     struct FileInfo {
         KpString name;                        ///< without its folder
         unsigned long long creationTime;      ///< of the last change of status, 100 ns since 1601-01-01, to the second
@@ -26,8 +27,9 @@ public:
     /// The same with files and folders apart; false for -1.
     static bool scanSortedByName(const char* dir, KpDArray<KpString>& files, KpDArray<KpString>& directories,
                                  const char* pattern = nullptr);
-    /// The names in `dir` and their times, in place of the content, sorted by name; those that can't be asked are left
-    /// out. Gives their number, 0 for a folder that can't be opened; of one that can't be read to its end those before.
+    /// The names in `dir` and their times, in place of the content, sorted by name; those whose
+    /// times cannot be read are left out. Returns their number, 0 for a folder that cannot be
+    /// opened; if a folder cannot be read to its end, the entries before the failure.
     static long scan(const char* dir, std::vector<FileInfo>& out, const char* pattern = nullptr,
                      bool onlyDirectories = false);
     /// As scan(), sorted by creationTime, the oldest first; `times`, if not null, receives it.

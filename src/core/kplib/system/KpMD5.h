@@ -23,10 +23,16 @@ public:
     /// Null.
     constexpr MD5() = default;
 
+    /// @{
+    /// The 16 bytes.
     constexpr unsigned char* data() { return bytes_.data(); }
     constexpr const unsigned char* data() const { return bytes_.data(); }
+    /// The bytes as two numbers.
+    /// @}
+
     constexpr Words words() const { return std::bit_cast<Words>(bytes_); }
 
+    /// Whether all bytes are zero.
     constexpr bool isNull() const { return *this == MD5(); }
 
     /// 32 upper-case hexadecimal digits, for the null value an empty text.
@@ -40,6 +46,7 @@ public:
         return a.words() < b.words() ? -1 : b.words() < a.words() ? 1 : 0;
     }
 
+    /// Whether all bytes are equal.
     friend constexpr bool operator==(const MD5& a, const MD5& b) { return a.words() == b.words(); }
 
 private:
@@ -56,9 +63,11 @@ constexpr unsigned int kp_hash(const MD5& digest)
 
 }  // namespace KpLib
 
-using KpLib::kp_hash;  // beside the other hashes, for who names the global one
+using KpLib::kp_hash;  // beside the other hashes, for callers that name the global one
 
+/// The first word.
 template <>
 struct std::hash<KpLib::MD5> {
+    /// The first word.
     std::size_t operator()(const KpLib::MD5& digest) const { return digest.words()[0]; }
 };

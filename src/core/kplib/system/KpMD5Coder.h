@@ -30,11 +30,15 @@ public:
     /// The list's hash().
     MD5Coder& operator<<(const MD5List& list);
 
-    // A text is led by its length in 8 bytes. KpString counts its terminator and feeds it, std::string does not: the
-    // same text has another digest from each, and that is to stay.
+    // A text is led by its length in 8 bytes. KpString counts its terminator and feeds it,
+    // std::string does not: so the same text gives two digests. Stored digests depend on this.
 
+    /// @{
+    /// Takes the length and the characters.
     MD5Coder& operator<<(const KpString& text);
     MD5Coder& operator<<(const std::string& text);
+    /// @}
+
     /// As the KpString made of it.
     MD5Coder& operator<<(const char* text);
 

@@ -13,14 +13,16 @@ public:
     /// With `sorted`, two lists of the same digests have the same hash, however they were filled.
     explicit MD5List(bool sorted = false) : sorted_(sorted) {}
 
-    /// Appends, or puts the digest behind the last that is not greater.
+    /// Appends, or inserts the digest after the last one that is not greater.
     void insert(const MD5& digest);
 
     /// MD5 over the digests from the last to the first, a direction that is part of the result; computed once after
     /// each change.
     MD5 hash() const;
 
+    /// Whether insert() keeps the order.
     bool isSorted() const { return sorted_; }
+    /// The digests.
     const KpDArray<MD5>& items() const { return items_; }
 
 private:

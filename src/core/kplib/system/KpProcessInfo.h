@@ -6,13 +6,18 @@
 /// is false and all numbers are 0.
 class KPLIB_API KpProcessInfo {
 public:
+    /// Asks for the process with that id.
     explicit KpProcessInfo(long long pid);
 
+    /// Whether there are figures.
     bool found() const { return found_; }
+    /// @{
+    /// A figure in bytes, 0 if unknown.
     long long workingSetSize() const { return workingSetSize_; }
     long long peakWorkingSetSize() const { return peakWorkingSetSize_; }
     long long pagefileUsage() const { return pagefileUsage_; }
     long long peakPagefileUsage() const { return peakPagefileUsage_; }
+    /// @}
 
     /// One line in the log, if found().
     void log() const;

@@ -4,11 +4,13 @@
 #include <kplib/foundation/KpExport.h>
 #include <kplib/foundation/KpString.h>
 
-/// The machine's memory and processes, asked anew at each call.
+/// The machine's memory and processes, read anew by each call.
 class KPLIB_API KpSysInfo {
 public:
+    /// A running process.
     struct ProcessEntry {
         KpString name;  ///< the first word of the command
+        /// Its number.
         long long processId = 0;
         KpString command;  ///< the same text
     };
@@ -19,8 +21,9 @@ public:
     static unsigned int physmem_available();
     /// Both are the total physical memory.
     static unsigned long long virtualmem_total() { return physmem_total(); }
+    /// As above.
     static unsigned long long virtualmem_available() { return physmem_total(); }
 
-    /// All processes, in place of the content, by the command "ps"; false if it can't be started.
+    /// All processes, in place of the content, by the command "ps"; false if it cannot be started.
     static bool process_list(KpDArray<ProcessEntry>& list);
 };

@@ -24,12 +24,15 @@ class KpDataBase;
 /// Positions, rows and offsets are not checked unless said so. One thread at a time for a whole database.
 class KPLIB_API KpTable {
 public:
+    /// What a column holds.
     enum ColumnType : int {
         Plain = 0,       ///< client data of a given size
         RowPointer = 1,  ///< 8 bytes: a row of the column's table, or null
         Relation = 2,    ///< 16 bytes: the first and the last cell of a list of rows of the column's table
     };
+    /// Largest number of columns.
     static constexpr int maxColumns = 16;
+    /// Relations start before this byte of a row.
     static constexpr int maxRelationOffset = 512;
 
     /// No rows, and the first column. KpDataBase::createTable() is the usual way.
@@ -38,14 +41,19 @@ public:
     KpTable(const KpTable&) = delete;
     KpTable& operator=(const KpTable&) = delete;
 
+    /// The id in the database.
     int tableId() const { return tableId_; }
+    /// A name for the client, empty at first.
     const KpString& name() const { return name_; }
+    /// Sets the name.
     void setName(const KpString& name) { name_ = name; }
 
-    /// Adds a column to all rows, its bytes zero there, unless there is one of this id (0 to 15). `size` is that of a
-    /// plain column, `target` the table that the others point to. The index of the column, or -1, with a line in the
-    /// log, for one that the row form has no place for. Moves the rows.
+    /// Adds a column to all rows, its bytes zero there, unless there is one of this id (0 to 15).
+    /// `size` is that of a plain column, `target` the table that the others point to. The index of
+    /// the column, or -1, with a line in the log, for one that does not fit into the row form.
+    /// Moves the rows.
     int columnAdd(int columnId, ColumnType type, int size, KpTable* target);
+    /// Number of columns, the table's own included.
     int columnCount() const { return columnCount_; }
     /// Byte offset of a column in a row, -1 for an id that isn't used.
     int columnOffset(int columnId) const { return isColumnId(columnId) ? offsetById_[columnId] : -1; }
@@ -55,15 +63,15 @@ public:
     /// A new row, its client bytes zero, in constant time on average; may move the rows. Null, with a line in the log,
     /// while there is no client column.
     char* rowAdd();
-    /// Empties the row's relations and gives the row back for rowAdd(). What points to it is the caller's to clear
-    /// before. False for what isn't a row in use.
+    /// Empties the row's relations and frees the row for rowAdd(). The caller clears all pointers
+    /// to it first. False if `row` is not a row in use.
     bool rowDel(char* row);
     /// The rows in use.
     long rowCount() const { return rowsInBlock() - freeRows_.size(); }
     /// The rows in use in the order of the block: rowNext(null) is the first, null ends it.
     char* rowNext(char* row) const;
-    /// The first row in use behind `row` (null: of all) whose column of this id holds the bytes at `value`; null for
-    /// none.
+    /// The first row in use after `row` (null: of all) whose column of this id holds the bytes at
+    /// `value`; null for none.
     char* rowFind(int columnId, const void* value, char* row = nullptr) const;
     /// Makes room, so that `rows` more can be added without a move. Gives by how many bytes the rows moved.
     long rowReserve(int rows);
@@ -75,6 +83,7 @@ public:
 
     /// The row that a row-pointer column at `offset` holds.
     static char* pointer(const char* row, int offset);
+    /// Sets that row.
     static void pointerSet(char* row, int offset, char* target);
 
     // Relations: `offset` is that of a relation column. A cell is two pointers: its target and the next cell.
@@ -83,38 +92,52 @@ public:
     void relationAdd(char* row, int offset, char* target);
     /// Takes the first cell that points to `target` out of the list, if there is one. O(length).
     void relationDel(char* row, int offset, char* target);
+    /// Empties the list.
     void relationRemoveAll(char* row, int offset);
+    /// Length of the list. O(length).
     static int relationGetCount(const char* row, int offset);
     /// Makes room, so that `cells` more can be added without a move.
     void relationReserve(int cells, int offset);
-    /// Walks a list: the first cell, the one behind a cell, and the row a cell points to; null ends it.
+    /// Walks a list: the first cell, the one after a cell, and the row a cell points to; null ends
+    /// it.
     static char** relationFirst(const char* row, int offset);
+    /// @{
+    /// As above.
     static char** relationNext(char** cell) { return reinterpret_cast<char**>(cell[1]); }
     static char* relationTarget(char** cell) { return cell[0]; }
+    /// @}
 
     /// Drops all rows and relations; the columns stay.
     void clear();
 
-    /// Whether everything the table knows of itself holds together, which is true while skipCheck() of it or of its
-    /// database is raised. O(rows and cells).
+    /// Whether the table is consistent; true while skipCheck() of it or of its database is in
+    /// effect. O(rows and cells).
     bool check() const;
     /// Whether `row` is null or a row of the block, in use or not.
     bool checkRowPointer(const char* row) const;
+    /// Makes check() return true; may be nested.
     void skipCheck() { ++skipCheck_; }
+    /// Ends one skipCheck().
     void unskipCheck() { --skipCheck_; }
 
-    // Counters for clients that agree among themselves not to change what is locked; the table doesn't ask them.
+    // Counters for clients that agree among themselves not to change locked data; the table itself
+    // ignores them.
 
+    /// Raises the counter of the rows.
     void lockRows() { ++rowLocks_; }
+    /// Lowers it.
     void unlockRows() { --rowLocks_; }
+    /// The counter of the rows.
     int rowLocks() const { return rowLocks_; }
-    /// Raises or lowers the counter of the column at `offset` and gives the column's index. An unknown offset gives -1
-    /// and raises the counter of skipCheck() in its place, with either; that is meant.
+    /// Raises or lowers the counter of the column at `offset` and gives the column's index. An
+    /// unknown offset gives -1 and raises the counter of skipCheck() in its place, with either
+    /// function.
     int lockRelation(int offset) { return changeRelationLock(offset, 1); }
+    /// As above.
     int unlockRelation(int offset) { return changeRelationLock(offset, -1); }
 
-    /// Copies rows, columns and relations into an empty table, where pointers to rows still lead to the old ones:
-    /// KpDataBase::clone() puts those right.
+    /// Copies rows, columns and relations into an empty table, whose pointers to rows still point
+    /// to the old ones: KpDataBase::clone() corrects them.
     void clone(KpTable& target) const;
 
 private:

@@ -10,19 +10,22 @@
 #include <functional>
 #include <type_traits>
 
-/// A random identifier of 128 bits: 16 bytes and nothing else, all zero when not set. A plain value; KpID_C<KpUUID>
-/// makes an identifier of it that tells whether it is valid.
+/// A random identifier of 128 bits: 16 bytes and nothing else, all zero when not set. A plain
+/// value; KpID_C<KpUUID> is an identifier made of it, with isValid().
 class KPLIB_API KpUUID {
 public:
     /// Zero.
     constexpr KpUUID() = default;
 
-    /// 16 bytes of "/dev/urandom", with no bits set for a version or variant; zero if they can't be read. Safe from any
-    /// thread.
+    /// 16 bytes of "/dev/urandom", with no bits set for a version or variant; zero if they cannot
+    /// be read. Safe from any thread.
     static KpUUID generateUUID();
 
+    /// @{
+    /// The 16 bytes.
     constexpr unsigned char* data() { return bytes_.data(); }
     constexpr const unsigned char* data() const { return bytes_.data(); }
+    /// @}
 
     /// 32 upper-case hexadecimal digits.
     KpString toString() const;
@@ -35,6 +38,7 @@ public:
     /// them are not checked.
     void fromFormattedString(const KpString& text);
 
+    /// Whether all bytes are equal.
     friend constexpr bool operator==(const KpUUID& a, const KpUUID& b) = default;
 
 private:
@@ -49,7 +53,9 @@ constexpr unsigned int kp_hash(const KpUUID& uuid)
     return std::bit_cast<std::array<std::uint32_t, 4>>(uuid)[3];
 }
 
+/// The second half of the bytes.
 template <>
 struct std::hash<KpUUID> {
+    /// The second half of the bytes as a number.
     std::size_t operator()(const KpUUID& uuid) const { return std::bit_cast<std::array<std::size_t, 2>>(uuid)[1]; }
 };

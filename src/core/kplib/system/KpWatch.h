@@ -30,14 +30,21 @@ public:
     /// Stops and gives the time, in seconds or rounded to milliseconds (for up to 49 days). Stopping a watch that
     /// stands adds the time since its last start once more.
     float stop();
+    /// @{
+    /// As stop(), in other units.
     double stop2();
     unsigned int stopMSec();
+    /// @}
 
     /// The time so far, without stopping.
     float getTime() const;
+    /// @{
+    /// As getTime(), in other units.
     double getTime2() const;
     unsigned int getTimeMSec() const;
+    /// @}
 
+    /// Whether time is being added.
     bool isRunning() const { return running_; }
 
     /// Writes one line to the log with name, `index` if not 0, the time so far, and how much that is since the last
@@ -58,6 +65,7 @@ private:
 /// Runs a watch for the length of a scope; one that runs already is left running.
 class KPLIB_API KpScopedWatch {
 public:
+    /// Continues `watch`, from 0 with `reset`.
     KpScopedWatch(KpWatch& watch, bool reset);
     KpScopedWatch(const KpScopedWatch&) = delete;
     KpScopedWatch& operator=(const KpScopedWatch&) = delete;

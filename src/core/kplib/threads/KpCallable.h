@@ -6,9 +6,14 @@
 class KPLIB_API KpCallable {
 public:
     KpCallable() = default;
+    /// @{
+    /// Copies nothing.
     KpCallable(const KpCallable&) = default;
     KpCallable& operator=(const KpCallable&) = default;
+    /// @}
+
     virtual ~KpCallable();
 
+    /// Does what the object stands for.
     virtual void call() = 0;
 };

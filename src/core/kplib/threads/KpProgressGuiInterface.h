@@ -16,13 +16,17 @@ public:
     /// Detaches itself.
     virtual ~KpProgressGuiInterface();
 
-    /// `text` is gone once the work is canceled: take what you need of it first.
+    /// `text` is destroyed when the work is canceled: copy what is needed of it first.
     virtual void setText(const std::string& text) = 0;
+    /// The scale of setValue() has changed.
     virtual void setMaximum(int maximum) = 0;
+    /// The position on the scale.
     virtual void setValue(int value) = 0;
     /// The work has ended, with this outcome.
     virtual void setCompleted(const KpResult& result) = 0;
+    /// Sets the title of the display; does nothing here.
     virtual void setWindowTitle(const std::string& title);
+    /// Shows the display; does nothing here.
     virtual void show();
 
 private:

@@ -40,6 +40,7 @@ public:
 
     /// Ends the work with a failure of the code Interrupted, unless it cannot be canceled.
     virtual void cancel();
+    /// Whether cancel() ended the work.
     virtual bool isCanceled() const;
 
     /// Ends the work with a failure of that code and text, which is also an error in the log. Null is an empty text.
@@ -50,18 +51,21 @@ public:
 
     /// Runs before the first scope opens.
     virtual void beforeStartWorking();
-    /// Runs when the last scope has closed: tells the outcome to the user interface and allows to cancel again.
+    /// Runs when the last scope has closed: passes the outcome to the user interface and enables
+    /// cancel() again.
     virtual void afterStopWorking();
 
     /// These pass on to the user interface, if there is one.
     virtual void setProgressValueGlobal(int value);
     /// The value on the scale of all open scopes.
     virtual int currentProgressValue() const;
+    /// Passes the scale on, as above.
     virtual void setMaximumGlobal(int maximum);
     /// Also becomes the text of the innermost scope.
     virtual void setProgressText(const char* text);
     /// The text of the innermost scope, "" without one. Valid until that changes.
     virtual const char* progressText() const;
+    /// Passes the outcome on, as above.
     virtual void setCompleted(const KpResult& result);
 
     /// One step forward in the innermost scope.
@@ -70,11 +74,14 @@ public:
     void terminate();
     /// Makes cancel() do nothing until the work has ended.
     void disableCancel() { cancelable_ = false; }
+    /// As setProgressText().
     void setProgressInfo(const char* text) { setProgressText(text); }
 
     /// The product of the maxima of all open scopes, at most INT_MAX; 1 without one.
     int globalMaximum() const;
+    /// Whether a scope is open.
     bool isWorking() const { return working_; }
+    /// Whether cancel() has an effect.
     bool canCancel() const { return cancelable_; }
     /// The outcome so far. A failure stays into later work.
     const KpResult& result() const { return result_; }

@@ -36,6 +36,7 @@ public:
 
     /// Whether a run has ended, and none has begun since. What run() wrote is then visible.
     bool finished() const;
+    /// Whether start() was called and the run has not ended.
     bool running() const;
 
     /// Gives up the processor.
@@ -43,11 +44,14 @@ public:
     /// Suspend the caller for at least that time; a signal doesn't cut it short. msleep() counts microseconds in 32
     /// bits, so its longest time is some 71 minutes, and longer ones wrap.
     static void sleep(unsigned long seconds);
+    /// As sleep(), in milliseconds.
     static void msleep(unsigned long milliseconds);
+    /// As sleep(), in microseconds.
     static void usleep(unsigned long microseconds);
 
     /// The name, valid until it changes.
     const char* threadName() const;
+    /// Replaces the name.
     void setThreadName(const char* name);
 
     /// Names the calling thread for the tools of the platform, which may keep its first characters only.

@@ -20,6 +20,7 @@ class KpWorkerThreadPrivate;
 /// cost of a load. Requests bind only a compute() that polls. An exception that leaves compute() ends the process.
 class KPLIB_API KpWorkerThread {
 public:
+    /// The state of the worker.
     enum State {
         NotStarted,        ///< no thread
         Idle,              ///< waits for start()
@@ -65,10 +66,12 @@ public:
     /// Waits for the pass, a suspended one is resumed, and ends the thread; start() makes a new one. Always false.
     bool terminate();
 
+    /// The State; the worker may change it at any time.
     int state() const;
 
     /// The name, valid until it changes. The thread takes it over as it starts.
     const char* name() const;
+    /// Replaces the name.
     void setName(const char* name);
 
     /// For compute(): whether to end early.
