@@ -10,16 +10,18 @@
 class KpCoordinateSystem;
 class KpFrameOfReference;
 
-/// A space that positions can be told in: a node of a tree whose root is a named frame of reference. Systems can be
+/// A space of positions: a node of a tree whose root is a named frame of reference. Systems can be
 /// related only if they end at the same frame.
 ///
-/// A child holds its parent, so a parent is an object on the heap that handles hold; a system without children may
-/// stand anywhere, and questions to it or about it take no handle to it. Systems may be changed, which moves all that
-/// is below them and tells nobody. The count of handles is for one thread.
+/// A child holds its parent, so a parent is an object on the heap that handles hold; a system
+/// without children may stand anywhere, and questions to it or about it take no handle to it.
+/// Systems may be changed, which also moves all child systems. There is no notification. The count
+/// of handles is for one thread.
 class KPLIB_API KpAbstractCoordinateSystem : public KpHandable {
 public:
     /// The root this system ends at; null if it floats.
     virtual KpHandle<const KpFrameOfReference> frameOfReference() const = 0;
+    /// The parent; null for a root or a system that floats.
     virtual KpHandle<const KpAbstractCoordinateSystem> parent() const = 0;
     /// From this system to its parent.
     virtual KpMat4f asTransformation() const = 0;

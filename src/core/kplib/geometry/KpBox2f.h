@@ -8,23 +8,38 @@
 class KpBox2f {
 public:
     constexpr KpBox2f() = default;
+    /// @{
+    /// Of these bounds as they are.
     constexpr KpBox2f(float xmin, float ymin, float xmax, float ymax) : min_(xmin, ymin), max_(xmax, ymax) {}
     constexpr KpBox2f(const KpVec2f& min, const KpVec2f& max) : min_(min), max_(max) {}
+    /// @}
 
+    /// A bound.
     constexpr float& xmin() { return min_.x(); }
+    /// A bound.
     constexpr float xmin() const { return min_.x(); }
+    /// A bound.
     constexpr float& ymin() { return min_.y(); }
+    /// A bound.
     constexpr float ymin() const { return min_.y(); }
+    /// A bound.
     constexpr float& xmax() { return max_.x(); }
+    /// A bound.
     constexpr float xmax() const { return max_.x(); }
+    /// A bound.
     constexpr float& ymax() { return max_.y(); }
+    /// A bound.
     constexpr float ymax() const { return max_.y(); }
-
+    /// @{
+    /// A corner.
     constexpr const KpVec2f& min() const { return min_; }
     constexpr const KpVec2f& max() const { return max_; }
+    /// @}
+
     /// max() - min(), also of an empty rectangle.
     constexpr KpVec2f size() const { return max_ - min_; }
 
+    /// Whether a minimum is above its maximum.
     constexpr bool isEmpty() const { return min_.x() > max_.x() || min_.y() > max_.y(); }
 
     /// Makes it hold `point`: an empty one becomes that point, else bounds move that it lies strictly outside of.

@@ -3,27 +3,41 @@
 #include <kplib/foundation/KpCheck.h>
 #include <kplib/geometry/KpVecBase.h>
 
-/// What the axis-aligned boxes in space share: xmin, xmax, ymin, ymax, zmin, zmax and nothing else, so that the object
-/// is its own byte image. `Box` is the class that derives from it, `Vector` its corner.
+/// Base of the axis-aligned boxes in space: xmin, xmax, ymin, ymax, zmin, zmax and nothing else,
+/// so that the object is its own byte image. `Box` is the class that derives from it, `Vector` its
+/// corner.
 ///
 /// Both bounds belong to the box; it is empty when on any axis the minimum is above the maximum. A default-made box is
 /// empty, from 1 to 0 on each axis.
 template <typename Box, typename Vector>
 class KpBox3Base {
 public:
+    /// Type of the bounds.
     using value_type = typename Vector::value_type;
 
+    /// A bound.
     constexpr value_type& xmin() { return b_[0]; }
+    /// A bound.
     constexpr value_type xmin() const { return b_[0]; }
+    /// A bound.
     constexpr value_type& xmax() { return b_[1]; }
+    /// A bound.
     constexpr value_type xmax() const { return b_[1]; }
+    /// A bound.
     constexpr value_type& ymin() { return b_[2]; }
+    /// A bound.
     constexpr value_type ymin() const { return b_[2]; }
+    /// A bound.
     constexpr value_type& ymax() { return b_[3]; }
+    /// A bound.
     constexpr value_type ymax() const { return b_[3]; }
+    /// A bound.
     constexpr value_type& zmin() { return b_[4]; }
+    /// A bound.
     constexpr value_type zmin() const { return b_[4]; }
+    /// A bound.
     constexpr value_type& zmax() { return b_[5]; }
+    /// A bound.
     constexpr value_type zmax() const { return b_[5]; }
 
     /// Bound `i` in the order above; not checked.
@@ -32,20 +46,25 @@ public:
         KPLIB_CHECK(i >= 0 && i < 6, "KpBox3Base: the index is not in [0, 6)");
         return b_[i];
     }
+    /// As above.
     constexpr value_type operator[](int i) const
     {
         KPLIB_CHECK(i >= 0 && i < 6, "KpBox3Base: the index is not in [0, 6)");
         return b_[i];
     }
+    /// The six bounds in the order above.
     constexpr const value_type* data() const { return b_; }
 
+    /// The lower corner.
     constexpr Vector min() const { return {b_[0], b_[2], b_[4]}; }
+    /// The upper corner.
     constexpr Vector max() const { return {b_[1], b_[3], b_[5]}; }
     /// Corner `i` from 0 to 7: x from the maximum if bit 0 of `i` is set, y if bit 1 is, z if bit 2 is.
     constexpr Vector corner(int i) const { return {b_[i & 1], b_[2 + (i >> 1 & 1)], b_[4 + (i >> 2 & 1)]}; }
     /// max() - min(), also of an empty box.
     constexpr Vector size() const { return max() - min(); }
 
+    /// Whether a minimum is above its maximum.
     constexpr bool isEmpty() const { return b_[0] > b_[1] || b_[2] > b_[3] || b_[4] > b_[5]; }
 
     /// Whether `point` lies in the box, of which each bound is moved out by `tolerance`; bounds are inside, NaN is not.
@@ -91,6 +110,7 @@ public:
 
 protected:
     constexpr KpBox3Base() = default;
+    /// Of these bounds as they are.
     constexpr KpBox3Base(value_type xmin, value_type xmax, value_type ymin, value_type ymax, value_type zmin,
                          value_type zmax) :
         b_{xmin, xmax, ymin, ymax, zmin, zmax}

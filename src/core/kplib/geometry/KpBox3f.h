@@ -7,6 +7,7 @@
 class KpBox3f : public KpBox3Base<KpBox3f, KpVec3f> {
 public:
     constexpr KpBox3f() = default;
+    /// Of these bounds as they are.
     constexpr KpBox3f(float xmin, float xmax, float ymin, float ymax, float zmin, float zmax) :
         KpBox3Base(xmin, xmax, ymin, ymax, zmin, zmax)
     {

@@ -7,6 +7,7 @@
 class KpBox3i : public KpBox3Base<KpBox3i, KpVec3i> {
 public:
     constexpr KpBox3i() = default;
+    /// Of these bounds as they are.
     constexpr KpBox3i(std::int32_t xmin, std::int32_t xmax, std::int32_t ymin, std::int32_t ymax, std::int32_t zmin,
                       std::int32_t zmax) :
         KpBox3Base(xmin, xmax, ymin, ymax, zmin, zmax)

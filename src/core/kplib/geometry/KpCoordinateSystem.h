@@ -15,11 +15,12 @@ class KpPlane;
 /// A coordinate system in the space of its parent: an origin and three axes, which need not be of length 1 or at right
 /// angles. The point (u, v, w) is at origin + u x + v y + w z in the parent's space.
 ///
-/// Without a parent it floats: it has no frame of reference and is compatible with nothing, itself included. Input from
-/// which no system can be made leaves NaN in the numbers, which isValid() tells; there are no other errors. See
-/// KpAbstractCoordinateSystem for who holds whom.
+/// Without a parent it floats: it has no frame of reference and is compatible with nothing, itself
+/// included. Input from which no system can be made leaves NaN in the numbers: isValid() is false
+/// then. There are no other errors. For ownership see KpAbstractCoordinateSystem.
 class KPLIB_API KpCoordinateSystem : public KpAbstractCoordinateSystem {
 public:
+    /// Names of the axes.
     enum AxisIndex { AxisX, AxisY, AxisZ };  ///< what the operations with an `axis` from 0 to 2 take
 
     /// Origin zero, unit axes, no parent.
@@ -36,10 +37,13 @@ public:
     /// All twelve numbers NaN; the parent stays.
     void makeNaN();
 
-    /// Null makes it float. That no system is above itself is the caller's duty.
+    /// Null makes it float. The caller ensures that no system is its own ancestor.
     void setParent(const KpAbstractCoordinateSystem* parent) { parent_ = parent; }
+    /// Replaces the origin.
     void setOrigin(const KpVec3f& origin) { origin_ = origin; }
+    /// Replaces one axis.
     void setAxis(int axis, const KpVec3f& value) { axes_[static_cast<std::size_t>(axis)] = value; }
+    /// Replaces the axes.
     void setAxes(const std::array<KpVec3f, 3>& axes) { axes_ = axes; }
     /// Right-handed unit axes at right angles, with z along `zAxis` and x as near to `xHint` as can be; any x if
     /// `xHint` is zero. An `xHint` along `zAxis` leaves x and y zero.
@@ -49,18 +53,23 @@ public:
     /// Keeps `axis` and brings the two others to right angles with it and each other; their lengths change.
     /// With `keepDirection` neither turns by more than a right angle, which may keep the system left-handed.
     void makePerpendicular(int axis, bool keepDirection);
+    /// Makes each axis of length 1.
     void normalizeAxes();
     /// Right-handed unit axes with z along the normal and the origin at `point`, wherever that is, or at the plane's
     /// point nearest to the parent's origin. An empty plane makes the origin NaN and leaves the axes.
     void setSystemByPlane(const KpPlane& plane, const KpVec3f& point);
+    /// As above.
     void setSystemByPlane(const KpPlane& plane);
 
+    /// The origin in the parent's space.
     const KpVec3f& origin() const { return origin_; }
+    /// An axis in the parent's space.
     const KpVec3f& axis(int axis) const { return axes_[static_cast<std::size_t>(axis)]; }
     /// No number is NaN, and the determinant of the axes is not 0.
     bool isValid() const;
     /// Each two axes have a dot product within 1e-6 of 0; their lengths count.
     bool isPerpendicular() const;
+    /// Whether the determinant of the axes is above 0.
     bool isRightHanded() const;
     /// The axes as rows.
     KpMat3f orientationAsMatrix() const { return KpMat3f(axes_); }
@@ -73,6 +82,7 @@ public:
 
     /// The parent's.
     KpHandle<const KpFrameOfReference> frameOfReference() const override;
+    /// The parent, null if there is none.
     KpHandle<const KpAbstractCoordinateSystem> parent() const override;
     KpMat4f asTransformation() const override;
     KpMat4f asTransformationToFrameOfReference() const override;
@@ -93,6 +103,7 @@ public:
     bool transformationFrom(const KpAbstractCoordinateSystem& other, KpMat4f& result) const;
     /// The same for callers that know isCompatibleWith(); NaN throughout if they are not.
     KpMat4f transformationTo(const KpAbstractCoordinateSystem& other) const;
+    /// As above.
     KpMat4f transformationFrom(const KpAbstractCoordinateSystem& other) const;
     /// The lowest system that is above both or one of the two; null if there is none, which may be so for compatible
     /// ones too.

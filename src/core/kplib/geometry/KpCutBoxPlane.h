@@ -19,9 +19,12 @@ public:
     /// The box from 0 to 1 on each axis, cut at a right angle to x.
     KpCutBoxPlane();
     // Each is what init() makes of the same arguments; two corners are those of a box.
+    /// @{
+    /// As init().
     KpCutBoxPlane(const KpBox3f& box, const KpVec3f& normal) { init(box, normal); }
     KpCutBoxPlane(const KpBox3f& box1, const KpBox3f& box2, const KpVec3f& normal) { init(box1, box2, normal); }
     KpCutBoxPlane(const KpVec3f& min, const KpVec3f& max, const KpVec3f& normal) { init(KpBox3f(min, max), normal); }
+    /// @}
 
     /// Prepares cuts of `box` by planes with `normal`, of any length. A second box stays as it was: unset, if there
     /// hasn't been any.
@@ -29,10 +32,12 @@ public:
     /// The same, with `box2` as the second box.
     void init(const KpBox3f& box1, const KpBox3f& box2, const KpVec3f& normal);
 
+    /// The box.
     const KpBox3f& box() const { return box_; }
 
     // The plane of a cut holds the points p with normal · p = distance.
 
+    /// The vertices of the polygon.
     std::vector<KpVec3f> cutPlane(float distance) const;
     /// Writes the vertices in both boxes, each to an array with 6 places, and gives their number; allocates nothing.
     /// `secondVertices` may be null, and has to be where there is no second box.
@@ -40,11 +45,13 @@ public:
 
     // For one cut alone.
 
+    /// @{
+    /// As above, for one plane.
     static std::vector<KpVec3f> cutPlane(const KpBox3f& box, const KpPlane& plane);
     static std::vector<KpVec3f> cutPlane(const KpVec3f& min, const KpVec3f& max, const KpPlane& plane);
     static int cutPlane(const KpBox3f& box1, const KpBox3f& box2, const KpPlane& plane, KpVec3f* vertices,
                         KpVec3f* secondVertices);
-
+    /// @}
 private:
     float cornerValues_[8];  // the corners along the normal
     KpBox3f box_;

@@ -10,14 +10,18 @@
 /// A box is given as xmin, xmax, ymin, ymax, zmin, zmax, in an array of six doubles, or as two corners.
 class KPLIB_API KpCutBoxPlaneDouble {
 public:
+    /// xmin, xmax, ymin, ymax, zmin, zmax.
     using Box = std::span<const double, 6>;
 
     /// The box from 0 to 1 on each axis, cut at a right angle to x.
     KpCutBoxPlaneDouble();
     // Each is what init() makes of the same arguments; two corners are those of a box.
+    /// @{
+    /// As init().
     KpCutBoxPlaneDouble(Box box, const KpVec3d& normal) { init(box, normal); }
     KpCutBoxPlaneDouble(Box box1, Box box2, const KpVec3d& normal) { init(box1, box2, normal); }
     KpCutBoxPlaneDouble(const KpVec3d& min, const KpVec3d& max, const KpVec3d& normal);
+    /// @}
 
     /// Prepares cuts of `box` by planes with `normal`, of any length. A second box stays as it was: unset, if there
     /// hasn't been any.
@@ -25,7 +29,9 @@ public:
     /// The same, with `box2` as the second box.
     void init(Box box1, Box box2, const KpVec3d& normal);
 
+    /// The normal as it was given.
     const KpVec3d& normal() const { return normal_; }
+    /// The box.
     Box box() const { return box_; }
 
     /// Writes the vertices of the cut by the plane normal · p = distance to an array with 6 places, in order around the

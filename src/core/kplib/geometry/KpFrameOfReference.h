@@ -10,9 +10,12 @@
 /// same space.
 class KPLIB_API KpFrameOfReference : public KpAbstractCoordinateSystem {
 public:
+    /// The frame of that id.
     explicit KpFrameOfReference(std::string id) : id_(std::move(id)) {}
 
+    /// The id.
     const std::string& id() const { return id_; }
+    /// Whether the ids are equal.
     friend bool operator==(const KpFrameOfReference& a, const KpFrameOfReference& b) { return a.id_ == b.id_; }
 
     /// This object, which has to live on the heap: the last such handle deletes it.

@@ -9,9 +9,10 @@ class KpBox3f;
 
 /// A line in space: a position and a direction of length 1 and nothing else, so that the object is its own byte image.
 ///
-/// The line has no ends: parameters along it, lengths from the position, may be negative where nothing else is said.
-/// Where there is no result an operation gives false and, but for the pick tests that have no outputs, NaN in all its
-/// outputs. A plain value in float arithmetic; a default-made one is not set to anything.
+/// The line has no ends: parameters along it, lengths from the position, may be negative where
+/// nothing else is said. Where there is no result an operation gives false and, but for the pick
+/// tests that have no outputs, NaN in all its outputs. A plain value in float arithmetic; a
+/// default-made one is not initialised.
 class KPLIB_API KpLine {
 public:
     constexpr KpLine() = default;
@@ -23,7 +24,9 @@ public:
     /// Makes `direction` of length 1 and gives its former length; one of length 0 stays, other than in setValue().
     float setPosDir(const KpVec3f& position, const KpVec3f& direction);
 
+    /// A point of the line.
     const KpVec3f& position() const { return position_; }
+    /// The direction.
     const KpVec3f& direction() const { return direction_; }
 
     /// The foot of the perpendicular from `point`.
@@ -36,18 +39,18 @@ public:
     /// hits without points. An empty box is missed. Kay and Kajiya, "Ray tracing complex scenes", 1986.
     bool intersect(const KpBox3f& box, KpVec3f& enter, KpVec3f& exit, float tolerance) const;
 
-    /// Where the line goes through the triangle a, b, c: `hit`, and in `barycentric` the weights of the corners, whose
-    /// sum is 1. `front` tells that a, b, c run clockwise for who looks along the line; it is false on a miss. False
-    /// if the triangle has no area or the line lies along it; edges belong to it. Badouel, "An efficient ray-polygon
-    /// intersection", Graphics Gems, 1990.
+    /// Where the line goes through the triangle a, b, c: `hit`, and in `barycentric` the weights
+    /// of the corners, whose sum is 1. `front` is true if a, b, c run clockwise as seen along the
+    /// line; it is false on a miss. False if the triangle has no area or the line lies along it;
+    /// edges belong to it. Badouel, "An efficient ray-polygon intersection", Graphics Gems, 1990.
     bool intersect(const KpVec3f& a, const KpVec3f& b, const KpVec3f& c, KpVec3f& hit, KpVec3f& barycentric,
                    bool& front) const;
 
     // Picks: whether something is nearer to the line than an angle in radians, seen from the position; a negative
     // `angle` is a distance of -`angle`. The comparison is strict.
 
-    /// The box is grown by the greatest distance of a corner from the position times tan(`angle`); at angle 0 it still
-    /// is hit by a line that crosses it, also behind the position.
+    /// The box is grown by the greatest distance of a corner from the position times tan(`angle`);
+    /// at angle 0 a line that crosses it still hits it, also behind the position.
     bool intersect(float angle, const KpBox3f& box) const;
     /// A point at the position or behind it is never picked.
     bool intersect(float angle, const KpVec3f& point) const;

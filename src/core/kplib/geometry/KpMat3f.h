@@ -11,16 +11,18 @@ class KpMat4f;
 
 /// A 3x3 matrix of floats, row by row and nothing else, so that the object is its own byte image.
 ///
-/// Points are row vectors and a matrix stands to their right: a product applies its left factor first. A plain value; a
-/// default-made one is not set to anything.
+/// Points are row vectors and a matrix stands to their right: a product applies its left factor
+/// first. A plain value; a default-made one is not initialised.
 class KPLIB_API KpMat3f {
 public:
     constexpr KpMat3f() = default;
+    /// From the elements, row by row.
     constexpr KpMat3f(float m00, float m01, float m02, float m10, float m11, float m12, float m20, float m21,
                       float m22) :
         m_{{m00, m01, m02}, {m10, m11, m12}, {m20, m21, m22}}
     {
     }
+    /// From three rows.
     explicit KpMat3f(const float (&rows)[3][3]) { setValue(rows); }
     /// From three columns - other than the form with an array, which takes rows.
     constexpr KpMat3f(const KpVec3f& column0, const KpVec3f& column1, const KpVec3f& column2) :
@@ -32,13 +34,21 @@ public:
     /// From three rows - other than the form with three vectors, which takes columns.
     explicit KpMat3f(const std::array<KpVec3f, 3>& rows) { setValue(rows); }
 
+    /// The identity.
     static constexpr KpMat3f identity() { return {1, 0, 0, 0, 1, 0, 0, 0, 1}; }
+    /// Becomes the identity.
     void makeIdentity() { *this = identity(); }
+    /// @{
+    /// Replaces all elements, given as three rows.
     void setValue(const float (&rows)[3][3]);
     void setValue(const std::array<KpVec3f, 3>& rows);
+    /// @}
+
     /// The upper left of `matrix`.
     void setValue(const KpMat4f& matrix);
+    /// Copies the elements, row by row.
     void getValue(float (&rows)[3][3]) const;
+    /// As setValue().
     KpMat3f& operator=(const float (&rows)[3][3]);
 
     /// The three floats of a row; m[row][column].
@@ -47,6 +57,7 @@ public:
         KPLIB_CHECK(row >= 0 && row < 3, "KpMat3f: the row is not in [0, 3)");
         return m_[row];
     }
+    /// As above.
     constexpr const float* operator[](int row) const
     {
         KPLIB_CHECK(row >= 0 && row < 3, "KpMat3f: the row is not in [0, 3)");
@@ -55,8 +66,11 @@ public:
     /// The nine floats, row by row.
     constexpr const float* data() const { return m_[0]; }
 
+    /// Becomes this * right.
     KpMat3f& operator*=(const KpMat3f& right) { return *this = *this * right; }
+    /// Adds element by element.
     KpMat3f& operator+=(const KpMat3f& other) { return *this = *this + other; }
+    /// Scales each element.
     KpMat3f& operator*=(float factor) { return *this = *this * factor; }
     /// Applies `a` first, then `b`.
     friend constexpr KpMat3f operator*(const KpMat3f& a, const KpMat3f& b)
@@ -64,28 +78,36 @@ public:
         return fromEach(
             [&](int i, int j) { return a.m_[i][0] * b.m_[0][j] + a.m_[i][1] * b.m_[1][j] + a.m_[i][2] * b.m_[2][j]; });
     }
+    /// Element by element.
     friend constexpr KpMat3f operator+(const KpMat3f& a, const KpMat3f& b)
     {
         return fromEach([&](int i, int j) { return a.m_[i][j] + b.m_[i][j]; });
     }
+    /// Element by element.
     friend constexpr KpMat3f operator-(const KpMat3f& a, const KpMat3f& b)
     {
         return fromEach([&](int i, int j) { return a.m_[i][j] - b.m_[i][j]; });
     }
+    /// @{
+    /// Each element scaled.
     friend constexpr KpMat3f operator*(const KpMat3f& m, float factor)
     {
         return fromEach([&](int i, int j) { return m.m_[i][j] * factor; });
     }
     friend constexpr KpMat3f operator*(float factor, const KpMat3f& m) { return m * factor; }
+    /// @}
+
     /// Exact; a matrix that holds a NaN equals none.
     friend constexpr bool operator==(const KpMat3f& a, const KpMat3f& b) = default;
     /// False as soon as one element differs by strictly more than `tolerance`.
     bool equals(const KpMat3f& other, float tolerance) const;
 
+    /// Rows and columns exchanged.
     constexpr KpMat3f transpose() const
     {
         return fromEach([&](int i, int j) { return m_[j][i]; });
     }
+    /// The determinant.
     constexpr float det3() const
     {
         return m_[0][0] * cofactor(0, 0) + m_[0][1] * cofactor(0, 1) + m_[0][2] * cofactor(0, 2);
@@ -100,6 +122,7 @@ public:
 
     /// The column product: result[i] = sum over j of m[i][j] * v[j]. Input and output may be one object.
     void multMatrixVec(const KpVec3f& v, KpVec3f& result) const { result = multMatrixVec(v); }
+    /// As above.
     constexpr KpVec3f multMatrixVec(const KpVec3f& v) const
     {
         return {m_[0][0] * v.x() + m_[0][1] * v.y() + m_[0][2] * v.z(),
@@ -108,6 +131,7 @@ public:
     }
     /// The row product, the way a point is transformed: result[j] = sum over i of v[i] * m[i][j].
     void multVecMatrix(const KpVec3f& v, KpVec3f& result) const { result = multVecMatrix(v); }
+    /// As above.
     constexpr KpVec3f multVecMatrix(const KpVec3f& v) const
     {
         return {v.x() * m_[0][0] + v.y() * m_[1][0] + v.z() * m_[2][0],

@@ -15,9 +15,9 @@ class KpRotation;
 /// A 4x4 matrix of floats, row by row and nothing else, so that the object is its own byte image: an affine or
 /// projective transformation of space.
 ///
-/// Points are row vectors and a matrix stands to their right: a product applies its left factor first, a translation
-/// stands in the last row, and the last column is (0, 0, 0, 1) for an affine matrix. A plain value; a default-made one
-/// is not set to anything.
+/// Points are row vectors and a matrix stands to their right: a product applies its left factor
+/// first, a translation is in the last row, and the last column is (0, 0, 0, 1) for an affine
+/// matrix. A plain value; a default-made one is not initialised.
 class KPLIB_API KpMat4f {
 public:
     /// Four floats that are computed with side by side, each in the order of a plain loop: one instruction where the
@@ -25,17 +25,22 @@ public:
     using Row = float __attribute__((vector_size(16)));
 
     constexpr KpMat4f() = default;
+    /// From the elements, row by row.
     constexpr KpMat4f(float m00, float m01, float m02, float m03, float m10, float m11, float m12, float m13, float m20,
                       float m21, float m22, float m23, float m30, float m31, float m32, float m33) :
         m_{{m00, m01, m02, m03}, {m10, m11, m12, m13}, {m20, m21, m22, m23}, {m30, m31, m32, m33}}
     {
     }
+    /// From four rows.
     explicit KpMat4f(const float (&rows)[4][4]) { setValue(rows); }
     /// `matrix` in the upper left, 1 in the lower right, else 0.
     explicit KpMat4f(const KpMat3f& matrix);
 
+    /// The identity.
     static constexpr KpMat4f identity() { return {1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1}; }
+    /// Becomes the identity.
     void makeIdentity() { *this = identity(); }
+    /// Replaces all elements, given as four rows.
     void setValue(const float (&rows)[4][4]);
     /// The rows (r0, 0), (r1, 0), (r2, 0), (r3, 1).
     void setValue(const KpVec3f& r0, const KpVec3f& r1, const KpVec3f& r2, const KpVec3f& r3)
@@ -47,7 +52,9 @@ public:
         for (int i = 0; i < 4; ++i)
             setRow(i, rows[i]);
     }
+    /// Copies the elements, row by row.
     void getValue(float (&rows)[4][4]) const;
+    /// As setValue().
     KpMat4f& operator=(const float (&rows)[4][4]);
 
     /// The matrix of a translation.
@@ -57,6 +64,7 @@ public:
     }
     /// The matrix of a scale.
     void setScale(float factor) { setScale(KpVec3f(factor, factor, factor)); }
+    /// As above, with a factor for each axis.
     void setScale(const KpVec3f& factors);
     /// The matrix of a rotation.
     void setRotate(const KpRotation& rotation);
@@ -67,6 +75,7 @@ public:
         KPLIB_CHECK(row >= 0 && row < 4, "KpMat4f: the row is not in [0, 4)");
         return m_[row];
     }
+    /// As above.
     constexpr const float* operator[](int row) const
     {
         KPLIB_CHECK(row >= 0 && row < 4, "KpMat4f: the row is not in [0, 4)");
@@ -75,6 +84,7 @@ public:
     /// The sixteen floats, row by row.
     constexpr const float* data() const { return m_[0]; }
 
+    /// Becomes this * right.
     KpMat4f& operator*=(const KpMat4f& right) { return *this = *this * right; }
     /// Applies `a` first, then `b`.
     friend KpMat4f operator*(const KpMat4f& a, const KpMat4f& b)
@@ -95,6 +105,7 @@ public:
     /// Whether this is exactly the identity.
     constexpr bool isIdentity() const { return *this == identity(); }
 
+    /// Rows and columns exchanged.
     constexpr KpMat4f transpose() const
     {
         return {m_[0][0], m_[1][0], m_[2][0], m_[3][0], m_[0][1], m_[1][1], m_[2][1], m_[3][1],
@@ -104,10 +115,11 @@ public:
     float det3(int r1, int r2, int r3, int c1, int c2, int c3) const;
     /// The determinant of the upper left.
     float det3() const { return det3(0, 1, 2, 0, 1, 2); }
+    /// The determinant.
     float det4() const;
 
-    /// The inverse: affine_inverse() where it applies, else by LUDecomposition(). A singular matrix has no error: what
-    /// comes out is large, infinite or NaN.
+    /// The inverse: affine_inverse() where it applies, else by LUDecomposition(). A singular
+    /// matrix is no error: its result is large, infinite or NaN.
     KpMat4f inverse() const;
     /// The inverse of an affine matrix, its determinant in double precision. False, and `out` as it was, if the last
     /// column isn't exactly (0, 0, 0, 1), or if the determinant is below 1e-15 of the sum of its terms' magnitudes; if
@@ -124,6 +136,7 @@ public:
     /// The row product, the way a point is transformed: (v, 1) M, divided by its fourth component w; w = 0 is not
     /// guarded against. Input and output may be one object.
     void multVecMatrix(const KpVec3f& v, KpVec3f& result) const { result = multVecMatrix(v); }
+    /// As above.
     KpVec3f multVecMatrix(const KpVec3f& v) const
     {
         return projected(v.x() * row(0) + v.y() * row(1) + v.z() * row(2) + row(3));
@@ -133,12 +146,14 @@ public:
     void multVecMatrix(std::span<const KpVec3f> points, KpVec3f* results) const;
     /// The column product M (v, 1), divided by its fourth component: the transposed transformation.
     void multMatrixVec(const KpVec3f& v, KpVec3f& result) const { result = multMatrixVec(v); }
+    /// As above.
     KpVec3f multMatrixVec(const KpVec3f& v) const
     {
         return projected(v.x() * column(0) + v.y() * column(1) + v.z() * column(2) + column(3));
     }
     /// The row product with the upper left alone, the way a direction is transformed: no translation, no division.
     void multDirMatrix(const KpVec3f& v, KpVec3f& result) const { result = multDirMatrix(v); }
+    /// As above.
     KpVec3f multDirMatrix(const KpVec3f& v) const
     {
         const Row sums = v.x() * row(0) + v.y() * row(1) + v.z() * row(2);
@@ -146,12 +161,15 @@ public:
     }
     /// The products with all four components, without a division.
     void multVecMatrix(const KpVec4f& v, KpVec4f& result) const { result = multVecMatrix(v); }
+    /// As above.
     KpVec4f multVecMatrix(const KpVec4f& v) const
     {
         const Row sums = v.x() * row(0) + v.y() * row(1) + v.z() * row(2) + v.w() * row(3);
         return {sums[0], sums[1], sums[2], sums[3]};
     }
+    /// The column product with all four components.
     void multMatrixVec(const KpVec4f& v, KpVec4f& result) const { result = multMatrixVec(v); }
+    /// As above.
     KpVec4f multMatrixVec(const KpVec4f& v) const
     {
         const Row sums = v.x() * column(0) + v.y() * column(1) + v.z() * column(2) + v.w() * column(3);

@@ -14,41 +14,49 @@ class KpMat4f;
 /// An unbounded plane in space: the points p with normal · p = distance, a normal and a float and nothing else, so that
 /// the object is its own byte image.
 ///
-/// What is built from usable points or directions has a normal of length 1, on which all operations rely; otherwise the
-/// plane is empty. Nothing here reports an error: where there is no result, NaN or zeros come out. A plain value in
-/// float arithmetic; a default-made one is not set to anything.
+/// What is built from usable points or directions has a normal of length 1, on which all
+/// operations rely; otherwise the plane is empty. Nothing here reports an error: where there is no
+/// result, NaN or zeros come out. A plain value in float arithmetic; a default-made one is not
+/// initialised.
 class KPLIB_API KpPlane {
 public:
     constexpr KpPlane() = default;
     // Each is what set() makes of the same arguments.
+    /// @{
+    /// As set().
     KpPlane(const KpVec3f& p0, const KpVec3f& p1, const KpVec3f& p2) { set(p0, p1, p2); }
     KpPlane(const KpVec3f& normal, float distance) { set(normal, distance); }
     KpPlane(const KpVec3f& normal, const KpVec3f& point) { set(normal, point); }
+    /// @}
 
     /// A plane of four zeros, always the same object; safe from any thread.
     static const KpPlane& emptyPlane();
 
     // Each makes the normal of length 1, and all four numbers 0 if its length is 0.
 
-    /// The plane through three points, which run counterclockwise for who looks against the normal.
+    /// The plane through three points, which run counterclockwise as seen against the normal.
     void set(const KpVec3f& p0, const KpVec3f& p1, const KpVec3f& p2);
     /// `distance` is the one from the origin: it stays as it is, whatever the length of `normal`.
     void set(const KpVec3f& normal, float distance);
     /// The plane through `point`.
     void set(const KpVec3f& normal, const KpVec3f& point);
 
+    /// The normal.
     const KpVec3f& normal() const { return normal_; }
+    /// Distance from the origin along the normal.
     float distance() const { return distance_; }
-    // These store what they are given: that the normal is of length 1 is the caller's duty.
+    // These store their argument unchanged: the caller ensures that the normal is of length 1.
+    /// Replaces the normal.
     void setNormal(const KpVec3f& normal) { normal_ = normal; }
+    /// Replaces the distance.
     void setDistanceFromOrigin(float distance) { distance_ = distance; }
 
     /// Moves the plane along its normal.
     void offset(float distance) { distance_ += distance; }
     /// Makes the normal of length 1 with the distance as it is, then turns the plane over if that is strictly below 0.
     void normalize();
-    /// Moves the plane by `matrix`, which has to be rigid or scale all axes alike: the normal goes through the matrix
-    /// itself, not its inverse transpose, and that is meant.
+    /// Moves the plane by `matrix`, which has to be rigid or scale all axes alike: the normal is
+    /// multiplied by the matrix itself, not by its inverse transpose.
     void transform(const KpMat4f& matrix);
     /// Moves the plane by the inverse of `matrix`, which may be any.
     void transformInv(const KpMat4f& matrix);

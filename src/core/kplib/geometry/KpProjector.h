@@ -9,13 +9,14 @@
 
 /// Turns positions of a pointer on the screen into positions in a working space, for handles that are dragged.
 ///
-/// One thread at a time uses a projector. Nothing raises an error: where there is no answer it is NaN.
+/// One thread at a time uses a projector. There are no errors: without a result the output is NaN.
 class KPLIB_API KpProjector {
 public:
     /// The position in working space for `point` on the screen, from (0, 0) at the lower left to (1, 1).
     virtual KpVec3f project(const KpVec2f& point) = 0;
     /// The same for a line in the world.
     virtual KpVec3f intersect(const KpLine& line) = 0;
+    /// Sets what the camera sees.
     virtual void setViewVolume(const KpViewVolume& viewVolume);
     /// From the working space to the world; the identity at the start.
     virtual void setWorkingSpace(const KpMat4f& workingToWorld);
@@ -23,17 +24,25 @@ public:
     virtual KpProjector* copy() const = 0;
     virtual ~KpProjector();
 
+    /// @{
+    /// As it was set.
     const KpViewVolume& viewVolume() const { return viewVolume_; }
     const KpMat4f& worldToWorking() const { return worldToWorking_; }
     const KpMat4f& workingToWorld() const { return workingToWorld_; }
+    /// @}
+
     /// What is seen at `point` of the screen, as a line in working space.
     KpLine getWorkingLine(const KpVec2f& point) const;
 
 protected:
     KpProjector() = default;
+    /// @{
+    /// Copies the state.
     KpProjector(const KpProjector&) = default;
     KpProjector& operator=(const KpProjector&) = default;
+    /// @}
 
+    /// A line of the world in working space.
     KpLine toWorkingSpace(const KpLine& worldLine) const;
 
 private:

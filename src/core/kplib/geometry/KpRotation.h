@@ -9,12 +9,14 @@ class KpMat4f;
 /// A rotation in space: the quaternion x, y, z, w with w the scalar part, four floats and nothing else, so that the
 /// object is its own byte image.
 ///
-/// Products follow those of matrices: a * b applies a first. A positive angle about +z takes +x to +y. A plain value; a
-/// default-made one is not set to anything.
+/// Products follow those of matrices: a * b applies a first. A positive angle about +z takes +x to
+/// +y. A plain value; a default-made one is not initialised.
 class KPLIB_API KpRotation {
 public:
     constexpr KpRotation() = default;
     // Each is what setValue() makes of the same arguments.
+    /// @{
+    /// As setValue().
     KpRotation(float x, float y, float z, float w) { setValue(x, y, z, w); }
     explicit KpRotation(const float* xyzw) { setValue(xyzw); }
     KpRotation(const KpVec3f& axis, float angle) { setValue(axis, angle); }
@@ -25,17 +27,21 @@ public:
     {
         setValue(from1, from2, to1, to2);
     }
+    /// @}
 
+    /// The rotation by 0.
     static constexpr KpRotation identity() { return asStored(0, 0, 0, 1); }
 
     /// The four, normalised; all 0 is not guarded against.
     void setValue(float x, float y, float z, float w);
+    /// As above, from four floats.
     void setValue(const float* xyzw) { setValue(xyzw[0], xyzw[1], xyzw[2], xyzw[3]); }
     /// The turn by `angle` (radians) about `axis`, of any length but 0.
     void setValue(const KpVec3f& axis, float angle);
     /// The rotation of a matrix, whose upper left has to be one. Not normalised afterwards. Shoemake, "Animating
     /// rotation with quaternion curves", 1985.
     void setValue(const KpMat4f& matrix);
+    /// As above.
     void setValue(const KpMat3f& matrix);
     /// The smallest turn that takes the direction `from` to the direction `to`.
     ///
@@ -51,18 +57,23 @@ public:
     void getValue(float& x, float& y, float& z, float& w) const;
     /// Axis of length 1 and angle in radians; (0, 0, 1) and 0 where there is nearly no turn.
     void getValue(KpVec3f& axis, float& angle) const;
+    /// @{
+    /// The matrix of toMat3f(), in a KpMat4f as its upper left.
     void getValue(KpMat4f& matrix) const;
     void getValue(KpMat3f& matrix) const { matrix = toMat3f(); }
+    /// @}
+
     /// The matrix for row vectors; the diagonal in double precision, rounded to float.
     KpMat3f toMat3f() const;
 
+    /// Component `i` in the order x, y, z, w; not checked.
     constexpr float operator[](int i) const { return q_[i]; }
     /// x, y, z, w
     constexpr const float* data() const { return q_; }
 
     /// Divides by the square root of norm(), which is taken in double precision.
     void normalize();
-    /// The sum of the four squares: no root is taken, and that is meant.
+    /// The sum of the four squares; no root is taken.
     float norm() const { return q_[0] * q_[0] + q_[1] * q_[1] + q_[2] * q_[2] + q_[3] * q_[3]; }
     /// Becomes the turn back, also if this isn't normalised: the product of both is the identity.
     void invert();
@@ -97,7 +108,9 @@ public:
 
     /// `v` turned, by way of the matrix. Input and output may be one object.
     void multVec(const KpVec3f& v, KpVec3f& result) const { result = multVec(v); }
+    /// As above.
     KpVec3f multVec(const KpVec3f& v) const;
+    /// As multVec().
     KpVec3f operator*(const KpVec3f& v) const { return multVec(v); }
 
     /// From `a` at t = 0 to `b` (or its negative) at t = 1 at a steady speed along the shorter way; not normalised.

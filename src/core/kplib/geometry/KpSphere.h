@@ -7,20 +7,26 @@
 
 class KpLine;
 
-/// A sphere: a center and a radius. A tangent line hits it; a negative radius meets lines as its magnitude does. Lines
-/// and points that are NaN hit, in NaN. A plain value in float arithmetic; a default-made one is not set to anything.
+/// A sphere: a center and a radius. A tangent line hits it; a negative radius meets lines as its
+/// magnitude does. Lines and points that are NaN hit, in NaN. A plain value in float arithmetic; a
+/// default-made one is not initialised.
 class KPLIB_API KpSphere {
 public:
     constexpr KpSphere() = default;
+    /// Of that centre and radius.
     constexpr KpSphere(const KpVec3f& center, float radius) : center_(center), radius_(radius) {}
 
-    /// A sphere about the origin with the radius -1, always the same object. The first call must not run beside
-    /// another.
+    /// A sphere about the origin with the radius -1, always the same object. The first call must
+    /// not run at the same time as another.
     static const KpSphere& emptySphere();
 
+    /// The centre.
     const KpVec3f& center() const { return center_; }
+    /// The radius.
     float radius() const { return radius_; }
+    /// Moves the centre.
     void setCenter(const KpVec3f& center) { center_ = center; }
+    /// Replaces the radius.
     void setRadius(float radius) { radius_ = radius; }
 
     /// The first hit at or in front of the line's position, from inside the way out. False, with `out` as it was, if

@@ -9,11 +9,14 @@
 /// control devices", 1988; Henriksen, Sporring and Hornbæk, "Virtual trackballs revisited", 2004.
 class KPLIB_API KpSphereSheetProjector : public KpSphereProjector {
 public:
+    /// @{
+    /// As the base class.
     explicit KpSphereSheetProjector(bool orientToEye = true) : KpSphereProjector(orientToEye) {}
     explicit KpSphereSheetProjector(const KpSphere& sphere, bool orientToEye = true) :
         KpSphereProjector(sphere, orientToEye)
     {
     }
+    /// @}
 
     KpVec3f project(const KpVec2f& point) override;
     KpVec3f intersect(const KpLine& line) override;
@@ -22,12 +25,17 @@ public:
     KpRotation getRotation(const KpVec3f& from, const KpVec3f& to) override;
     void setupPlane(const KpLine* line) override;
 
-    // What setupPlane() has made: the eye of a perspective, the plane through the center that sheet and sphere stand on
-    // and its direction toward the half that is meant.
+    // Results of setupPlane(): the eye of a perspective, and the plane through the centre on which
+    // sheet and sphere stand, with its direction toward the selected half.
+    /// The eye of a perspective.
     const KpVec3f& planeEye() const { return planeEye_; }
+    /// A point of the plane.
     const KpVec3f& planePoint() const { return planePoint_; }
+    /// Its normal.
     const KpVec3f& planeDir() const { return planeDir_; }
+    /// Its distance from the centre, always 0.
     float planeDist() const { return planeDist_; }
+    /// The plane.
     const KpPlane& tolPlane() const { return tolPlane_; }
 
 private:

@@ -7,6 +7,7 @@
 class KPLIB_API KpVec2f : public KpVecBase<KpVec2f, float, 2> {
 public:
     constexpr KpVec2f() = default;
+    /// Of these components.
     constexpr KpVec2f(float x, float y) : KpVecBase(x, y) {}
     /// From a vector of another component type, each component converted as by static_cast.
     template <typename Vector, typename Component>

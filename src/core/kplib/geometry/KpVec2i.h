@@ -8,6 +8,7 @@
 class KpVec2i : public KpVecBase<KpVec2i, std::int32_t, 2> {
 public:
     constexpr KpVec2i() = default;
+    /// Of these components.
     constexpr KpVec2i(std::int32_t x, std::int32_t y) : KpVecBase(x, y) {}
     /// From a vector of another component type, each component converted as by static_cast.
     template <typename Vector, typename Component>

@@ -6,6 +6,7 @@
 class KpVec3d : public KpVecBase<KpVec3d, double, 3> {
 public:
     constexpr KpVec3d() = default;
+    /// Of these components.
     constexpr KpVec3d(double x, double y, double z) : KpVecBase(x, y, z) {}
     /// From a vector of another component type, each component converted as by static_cast.
     template <typename Vector, typename Component>

@@ -9,6 +9,7 @@
 class KPLIB_API KpVec3f : public KpVecBase<KpVec3f, float, 3> {
 public:
     constexpr KpVec3f() = default;
+    /// Of these components.
     constexpr KpVec3f(float x, float y, float z) : KpVecBase(x, y, z) {}
     /// From a vector of another component type, each component converted as by static_cast.
     template <typename Vector, typename Component>
@@ -16,8 +17,8 @@ public:
     {
     }
 
-    /// Makes the length 1 and gives the former one. A vector of length 0 stays, and 0 is given: planes and lines turn
-    /// empty on it.
+    /// Makes the length 1 and gives the former one. A vector of length 0 stays, and 0 is given:
+    /// planes and lines become empty then.
     float normalize() { return normalizeByLength(); }
 
     /// The signed unit axis that is nearest in direction; of equally near ones the first of +x, -x, +y, -y, +z, -z,

@@ -8,6 +8,7 @@
 class KpVec3l : public KpVecBase<KpVec3l, std::int64_t, 3> {
 public:
     constexpr KpVec3l() = default;
+    /// Of these components.
     constexpr KpVec3l(std::int64_t x, std::int64_t y, std::int64_t z) : KpVecBase(x, y, z) {}
     /// From a vector of another component type, each component converted as by static_cast.
     template <typename Vector, typename Component>

@@ -7,7 +7,9 @@
 class KpVec4f : public KpVecBase<KpVec4f, float, 4> {
 public:
     constexpr KpVec4f() = default;
+    /// Of these components.
     constexpr KpVec4f(float x, float y, float z, float w) : KpVecBase(x, y, z, w) {}
+    /// Of the components of `v` and of `w`.
     constexpr KpVec4f(const KpVec3f& v, float w) : KpVecBase(v.x(), v.y(), v.z(), w) {}
     /// From a vector of another component type, each component converted as by static_cast.
     template <typename Vector, typename Component>

@@ -8,6 +8,7 @@
 class KpVec4i : public KpVecBase<KpVec4i, std::int32_t, 4> {
 public:
     constexpr KpVec4i() = default;
+    /// Of these components.
     constexpr KpVec4i(std::int32_t x, std::int32_t y, std::int32_t z, std::int32_t w) : KpVecBase(x, y, z, w) {}
     /// From a vector of another component type, each component converted as by static_cast.
     template <typename Vector, typename Component>

@@ -7,15 +7,19 @@
 #include <cstdint>
 #include <iosfwd>
 
-/// What the fixed-size vectors share: `Size` components of type `Component` and nothing else, so that the object is its
-/// own byte image. `Vector` is the class that derives from it (KpVec3f ...) and is what the operators give.
+/// Base of the fixed-size vectors: `Size` components of type `Component` and nothing else, so that
+/// the object is its own byte image. `Vector` is the class that derives from it (KpVec3f ...) and
+/// is what the operators return.
 ///
-/// All arithmetic is done in the width of the component, sums from x to the last. A plain value: no errors, no
-/// allocation; different objects may be used by different threads. A default-made vector is not set to anything.
+/// All arithmetic is done in the width of the component, sums from x to the last. A plain value:
+/// no errors, no allocation; different objects may be used by different threads. A default-made
+/// vector is not initialised.
 template <typename Vector, typename Component, int Size>
 class KpVecBase {
 public:
+    /// Type of the components.
     using value_type = Component;
+    /// Number of components.
     static constexpr int size() { return Size; }
 
     /// Component `i`, from 0; not checked.
@@ -24,6 +28,7 @@ public:
         KPLIB_CHECK(i >= 0 && i < Size, "KpVecBase: the index is not in [0, size())");
         return v_[i];
     }
+    /// As above.
     constexpr Component operator[](int i) const
     {
         KPLIB_CHECK(i >= 0 && i < Size, "KpVecBase: the index is not in [0, size())");
@@ -31,19 +36,32 @@ public:
     }
     /// The components one after the other, x first.
     constexpr Component* data() { return v_; }
+    /// As above.
     constexpr const Component* data() const { return v_; }
+    /// The components as a range.
     constexpr Component* begin() { return v_; }
+    /// The components as a range.
     constexpr Component* end() { return v_ + Size; }
+    /// The components as a range.
     constexpr const Component* begin() const { return v_; }
+    /// The components as a range.
     constexpr const Component* end() const { return v_ + Size; }
 
+    /// A component by name.
     constexpr Component& x() { return v_[0]; }
+    /// A component by name.
     constexpr Component x() const { return v_[0]; }
+    /// A component by name.
     constexpr Component& y() { return v_[1]; }
+    /// A component by name.
     constexpr Component y() const { return v_[1]; }
+    /// A component by name.
     constexpr Component& z() requires(Size > 2) { return v_[2]; }
+    /// A component by name.
     constexpr Component z() const requires(Size > 2) { return v_[2]; }
+    /// A component by name.
     constexpr Component& w() requires(Size > 3) { return v_[3]; }
+    /// A component by name.
     constexpr Component w() const requires(Size > 3) { return v_[3]; }
 
     /// The sum of the products of the components.
@@ -60,6 +78,7 @@ public:
         return {y() * other.z() - z() * other.y(), z() * other.x() - x() * other.z(),
                 x() * other.y() - y() * other.x()};
     }
+    /// The sum of the squares.
     constexpr Component squaredLength() const { return dot(static_cast<const Vector&>(*this)); }
     /// The square root of squaredLength(); of integers its whole part.
     Component length() const
@@ -75,36 +94,42 @@ public:
 
     // Operators between two vectors work component by component, those with a number on each component.
 
+    /// Component by component, or on each component.
     constexpr Vector& operator+=(const Vector& other)
     {
         for (int i = 0; i < Size; ++i)
             v_[i] += other.v_[i];
         return self();
     }
+    /// Component by component, or on each component.
     constexpr Vector& operator-=(const Vector& other)
     {
         for (int i = 0; i < Size; ++i)
             v_[i] -= other.v_[i];
         return self();
     }
+    /// Component by component, or on each component.
     constexpr Vector& operator*=(const Vector& other)
     {
         for (int i = 0; i < Size; ++i)
             v_[i] *= other.v_[i];
         return self();
     }
+    /// Component by component, or on each component.
     constexpr Vector& operator/=(const Vector& other)
     {
         for (int i = 0; i < Size; ++i)
             v_[i] /= other.v_[i];
         return self();
     }
+    /// Component by component, or on each component.
     constexpr Vector& operator*=(Component factor)
     {
         for (Component& c : v_)
             c *= factor;
         return self();
     }
+
     /// Divides each component; of integers toward zero, and by 0 not at all allowed.
     constexpr Vector& operator/=(Component divisor)
     {
@@ -113,13 +138,21 @@ public:
         return self();
     }
 
+    /// Component by component, or on each component.
     friend constexpr Vector operator+(Vector a, const Vector& b) { return a += b; }
+    /// Component by component, or on each component.
     friend constexpr Vector operator-(Vector a, const Vector& b) { return a -= b; }
+    /// Component by component, or on each component.
     friend constexpr Vector operator*(Vector a, const Vector& b) { return a *= b; }
+    /// Component by component, or on each component.
     friend constexpr Vector operator/(Vector a, const Vector& b) { return a /= b; }
+    /// Component by component, or on each component.
     friend constexpr Vector operator*(Vector a, Component factor) { return a *= factor; }
+    /// Component by component, or on each component.
     friend constexpr Vector operator*(Component factor, Vector a) { return a *= factor; }
+    /// Component by component, or on each component.
     friend constexpr Vector operator/(Vector a, Component divisor) { return a /= divisor; }
+    /// Each component negated.
     friend constexpr Vector operator-(Vector a)
     {
         for (Component& c : a.v_)
@@ -146,6 +179,7 @@ public:
 
 protected:
     constexpr KpVecBase() = default;
+    /// Of these components.
     template <std::same_as<Component>... Components>
     requires(sizeof...(Components) == Size) constexpr KpVecBase(Components... components) : v_{components...} {}
     /// Each component converted as by static_cast.

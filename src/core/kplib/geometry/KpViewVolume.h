@@ -13,38 +13,47 @@
 
 /// What a camera sees: a box or a frustum in the world, for picking, projection and culling.
 ///
-/// Screen coordinates go from (0, 0) at the lower left of the viewport to (1, 1) at the upper right. A plain value. It
-/// has no shape that means anything until ortho(), perspective() or frustum() ran. There are no errors: a degenerate
-/// volume divides by zero and spreads NaN.
+/// Screen coordinates go from (0, 0) at the lower left of the viewport to (1, 1) at the upper
+/// right. A plain value. Its shape is undefined until ortho(), perspective() or frustum() is
+/// called. There are no errors: a degenerate volume divides by zero and gives NaN.
 class KPLIB_API KpViewVolume {
 public:
+    /// How points are projected.
     enum Type : std::int32_t { Orthographic, Perspective };
 
     KpViewVolume() = default;
 
     // The eye goes to the origin and looks along -z; the rectangle is the near one. Stereo and camera offset stay.
 
+    /// A box between these bounds.
     void ortho(float left, float right, float bottom, float top, float near, float far);
     /// `fovy` is the angle between bottom and top in radians, `aspect` the width over the height.
     void perspective(float fovy, float aspect, float near, float far);
-    /// The near rectangle is at z = +near, which is meant: for one before the eye, `near` and `far` are negative.
+    /// The near rectangle is at z = +near: for one in front of the eye, `near` and `far` are
+    /// negative.
     void frustum(float left, float right, float bottom, float top, float near, float far);
 
+    /// Moves the eye and the volume.
     void translateCamera(const KpVec3f& translation);
     /// About the eye.
     void rotateCamera(const KpRotation& rotation);
     /// Shrinks the near rectangle about its center to the share abs(factor) of its width, height or both.
     void scale(float factor);
+    /// @{
+    /// As above, in one direction.
     void scaleWidth(float factor);
     void scaleHeight(float factor);
+    /// @}
+
     /// Moves the volume by `matrix`. Under a mirror left and right change places, so that the rectangle stays
     /// right-handed as seen from the eye. Stereo and camera offset go back to their defaults.
     void transform(const KpMat4f& matrix);
 
     /// The part in front of a rectangle on the screen.
     KpViewVolume narrow(float left, float bottom, float right, float top) const;
-    /// The part between two depths, fractions from 1 at the near plane to 0 at the far one. The clamped `near` itself
-    /// becomes nearDist(), which is meant. Stereo and camera offset go back to their defaults.
+    /// The part between two depths, fractions from 1 at the near plane to 0 at the far one. The
+    /// clamped `near` itself becomes nearDist(). Stereo and camera offset go back to their
+    /// defaults.
     KpViewVolume zNarrow(float near, float far) const;
     /// Both: x and y of `box` are the rectangle, zmax is near and zmin is far.
     KpViewVolume narrow(const KpBox3f& box) const;
@@ -59,14 +68,19 @@ public:
 
     /// The points of the near and the far plane that are seen at `point` of the screen, and the line through them.
     void projectPointToLine(const KpVec2f& point, KpVec3f& near, KpVec3f& far) const;
+    /// @{
+    /// The same as a line.
     void projectPointToLine(const KpVec2f& point, KpLine& line) const;
     KpLine projectPointToLine(const KpVec2f& point) const;
+    /// @}
+
     /// z is the depth from 0 at the near plane to 1 at the far one.
     void projectToScreen(const KpVec3f& world, KpVec3f& screen) const;
     /// Width and height on the screen of the eight corners' bounding rectangle.
     KpVec2f projectBox(const KpBox3f& box) const;
     /// The plane at `distance` from the eye that faces it.
     KpPlane getPlane(float distance) const;
+    /// The point at `distance` along the viewing direction from the eye.
     KpVec3f getSightPoint(float distance) const { return projPoint_ + projDir_ * distance; }
     /// What is seen at `point` of the screen in getPlane().
     KpVec3f getPlanePoint(float distance, const KpVec2f& point) const;
@@ -75,8 +89,8 @@ public:
     /// Turns what is upright in the world, y up and x right, to the up and right of the view; with `rightAngleOnly`
     /// only by right angles.
     KpRotation getAlignRotation(bool rightAngleOnly) const;
-    /// How long a segment at `center` is that spans `normRadius` of the screen; for handles of steady size. What is off
-    /// the screen is measured at its border. 1 if there is no answer.
+    /// How long a segment at `center` is that spans `normRadius` of the screen; for handles of
+    /// steady size. What is off the screen is measured at its border. 1 if there is no result.
     float getWorldToScreenScale(const KpVec3f& center, float normRadius) const;
 
     /// Whether the point is in the volume, its faces included. Not in one whose nearDist() and nearToFar() are 0.
@@ -90,52 +104,85 @@ public:
     /// Whether the box from `min` to `max` lies wholly behind the plane.
     static bool outsideTest(const KpPlane& plane, const KpVec3f& min, const KpVec3f& max);
 
+    /// How points are projected.
     Type type() const { return type_; }
     const KpVec3f& projPoint() const { return projPoint_; }  ///< the eye, or a point on the central axis
     const KpVec3f& projDir() const { return projDir_; }      ///< of length 1
     float nearDist() const { return nearDist_; }             ///< of the near plane from the eye
-    float nearToFar() const { return nearToFar_; }
+    float nearToFar() const { return nearToFar_; }           ///< from the near plane to the far one
     // The lower left, lower right and upper left corner of the near rectangle: in the world, and relative to the eye.
+    /// @{
+    /// A corner.
     const KpVec3f& llf() const { return llf_; }
     const KpVec3f& lrf() const { return lrf_; }
     const KpVec3f& ulf() const { return ulf_; }
     const KpVec3f& llfO() const { return llfO_; }
     const KpVec3f& lrfO() const { return lrfO_; }
     const KpVec3f& ulfO() const { return ulfO_; }
+    /// @}
 
     // Stereo, of a perspective alone: mode 0 is off, 1 one eye and any other value the other one. The scales are for
     // the distance of the eyes and for what comes of it.
+    /// @{
+    /// Scale of the distance of the eyes.
     float stereoEyeScale() const { return stereoEyeScale_; }
     void setStereoEyeScale(float scale) { stereoEyeScale_ = scale; }
+    /// @}
+
+    /// Scale of the offset that follows from it.
     float stereoOffsetScale() const { return stereoOffsetScale_; }
+    /// As above.
     void setStereoOffsetScale(float scale) { stereoOffsetScale_ = scale; }
+    /// Which eye: 0 for none.
     std::int32_t stereoMode() const { return stereoMode_; }
+    /// As above.
     void setStereoMode(std::int32_t mode) { stereoMode_ = mode; }
 
     // The offset of the eye in place of the one that stereo computes; 0 while it isn't set.
+    /// Whether there is such an offset.
     bool isCameraOffsetSet() const { return cameraOffsetIsSet_ != 0; }
+    /// The offset.
     float getCameraOffset() const { return cameraOffset_; }
+    /// Sets the offset.
     void setCameraOffset(float offset);
+    /// Returns to the offset that stereo computes.
     void unsetCameraOffset();
 
 private:
+    /// As above.
     void setShape(Type type, const KpVec3f& llf, const KpVec3f& lrf, const KpVec3f& ulf, float near, float far);
+    /// As above.
     void rebuildCorners();
+    /// As above.
     void moveSidesIn(const KpVec3f& step);
+    /// As above.
     void moveBottomAndTopIn(const KpVec3f& step);
+    /// As above.
     KpVec3f width() const { return lrfO_ - llfO_; }
+    /// As above.
     KpVec3f height() const { return ulfO_ - llfO_; }
+    /// As above.
     KpPlane face(int i) const;
+    /// As above.
     float stereoShift(float width) const;
 
+    /// As above.
     Type type_ = Orthographic;
+    /// As above.
     KpVec3f projPoint_{0, 0, 0}, projDir_{0, 0, 0};
+    /// As above.
     float nearDist_ = 0, nearToFar_ = 0;
+    /// As above.
     KpVec3f llf_{0, 0, 0}, lrf_{0, 0, 0}, ulf_{0, 0, 0};  // always the eye and the three below
+    /// As above.
     KpVec3f llfO_{0, 0, 0}, lrfO_{0, 0, 0}, ulfO_{0, 0, 0};
+    /// As above.
     float stereoEyeScale_ = 1, stereoOffsetScale_ = 1;
+    /// As above.
     std::int32_t stereoMode_ = 0;
+    /// As above.
     float cameraOffset_ = 0;
+    /// As above.
     std::int32_t cameraOffsetIsSet_ = 0;
 };
 

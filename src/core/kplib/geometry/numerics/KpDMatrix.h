@@ -5,39 +5,48 @@
 
 #include <cstddef>
 
-/// A dense matrix of any size, row by row, with the linear algebra that the 3x3 and 4x4 types cannot do. float is the
-/// one element type there is.
+/// A dense matrix of any size, row by row, with the linear algebra that the 3x3 and 4x4 types
+/// cannot do. float is the only element type.
 ///
 /// Each matrix owns its block: copies are deep. An empty one has no block. Exhausted memory is a KpMemoryException
 /// where nothing else is said, and the matrix is as before. No shared state; one thread at a time.
 template <typename T>
 class KpDMatrix {
 public:
+    /// Type of the elements.
     using value_type = T;
 
     KpDMatrix() noexcept = default;
-    /// The elements are not set to anything.
+    /// The elements are not initialised.
     KpDMatrix(int rows, int cols) { resize(rows, cols); }
+    /// Copies the elements.
     KpDMatrix(const KpDMatrix& other) { *this = other; }
+    /// Takes the block; `other` is left empty.
     KpDMatrix(KpDMatrix&& other) noexcept { swap(other); }
     ~KpDMatrix();
 
+    /// Copies shape and elements.
     KpDMatrix& operator=(const KpDMatrix& other);
+    /// Takes the block of `other`.
     KpDMatrix& operator=(KpDMatrix&& other) noexcept
     {
         KpDMatrix(static_cast<KpDMatrix&&>(other)).swap(*this);
         return *this;
     }
+    /// Exchanges the blocks.
     void swap(KpDMatrix& other) noexcept;
 
     /// Nothing if the shape is this one. Else the elements keep their places in memory, not their rows and columns,
     /// and new ones are not set to anything. Negative counts are not allowed.
     void resize(int rows, int cols);
 
+    /// Number of rows.
     int rows() const noexcept { return rows_; }
+    /// Number of columns.
     int cols() const noexcept { return cols_; }
     /// Element [i][j] is at i * cols() + j; null for an empty matrix.
     T* data() noexcept { return data_; }
+    /// As above.
     const T* data() const noexcept { return data_; }
     /// The elements of a row; m[row][column], not checked.
     T* operator[](int row) noexcept
@@ -45,6 +54,7 @@ public:
         KPLIB_CHECK(row >= 0 && row < rows_, "KpDMatrix: the row is not in [0, rows())");
         return data_ + place(row);
     }
+    /// As above.
     const T* operator[](int row) const noexcept
     {
         KPLIB_CHECK(row >= 0 && row < rows_, "KpDMatrix: the row is not in [0, rows())");
@@ -58,11 +68,12 @@ public:
     /// one error in the log, and this stays.
     KpDMatrix& operator*=(const KpDMatrix& other);
 
-    /// The singular values of this m by n matrix A: A = U diag(w) transpose(V), with U m by n and V n by n, whose
-    /// columns are orthonormal (those of U that belong to a row that A doesn't have are 0). `w`: place for n values,
-    /// none negative, in no order. False, with one warning in the log and the three left as they stand, if a value
-    /// hasn't converged when its `maxIterations`-th iteration begins; 30 is plenty. U and V are neither this nor
-    /// each other. O(m n^2). Golub and Reinsch, "Singular value decomposition and least squares solutions",
+    /// The singular values of this m by n matrix A: A = U diag(w) transpose(V), with U m by n and
+    /// V n by n, whose columns are orthonormal (those of U that belong to a row that A doesn't
+    /// have are 0). `w`: place for n values, none negative, in no order. False, with one warning
+    /// in the log and the three left as they stand, if a value has not converged when its
+    /// `maxIterations`-th iteration begins; 30 suffices. U and V are neither this nor each other.
+    /// O(m n^2). Golub and Reinsch, "Singular value decomposition and least squares solutions",
     /// Numerische Mathematik 14, 1970.
     bool SVD(KpDMatrix& U, T* w, KpDMatrix& V, int maxIterations) const;
 

@@ -15,8 +15,12 @@
 class KPLIB_API KpFitPlane {
 public:
     KpFitPlane() = default;
+    /// @{
+    /// Copies points and results.
     KpFitPlane(const KpFitPlane&) = default;
     KpFitPlane& operator=(const KpFitPlane&) = default;
+    /// @}
+
     virtual ~KpFitPlane();
 
     /// createPlane(); with fewer than 3 points nothing. O(n).
@@ -28,9 +32,15 @@ public:
     /// orthogonalPlaneFit(), and projection() from it, which it returns.
     const KpMat4f& createPlane();
 
+    /// @{
+    /// The points, empty at first.
     KpDArray<KpVec3f>& points() { return points_; }
     const KpDArray<KpVec3f>& points() const { return points_; }
+    /// The mean of the points.
+    /// @}
+
     const KpVec3f& centroid() const { return centroid_; }
+    /// The normal, of length 1 after a fit.
     const KpVec3f& normal() const { return normal_; }
     /// Takes a point to its foot on the plane by KpMat4f::multMatrixVec(). Intentional: unlike most matrices, this is
     /// one for column vectors. With a normal along x it collapses toward a line.

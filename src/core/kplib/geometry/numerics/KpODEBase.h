@@ -2,20 +2,24 @@
 
 #include <kplib/foundation/KpExport.h>
 
-/// What the integrators of curves in a vector field share, KpODE2 in the plane and KpODE3 in space: streamlines.
+/// Base of the integrators of curves in a vector field, KpODE2 in the plane and KpODE3 in space:
+/// streamlines.
 ///
-/// An embedded Runge-Kutta method goes along the field in steps that fit the error; the curve is handed out at equal
-/// spacing of its parameter, from the cubic Hermite segment of each step. The parameter is arc length, unless
-/// setNormalization(0) leaves the field its own speed. Set up, init(), then next() or nextSL() until they give another
-/// code than 0. Nothing is logged, nothing allocated. One thread at a time; the field is called on it.
+/// An embedded Runge-Kutta method follows the field in steps that fit the error; the curve is
+/// sampled at equal spacing of its parameter, from the cubic Hermite segment of each step. The
+/// parameter is arc length, unless setNormalization(0) leaves the field its own speed. Set up,
+/// init(), then next() or nextSL() until they give another code than 0. Nothing is logged, nothing
+/// allocated. One thread at a time; the field is called on it.
 template <typename Vector>
 class KPLIB_API KpODEBase {
 public:
+    /// Type of points and derivatives.
     using value_type = Vector;
 
     /// The field at `x`. 0, or any other code where there is no field: the integration then stops with this code.
     using RightHandSide = int (*)(const Vector& x, Vector& derivative, void* userData);
 
+    /// The Runge-Kutta pairs.
     enum Method : int {
         RK21,  ///< explicit midpoint, second order, against Euler
         RK32,  ///< Bogacki and Shampine, 3(2)
@@ -38,9 +42,11 @@ public:
     KpODEBase() { state_.userData = this; }
     /// User data that is the object itself becomes the copy.
     KpODEBase(const KpODEBase& other) { *this = other; }
+    /// Copies the state; user data that is the object itself becomes the copy.
     KpODEBase& operator=(const KpODEBase& other);
     ~KpODEBase() = default;
 
+    /// A Method, RK43 at first; any other number ends the integration with MethodOutOfRange.
     void setMethod(int method) { state_.method = method; }
     /// `min`: a rejected step below it ends the integration with StepTooSmall, also if the field failed before. `max`
     /// bounds all steps but the first.
@@ -74,7 +80,9 @@ public:
     /// A step that can no longer advance ends the integration too: with the last code other than 0 that the field gave
     /// since init(), and with StepTooSmall if it gave none.
     int next(Vector& point, int flag = 0);
+    /// The same with derivatives.
     int next(Vector& point, Vector& derivative, int flag = 0);
+    /// The same with derivatives.
     int next(Vector& point, Vector& derivative, Vector& secondDerivative, int flag = 0);
 
     /// One accepted step at its own size: the new point, the field there, and the size. On another code than 0 the
@@ -84,9 +92,11 @@ public:
     // One attempt at a step of h() from the current point: the new point, the field there, and the estimated error.
     // Another code than 0, and all three untouched, if the field fails.
 
+    /// Explicit midpoint, with Euler's step as the check.
     int rk21(Vector& y, Vector& f, Vector& error) const;
     /// Bogacki and Shampine, "A 3(2) pair of Runge-Kutta formulas", Applied Mathematics Letters 2(4), 1989.
     int rk32(Vector& y, Vector& f, Vector& error) const;
+    /// The classic method, with a third-order check.
     int rk43(Vector& y, Vector& f, Vector& error) const;
     /// Dormand and Prince, "A family of embedded Runge-Kutta formulae", Journal of Computational and Applied
     /// Mathematics 6(1), 1980.
@@ -104,18 +114,30 @@ public:
     /// Frozen. The samples of next() do not change.
     void freeze(const Vector& point);
 
+    /// Size of the next step.
     float h() const { return state_.h; }
+    /// As it was set.
     float hMin() const { return state_.hMin; }
+    /// As it was set.
     float hMax() const { return state_.hMax; }
+    /// As it was set.
     float hSampling() const { return state_.hSampling; }
+    /// As it was set.
     float tolerance() const { return state_.tolerance; }
+    /// As it was set.
     float orientation() const { return state_.orientation; }
+    /// As it was set.
     int checkHMin() const { return state_.checkHMin; }
+
     /// 0 while the integration runs, else the code that it ended with.
     int status() const { return state_.status; }
+    /// As it was set.
     int normalization() const { return state_.normalization; }
+    /// As it was set.
     int method() const { return state_.method; }
+    /// As it was set.
     void* userData() const { return state_.userData; }
+    /// As it was set.
     RightHandSide rightHandSide() const { return state_.rightHandSide; }
 
 private:

@@ -11,14 +11,15 @@
 /// S. D. Durham, "Improving a poor random number generator", ACM TOMS 2(1), 1976. Not for secrets.
 class KPLIB_API KpRandom {
 public:
+    /// As initialize().
     explicit KpRandom(std::int64_t seed = 1) { initialize(seed); }
 
     /// Starts the sequence of `seed`; 0 counts as 1. A multiple of 2^31 - 1 other than 0 is a fixed point of the
     /// generator: it gives nothing but 0.
     void initialize(std::int64_t seed);
 
-    /// The next number of this object's sequence, above 0 and at most 0.99999988. Threads that call it at the same time
-    /// may get the same numbers, and do no other harm.
+    /// The next number of this object's sequence, above 0 and at most 0.99999988. Threads that
+    /// call it at the same time may get the same numbers, with no other effect.
     double next();
 
     /// As next(), from one generator for the whole process, which the first call seeds from the clock.

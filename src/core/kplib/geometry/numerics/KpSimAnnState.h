@@ -25,12 +25,19 @@ public:
 
 protected:
     KpSimAnnState() = default;
+    /// @{
+    /// Copies the state of the proposal.
     KpSimAnnState(const KpSimAnnState&) = default;
     KpSimAnnState& operator=(const KpSimAnnState&) = default;
+    /// @}
+
     ~KpSimAnnState() = default;  // states are not deleted through this class
 
+    /// Proposes a change, as suggestChange() describes.
     virtual float doSuggestChange() = 0;
+    /// Makes the change that was proposed last.
     virtual void doExecuteChange() = 0;
+    /// The energy.
     virtual float doEvaluate() = 0;
 
 private:

@@ -5,10 +5,12 @@
 #include <utility>
 #include <vector>
 
-/// An ellipse along the axes: what circles and ellipses share.
+/// An ellipse along the axes: the base of circles and ellipses.
 class KPLIB_API AbstractEllipse2D : public CurvedShape2D {
 public:
+    /// The centre.
     const KpVec2f& center() const { return center_; }
+    /// Moves the centre.
     void setCenter(const KpVec2f& center) { center_ = center; }
     /// Both radii.
     KpVec2f radius() const { return {radiusX(), radiusY()}; }
@@ -16,13 +18,19 @@ public:
     /// An approximation: the point of the outline in the direction of `p`, as seen after the ellipse has been made a
     /// circle.
     std::pair<bool, KpVec2f> closestPoint(KpVec2f p) const override;
+    /// The box of centre and radii.
     Rectangle2D boundingBox() const override;
     /// Both radii are exactly 0.
     bool isEmpty() const override;
     std::vector<KpVec2f> tesselate(unsigned int segments) const override;
 
+    /// @{
+    /// A radius; negative ones are kept as given.
     virtual float radiusX() const = 0;
     virtual float radiusY() const = 0;
+    /// The enclosed area.
+    /// @}
+
     virtual float area() const;
     /// By S. Ramanujan's second approximation ("Modular equations and approximations to pi", 1914).
     virtual float circumference() const;
@@ -31,6 +39,7 @@ public:
 
 protected:
     AbstractEllipse2D() = default;
+    /// An ellipse with that centre.
     explicit AbstractEllipse2D(const KpVec2f& center) : center_(center) {}
 
     /// The point at `angle` for these radii.

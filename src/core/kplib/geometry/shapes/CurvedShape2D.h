@@ -8,8 +8,12 @@
 class KPLIB_API CurvedShape2D : public AbstractShape2D {
 public:
     CurvedShape2D() = default;
+    /// @{
+    /// Copies the shape.
     CurvedShape2D(const CurvedShape2D&) = default;
     CurvedShape2D& operator=(const CurvedShape2D&) = default;
+    /// @}
+
     ~CurvedShape2D() override;
 
     /// The ends of `segments` chords in order, one point more than chords; the last nearly repeats the first.

@@ -15,21 +15,27 @@ public:
     /// From `p0` to `p1`.
     KpLine2D(const KpVec2f& p0, const KpVec2f& p1) { setValue(p0, p1); }
 
+    /// Becomes empty.
     void makeEmpty() { *this = KpLine2D(); }
+    /// From `p0` to `p1`.
     void setValue(const KpVec2f& p0, const KpVec2f& p1) { setPosDir(p0, p1 - p0); }
+    /// Replaces position and direction.
     void setPosDir(const KpVec2f& position, const KpVec2f& direction)
     {
         position_ = position;
         direction_ = direction;
     }
 
+    /// Where the segment starts.
     const KpVec2f& position() const { return position_; }
+    /// From the start of the segment to its end.
     const KpVec2f& direction() const { return direction_; }
     /// Both ends of the segment.
     std::vector<KpVec2f> getCoordinates() const { return {position_, position_ + direction_}; }
 
     /// Whether a number is NaN or the direction is exactly zero.
     bool isEmpty() const;
+    /// Whether there is a direction.
     bool isNotEmpty() const { return !isEmpty(); }
 
     /// Distance of `p` from the line, which goes on at both ends: above 0 to the left of the direction (y upward). From
@@ -46,7 +52,9 @@ public:
     /// Whether the lines meet, and where, into `out` if it isn't null. Parallel lines and empty ones never do. With
     /// `segmentsOnly` the point has to lie in both segments, ends included.
     bool intersects(const KpLine2D& other, bool segmentsOnly, KpVec2f* out) const;
+    /// As above, for lines.
     bool intersects(const KpLine2D& other, KpVec2f* out) const { return intersects(other, false, out); }
+    /// As above, for segments.
     bool intersectsSegments(const KpLine2D& other, KpVec2f* out) const { return intersects(other, true, out); }
 
 private:

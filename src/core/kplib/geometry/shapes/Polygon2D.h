@@ -5,11 +5,12 @@
 #include <utility>
 #include <vector>
 
-/// A filled polygon: a closed list of vertices, whose last one is the first again. It may cross itself; what lies
-/// inside is told by the even-odd rule.
+/// A filled polygon: a closed list of vertices, whose last one is the first again. It may cross
+/// itself; the even-odd rule decides what is inside.
 class KPLIB_API Polygon2D : public Polyline2D {
 public:
     Polygon2D() = default;
+    /// As setVertices().
     explicit Polygon2D(std::vector<KpVec2f> vertices) { Polygon2D::setVertices(std::move(vertices)); }
 
     /// Closes the list, if it isn't closed. A single vertex becomes two equal ones.
