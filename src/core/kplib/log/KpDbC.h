@@ -3,7 +3,7 @@
 #include <kplib/foundation/KpExport.h>
 
 // Design by contract: switches and a hook that the checking macros of an application share. The library itself keeps
-// them and asks nothing of them. To be set at start-up, before other threads run.
+// them but does not use them. Set them at start-up, before other threads run.
 
 /// What kind of promise was broken.
 enum DbCEventType : int {
@@ -18,7 +18,7 @@ extern KPLIB_API bool kp_DbC_handleEvents;
 /// Whether a handled one stops at a breakpoint.
 extern KPLIB_API bool kp_DbC_breakOnEvent;
 
-/// Told of a broken contract: kind, condition, file, line, function and a message for the reader; texts may be null.
+/// Receives a broken contract: kind, condition, file, line, function and a message for the reader; texts may be null.
 using DbCCallback = void (*)(DbCEventType type, const char* condition, const char* file, unsigned int line,
                              const char* function, const char* message);
 

@@ -8,7 +8,7 @@
 ///         return false;
 namespace Tm {
 
-/// This thread's last error, a success when there is none. It is forgotten with the call unless `keep` is true.
+/// This thread's last error, a success when there is none. The call clears it unless `keep` is true.
 KPLIB_API KpResult lastError(bool keep);
 
 /// Makes `result` this thread's last error, whatever it was; a success clears it.
@@ -20,7 +20,7 @@ KPLIB_API KpResult tmError(KpResult::Code code, const char* file, unsigned int l
                            const char* date, const char* time, const char* data, bool verbose, bool setLastError);
 
 /// Whether `result` is a failure. One is logged, becomes the last error unless there is one already (the first failure
-/// stays until somebody takes it), and goes to the notification callbacks.
+/// stays until lastError() takes it), and goes to the notification callbacks.
 KPLIB_API bool fail(const KpResult& result);
 
 /// The same.

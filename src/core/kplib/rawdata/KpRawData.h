@@ -20,9 +20,9 @@ class KPLIB_API KpRawData {
 public:
     KpRawData() = delete;
 
-    /// @{
     /// @name Conversion and mapping
     /// Source and target may be one buffer, or overlap with the target first, if target elements are no larger.
+    /// @{
 
     /// Copies `n` elements into the type of `dst`; none if `n` is below 1. Equal types, of any kind, are copied as
     /// bytes.
@@ -31,7 +31,7 @@ public:
     /// 255. NaN becomes 0, and the smallest value as an int. Ushort to short keeps the bits (40000 is -25536), floats
     /// of 2147483648 and more are -2147483648 as an int, and doubles stop at -2147483646: peers rely on these three. An
     /// error is logged, and nothing written, if one type is complex or the target is no number; a source that is no
-    /// number is ignored without a word.
+    /// number is ignored silently.
     static void memcpy(KpTypedPointer dst, KpTypedPointer src, long n);
 
     /// Converts (element + offset) * scale as memcpy() does, and limits ushort to short and equal types too.
@@ -50,6 +50,8 @@ public:
     /// @}
 
     /// @name Questions
+    /// @{
+
     /// Smallest and largest of `n` elements, rounded to float; the first one is always read. The parts of complex
     /// numbers share one range. NaN is skipped, but stays in both results if it comes first. For other types the
     /// results are left as they were.
@@ -58,8 +60,10 @@ public:
     /// Whether no element, and no part of a complex one, is less or greater than the first; true if `n` is 0. NaN at
     /// the head gives false, later NaN is skipped. False for other types. Stops at the first difference.
     static bool isConstant(KpTypedPointer data, unsigned long n);
-    /// @{
+    /// @}
+
     /// @name Byte order, in place
+    /// @{
 
     /// Reverses the bytes of each element; of the two halves of complex numbers and string references each by itself.
     static void swapBytes(KpTypedPointer data, unsigned long n);
@@ -71,21 +75,19 @@ public:
     /// @}
 
     /// @name Files
+    /// @{
+
     /// Reads or writes `count` items of `size` bytes, at least 1, by pieces of 1 MiB up to the first short one. The
     /// number of whole items transferred.
     static unsigned long fread(void* data, unsigned long size, unsigned long count, FILE* f);
-    /// As above.
     static unsigned long fwrite(const void* data, unsigned long size, unsigned long count, FILE* f);
 
     /// Elements in a file of the named byte order; the number of whole ones transferred. readBigEndian() swaps all `n`
     /// elements in memory, however few it read. writeBigEndian() swaps the caller's buffer for the time of the call:
-    /// nobody may look at it meanwhile.
+    /// no other thread may read it meanwhile.
     static long readBigEndian(KpTypedPointer data, unsigned long n, FILE* f);
-    /// As above.
     static long writeBigEndian(KpTypedPointer data, unsigned long n, FILE* f);
-    /// As above.
     static long readLittleEndian(KpTypedPointer data, unsigned long n, FILE* f);
-    /// As above.
     static long writeLittleEndian(KpTypedPointer data, unsigned long n, FILE* f);
 
     /// Reads from a descriptor until `size` bytes have come or it ends, by calls of 4 MiB at most if `limitChunkSize`
@@ -94,21 +96,23 @@ public:
 
     /// Writes all `size` bytes to a descriptor and returns their number; all bits set at the first failure.
     static unsigned long write(int fd, const void* data, unsigned long size);
-    /// @{
+    /// @}
+
     /// @name Blocks in memory
+    /// @{
 
     /// Mirrors a block of `dims` voxels in place along `axis`, 0 to 2. False, and nothing changes, for another axis, an
     /// empty block, null, or if there is no memory for the exchange.
     static bool flip(void* data, int bytesPerVoxel, const int* dims, int axis);
 
     /// Cuts or extends a block to the box from `min` to `max`, both inclusive. `data`, a block of malloc, and `dims`
-    /// then tell the new block; addresses into the old one are void. Voxels outside of it are copies of `fillValue`, or
-    /// of the nearest voxel if that is null. False, and nothing changes, for an empty box or block, null, or if there
-    /// is no memory.
+    /// then describe the new block; addresses into the old one are void. Voxels outside of it are copies of
+    /// `fillValue`, or of the nearest voxel if that is null. False, and nothing changes, for an empty box or block,
+    /// null, or if there is no memory.
     static bool crop(void*& data, int bytesPerVoxel, int* dims, const int* min, const int* max, const void* fillValue);
 
-    /// Changes the order of the axes in place: axis i becomes what axis perm[i] was, and `dims` tells the new sizes. A
-    /// voxel has `nDataVar` elements, which stay together; if isConstant() holds for all of them, only the sizes
+    /// Changes the order of the axes in place: axis i becomes what axis perm[i] was, and `dims` receives the new sizes.
+    /// A voxel has `nDataVar` elements, which stay together; if isConstant() holds for all of them, only the sizes
     /// change. Takes one slice of the two largest sizes and a bit a row of memory meanwhile. False, and nothing
     /// changes, if `perm` is no permutation of 0, 1, 2, if there is no memory, or, with a line in the log, for elements
     /// that are no numbers (but for voxels of four bytes). F. Gustavson, L. Karlsson and B. Kagstrom, "Parallel and
@@ -121,10 +125,10 @@ public:
     /// by dy / fy by dz / fz voxels and is the caller's. What is left over at the far edges is never read. Factors and
     /// `nDataVar` are at least 1; nothing is written for others, or for factors above their sizes.
     ///
-    /// @{
     /// `progress` may be null. It gets a scope of `dz` steps, closed on return, and after each layer of voxels the step
     /// reached, unless it is canceled: then the rest of the target is left as it was. An error is logged if the
     /// elements are no numbers.
+    /// @{
 
     /// The mean of each block, cut towards zero for integers. Sums run along x, then y, then z: those of real numbers
     /// are kept in the element's own precision and so depend on that order.
@@ -143,8 +147,8 @@ public:
 
     /// The first voxel of each block as it stands: labels must not be mixed.
     ///
-    /// For ushort, `b` is the source and `a` the target; for all other types `a` is the source and `b` the target, and
-    /// that is meant.
+    /// For ushort, `b` is the source and `a` the target; for all other types `a` is the source and `b` the target.
+    /// Intentional: existing callers depend on it.
     static void downSampleLabels3D(void* a, KpTypedPointer b, unsigned long dx, unsigned long dy, unsigned long dz,
                                    int fx, int fy, int fz, KpProgressInterface* progress);
     /// @}
