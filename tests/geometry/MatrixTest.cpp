@@ -281,7 +281,8 @@ TEST(KpMat4f, setTransformAppliesItsPartsInOrder)
     KpVec3f t, s;
     KpRotation r, so;
     for (int i = 0; i < 200; ++i) {
-        const KpVec3f translation = someVector(random, 2), center = i % 2 ? someVector(random, 2) : origin;
+        const KpVec3f translation = someVector(random, 2), corner(i % 6 == 2, i % 8 == 2, i % 10 == 2);
+        const KpVec3f center = i % 2 ? someVector(random, 2) : corner;
         const KpVec3f scale = i % 3 ? KpVec3f(0.5F, 2, 3) : ones, v = someVector(random, 2);
         const KpRotation rotation(someVector(random, 2), 1), orientation(someVector(random, 2), 2);
         m.setTransform(translation, rotation, scale, orientation, center);

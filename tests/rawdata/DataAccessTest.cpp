@@ -155,9 +155,6 @@ TEST(Volume, subBoxLooksOnAndCloneCopies)
         EXPECT_EQ(source.clone(copy, none).isOk(), (n < 6));
         EXPECT_EQ(copy->hasData(), (n < 6));
     }
-    const TmDataAccess byte({1L, 1L, 1L}, dense, nullptr, KpPrimType::Byte, 1, none);
-    const FailingMalloc failing(2, 1);  // the block
-    EXPECT_TRUE(byte.clone(copy, none).isBad());
 }
 
 TEST(Volume, linesEqualTheirVoxelsOneByOne)

@@ -82,6 +82,10 @@ TEST(SimulatedAnnealer, findsTheLowestEnergyAndFreezesThere)
     Walk walk;
     annealer.anneal(&walk, true);
     EXPECT_NEAR(walk.at, 17, 1);
+    annealer.setMaxTries(0);
+    walk.proposals = 0;
+    annealer.anneal(&walk, true);
+    EXPECT_EQ(walk.proposals, 0);
 
     annealer.setStartTemperature(1e-6F);  // nothing is accepted but what lowers the energy
     annealer.setMaxTries(40);
