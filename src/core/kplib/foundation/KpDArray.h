@@ -32,6 +32,12 @@ struct KpElementTraits {
 
 /// The growable array of the library: three words, no allocator, no virtual operations.
 ///
+///     KpDArray<int> sizes = {512, 256};
+///     sizes.append(128);
+///     sizes.remove(0);
+///     for (int size : sizes)
+///         std::printf("%d ", size);  // prints: 256 128
+///
 /// Elements are moved as bytes when the array grows or opens a gap (the exceptions are those of
 /// KpElementTraits), so an address of an element is valid only until the next growth. The array
 /// grows by half its size, and only resize(), remax() and the insertions change it; positions are

@@ -6,6 +6,11 @@
 
 /// Smart pointer to an object that counts its handles: a T with ref() and unref(), such as a KpHandable.
 ///
+///     struct Image : KpHandable { int number = 7; };
+///     KpHandle<Image> image(new Image);  // deleted with the last handle
+///     KpHandle<Image> again = image;
+///     std::printf("%d, %d handles\n", again->number, image->refCount());  // prints: 7, 2 handles
+///
 /// One pointer wide. T may be incomplete where handles are only declared. Access is unchecked. Copies on several
 /// threads are as safe as the counter of T; one handle object belongs to one thread at a time.
 template <typename T>

@@ -12,6 +12,10 @@
 
 /// The library's string: an array of char whose last element is the NUL, so size() is length() + 1.
 ///
+///     KpString name(0, "slice%02d.raw", 7);  // the int selects the constructor that formats
+///     name.replaceSubStr(".raw", ".mask");
+///     std::printf("%s %d\n", name.c_str(), name.length());  // prints: slice07.mask 12
+///
 /// Text is bytes, of whatever encoding. Only raw array operations, a move from it and a format
 /// that the platform refuses leave a string without its NUL (an array of size 0), which reads as
 /// "". No positions are checked. One thread at a time.

@@ -15,6 +15,14 @@ class KpPlane;
 /// A coordinate system in the space of its parent: an origin and three axes, which need not be of length 1 or at right
 /// angles. The point (u, v, w) is at origin + u x + v y + w z in the parent's space.
 ///
+///     KpHandle<KpFrameOfReference> patient(new KpFrameOfReference("1.2.3"));
+///     KpHandle<KpCoordinateSystem> slices = patient->createChildSystem();
+///     slices->setOrigin(KpVec3f(-120, -100, 40));
+///     slices->setAxis(KpCoordinateSystem::AxisZ, KpVec3f(0, 0, 2));
+///     const KpMat4f toPatient = slices->asTransformationToFrameOfReference();
+///     const KpVec3f place = toPatient.multVecMatrix(KpVec3f(0, 0, 3));
+///     std::printf("slice 3 is at z = %g\n", double(place.z()));  // prints: slice 3 is at z = 46
+///
 /// Without a parent it floats: it has no frame of reference and is compatible with nothing, itself
 /// included. Input from which no system can be made leaves NaN in the numbers: isValid() is false
 /// then. There are no other errors. For ownership see KpAbstractCoordinateSystem.

@@ -17,6 +17,11 @@ KpLogFilePrivate& logRecord(KpLogFile& log);
 /// log opens none by itself, but goes on in a new one where one is open and has grown beyond its
 /// limit.
 ///
+///     KpLogFile& log = getTheLogInstance();
+///     log.setDateTimeFormat(KpLogFile::NoDateTime);
+///     log.setDefaultModule("Loader");
+///     log.warnf("%d slices are missing", 2);  // prints: W [Loader] 2 slices are missing
+///
 /// A line is time, ": ", a letter for the level, the module in brackets, a blank and the text:
 ///
 ///     14:03:59.120: W [Dicom] text

@@ -36,6 +36,14 @@ KPLIB_API void makeBools(unsigned char* bytes, long count);
 
 /// The byte buffer of the client/server protocol: written by appending with `<<`, read by moving an offset with `>>`.
 ///
+///     TmMsg message;
+///     message << 30 << 0.5F;
+///     int slices = 0;
+///     float spacing = 0;
+///     message >> slices >> spacing;
+///     std::printf("%d %g, %lu bytes left\n", slices, double(spacing), message.bytesAvailable());
+///     // prints: 30 0.5, 0 bytes left
+///
 /// A message is a plain memory image: packed, in the host's byte order (little-endian), without
 /// tags, version or length. The reader must read the same types in the order in which they were
 /// written. The two ends are independent: reading may follow writing. Counts on the wire have 32

@@ -11,6 +11,14 @@
 /// The inner node of the parameter tree: a container of sub-bundles, which stand first and in the order of insertion,
 /// and of parameters. It owns its children.
 ///
+///     HxParamBundle scan("Scan");
+///     scan.set("Slices", 30);
+///     scan.setTag("G0008-0060", "CT");
+///     int slices = 0;
+///     if (scan.findNum("Slices", 1, &slices))
+///         std::printf("%s, %d slices\n", scan.findTag("G0008-0060", "?"), slices);
+///         // prints: CT, 30 slices
+///
 /// Lookups ignore the case of ASCII letters and put a `_` in front of a leading digit, as names
 /// have it. A name with a blank in it also matches what is named by the part before, but for
 /// titles and sorted parameters. A bundle answers to its name and to the first 16 words of its

@@ -8,6 +8,12 @@
 
 /// Operations on flat runs of elements whose type is known at run time only, and on the dense 3D blocks made of them.
 ///
+///     short voxels[] = {-1000, 0, 1000, 3000};
+///     unsigned char shown[4];
+///     KpRawData::mapLinear(shown, voxels, 4, 1000, 255.0 / 4000);  // (voxel + offset) * scale
+///     std::printf("%d %d %d %d\n", shown[0], shown[1], shown[2], shown[3]);
+///     // prints: 0 63 127 255
+///
 /// Numbers here are byte, short, int, float, double and ushort; complex is served where an operation says so. Counts
 /// are counts of elements of the buffer's own type: one of complex is a pair of floats. Elements are packed, x fastest,
 /// then y, then z, and interleaved components sit together; their addresses need no alignment. The host is

@@ -18,6 +18,13 @@
 /// A volume in memory: sizes, element type, components, strides and the memory itself. It is
 /// passed as KpHandle<TmDataAccess>.
 ///
+///     KpHandle<TmDataAccess> volume(new TmDataAccess({4L, 3L, 2L}, KpPrimType::Short, 1,
+///                                                    KpAllocator(KpAllocator::AllocatorMalloc)));
+///     if (volume->hasData())
+///         *static_cast<short*>(volume->dataPtr(1, 2, 1)) = 42;
+///     std::printf("%ld bytes, stride %ld\n", volume->size(), volume->strides()[2]);
+///     // prints: 48 bytes, stride 24
+///
 /// The memory is one block (linear; strides()[2] is above 0) or one block a slice (sliced;
 /// strides()[2] is 0). Voxel (x, y, z) lies at its slice's address + x * strides()[0] + y *
 /// strides()[1], in bytes. The object frees its blocks through its allocator; with an allocator

@@ -8,6 +8,16 @@ class KpWorkerThreadPrivate;
 
 /// One long-lived thread that performs one job again and again, whenever it is asked to.
 ///
+///     struct Sum : KpWorkerThread {
+///         Sum() : KpWorkerThread("Sum") {}
+///         ~Sum() override { terminate(); }
+///         void compute() override { result = a + b; }
+///         int a = 0, b = 0, result = 0;
+///     } sum;
+///     sum.a = 3, sum.b = 4;
+///     sum.start(true);  // until the pass has ended
+///     std::printf("%d\n", sum.result);  // prints: 7
+///
 /// A subclass provides compute(), and stores the input of a pass before start(). There is no queue: one pass at a time.
 /// A pass costs two hand-overs between threads, not the making of one.
 ///

@@ -10,6 +10,12 @@ class KpString;
 
 /// A resizable array of bits, one a voxel: the mask of morphology and flood fill, or one label of a label volume.
 ///
+///     KpBitfield mask(100, KpBitfield::INIT_UNSET);
+///     mask.setRange(10, 19);
+///     mask.unset(10);
+///     std::printf("%lu bits from %lu\n", mask.nSetBits(), mask.firstSetBit());
+///     // prints: 9 bits from 11
+///
 /// Bit i is bit i & 31, from the least significant, of the 32-bit word i >> 5. There is always one
 /// word more than there are full ones: 32 bits take two. That spare word is part of the layout:
 /// fills and the digest include it, functions that count or find bits do not. Operations on many

@@ -6,6 +6,15 @@
 
 /// Labels the connected regions of a 2D or 3D image in one raster pass, and counts what they hold.
 ///
+///     short image[] = {9, 9, 0, 5, 0, 0, 0, 5};
+///     const int dims[] = {4, 2, 1};
+///     unsigned short* labels = nullptr;
+///     KpDArray<KpConnectedComponents::Component> table;
+///     const int n = KpConnectedComponents::labelCC(image, dims, 6, labels, 0, 5, 9, 0, 0, &table);
+///     std::printf("%d regions, the first of %u voxels\n", n, table[1].nVoxels);
+///     // prints: 2 regions, the first of 2 voxels
+///     kpfree(labels);
+///
 /// Images are dense, x fastest, `dims` their three sizes. Neighbours are 4 or 8 (in plane), 6, 18, 26, or 10 (8 and the
 /// faces in z); with any other number each voxel is a component of its own. The result is an image of labels and a
 /// table: entry 0 is the background, all zero, entry i component i, numbered in raster order of the first voxels. Where

@@ -8,6 +8,11 @@
 
 /// Dilation, erosion and flood fill of masks.
 ///
+///     KpBitfield mask(5 * 5 * 5, KpBitfield::INIT_UNSET), grown;
+///     mask.set(2 + 2 * 5 + 2 * 25);
+///     KpMorphology::dilation3D(mask, grown, KpVec3i(5, 5, 5), 1, true);  // 6 neighbours
+///     std::printf("%lu voxels\n", grown.nSetBits());  // prints: 7 voxels
+///
 /// A mask is a field of dims[0] * dims[1] * dims[2] bits, x fastest, rows and slices without gaps; `src` has that many.
 /// Neighbours are the voxels at most one step away along each axis: 6 (in the plane 4) along one axis, 18 along two, 26
 /// (8) along all three. Voxels have no size here; wider effects come from repetition.
