@@ -5,8 +5,8 @@
 
 #include <cstdint>
 
-// Hashes of 32 bits. They don't mix their bits, and that is meant: they are cheap, and the containers that use them
-// expect that. Those of vectors, digests and UUIDs stand beside these types.
+// Hashes of 32 bits. They do not mix their bits: they are cheap, and the containers that use them expect that. Those of
+// vectors, digests and UUIDs stand beside these types.
 
 /// h * 9 + c over the characters, which count as signed; 0 for an empty text.
 constexpr unsigned int kp_hash(const char* s)
@@ -41,6 +41,7 @@ constexpr unsigned int kp_hash(KpID<T, empty> id)
 {
     return kp_hash(static_cast<long long>(id.value()));
 }
+/// As above.
 template <typename T>
 constexpr unsigned int kp_hash(const KpID_C<T>& id)
 {
@@ -53,6 +54,7 @@ constexpr unsigned int qHash(KpID<T, empty> id)
 {
     return kp_hash(id);
 }
+/// As above.
 template <typename T>
 constexpr unsigned int qHash(const KpID_C<T>& id)
 {

@@ -161,4 +161,5 @@ KpString operator+(const KpString& a, Char c)
     return result;
 }
 
+/// Writes the characters.
 KPLIB_API std::ostream& operator<<(std::ostream& out, const KpString& text);

@@ -28,8 +28,12 @@ class KpPlane;
 /// then. There are no other errors. For ownership see KpAbstractCoordinateSystem.
 class KPLIB_API KpCoordinateSystem : public KpAbstractCoordinateSystem {
 public:
-    /// Names of the axes.
-    enum AxisIndex { AxisX, AxisY, AxisZ };  ///< what the operations with an `axis` from 0 to 2 take
+    /// Names of the axes, for operations with an `axis` from 0 to 2.
+    enum AxisIndex {
+        AxisX,  ///< 0
+        AxisY,  ///< 1
+        AxisZ,  ///< 2
+    };
 
     /// Origin zero, unit axes, no parent.
     KpCoordinateSystem() = default;

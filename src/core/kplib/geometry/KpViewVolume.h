@@ -19,7 +19,10 @@
 class KPLIB_API KpViewVolume {
 public:
     /// How points are projected.
-    enum Type : std::int32_t { Orthographic, Perspective };
+    enum Type : std::int32_t {
+        Orthographic,  ///< along parallel lines
+        Perspective,   ///< toward the eye
+    };
 
     KpViewVolume() = default;
 

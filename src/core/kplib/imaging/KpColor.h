@@ -74,8 +74,11 @@ private:
 // L*a*b*. Each reads and writes three floats, calculates in double, and may change its input; values outside the ranges
 // are clamped.
 
+/// From sRGB to XYZ.
 KPLIB_API void rgb2XYZ(float* rgb, float* xyz);
+/// From XYZ to L*a*b*.
 KPLIB_API void XYZ2CIELab(float* xyz, float* lab);
+/// From L*a*b* to XYZ.
 KPLIB_API void CIELab2XYZ(float* lab, float* xyz);
-/// True when blue was clamped or 0; red and green do not count.
+/// From XYZ to sRGB. True when blue was clamped or 0; red and green do not count.
 KPLIB_API bool XYZ2rgb(float* xyz, float* rgb);

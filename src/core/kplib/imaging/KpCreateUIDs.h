@@ -13,7 +13,13 @@
 class KPLIB_API KpCreateUIDs {
 public:
     /// What the identifier is for; the values of the layer above, which stand in the UID as 2 to 6.
-    enum UIDtype : int { UIDtype0 = 0, UIDtype1 = 1, UIDtype2 = 2, UIDtype3 = 3, UIDtype4 = 4 };
+    enum UIDtype : int {
+        UIDtype0 = 0,  ///< 2 in the UID
+        UIDtype1 = 1,  ///< 3 in the UID
+        UIDtype2 = 2,  ///< 4 in the UID
+        UIDtype3 = 3,  ///< 5 in the UID
+        UIDtype4 = 4,  ///< 6 in the UID
+    };
 
     KpCreateUIDs();
 

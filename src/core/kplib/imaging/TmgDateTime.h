@@ -5,27 +5,30 @@
 #include <string>
 #include <utility>
 
-// Dates and times of DICOM headers (VR DA "yyyymmdd", TM "hhmmss.ffffff") as texts for people and for sorting. How
-// dates look is up to hooks, process-wide and unlocked, to be set before other threads start.
+// Dates and times of DICOM headers (VR DA "yyyymmdd", TM "hhmmss.ffffff") as texts for people and for sorting. Hooks
+// choose the form of dates: process-wide and unlocked, set them before other threads start.
 
 namespace Tmg {
 
-/// Text for a date, and the date yyyymmdd of a text.
+/// Makes the text for a date.
 using DateReformatLong = std::string (*)(long yyyymmdd);
+/// Reads the date yyyymmdd out of a text.
 using DateReformatString = long (*)(const std::string& text);
 
 /// Installs a hook; null stands for the default one.
 KPLIB_API void SetFuncDateReformatLong(DateReformatLong function);
+/// Installs a hook; null stands for the default one.
 KPLIB_API void SetFuncDateReformatString(DateReformatString function);
 
-/// By the hooks.
+/// The text for a date, by the hook.
 KPLIB_API std::string dateReformat(long yyyymmdd);
+/// The date of a text, by the hook.
 KPLIB_API long dateReformat(const std::string& text);
 
 /// "2024-MAR-15" for 20240315; "" for a number of fewer than eight characters. Any month but 1 to 11 reads "-DEC-", 0
-/// and 13 too, and that is meant.
+/// and 13 too.
 KPLIB_API std::string dateReformatLong_default(long yyyymmdd);
-/// The other way, in any case of letters: 0 for an unknown month. A text of fewer than nine characters is read as a
+/// The inverse, in any case of letters: 0 for an unknown month. A text of fewer than nine characters is read as a
 /// number.
 KPLIB_API long dateReformatString_default(const std::string& text);
 

@@ -9,7 +9,9 @@
 KPLIB_API void* kpCrashDumpConfig();
 /// 0
 KPLIB_API int kpInitCrashDumpWriter(const char* path);
+/// Does nothing.
 KPLIB_API void kpSetReportCrashCmd(const char* command);
 /// 0
 KPLIB_API int kpEnableProbeDellBackupAndRecoveryCrash(bool enable);
+/// Does nothing.
 KPLIB_API void spawnNewClientToUploadCrashDump();

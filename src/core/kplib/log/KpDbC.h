@@ -7,10 +7,10 @@
 
 /// What kind of promise was broken.
 enum DbCEventType : int {
-    DbCPrecondition = 0,
-    DbCPostcondition = 1,
-    DbCInvariant = 2,
-    DbCAssertion = 3,
+    DbCPrecondition = 0,   ///< of a caller
+    DbCPostcondition = 1,  ///< of the function itself
+    DbCInvariant = 2,      ///< of an object
+    DbCAssertion = 3,      ///< at a place in the code
 };
 
 /// Whether broken contracts are handled at all.
@@ -24,4 +24,5 @@ using DbCCallback = void (*)(DbCEventType type, const char* condition, const cha
 
 /// The hook that the macros call; null (the default) for none.
 KPLIB_API DbCCallback kp_DbC_callback();
+/// Replaces the hook.
 KPLIB_API void kp_DbC_callbackSet(DbCCallback callback);

@@ -34,7 +34,7 @@ class KPLIB_API KpLogFile {
 public:
     /// How a line shows its time.
     enum DateTimeFormat : int {
-        NoDateTime = 0,
+        NoDateTime = 0,   ///< no time
         TimeOnly = 1,     ///< 14:03:59.120, or the time since resetTimeStamp()
         DateAndTime = 2,  ///< 2017-03-01 14:03:59.120
     };

@@ -4,12 +4,12 @@
 
 /// How grave a message is, from the least up.
 enum KpLogLevel : int {
-    KpLogDebug = 0,
-    KpLogInfo = 1,
-    KpLogWarning = 2,
-    KpLogError = 3,
-    KpLogCritical = 4,
-    KpLogOff = 5,  ///< only as a threshold: no message reaches it
+    KpLogDebug = 0,     ///< for developers
+    KpLogInfo = 1,      ///< what happens
+    KpLogWarning = 2,   ///< may be wrong, and work goes on
+    KpLogError = 3,     ///< an operation failed
+    KpLogCritical = 4,  ///< the program may not go on
+    KpLogOff = 5,       ///< only as a threshold: no message reaches it
 };
 
 /// "D", "I", "W", "E" or "C"; "" for anything that is no level of a message.

@@ -14,52 +14,52 @@ class KPLIB_API KpResult {
 public:
     /// Any number may stand for a failure; those below have texts of their own.
     enum Code : int {
-        Ok = 0,
-        Failed = 1,
-        InternalError = 2,
-        DataExpected = 3,
-        NotSupported = 4,
-        ReadOnly = 5,
-        OutOfRange = 6,
-        NotImplemented = 7,
-        OutOfMemory = 8,
-        False = 9,
-        Interrupted = 11,
-        WriteFileFailed = 12,
-        ReadFileFailed = 13,
-        InvalidArgument = 17,
+        Ok = 0,                ///< success
+        Failed = 1,            ///< a failure without a cause of its own
+        InternalError = 2,     ///< a fault of the program
+        DataExpected = 3,      ///< data are missing
+        NotSupported = 4,      ///< the request is not supported
+        ReadOnly = 5,          ///< the object cannot be changed
+        OutOfRange = 6,        ///< an index or a value is out of range
+        NotImplemented = 7,    ///< the request is not implemented
+        OutOfMemory = 8,       ///< memory is exhausted
+        False = 9,             ///< a negative answer
+        Interrupted = 11,      ///< canceled by the user
+        WriteFileFailed = 12,  ///< a file could not be written
+        ReadFileFailed = 13,   ///< a file could not be read
+        InvalidArgument = 17,  ///< an argument is invalid
 
         // Reports and snapshots.
-        ReportStartFailed = 112,
-        ReportWriteFailed = 113,
-        SnapshotSaveFailed = 120,
+        ReportStartFailed = 112,   ///< the word processor could not be started
+        ReportWriteFailed = 113,   ///< a report could not be written
+        SnapshotSaveFailed = 120,  ///< a picture could not be saved
 
         // OpenGL's own numbers.
-        GlInvalidEnum = 1280,
-        GlInvalidValue = 1281,
-        GlInvalidOperation = 1282,
-        GlStackOverflow = 1283,
-        GlStackUnderflow = 1284,
-        GlOutOfMemory = 1285,
+        GlInvalidEnum = 1280,       ///< GL_INVALID_ENUM
+        GlInvalidValue = 1281,      ///< GL_INVALID_VALUE
+        GlInvalidOperation = 1282,  ///< GL_INVALID_OPERATION
+        GlStackOverflow = 1283,     ///< GL_STACK_OVERFLOW
+        GlStackUnderflow = 1284,    ///< GL_STACK_UNDERFLOW
+        GlOutOfMemory = 1285,       ///< GL_OUT_OF_MEMORY
 
         // 4096 and the classic errno numbers, with the values of Windows.
-        SysNoEntry = 4096 + 2,
-        SysArgumentListTooLong = 4096 + 7,
-        SysExecFormat = 4096 + 8,
-        SysBadFile = 4096 + 9,
-        SysNoChild = 4096 + 10,
-        SysNoMoreProcesses = 4096 + 11,
-        SysNoMemory = 4096 + 12,
-        SysPermission = 4096 + 13,
-        SysBusy = 4096 + 16,
-        SysExists = 4096 + 17,
-        SysCrossDevice = 4096 + 18,
-        SysInvalidArgument = 4096 + 22,
-        SysTooManyFiles = 4096 + 24,
-        SysNoSpace = 4096 + 28,
-        SysMathArgument = 4096 + 33,
-        SysResultTooLarge = 4096 + 34,
-        SysDeadlock = 4096 + 36,
+        SysNoEntry = 4096 + 2,              ///< ENOENT
+        SysArgumentListTooLong = 4096 + 7,  ///< E2BIG
+        SysExecFormat = 4096 + 8,           ///< ENOEXEC
+        SysBadFile = 4096 + 9,              ///< EBADF
+        SysNoChild = 4096 + 10,             ///< ECHILD
+        SysNoMoreProcesses = 4096 + 11,     ///< EAGAIN
+        SysNoMemory = 4096 + 12,            ///< ENOMEM
+        SysPermission = 4096 + 13,          ///< EACCES
+        SysBusy = 4096 + 16,                ///< EBUSY
+        SysExists = 4096 + 17,              ///< EEXIST
+        SysCrossDevice = 4096 + 18,         ///< EXDEV
+        SysInvalidArgument = 4096 + 22,     ///< EINVAL
+        SysTooManyFiles = 4096 + 24,        ///< EMFILE
+        SysNoSpace = 4096 + 28,             ///< ENOSPC
+        SysMathArgument = 4096 + 33,        ///< EDOM
+        SysResultTooLarge = 4096 + 34,      ///< ERANGE
+        SysDeadlock = 4096 + 36,            ///< EDEADLK
     };
 
     class Error;

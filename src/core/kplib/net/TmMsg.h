@@ -162,6 +162,7 @@ TmMsg& operator<<(TmMsg& msg, const T& value)
     return msg;
 }
 
+/// Reads that form.
 template <kplib::detail::WireValue T>
 TmMsg& operator>>(TmMsg& msg, T& value)
 {
@@ -209,38 +210,46 @@ requires(std::is_arithmetic_v<T> && !kplib::detail::WireValue<T>) TmMsg& operato
 /// The length with the NUL in 32 bits (0 for null), and the bytes with the NUL. Reads as an address in the message
 /// itself, or null; valid until the message is written to. A text of the message itself may be written to it, too.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const char* text);
+/// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, char*& text);
 
 /// The length in 32 bits, and as many bytes, without a NUL.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const std::string& text);
+/// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, std::string& text);
 
 /// The bytes up to the first NUL, which goes with them; no length.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpString& text);
+/// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, KpString& text);
 
 /// As KpString.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpFilename& name);
+/// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, KpFilename& name);
 
 /// The count in 32 bits, and each text in the form of `const char*`. The array that is read owns none of its texts; a
 /// negative count is no texts.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpDArray<char*>& texts);
+/// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, KpDArray<char*>& texts);
 
 /// The code, and for a failure text and data in the form of `const char*`; file and line stay here. Reading a failure
 /// makes a new one, with its line in the log; empty data becomes the text of the code.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpResult& result);
+/// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, KpResult& result);
 
 /// The number of bits in 32 bits, and all words, the spare one too.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpBitfield& field);
+/// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, KpBitfield& field);
 
 /// Components, type, width and height in 32 bits each, and the pixels without gaps between the rows; the pixels of a
 /// row are taken to be dense. Without data width and height are sent as 0. The view that is read owns its pixels; its
 /// data is null if none came.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpTypedData2D& image);
+/// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, KpTypedData2D& image);
 
 /// A bool that is true for null, and nothing else; or sizes, components, type and all voxels without gaps. The voxels
@@ -257,4 +266,5 @@ KPLIB_API TmMsg& operator>>(TmMsg& msg, TmDataAccess*& object);
 /// fewer bytes than announced, that is one error line in the log, and `inner` has the announced
 /// size with bytes of 0.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const TmMsg& inner);
+/// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, TmMsg& inner);

@@ -19,7 +19,10 @@ class NameKey;
 class KPLIB_API HxParamBase {
 public:
     /// The two kinds of nodes.
-    enum Type : std::uint8_t { TypeParameter = 0, TypeBundle = 1 };
+    enum Type : std::uint8_t {
+        TypeParameter = 0,  ///< an HxParameter
+        TypeBundle = 1,     ///< an HxParamBundle
+    };
 
     /// Rules for a node. The setters of the tree ignore them, except as stated here: they are for
     /// editors, through HxParamEditCheck.
@@ -29,18 +32,18 @@ public:
         FlagNoDelete = 4,        ///< HxParamBundle::remove() refuses
         FlagNoInsertBundle = 8,  ///< the bundle takes no further sub-bundles
         FlagNoInsertParam = 16,  ///< the bundle takes no further parameters
-        FlagNoRename = 32,
-        FlagNoSetValue = 64,
-        FlagHidden = 128,  ///< never part of the text form
+        FlagNoRename = 32,       ///< for editors: the name is fixed
+        FlagNoSetValue = 64,     ///< for editors: the value is fixed
+        FlagHidden = 128,        ///< never part of the text form
     };
 
     /// What changed at a node or below it; for clients: the tree itself does not read it.
     enum TouchMask : int {
-        TouchName = 1,
-        TouchValue = 2,  ///< of a bundle: its list of children
-        TouchChildName = 4,
-        TouchChildValue = 8,
-        TouchAny = 16,  ///< set with each of the others
+        TouchName = 1,        ///< the name of the node
+        TouchValue = 2,       ///< of a bundle: its list of children
+        TouchChildName = 4,   ///< the name of a node below
+        TouchChildValue = 8,  ///< the value of a node below
+        TouchAny = 16,        ///< set with each of the others
     };
 
     /// A new node with the same content, outside any tree, owned by the caller.

@@ -10,9 +10,9 @@ public:
     /// What getBuildString() shows, to be combined.
     enum BuildStringFlag : int {
         BuildNumber = 1,  ///< the build number as a part of the version
-        Comments = 2,
-        Platform = 4,
-        BuildTime = 8,
+        Comments = 2,     ///< the comments of the build
+        Platform = 4,     ///< the name of the platform
+        BuildTime = 8,    ///< date and time of the build
     };
 
     KpBuildInfo() = delete;

@@ -9,18 +9,18 @@ class KPLIB_API KpCPUInfo {
 public:
     /// Bits of detectCPUFeatures(), each named after an extension of the x86 instruction set.
     enum Feature : unsigned {
-        MMX = 1,
-        MMXExtensions = 2,
-        ThreeDNow = 4,
-        ThreeDNowExtensions = 8,
-        SSE = 16,
-        SSE2 = 32,
-        ConditionalMove = 64,
-        SSE3 = 512,
-        SSSE3 = 1024,
-        SSE4_1 = 2048,
-        SSE4_2 = 4096,
-        AVX = 8192,
+        MMX = 1,                  ///< 64-bit integer vectors
+        MMXExtensions = 2,        ///< the AMD extensions of MMX
+        ThreeDNow = 4,            ///< 3DNow!
+        ThreeDNowExtensions = 8,  ///< extended 3DNow!
+        SSE = 16,                 ///< 128-bit float vectors
+        SSE2 = 32,                ///< 128-bit double and integer vectors
+        ConditionalMove = 64,     ///< CMOV
+        SSE3 = 512,               ///< SSE3
+        SSSE3 = 1024,             ///< supplemental SSE3
+        SSE4_1 = 2048,            ///< SSE4.1
+        SSE4_2 = 4096,            ///< SSE4.2
+        AVX = 8192,               ///< 256-bit vectors
     };
 
     /// The machine's processors, read by the first call.

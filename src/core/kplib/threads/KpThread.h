@@ -67,10 +67,12 @@ private:
     KpThreadPrivate* record_;  // keeps the platform's thread header out of here
 };
 
+/// The number of this process.
 KPLIB_API int tmCurrentProcessId();
 /// The platform's identifier of the calling thread, never 0.
 KPLIB_API unsigned long tmCurrentThreadId();
 
 /// The main thread is whichever asks first for one of these two, so an application asks from its real one at start-up.
 KPLIB_API unsigned long tmMainThreadId();
+/// Whether this is the main thread, see tmMainThreadId().
 KPLIB_API bool tmIsMainThread();

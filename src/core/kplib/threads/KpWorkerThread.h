@@ -32,14 +32,14 @@ class KPLIB_API KpWorkerThread {
 public:
     /// The state of the worker.
     enum State {
-        NotStarted,        ///< no thread
-        Idle,              ///< waits for start()
-        Computing,         ///< compute() runs
-        Suspended,         ///< compute() sleeps in suspended()
-        CanceledIdle,      ///< waits for start(), the last pass was canceled
-        SuspendRequested,  ///< compute() hasn't noticed yet
-        CancelRequested,   ///< compute() hasn't returned yet
-        TerminateRequested
+        NotStarted,         ///< no thread
+        Idle,               ///< waits for start()
+        Computing,          ///< compute() runs
+        Suspended,          ///< compute() sleeps in suspended()
+        CanceledIdle,       ///< waits for start(), the last pass was canceled
+        SuspendRequested,   ///< compute() hasn't noticed yet
+        CancelRequested,    ///< compute() hasn't returned yet
+        TerminateRequested  ///< the thread is about to end
     };
 
     /// No thread yet.

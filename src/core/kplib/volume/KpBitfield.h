@@ -25,9 +25,9 @@ class KPLIB_API KpBitfield {
 public:
     /// What words that are added begin with; any other value leaves them as they are, as INIT_NONE does.
     enum INIT : int {
-        INIT_SET = 0,
-        INIT_UNSET = 1,
-        INIT_NONE = 2,
+        INIT_SET = 0,    ///< all bits set
+        INIT_UNSET = 1,  ///< all bits clear
+        INIT_NONE = 2,   ///< not initialised
     };
 
     /// How toLabels() merges bits into labels.

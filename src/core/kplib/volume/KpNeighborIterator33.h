@@ -16,7 +16,14 @@ public:
 
     /// Which directions a neighbour lies in. A voxel at the volume's border has those bits set that lead outside; a
     /// neighbour that shares one of them lies outside.
-    enum Border : unsigned char { XMin = 1, XMax = 2, YMin = 4, YMax = 8, ZMin = 16, ZMax = 32 };
+    enum Border : unsigned char {
+        XMin = 1,   ///< toward lower x
+        XMax = 2,   ///< toward higher x
+        YMin = 4,   ///< toward lower y
+        YMax = 8,   ///< toward higher y
+        ZMin = 16,  ///< toward lower z
+        ZMax = 32,  ///< toward higher z
+    };
 
     /// `nNeighbors` is 4 or 8 (in plane), 10 (8 and the faces in z), 6, 18 or 26; any other makes a table that is never
     /// filled. `dims` are three sizes.

@@ -32,11 +32,11 @@ public:
 
     /// What next() and the like return; other codes are those of the right-hand side.
     enum Code : int {
-        Success = 0,
-        Frozen = 1,
-        ZeroField = 2,
-        StepTooSmall = 3,
-        MethodOutOfRange = 5,
+        Success = 0,           ///< the integration runs
+        Frozen = 1,            ///< freeze() was called
+        ZeroField = 2,         ///< the field is zero at the point
+        StepTooSmall = 3,      ///< no step meets the tolerance
+        MethodOutOfRange = 5,  ///< the method is no Method
     };
 
     KpODEBase() { state_.userData = this; }
