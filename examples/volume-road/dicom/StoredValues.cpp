@@ -37,7 +37,8 @@ void copyWords(const unsigned char* pixels, const Image& plane, Stored* to)
             reinterpret_cast<const Word*>(pixels) + (region.top + y) * region.frameColumns + region.left;
         for (long x = 0; x < region.columns; ++x) {
             const Word bits = cutOut(row[x], plane.format);
-            *to++ = static_cast<Stored>(plane.format.isSigned ? static_cast<std::make_signed_t<Word>>(bits) : bits);
+            *to++ = plane.format.isSigned ? static_cast<Stored>(static_cast<std::make_signed_t<Word>>(bits))
+                                          : static_cast<Stored>(bits);
         }
     }
 }
