@@ -44,6 +44,6 @@ private:
     void unrefLast() const;
 
     mutable int refCount_ = 0;
-    mutable bool destructionInProgress_ = false;  // from then on the count stands still
+    mutable bool destructionInProgress_ = false;  // the count is fixed from then on
     mutable bool destructionNotified_ = false;
 };

@@ -26,7 +26,8 @@ public:
     /// Deletes the object with its last reference.
     void unref() const
     {
-        // The spin lock is only for those who may bring the count to 0; dropping one reference of several needs none.
+        // The spin lock is only for threads that may bring the count to 0; dropping one reference
+        // of several needs none.
         for (int n = refCount_.load(std::memory_order_relaxed); n > 1;) {
             if (refCount_.compare_exchange_weak(n, n - 1, std::memory_order_release, std::memory_order_relaxed))
                 return;

@@ -5,8 +5,8 @@
 
 #include <cstdint>
 
-// Hashes of 32 bits. They do not mix their bits: they are cheap, and the containers that use them expect that. Those of
-// vectors, digests and UUIDs stand beside these types.
+// Hashes of 32 bits. They do not mix their bits: they are cheap, and the containers that use them
+// expect that. Those of vectors, digests and UUIDs are in the headers of these types.
 
 /// h * 9 + c over the characters, which count as signed; 0 for an empty text.
 constexpr unsigned int kp_hash(const char* s)

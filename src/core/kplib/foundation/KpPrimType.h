@@ -4,7 +4,8 @@
 
 #include <cstdint>
 
-/// Type of the elements of typed memory. The numbers stand on the wire and in files and never change.
+/// Type of the elements of typed memory. The numbers are part of messages and files and never
+/// change.
 class KPLIB_API KpPrimType {
 public:
     /// The element types.

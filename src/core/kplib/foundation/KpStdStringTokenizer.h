@@ -17,7 +17,7 @@ public:
     /// Whether nextToken() has one to give.
     bool hasMoreTokens() const { return begin_ != end_; }
 
-    /// The next token into `token`; behind the last one, `token` stays.
+    /// The next token into `token`; after the last one, `token` stays.
     void nextToken(std::string& token);
 
 private:

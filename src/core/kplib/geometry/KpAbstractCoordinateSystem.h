@@ -14,7 +14,7 @@ class KpFrameOfReference;
 /// related only if they end at the same frame.
 ///
 /// A child holds its parent, so a parent is an object on the heap that handles hold; a system
-/// without children may stand anywhere, and questions to it or about it take no handle to it.
+/// without children may be any object, and functions that ask it or about it take no handle to it.
 /// Systems may be changed, which also moves all child systems. There is no notification. The count
 /// of handles is for one thread.
 class KPLIB_API KpAbstractCoordinateSystem : public KpHandable {

@@ -8,8 +8,8 @@ class KpVec3f;
 // Comparison of floats with a tolerance. The forms without a given one are relative to the smaller of the two
 // magnitudes. NaN matches nothing.
 
-/// Whether a ten-thousandth of the smaller magnitude is at or above the difference. No floor, and that is meant: 0
-/// matches 0 alone.
+/// Whether a ten-thousandth of the smaller magnitude is at or above the difference. There is no
+/// floor: 0 matches 0 alone.
 KPLIB_API bool kpFuzzyCompare(float a, float b);
 /// Whether `eps` is at or above the difference.
 KPLIB_API bool kpFuzzyCompare(float a, float b, float eps);

@@ -6,13 +6,13 @@
 /// Makes DICOM unique identifiers for new objects (PS3.5, 9): root, version, a number for the kind of object, the node,
 /// a counter and the process, separated by dots.
 ///
-/// The counter is the time of day and counts on where the clock stands still or goes back: within
-/// a process it never repeats, for all objects and threads. That the text stays within the 64
-/// characters of DICOM is up to the root. createUID() may be called on one object by many threads,
-/// for types that there are; all else is for one thread.
+/// The counter is the time of day, and is incremented where the clock does not advance or goes
+/// back: within a process it never repeats, for all objects and threads. That the text stays
+/// within the 64 characters of DICOM is up to the root. createUID() may be called on one object by
+/// many threads, for types that there are; all else is for one thread.
 class KPLIB_API KpCreateUIDs {
 public:
-    /// What the identifier is for; the values of the layer above, which stand in the UID as 2 to 6.
+    /// What the identifier is for; the values of the layer above, which are 2 to 6 in the UID.
     enum UIDtype : int {
         UIDtype0 = 0,  ///< 2 in the UID
         UIDtype1 = 1,  ///< 3 in the UID

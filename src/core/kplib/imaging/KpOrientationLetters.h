@@ -35,7 +35,7 @@ public:
     /// All four strings are valid, and the right and the bottom edge don't name one axis as a whole: L and R do, LP and
     /// A don't.
     bool isValid() const;
-    /// Whether `letter` stands neither at the right nor at the bottom.
+    /// Whether `letter` is neither at the right nor at the bottom.
     bool unusedLabel(char letter) const;
     // Whether the view shows one kind of slice. With no letters at all it shows every kind.
     /// @{

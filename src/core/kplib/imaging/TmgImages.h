@@ -17,8 +17,8 @@
 
 namespace Tmg {
 
-/// Tags whose value is taken to be the same in all images of a volume, so that the first image may stand for all.
-/// Lives from static initialisation to exit.
+/// Tags whose value is taken to be the same in all images of a volume, so that the first image
+/// serves for all. Lives from static initialisation to exit.
 KPLIB_API extern const std::set<std::string> tagsConstantInVolume;
 
 /// Replaces all that `list` holds by the texts of the images; no texts leave it empty.
@@ -32,14 +32,16 @@ KPLIB_API bool imageNumber(const HxParamBundle& object, int index, int& out);
 /// The numbers of the images `first` to `last`, both cut to those that there are. Without a list `out` stays.
 KPLIB_API void imageNumbers3D(const HxParamBundle& object, int first, int last, KpDArray<int>& out);
 
-/// The frame of image `index` in an object of two or more frames (0028,0008): `index` itself in an enhanced one, else
-/// the number behind the last point of its stored SOP Instance UID. findSorted() sorts the header.
+/// The frame of image `index` in an object of two or more frames (0028,0008): `index` itself in an
+/// enhanced one, else the number after the last point of its stored SOP Instance UID. findSorted()
+/// sorts the header.
 KPLIB_API bool frameNumber(const HxParamBundle& object, bool enhanced, int index, int& out);
 
-/// The value of a tag for image `index`: its own if `ImageLevelTags` names the tag (any name that holds `tag` counts as
-/// that), else that of the header. `approximate` tells that it is the volume's and may differ for this image, as it
-/// never does if there is but one image or the tag is one of tagsConstantInVolume. False, with `approximate` set all
-/// the same, if there is no value, or an empty one of the image's own.
+/// The value of a tag for image `index`: its own if `ImageLevelTags` names the tag (any name that
+/// holds `tag` counts as that), else that of the header. `approximate` is set if the value is the
+/// volume's and may differ for this image, which is never so for a single image or a tag of
+/// tagsConstantInVolume. False, with `approximate` set all the same, if there is no value, or an
+/// empty one of the image's own.
 KPLIB_API bool imageLevelTag(const HxParamBundle& object, int index, const char* tag, KpString& value,
                              bool& approximate);
 

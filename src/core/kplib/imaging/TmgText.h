@@ -9,18 +9,19 @@
 
 namespace Tmg {
 
-/// Whether a text fits a pattern as a whole: `anyRun` stands for any characters, `anyOne` for one or none (but not at
-/// the end of the text), others for themselves. Only the first character of the pattern is held against `anyRun` and
-/// `anyOne`; behind it they are `*` and `?`, and that is meant. Null counts as "". O(pattern * text).
+/// Whether a text fits a pattern as a whole: `anyRun` stands for any characters, `anyOne` for one
+/// or none (but not at the end of the text), others for themselves. Only the first character of
+/// the pattern is held against `anyRun` and `anyOne`; after it they are always `*` and `?`. Null
+/// counts as "". O(pattern * text).
 KPLIB_API bool match(const char* pattern, const char* text, char anyRun, char anyOne);
 
-/// Whether one of `texts` fits one of `patterns` by match() with `*` and `?`, heedless of case. Both are lists at
-/// `separators` as KpStdStringTokenizer reads them; null for either is false.
+/// Whether one of `texts` fits one of `patterns` by match() with `*` and `?`, ignoring case. Both
+/// are lists at `separators` as KpStdStringTokenizer reads them; null for either is false.
 KPLIB_API bool matchSet(const char* patterns, const char* texts, const char* separators);
 
-/// Appends those values of `additions` that `target` hasn't got, and tells whether there were any. Values are what
-/// KpStringTokenizerGeneral finds between `separators`. A new one is set off by the separator that `target` used last,
-/// else by the first of `separators`.
+/// Appends those values of `additions` that `target` lacks, and returns whether there were any.
+/// Values are what KpStringTokenizerGeneral finds between `separators`. A new one is set off by
+/// the separator that `target` used last, else by the first of `separators`.
 KPLIB_API bool addToMultiValueString(KpString& target, const KpString& additions, const char* separators);
 
 /// The path as this machine knows it: on this platform the same.

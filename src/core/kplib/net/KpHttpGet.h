@@ -102,7 +102,7 @@ private:
     std::atomic<int> status_ = 0;
     std::atomic<int> socket_ = -1;
     KpWatch watch_{true};
-    KpMutex closing_{false};    // held by who opens, closes or begins to use the connection
+    KpMutex closing_{false};    // held while the connection is opened, closed or taken into use
     bool socketInUse_ = false;  // guarded by it, as the next
     bool canceled_ = false;     // cancel() was called since request() began
 };

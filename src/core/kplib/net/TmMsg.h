@@ -57,7 +57,7 @@ public:
     TmMsg() = default;
     /// For reading `size` bytes that stay the caller's and must outlive the message.
     TmMsg(unsigned long size, unsigned char* data) { setRawData(size, data); }
-    /// Owns a copy of the bytes; reads on where `other` stands.
+    /// Owns a copy of the bytes; the read offset is that of `other`.
     TmMsg(const TmMsg& other);
     ~TmMsg();
 
@@ -131,7 +131,7 @@ public:
     void print(const char* title) const;
 
 private:
-    /// An array whose storage may be somebody else's.
+    /// An array whose storage may be owned elsewhere.
     struct Buffer : KpDArray<unsigned char> {
         using KpDArray::setSize;
         using KpDArray::setStorage;
@@ -147,7 +147,7 @@ private:
     unsigned long readOffset_ = 0;
     Buffer buffer_;
     unsigned char marks_ : 2 = 0;
-    unsigned char externalData_ : 1 = 0;  // the storage is somebody else's
+    unsigned char externalData_ : 1 = 0;  // the storage is owned elsewhere
 };
 
 static_assert(sizeof(TmMsg) == 40);

@@ -56,10 +56,11 @@ public:
     /// recorded; kind, parent and edit check stay.
     HxParamBase& operator=(const HxParamBase& other);
 
-    /// Names the node. A leading digit gets a `_` in front; letters, digits and `-` stay, some Latin-1 letters lose
-    /// their accents, any other byte becomes `_`. A bundle keeps only what stands before the first blank, the rest goes
-    /// into its parameter `Name`, its title, which in turn never repeats the name. Null or empty makes up a name from
-    /// a process-wide, unlocked counter. Records TouchName if the name differs from the old one.
+    /// Names the node. A leading digit gets a `_` in front; letters, digits and `-` stay, some
+    /// Latin-1 letters lose their accents, any other byte becomes `_`. A bundle keeps only the
+    /// part before the first blank, the rest goes into its parameter `Name`, its title, which in
+    /// turn never repeats the name. Null or empty makes up a name from a process-wide, unlocked
+    /// counter. Records TouchName if the name differs from the old one.
     void setName(const char* name);
 
     /// Records a change here and, as one of a child, in all bundles above.

@@ -8,8 +8,8 @@
 #include <cstdio>
 #include <utility>
 
-/// The inner node of the parameter tree: a container of sub-bundles, which stand first and in the order of insertion,
-/// and of parameters. It owns its children.
+/// The inner node of the parameter tree: a container of sub-bundles, which come first and in the
+/// order of insertion, and of parameters. It owns its children.
 ///
 ///     HxParamBundle scan("Scan");
 ///     scan.set("Slices", 30);
@@ -124,8 +124,8 @@ public:
     /// As above.
     const HxParamBase* findBase(const char* name) const;
 
-    /// The parameter of that name, taken as it stands, by binary search, after sorting if need be. O(log n). Which one
-    /// of equal names is found isn't defined.
+    /// The parameter of exactly that name, by binary search, after sorting if need be. O(log n).
+    /// Which one of equal names is found isn't defined.
     HxParameter* findSorted(const char* name)
     {
         return const_cast<HxParameter*>(std::as_const(*this).findSorted(name));

@@ -151,7 +151,7 @@ public:
                                                  unsigned long dz, int fx, int fy, int fz, int nDataVar,
                                                  KpProgressInterface* progress);
 
-    /// The first voxel of each block as it stands: labels must not be mixed.
+    /// The first voxel of each block: labels must not be mixed.
     ///
     /// For ushort, `b` is the source and `a` the target; for all other types `a` is the source and `b` the target.
     /// Intentional: existing callers depend on it.

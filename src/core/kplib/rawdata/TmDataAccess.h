@@ -162,7 +162,7 @@ private:
     void fixStrides();
     bool hasVoxels() const;
 
-    // A line along `axis` that begins `offset` bytes behind the first voxel.
+    // A line along `axis` that begins `offset` bytes after the first voxel.
     template <typename T>
     void rowImpl(long offset, int axis, float* out) const;
     template <typename T>

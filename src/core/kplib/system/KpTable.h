@@ -15,11 +15,11 @@ class KpDataBase;
 /// one of them. Relations - lists of rows of another table - are kept as lists of cells in a pool a column, which moves
 /// likewise.
 ///
-/// Row form: columns follow one another without gaps (an offset is the sum of the sizes before it, so fields may lie
-/// unaligned: read them by memcpy). Column 0 is the table's own, 4 bytes: 0 in a row in use, 1 in a free one. The 4
-/// bytes behind it hold the table's id and belong to the first client column, which has to be a plain one of at least 4
-/// bytes and leaves those to the table. At most 16 columns; a relation has to start within the first 512 bytes of a
-/// row.
+/// Row form: columns follow one another without gaps (an offset is the sum of the sizes before it,
+/// so fields may lie unaligned: read them by memcpy). Column 0 is the table's own, 4 bytes: 0 in a
+/// row in use, 1 in a free one. The 4 bytes after it hold the table's id and belong to the first
+/// client column, which has to be a plain one of at least 4 bytes and leaves those to the table.
+/// At most 16 columns; a relation has to start within the first 512 bytes of a row.
 ///
 /// Positions, rows and offsets are not checked unless said so. One thread at a time for a whole database.
 class KPLIB_API KpTable {

@@ -10,7 +10,7 @@
 /// A watch that was only ever continued with cont(), before the first start() of any watch in the process, reports 0.
 class KPLIB_API KpWatch {
 public:
-    /// Stands at 0, or runs at once.
+    /// Stopped at 0, or runs at once.
     explicit KpWatch(bool startNow);
     /// The same with a label for dump(), copied; null for none.
     KpWatch(const char* name, bool startNow);
@@ -22,13 +22,13 @@ public:
 
     /// Runs from 0.
     void start();
-    /// Stands at 0.
+    /// Stops at 0.
     void reset();
     /// Runs on from the time gathered so far.
     void cont();
 
-    /// Stops and gives the time, in seconds or rounded to milliseconds (for up to 49 days). Stopping a watch that
-    /// stands adds the time since its last start once more.
+    /// Stops and gives the time, in seconds or rounded to milliseconds (for up to 49 days).
+    /// Stopping a stopped watch adds the time since its last start once more.
     float stop();
     /// @{
     /// As stop(), in other units.

@@ -14,6 +14,6 @@ public:
 
     virtual ~KpCallable();
 
-    /// Does what the object stands for.
+    /// Performs the operation.
     virtual void call() = 0;
 };

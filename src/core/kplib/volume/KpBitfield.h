@@ -147,7 +147,7 @@ public:
     /// Merges the first `n` bits into as many labels. Does nothing if there are fewer bits, or for an unknown policy.
     void toLabels(unsigned long n, unsigned char* labels, unsigned char label, InsertPolicy policy) const;
 
-    /// Writes the (nBits + 7) / 8 bytes of the bits as they stand in memory: bit i in byte i / 8,
+    /// Writes the (nBits + 7) / 8 bytes of the bits as they are in memory: bit i in byte i / 8,
     /// least significant first, and no size. False if the file cannot be opened or not all bytes
     /// can be written.
     bool save(const KpString& file) const;

@@ -71,7 +71,7 @@ public:
     /// The singular values of this m by n matrix A: A = U diag(w) transpose(V), with U m by n and
     /// V n by n, whose columns are orthonormal (those of U that belong to a row that A doesn't
     /// have are 0). `w`: place for n values, none negative, in no order. False, with one warning
-    /// in the log and the three left as they stand, if a value has not converged when its
+    /// in the log and the three left unfinished, if a value has not converged when its
     /// `maxIterations`-th iteration begins; 30 suffices. U and V are neither this nor each other.
     /// O(m n^2). Golub and Reinsch, "Singular value decomposition and least squares solutions",
     /// Numerische Mathematik 14, 1970.

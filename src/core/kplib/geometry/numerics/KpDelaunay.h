@@ -12,10 +12,11 @@ class KpVec3f;
 /// Delaunay triangulations of points in the plane and in space: no point lies inside the circle or sphere through the
 /// corners of another part.
 ///
-/// The points go in one after the other: what has the new one in its circle makes way for a fan around it (A. Bowyer,
-/// "Computing Dirichlet tessellations", and D. F. Watson, both in The Computer Journal 24(2), 1981). They are worked on
-/// as copies, shifted at random by up to half a hundred-millionth of their range, with KpRandom::rand(): so equal or
-/// regular points are no trouble, and two processes may choose differently where the choice is open. Parts that are
+/// The points go in one after the other: what has the new one in its circle makes way for a fan
+/// around it (A. Bowyer, "Computing Dirichlet tessellations", and D. F. Watson, both in The
+/// Computer Journal 24(2), 1981). The algorithm works on copies, shifted at random by up to half a
+/// hundred-millionth of their range, with KpRandom::rand(): so equal or regular points are no
+/// trouble, and two processes may choose differently where the choice is open. Parts that are
 /// nearly flat are left out, so the hull may have small gaps.
 ///
 /// Both restart the system's generator with srand(367). They throw KpMemoryException with the result unchanged; memory
@@ -34,7 +35,7 @@ public:
     /// `tetrahedra` unchanged, if one point falls into spheres whose common surface has more than 16385 faces.
     static bool triangulate3D(KpVec3f* points, int n, KpDArray<Tetrahedron>& tetrahedra);
 
-    /// Draws the outlines of `triangles` into an EPS file, to look at, fitted into a square of 425 points. False if
-    /// `path` can't be opened; what happens to the bytes after that isn't told.
+    /// Draws the outlines of `triangles` into an EPS file, to look at, fitted into a square of 425
+    /// points. False if `path` cannot be opened; a later failure to write is not reported.
     static bool writeEPS(const char* path, KpVec2f* points, int n, KpDArray<Triangle>& triangles);
 };

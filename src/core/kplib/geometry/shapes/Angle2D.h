@@ -19,7 +19,7 @@ public:
 
     /// Fewer than three vertices.
     bool isEmpty() const override { return size() < 3; }
-    /// Not empty, and both arms long enough to tell an angle: 0.001 squared units.
+    /// Not empty, and both arms long enough to measure an angle: 0.001 squared units.
     bool isValid() const;
     /// In radians from 0 to pi, 0 if the outer vertices are the same; the flag is false unless isValid().
     std::pair<bool, float> angle() const;
