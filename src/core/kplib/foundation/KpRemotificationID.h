@@ -19,7 +19,7 @@ public:
     static constexpr int RS_DATA_MANAGER = 5;        ///< the data manager
     static constexpr int RS_VOLUME_INFO_CACHE = 6;   ///< the cache of volume descriptions
     static constexpr int RS_ERROR_NOTIFIER = 7;      ///< the notifier of errors
-    static constexpr int RS_POWERSCRIBE_CTRL = 9;    ///< the control of dictation
+    static constexpr int RS_POWERSCRIBE_CTRL = 9;    ///< a controller
     static constexpr int RS_MAX = 9;                 ///< the last singleton
     static constexpr int RS_LAST_SINGLETON_ID = 20;  ///< first value after the range kept for singletons
 

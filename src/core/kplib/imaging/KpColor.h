@@ -12,9 +12,9 @@ public:
     KpColor() = default;  ///< black
     /// Of these components.
     KpColor(float red, float green, float blue) : rgb_{red, green, blue} {}
-    /// By setValue(); black if that fails.
+    /// By setValue().
     KpColor(const char* text) { setValue(text); }
-    /// By setValue(); black if that fails.
+    /// By setValue().
     KpColor(int argc, char** argv) { setValue(argc, argv); }
 
     /// Reads one number (grey) or three, from 0 to 1 or from 0 to 255 if one is above 1; "#RRGGBB"

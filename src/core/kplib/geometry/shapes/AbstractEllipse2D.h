@@ -25,7 +25,7 @@ public:
     std::vector<KpVec2f> tesselate(unsigned int segments) const override;
 
     /// @{
-    /// A radius; negative ones are kept as given.
+    /// A radius.
     virtual float radiusX() const = 0;
     virtual float radiusY() const = 0;
     /// The enclosed area.
