@@ -15,30 +15,18 @@ public:
     /// Type of the bounds.
     using value_type = typename Vector::value_type;
 
-    /// A bound.
-    constexpr value_type& xmin() { return b_[0]; }
-    /// A bound.
-    constexpr value_type xmin() const { return b_[0]; }
-    /// A bound.
-    constexpr value_type& xmax() { return b_[1]; }
-    /// A bound.
-    constexpr value_type xmax() const { return b_[1]; }
-    /// A bound.
-    constexpr value_type& ymin() { return b_[2]; }
-    /// A bound.
-    constexpr value_type ymin() const { return b_[2]; }
-    /// A bound.
-    constexpr value_type& ymax() { return b_[3]; }
-    /// A bound.
-    constexpr value_type ymax() const { return b_[3]; }
-    /// A bound.
-    constexpr value_type& zmin() { return b_[4]; }
-    /// A bound.
-    constexpr value_type zmin() const { return b_[4]; }
-    /// A bound.
-    constexpr value_type& zmax() { return b_[5]; }
-    /// A bound.
-    constexpr value_type zmax() const { return b_[5]; }
+    constexpr value_type& xmin() { return b_[0]; }       ///< least x
+    constexpr value_type xmin() const { return b_[0]; }  ///< least x
+    constexpr value_type& xmax() { return b_[1]; }       ///< greatest x
+    constexpr value_type xmax() const { return b_[1]; }  ///< greatest x
+    constexpr value_type& ymin() { return b_[2]; }       ///< least y
+    constexpr value_type ymin() const { return b_[2]; }  ///< least y
+    constexpr value_type& ymax() { return b_[3]; }       ///< greatest y
+    constexpr value_type ymax() const { return b_[3]; }  ///< greatest y
+    constexpr value_type& zmin() { return b_[4]; }       ///< least z
+    constexpr value_type zmin() const { return b_[4]; }  ///< least z
+    constexpr value_type& zmax() { return b_[5]; }       ///< greatest z
+    constexpr value_type zmax() const { return b_[5]; }  ///< greatest z
 
     /// Bound `i` in the order above; not checked.
     constexpr value_type& operator[](int i)

@@ -38,31 +38,19 @@ public:
     constexpr Component* data() { return v_; }
     /// As above.
     constexpr const Component* data() const { return v_; }
-    /// The components as a range.
-    constexpr Component* begin() { return v_; }
-    /// The components as a range.
-    constexpr Component* end() { return v_ + Size; }
-    /// The components as a range.
-    constexpr const Component* begin() const { return v_; }
-    /// The components as a range.
-    constexpr const Component* end() const { return v_ + Size; }
+    constexpr Component* begin() { return v_; }                   ///< first component
+    constexpr Component* end() { return v_ + Size; }              ///< past the last one
+    constexpr const Component* begin() const { return v_; }       ///< first component
+    constexpr const Component* end() const { return v_ + Size; }  ///< past the last one
 
-    /// A component by name.
-    constexpr Component& x() { return v_[0]; }
-    /// A component by name.
-    constexpr Component x() const { return v_[0]; }
-    /// A component by name.
-    constexpr Component& y() { return v_[1]; }
-    /// A component by name.
-    constexpr Component y() const { return v_[1]; }
-    /// A component by name.
-    constexpr Component& z() requires(Size > 2) { return v_[2]; }
-    /// A component by name.
-    constexpr Component z() const requires(Size > 2) { return v_[2]; }
-    /// A component by name.
-    constexpr Component& w() requires(Size > 3) { return v_[3]; }
-    /// A component by name.
-    constexpr Component w() const requires(Size > 3) { return v_[3]; }
+    constexpr Component& x() { return v_[0]; }                          ///< first component
+    constexpr Component x() const { return v_[0]; }                     ///< first component
+    constexpr Component& y() { return v_[1]; }                          ///< second component
+    constexpr Component y() const { return v_[1]; }                     ///< second component
+    constexpr Component& z() requires(Size > 2) { return v_[2]; }       ///< third component
+    constexpr Component z() const requires(Size > 2) { return v_[2]; }  ///< third component
+    constexpr Component& w() requires(Size > 3) { return v_[3]; }       ///< fourth component
+    constexpr Component w() const requires(Size > 3) { return v_[3]; }  ///< fourth component
 
     /// The sum of the products of the components.
     constexpr Component dot(const Vector& other) const

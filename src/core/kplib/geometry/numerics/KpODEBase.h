@@ -116,29 +116,19 @@ public:
 
     /// Size of the next step.
     float h() const { return state_.h; }
-    /// As it was set.
-    float hMin() const { return state_.hMin; }
-    /// As it was set.
-    float hMax() const { return state_.hMax; }
-    /// As it was set.
-    float hSampling() const { return state_.hSampling; }
-    /// As it was set.
-    float tolerance() const { return state_.tolerance; }
-    /// As it was set.
-    float orientation() const { return state_.orientation; }
-    /// As it was set.
-    int checkHMin() const { return state_.checkHMin; }
+    float hMin() const { return state_.hMin; }                ///< see setHMinMax()
+    float hMax() const { return state_.hMax; }                ///< see setHMinMax()
+    float hSampling() const { return state_.hSampling; }      ///< see setHSampling()
+    float tolerance() const { return state_.tolerance; }      ///< see setTolerance()
+    float orientation() const { return state_.orientation; }  ///< see setOrientation()
+    int checkHMin() const { return state_.checkHMin; }        ///< see setCheckHMin()
 
     /// 0 while the integration runs, else the code that it ended with.
     int status() const { return state_.status; }
-    /// As it was set.
-    int normalization() const { return state_.normalization; }
-    /// As it was set.
-    int method() const { return state_.method; }
-    /// As it was set.
-    void* userData() const { return state_.userData; }
-    /// As it was set.
-    RightHandSide rightHandSide() const { return state_.rightHandSide; }
+    int normalization() const { return state_.normalization; }            ///< see setNormalization()
+    int method() const { return state_.method; }                          ///< see setMethod()
+    void* userData() const { return state_.userData; }                    ///< see setRightHandSide()
+    RightHandSide rightHandSide() const { return state_.rightHandSide; }  ///< see setRightHandSide()
 
 private:
     /// What a call of next() meets.
