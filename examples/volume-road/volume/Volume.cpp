@@ -4,7 +4,6 @@
 
 #include <algorithm>
 #include <cmath>
-#include <cstdarg>
 #include <limits>
 
 double Volume::sliceAt(double height) const
@@ -91,14 +90,4 @@ Volume luminanceOf(const Volume& colour)
         grey.bytes[i] = static_cast<unsigned char>((299 * rgb[0] + 587 * rgb[1] + 114 * rgb[2] + 500) / 1000);
     }
     return grey;
-}
-
-KpResult badInput(const char* format, ...)
-{
-    KpString text;
-    va_list args;
-    va_start(args, format);
-    text.vprintf(format, args);
-    va_end(args);
-    return KpResult(KpResult::InvalidArgument, text, nullptr);
 }

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "BadInput.h"
+
 #include <kplib/foundation/KpDArray.h>
 #include <kplib/foundation/KpPrimType.h>
 #include <kplib/foundation/KpString.h>
@@ -81,6 +83,3 @@ std::array<double, 2> displayedRange(Volume& volume);
 
 /// The luminance of a colour volume as bytes; other volumes cannot be asked.
 Volume luminanceOf(const Volume& colour);
-
-/// A failure whose text is one line for the user, formatted as by printf.
-KpResult badInput(const char* format, ...) KPLIB_PRINTF(1, 2);
