@@ -1,6 +1,9 @@
 #include <kplib/foundation/KpFrameID.h>
+#include <kplib/foundation/KpHandable.h>
+#include <kplib/foundation/KpHandle.h>
 #include <kplib/foundation/KpHash.h>
 #include <kplib/foundation/KpRemotificationID.h>
+#include <kplib/foundation/KpString.h>
 #include <kplib/foundation/KpTransferID.h>
 #include <kplib/foundation/KpUniqueID.h>
 #include <kplib/foundation/TmSessionContextID.h>
@@ -94,6 +97,17 @@ TEST(Hash, keepsTheLowBits)
     EXPECT_EQ(kp_hash(reinterpret_cast<void*>(0x712345678)), 0x12345678U);
     EXPECT_EQ(kp_hash(KpVec3i(33, -1, 3)), 1U * 1024 + 31 * 32 + 3);
     EXPECT_EQ(kp_hash(KpVec4i(-32, 31, 2, 35)), 31U * 1024 + 2 * 32 + 3);
+}
+
+TEST(Hash, makesKeysOfEqualValuesEqual)
+{
+    KpString one("a-b"), other("a-c");
+    one[1] = other[1] = '\0';  // == compares the lengths, and the texts up to there
+    const KpHandle<KpHandable> object(new KpHandable), same = object;
+    EXPECT_EQ((std::unordered_set<KpString>{"a", one, other}).size(), 2U);
+    EXPECT_EQ((std::unordered_set<Kp128>{{1, 2}, {2, 1}, {1, 2}}).size(), 2U);
+    EXPECT_EQ((std::unordered_set<KpHandle<KpHandable>>{object, same, nullptr}).size(), 2U);
+    EXPECT_EQ(one.view().size(), 3U) << "all that size() counts but the last NUL";
 }
 
 }  // namespace

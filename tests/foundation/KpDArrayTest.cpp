@@ -7,7 +7,9 @@
 
 #include <algorithm>
 #include <climits>
+#include <concepts>
 #include <random>
+#include <span>
 #include <string>
 #include <vector>
 
@@ -82,6 +84,20 @@ TEST(KpDArray, insertsSortedBehindEqualElements)
     EXPECT_EQ(array.insertSorted(5, kpStandardCompare<int>), 2);
     EXPECT_EQ(array.insertSorted(0, kpStandardCompare<int>, 0, -1), 1);  // element 0 counts as known to be less
     EXPECT_EQ(std::vector<int>(array.begin(), array.end()), (std::vector<int>{1, 0, 5, 5, 9}));
+}
+
+TEST(KpDArray, isMadeOfRangesAndComparedWhole)
+{
+    const std::vector<KpString> texts{"a", "b", "b"};
+    const std::span<const KpString> tail(texts.begin() + 1, 2);
+    const KpDArray<KpString> all(texts.begin(), texts.end()), rest(tail);
+    EXPECT_EQ(all, KpDArray<KpString>(texts));
+    EXPECT_EQ(rest, (KpDArray<KpString>{"b", "b"}));
+    EXPECT_NE(rest, (KpDArray<KpString>{"b"}));
+    EXPECT_NE(rest, (KpDArray<KpString>{"b", "a"}));
+    struct NotCompared {};
+    static_assert(!std::equality_comparable<KpDArray<NotCompared>>);
+    EXPECT_EQ(KpDArray<char>(KpString("ab")).size(), 3) << "a string stays an array with its NUL";
 }
 
 TEST(KpDArray, survivesFailingAllocations)

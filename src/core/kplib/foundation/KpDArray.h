@@ -4,6 +4,7 @@
 #include <kplib/foundation/KpMemory.h>
 
 #include <climits>
+#include <concepts>
 #include <cstddef>
 #include <cstring>
 #include <initializer_list>
@@ -63,6 +64,32 @@ public:
     KpDArray(KpDArray&& other) noexcept { swap(other); }
     /// Copies the items.
     KpDArray(std::initializer_list<T> items) : KpDArray() { insert(0, static_cast<long>(items.size()), items.begin()); }
+    /// Copies the elements of [first, last), which must not lie in this array.
+    template <typename Iterator>
+    requires requires(Iterator i)
+    {
+        {
+            *i
+            } -> std::convertible_to<T>;
+        {
+            ++i
+            } -> std::same_as<Iterator&>;
+    }
+    KpDArray(Iterator first, Iterator last) : KpDArray()
+    {
+        for (; first != last; ++first)
+            append(*first);
+    }
+    /// Copies the elements of a std::span, a std::vector or another contiguous range of T.
+    template <typename Range>
+    requires(!std::derived_from<Range, KpDArray>) && requires(const Range& range)
+    {
+        requires std::same_as<std::remove_cvref_t<decltype(*range.data())>, T>;
+        {
+            range.size()
+            } -> std::convertible_to<std::size_t>;
+    }
+    explicit KpDArray(const Range& range) : KpDArray() { insert(0, static_cast<long>(range.size()), range.data()); }
     ~KpDArray()
     {
         clear();
@@ -128,6 +155,15 @@ public:
         std::swap(size_, other.size_);
         std::swap(capacity_, other.capacity_);
         std::swap(data_, other.data_);
+    }
+
+    /// Whether both have as many elements, each equal to its counterpart.
+    friend bool operator==(const KpDArray& a, const KpDArray& b) requires std::equality_comparable<T>
+    {
+        bool equal = a.size_ == b.size_;
+        for (long i = 0; equal && i < a.size_; ++i)
+            equal = a.data_[i] == b.data_[i];
+        return equal;
     }
 
     /// Number of elements.

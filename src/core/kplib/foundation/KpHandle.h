@@ -2,6 +2,8 @@
 
 #include <kplib/foundation/KpCheck.h>
 
+#include <cstddef>
+#include <typeindex>  // declares std::hash
 #include <utility>
 
 /// Smart pointer to an object that counts its handles: a T with ref() and unref(), such as a KpHandable.
@@ -76,9 +78,9 @@ public:
         KPLIB_CHECK(pointer_ != nullptr, "KpHandle: dereferenced while null");
         return *pointer_;
     }
-    /// Whether there is an object.
     /// @}
 
+    /// Whether there is an object.
     explicit operator bool() const noexcept { return pointer_ != nullptr; }
 
     /// @{
@@ -86,6 +88,14 @@ public:
     bool operator==(const KpHandle& other) const noexcept { return pointer_ == other.pointer_; }
     bool operator==(const T* object) const noexcept { return pointer_ == object; }
     /// @}
+
 private:
     T* pointer_ = nullptr;
+};
+
+/// Handles of one object are equal.
+template <typename T>
+struct std::hash<KpHandle<T>> {
+    /// That of the address.
+    std::size_t operator()(const KpHandle<T>& handle) const { return std::hash<T*>()(handle.get()); }
 };

@@ -6,6 +6,7 @@
 #include <compare>
 #include <concepts>
 #include <cstdarg>
+#include <cstddef>
 #include <cstring>
 #include <iosfwd>
 #include <string_view>
@@ -59,8 +60,10 @@ public:
     /// @{
     /// The text without a copy; valid until the string changes.
     operator const char*() const noexcept { return c_str(); }
-    operator std::string_view() const noexcept { return {c_str(), size() > 0 ? static_cast<size_t>(size() - 1) : 0}; }
+    operator std::string_view() const noexcept { return view(); }
     /// @}
+    /// The characters without the NUL that size() counts, for loops and spans; valid until the string changes.
+    std::string_view view() const noexcept { return {c_str(), size() > 0 ? static_cast<std::size_t>(size() - 1) : 0}; }
 
     /// Appends; null is ignored. `s` may lie in this string.
     KpString& operator+=(const char* s);
@@ -163,3 +166,13 @@ KpString operator+(const KpString& a, Char c)
 
 /// Writes the characters.
 KPLIB_API std::ostream& operator<<(std::ostream& out, const KpString& text);
+
+/// For KpString and all that derives from it.
+template <std::derived_from<KpString> String>
+struct std::hash<String> {
+    /// That of the text up to its first NUL, as far as == compares it.
+    std::size_t operator()(const String& text) const
+    {
+        return std::hash<std::string_view>()(std::string_view(text.c_str()));
+    }
+};
