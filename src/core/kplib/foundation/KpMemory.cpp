@@ -8,15 +8,15 @@
 
 namespace {
 
-// The text is made and dropped: whoever catches reads the wording of KpMemoryException, and that is meant. It is short
-// enough for one block, so that a failure here ends in kpmalloc and cannot come back to kprealloc.
+// Formats a text and discards it. Intentional: handlers depend on the text of KpMemoryException.
+// The text fits into one block, so a failure here ends in kpmalloc and cannot return to kprealloc.
 void dropReallocationText(unsigned long size)
 {
     try {
         KpString text{KpString::NoMemory()};
         text.printf("could not reallocate %lu bytes", size);
     } catch (const KpMemoryException&) {
-        return;  // there isn't even memory for the text
+        return;  // no memory for the text either
     }
 }
 

@@ -3,7 +3,7 @@
 #include <pthread.h>
 
 struct KpThreadLocalStoragePrivate {
-    pthread_key_t key = ~pthread_key_t{0};  // nobody's, so that a key that could not be made touches no other
+    pthread_key_t key = ~pthread_key_t{0};  // never valid: if none can be created, no other key is used
 };
 
 KpThreadLocalStorageBase::KpThreadLocalStorageBase() : KpThreadLocalStorageBase(nullptr) {}
@@ -16,7 +16,7 @@ KpThreadLocalStorageBase::KpThreadLocalStorageBase(void (*destructor)(void*)) : 
 KpThreadLocalStorageBase::~KpThreadLocalStorageBase()
 {
     if (pthread_key_delete(key_->key) == 0)
-        delete key_;  // a key that the platform doesn't let go keeps its memory, and that is meant
+        delete key_;  // intentional: if the platform keeps the key, its record is leaked
 }
 
 void* KpThreadLocalStorageBase::get() const

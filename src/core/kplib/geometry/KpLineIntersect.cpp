@@ -69,11 +69,11 @@ bool KpLine::intersect(const KpBox3f& box, KpVec3f& enter, KpVec3f& exit, float 
         const Crossing crossing =
             crossSlab(position_[axis], direction_[axis], box[2 * axis], box[2 * axis + 1], tolerance, range);
         if (crossing == Crossing::Thin)
-            return true;  // at once, before later axes can tell of a miss: that is meant
+            return true;  // intentional: before a later axis can report a miss
         isApart = crossing == Crossing::Apart;
     }
     if (!isApart) {
-        // An entry beyond the exit is not asked for: its points lie outside.
+        // An entry beyond the exit needs no test of its own: its points lie outside.
         const KpVec3f first = pointAt(range.entry), last = pointAt(range.exit);
         if (box.contains(first, tolerance) && box.contains(last, tolerance)) {
             enter = first;

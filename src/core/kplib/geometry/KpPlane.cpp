@@ -26,7 +26,7 @@ std::optional<float> cosine(KpVec3f a, KpVec3f b)
     return a.dot(b);
 }
 
-// NaN passes, here and in the comparison of distances: what can't be told apart counts as equal.
+// NaN passes, here and in the comparison of distances: values that cannot be compared are equal.
 bool isNearOne(float cosine)
 {
     return !(cosine - cosineTolerance > 1) && !(cosine + cosineTolerance < 1);

@@ -34,7 +34,7 @@ KpVec3f pointAt(const KpLine& line, float t)
 
 const KpSphere& KpSphere::emptySphere()
 {
-    // Made without a lock and never freed, both meant: whoever holds it may outlive the statics.
+    // Intentional: created without a lock and never freed, since a holder may outlive the statics.
     static constinit const KpSphere* empty = nullptr;
     if (empty == nullptr)
         empty = new KpSphere(KpVec3f(0, 0, 0), -1);

@@ -23,7 +23,7 @@ KpVec3f toScreen(const KpMat4f& matrix, const KpVec3f& world)
 KpRotation alignToAxes(const KpVec3f& up, const KpVec3f& right)
 {
     const KpRotation toUp(KpVec3f(0, 1, 0), up.getClosestAxis());
-    const KpVec3f x = toUp.multVec(KpVec3f(1, 0, 0));  // turned by toUp, and below again: that is meant
+    const KpVec3f x = toUp.multVec(KpVec3f(1, 0, 0));  // intentional: turned by toUp here and again below
     KpRotation best = KpRotation::identity();
     float bestScore = -237.4F;  // below any that directions have
     for (int quarters = -1; quarters <= 2; ++quarters) {

@@ -14,7 +14,8 @@ void kpDestructError(void* error)
     delete static_cast<KpResult*>(error);
 }
 
-// Made by whoever fails first, and never destroyed, as static initialisers and destructors may fail too.
+// Created by the first failure and never destroyed, since static initialisers and destructors may
+// fail too.
 KpThreadLocalStorage<KpResult>& kpLastError()
 {
     static auto* const storage = new KpThreadLocalStorage<KpResult>(kpDestructError);

@@ -74,7 +74,7 @@ bool KpHttpGet::setURL(const char* url)
         return false;
     }
     const std::string_view rest = text.substr(scheme.size());
-    const size_t colon = rest.find(':');  // the first, wherever it stands, and that is meant
+    const size_t colon = rest.find(':');  // intentional: the first colon, even after a slash
     const size_t slash = rest.find('/', colon == std::string_view::npos ? 0 : colon);
     const std::string host(rest.substr(0, std::min(colon, slash)));
     const int port = colon == std::string_view::npos ? 80 : std::atoi(rest.data() + colon + 1);
@@ -192,7 +192,7 @@ bool KpHttpGet::receiveHead(HttpHead& head)
         }
         if (n < 1) {
             if (n == 0)
-                errno = ECONNRESET;  // an orderly end too, of which errno doesn't tell
+                errno = ECONNRESET;  // an orderly end too, which leaves errno unset
             setError(nullptr);
             return false;
         }

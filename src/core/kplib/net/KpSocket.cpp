@@ -51,11 +51,11 @@ bool resolve(const char* host, in_addr_t& address)
         return true;
     address = KpSocketTools::getIPV4Address(host);
     if (address == 0)
-        errno = EHOSTUNREACH;  // the resolver has error codes of its own, and errno would tell of anything
+        errno = EHOSTUNREACH;  // the resolver has its own error codes and may leave any errno
     return address != 0;
 }
 
-// For what is no longer of use; errno keeps telling why.
+// Closes a socket that is not needed; errno keeps the cause of the failure.
 int closeFailed(int socket)
 {
     const int cause = errno;

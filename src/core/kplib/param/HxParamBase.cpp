@@ -57,7 +57,7 @@ char cleaned(char c)
 {
     if ((c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') || c == '-')
         return c;
-    switch (static_cast<unsigned char>(c)) {  // Latin-1; the list is short, and that is meant
+    switch (static_cast<unsigned char>(c)) {  // Latin-1; intentional: no other letters
     case 196:
         return 'A';
     case 214:
@@ -109,7 +109,7 @@ void HxParamBase::operator delete(void* node) noexcept
     kpfree(node);
 }
 
-// The name is given while the kind is still that of a parameter, and that is meant: names count on it.
+// Sets the name while the kind is still that of a parameter. Intentional: names depend on it.
 HxParamBase::HxParamBase(Type type, const char* name)
 {
     setName(name);

@@ -274,7 +274,7 @@ bool HxParameter::isEqual(int n, KpPrimType otherType, const void* data) const
         return false;
     if (data == value_)
         return true;
-    // The kind of the node, not the type of its elements: only Byte ever gets on, and that is meant.
+    // Intentional: compares with the kind of the node, not its element type, so only Byte passes.
     if (n != dimension_ || static_cast<int>(otherType) != type())
         return false;
     return n == 0 ||

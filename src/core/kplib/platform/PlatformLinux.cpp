@@ -67,7 +67,8 @@ bool processorCounts(ProcessorCounts& counts)
     std::string package, core;
     const long configured = sysconf(_SC_NPROCESSORS_CONF);
     for (long i = 0; i < configured; ++i) {
-        // A core is told by the processors on it: its number may occur again in another part of the same package.
+        // The list of its processors identifies a core: the number of the core may occur again in
+        // another part of the same package.
         if (!readTopology(i, "physical_package_id", package) || !readTopology(i, "thread_siblings", core))
             continue;
         packages.insert(package);

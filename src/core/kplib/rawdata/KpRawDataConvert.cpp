@@ -12,8 +12,8 @@ namespace {
 
 using namespace kplib::detail;
 
-// Whether both types are numbers. A target that isn't one is an error, a source that isn't is left out without a word,
-// and that is meant.
+// Returns whether both types are numbers. Intentional: if the target is not a number, an error is
+// logged; if only the source is not, nothing is logged.
 bool areNumbers(KpPrimType to, KpPrimType from)
 {
     if (!to.isNumber()) {
@@ -56,7 +56,7 @@ void KpRawData::mapLinear(KpTypedPointer dst, KpTypedPointer src, unsigned long 
         return;
     }
     if (dst.type == KpPrimType::Complex || src.type == KpPrimType::Complex) {
-        // One text for both directions, and that is meant.
+        // Intentional: one text for both directions.
         getTheLogInstance().errorf("ERROR: KpRawData::mapLinear(), mapping from complex to real is not supported\n");
         return;
     }

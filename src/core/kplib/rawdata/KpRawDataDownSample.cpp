@@ -87,7 +87,7 @@ void downSample(BlockRule rule, void* dst, KpTypedPointer src, const Grid& grid,
             loop(row);
         }
     };
-    // The source slice at which the layer begins, and one: the last is below dz, and that is meant.
+    // Intentional: progress is the first source slice of the layer plus 1, so it ends below dz.
     eachLayer(grid, progress, makeLayer, [&](long k) { return k * row.fz + 1; });
 }
 
@@ -111,7 +111,7 @@ void takeCorners(void* dst, const void* src, const Grid& grid, KpProgressInterfa
             fx == 2 ? takeEvery<2>(to, row, nx, fx) : takeEvery<0>(to, row, nx, fx);
         }
     };
-    // Layers of the target against slices of the source: the last is about dz / fz of dz, and that is meant.
+    // Intentional: progress counts target layers against source slices: it ends at about dz / fz.
     eachLayer(grid, progress, makeLayer, [](long k) { return k + 1; });
 }
 
@@ -142,7 +142,7 @@ void KpRawData::downSampleLabels3D(void* a, KpTypedPointer b, unsigned long dx, 
     const Grid grid{{dx, dy, dz}, {fx, fy, fz}};
     if (!isSupported(b.type) || !grid.hasFactors() || !grid.accepts(a, b.data))
         return;
-    // Only ushort goes from `b` to `a`, and that is meant: callers hand source and target accordingly.
+    // Intentional: only ushort is copied from `b` to `a`; callers order source and target by this.
     const bool toA = b.type == KpPrimType::UShort;
     void* const dst = toA ? a : b.data;
     const void* const src = toA ? b.data : a;

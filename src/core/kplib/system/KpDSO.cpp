@@ -105,7 +105,7 @@ int KpDSO::load(const KpFilename& name, KpString& messages)
 void KpDSO::initPackage(const KpFilename& name) const
 {
     std::string package = name.basename();
-    package.erase(0, 3);  // "lib", though nobody looks
+    package.erase(0, 3);  // the prefix "lib", which is not checked
     package = package.substr(0, package.rfind('.'));
     call<void>(KpString(0, "orlinpackage_%s_init", package.c_str()));
 }

@@ -9,7 +9,7 @@
 
 namespace {
 
-// What stat() tells of a name; all zero where it fails.
+// The result of stat() for a name; all zero if stat() fails.
 struct Status : stat {
     explicit Status(const char* name) : stat{}, isKnown(::stat(name, this) == 0) {}
     bool isSameFile(const Status& other) const

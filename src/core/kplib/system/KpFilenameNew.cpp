@@ -47,7 +47,7 @@ void KpFilename::enumerate(KpString& result, const char* pattern, int number)
         const int width = static_cast<int>(last + 1 - first);
         text.replace(first, last + 1 - first, KpString(0, "%0*d", width, number).c_str());
     } else if (number >= 2) {
-        const auto dot = text.rfind('.');  // of a folder's name too, that is meant
+        const auto dot = text.rfind('.');  // intentional: also one in a folder's name
         text.insert(dot == std::string::npos ? text.size() : dot, KpString(0, "%04d", number).c_str());
     }
     result = text.c_str();

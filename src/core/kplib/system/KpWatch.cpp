@@ -9,7 +9,7 @@
 
 namespace {
 
-// Seconds per tick; 0 until the first start() of any watch, and that is meant. Always set to the same value.
+// Seconds per tick, always set to the same value. Intentional: 0 until a watch is first started.
 std::atomic<double> cFactor = 0;
 
 double seconds(std::uint64_t ticks)

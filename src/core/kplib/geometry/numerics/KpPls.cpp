@@ -107,7 +107,7 @@ void KpPls::ReumannWitkam(const Points& points, float tolerance, Points& result)
     kept.append(points[0]);
     long anchor = 0, cursor = 1;
     while (cursor < n) {
-        // A short piece tells no direction.
+        // A piece shorter than the tolerance has no reliable direction.
         while (cursor < n - 1 && (points[cursor] - points[anchor]).squaredLength() < squaredTolerance)
             ++cursor;
         const KpLine2D strip(points[anchor], points[cursor]);

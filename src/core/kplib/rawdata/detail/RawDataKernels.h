@@ -5,8 +5,9 @@
 
 #include <span>
 
-// The loops under KpRawData. Each table's first row is the plain loop, the reference. A row answers a type or a width
-// with its loop, null if it has none. Addresses need no alignment; sources and targets don't overlap unless told.
+// The loops of KpRawData. The first row of each table is the plain loop, the reference. A row
+// returns its loop for a type or a width, null if it has none. Addresses need no alignment.
+// Sources and targets do not overlap.
 
 namespace kplib::detail {
 

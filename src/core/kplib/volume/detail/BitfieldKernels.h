@@ -59,11 +59,11 @@ using AnyLoop = bool(const BitWord* a, const BitWord* b, unsigned long n);
 template <typename Op>
 std::span<const KernelPath<AnyLoop>> anyPaths();
 
-// Writes all n / 32 + 1 words of the mask of `n` labels, as KpBitfield::fromLabels() tells.
+// Writes all n / 32 + 1 words of the mask of `n` labels, as KpBitfield::fromLabels() describes.
 using FromLabelsLoop = void(BitWord* words, const unsigned char* labels, unsigned long n, unsigned char label);
 std::span<const KernelPath<FromLabelsLoop>> fromLabelsPaths();
 
-// Merges `n` bits into labels, as KpBitfield::InsertPolicy tells.
+// Merges `n` bits into labels, as KpBitfield::InsertPolicy describes.
 using ToLabelsLoop = void(const BitWord* words, unsigned char* labels, unsigned long n, unsigned char label);
 using ToLabelsLoops = ToLabelsLoop*(KpBitfield::InsertPolicy policy);  // null for an unknown policy
 std::span<const KernelPath<ToLabelsLoops>> toLabelsPaths();

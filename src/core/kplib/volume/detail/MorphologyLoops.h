@@ -13,7 +13,7 @@ using Word = MorphologyWord;
 using LooseWord = Loose<std::uint64_t>;
 constexpr long wordBits = MorphologyLayout::wordBits, block = MorphologyLayout::block;
 
-// `count` bits from bit `pos`, without looking at words beyond; the bits above are of no meaning.
+// The `count` bits from bit `pos`; reads no further words. The bits above them are unspecified.
 KPLIB_KERNEL_BODY Word bitsAt(const std::uint32_t* field, long pos, long count)
 {
     const std::uint32_t* word = field + pos / 32;

@@ -27,7 +27,7 @@ RowBits bitsOf64(long start, IsSet isSet)
     return bitsOf64Flags(flags);
 }
 
-// The bits of `isSet(i)`; tells whether there is any.
+// Writes `isSet(i)` as bits and returns whether any is set.
 template <typename IsSet>
 bool fillBits(RowBits* bits, long n, IsSet isSet)
 {

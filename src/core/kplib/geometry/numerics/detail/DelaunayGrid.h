@@ -78,7 +78,7 @@ private:
     static constexpr int reach = Size == 2 ? 2 : 3;      // in space smaller cells spare more walks than they cost
     static constexpr int cells = Size == 2 ? 4 : 27;     // from which a box can reach a point
     static constexpr int smallest = -140, levels = 268;  // from what is lost in the rounding to beyond all floats
-    static constexpr double lastCell = 0x1p51;           // up to here neighbours can be told apart
+    static constexpr double lastCell = 0x1p51;           // up to here numbers of neighbouring cells differ
     static constexpr std::uint64_t levelFactor = 0xD6E8FEB86659FD93;
     static constexpr std::uint64_t factors[] = {0x9E3779B97F4A7C15, 0xC2B2AE3D27D4EB4F, 0x165667B19E3779F9};
 
