@@ -15,6 +15,23 @@ KPLIB_X86_ROWS(DiffersLoops, differsX86);
 
 namespace scan {
 
+// Plan
+//
+// The plain loops define the results: they go through the elements one by one, a NaN changes no
+// bound, and of equal zeros (0 and -0) the first stays.
+//
+// The wide loops handle blocks of 256 steps. A step is four vectors, each with its own lanes of
+// smallest and largest elements, so that no comparison waits for the one before it:
+//
+//     elements:  | v0 | v1 | v2 | v3 | v0 | v1 | v2 | v3 | ...  | rest |
+//                  |    |    |    |    |    |    |    |            |
+//     lanes:      [0]  [1]  [2]  [3]  [0]  [1]  [2]  [3]       plain loop
+//
+// After a block the lanes are reduced to one smallest and one largest element. Lanes do not keep
+// the order of the elements, which matters for the sign of a zero only: settled() restores it. NaN
+// fails both comparisons of a lane, as in the plain loops. The search for an element that differs
+// from the first one is the same reduction; it ends after the first block with a wider range.
+
 template <typename T>
 KPLIB_KERNEL_BODY void widen(T& min, T& max, T value)
 {
@@ -51,19 +68,21 @@ struct DiffersPlain {
     }
 };
 
-// Vectors of the compiler: it doesn't reorder a minimum of floats by itself. Each lane follows the sequential steps.
+// Vector extensions, since the compiler does not reorder a minimum of floats by itself. Each lane
+// takes its elements in sequence.
 template <typename T, int Bytes>
 struct Lanes {
     typedef T Vector __attribute__((vector_size(Bytes)));
     static constexpr int count = Bytes / sizeof(T);
     static constexpr int unroll = 4;
     static constexpr long step = unroll * count;  // elements a round
-    static constexpr long block = 256 * step;     // elements between two looks at the outcome
+    static constexpr long block = 256 * step;     // elements between two reductions of the lanes
 
     KPLIB_KERNEL_BODY static void load(Vector& to, const void* from) { std::memcpy(&to, from, Bytes); }
 };
 
-// Smallest and largest of a multiple of Lanes::step elements and the given range, but for the sign of zeros.
+// Extends the range [min, max] by `n` elements, a multiple of Lanes::step. The sign of a zero is
+// unspecified.
 template <typename T, int Bytes>
 KPLIB_KERNEL_BODY void blockRange(const Loose<T>* values, long n, T& min, T& max)
 {
@@ -89,8 +108,8 @@ KPLIB_KERNEL_BODY void blockRange(const Loose<T>* values, long n, T& min, T& max
     }
 }
 
-// The bound after a block whose smallest or largest element is `found`: the earlier one stays if they are equal, and
-// of the zeros in the block the first is taken, since lanes lose their order.
+// The bound after a block whose smallest or largest element is `found`. An equal earlier bound
+// stays; of several zeros in the block the first one counts.
 template <typename T>
 KPLIB_KERNEL_BODY T settled(T bound, T found, const Loose<T>* values)
 {
@@ -112,7 +131,7 @@ struct RangeWide {
         auto* values = static_cast<const Loose<T>*>(elements);
         T low = *static_cast<T*>(min), high = *static_cast<T*>(max);
         if (std::isnan(low))
-            return;  // at the head it stays
+            return;  // a first element that is NaN stays both bounds
         while (n >= L::step) {
             const long count = std::min(n - n % L::step, L::block);
             T blockLow = low, blockHigh = high;

@@ -26,10 +26,10 @@ using MorphologyLoop = void(const MorphologyJob& job, void* area);
 std::span<const KernelPath<MorphologyLoop>> morphologyPaths();
 unsigned long morphologyAreaBytes(const MorphologyJob& job);
 
-// How many passes, of those that the job asks for, to do at once so that their work area stays in the cache.
+// How many of the job's passes to do at once so that their work area stays in the cache.
 long morphologyPassesAtOnce(const MorphologyJob& job);
 
-// One pass voxel by voxel: what all else has to equal, and what needs no work area.
+// One pass voxel by voxel: the reference, which needs no work area.
 void morphologyByVoxel(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, MorphologyReach reach, bool erodes);
 
 }  // namespace kplib::detail

@@ -10,17 +10,25 @@ namespace kplib::detail {
 
 using MorphologyWord [[gnu::may_alias]] = std::uint64_t;  // fields are of halves of it
 
-// Does `step` passes at once: slices that step before and behind, too, contribute.
+// Does `step` passes at once: the slices `step` before and after contribute too.
 struct MorphologyStage {
     long step;
-    long delay;   // slices that have come to the first stage before one comes to this
-    long slices;  // where its own begin, counted in slices: that for what is near, then 2 * step for what is far
-    long masks;   // the first of its two
+    long delay;   // slices by which it follows the first stage
+    long slices;  // number of its first buffer: one for the near figure, then 2 * step for the far ones
+    long masks;   // words from the first mask to its two masks
 };
 
-// The stages, and where things lie in the work area, in words. Each slice has zeros before and behind, for shifts by
-// rows. Several passes with all 26 neighbours are a box: from a box of radius r one step of r + 1 makes that of 2r +
-// 1, and where the volume cuts it off nothing is missing, as the ways to each voxel lead through the ones between.
+// The stages, and the places of the buffers in the work area, counted in words:
+//
+//     pad, input 0, pad, input 1, pad, between, pad,
+//     near of stage 0, pad, far 0 of stage 0, pad, ... far 2 * step - 1 of stage 0, pad,
+//     the same of each further stage, masks
+//
+// A buffer holds one slice. The zeros of the pads are what a shift by `step` rows reads beyond it.
+//
+// Several passes with all 26 neighbours make a box. From a box of radius r, one step of r + 1 makes
+// a box of radius 2r + 1. The border of the volume does not change that, since all voxels between
+// two voxels of the volume belong to the volume.
 struct MorphologyLayout {
     static constexpr long wordBits = 64, block = 8;  // loops go by blocks, the words of a cache line
     static constexpr long maxStages = 32, maxStep = 8;
@@ -43,7 +51,7 @@ struct MorphologyLayout {
         masks = pad + slices * (words + pad);
     }
     static constexpr long roundedUp(long n, long to) { return (n + to - 1) / to * to; }
-    // The masks of the ends of rows repeat themselves.
+    // Words after which the masks of the ends of rows repeat.
     static constexpr long maskPeriod(long nx) { return std::lcm(nx, wordBits * block) / wordBits; }
     constexpr long slice(long i) const { return pad + i * (words + pad); }
     constexpr unsigned long bytes() const

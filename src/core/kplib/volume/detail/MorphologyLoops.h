@@ -23,7 +23,7 @@ KPLIB_KERNEL_BODY Word bitsAt(const std::uint32_t* field, long pos, long count)
     return bits;
 }
 
-// Writes the lowest `count` bits to those from `pos` on; the ones beside stay.
+// Writes the lowest `count` bits to the bits from `pos` on; the others stay.
 KPLIB_KERNEL_BODY void putBits(std::uint32_t* field, long pos, long count, Word bits)
 {
     while (count > 0) {
@@ -47,7 +47,7 @@ KPLIB_KERNEL_BODY Word shiftedDown(Word low, Word high, long by)
     return low >> by | high << 1 << (63 - by);
 }
 
-// The voxels so many rows of bits before and behind along y.
+// The voxels before and after along y: at a distance of `words` words and `by` bits.
 template <bool rowsOfWords>
 KPLIB_KERNEL_BODY Word alongY(const Word* bits, long words, long by)
 {
@@ -87,8 +87,9 @@ KPLIB_KERNEL_BODY void realignAlongX(Word* __restrict to, Word* __restrict wide,
     }
 }
 
-// Completes the slice before `in`, and takes up what `in` contributes: `near` and `farBefore` are those of the slice
-// before, `far` that of the one before it and then that of `in`.
+// Completes the slice one step before `in`, and stores the figures of `in`. `near` and `farBefore`
+// are the figures of that slice. `far` is the figure of the slice two steps before `in`, and
+// receives that of `in`.
 template <MorphologyReach reach, bool rowsOfWords>
 struct Combine {
     KPLIB_KERNEL_BODY static void run(Word* __restrict out, Word* __restrict near, Word* __restrict far,

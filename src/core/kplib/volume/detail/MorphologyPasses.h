@@ -8,12 +8,41 @@
 #include <cstring>
 #include <memory>
 
-// Slices pass, one after the other, through a row of stages, one a pass of the operation. A slice is one string of
-// bits that starts at a word: steps along y are shifts of the string, steps along x are shifts by one with the ends of
-// the rows masked. So rows need no alignment, and all loops are long. Erosion is the dilation of what is not set.
+// Plan
 //
-// Any of the neighbourhoods is made of two figures in the plane: what a voxel reaches in its own slice (near), and what
-// it reaches in the slices before and behind (far). A stage keeps what the slices that have come so far contribute.
+// A slice is one string of bits that starts at a word boundary. A step along y is a shift of the
+// string by a row; a step along x is a shift by one bit with the ends of the rows masked. So rows
+// need no alignment and all loops are long. Erosion is the dilation of the inverted mask: bits are
+// inverted when a slice is read and when it is written. Bits after the last voxel are 0 in each
+// slice that a stage receives, so the outside is background for dilation, foreground for erosion.
+//
+// A pass is a stage, and each slice goes through all stages while it is in the cache. At time t,
+// stage i receives slice t - delay(i) and completes the slice `step` before it. Four slices, two
+// stages of step 1 ("-" is a slice of zeros after the last one):
+//
+//     time                 0    1    2    3    4    5
+//     read from src        0    1    2    3
+//     stage 0 receives     0    1    2    3    -
+//     stage 0 completes         0    1    2    3
+//     stage 1 receives          0    1    2    3    -
+//     stage 1 completes              0    1    2    3
+//     written to dst                 0    1    2    3
+//
+// Slice t is read before slice t - passes is written, so dst may be src.
+//
+// Each neighbourhood consists of two figures in the plane: `near`, the voxels reached in the slice
+// itself, and `far`, the voxels reached in the slices `step` before and after it:
+//
+//     Faces   near:  . o .   far:  . . .     Edges   near:  o o o   far:  . o .
+//                    o o o         . o .                    o o o         o o o
+//                    . o .         . . .                    o o o         . o .
+//
+//     Corners: near and far are both the square of Edges, with `step` instead of 1
+//
+//     completed(z - step) = far(z - 2 step) | near(z - step) | far(z)
+//
+// So a stage keeps `near` of one slice and `far` of the last 2 * step slices, in a ring indexed by
+// z % (2 * step). MorphologyLayout describes the steps and the buffers.
 
 namespace kplib::detail {
 
@@ -47,7 +76,7 @@ struct Passes {
         for (long i = 0; i < layout.count; ++i)
             makeMasks(layout.stages[i]);
     }
-    // Of the voxels with one `step` before, or behind, them in their row.
+    // Masks of the voxels that have another voxel `step` before, or after, them in their row.
     KPLIB_KERNEL_BODY void makeMasks(const Stage& stage) const
     {
         const auto bits = static_cast<unsigned long>(layout.maskWords * wordBits);
@@ -65,7 +94,7 @@ struct Passes {
             mask[i / 64] &= ~(Word{1} << i % 64);
     }
 
-    // Zeros behind the last voxel.
+    // Clears the bits after the last voxel.
     KPLIB_KERNEL_BODY void clearTail(Word* bits) const
     {
         const long last = layout.sliceBits / wordBits;
@@ -75,11 +104,11 @@ struct Passes {
             bits[i] = 0;
     }
 
-    // Slice z, and what it reaches along x.
+    // Reads slice z into `to`, and writes the voxels that it reaches along x to between().
     KPLIB_KERNEL_BODY void load(long z, Word* to) const
     {
         const long from = z * layout.sliceBits, used = (layout.sliceBits + wordBits - 1) / wordBits;
-        long whole = std::max(used - 2, 0L) & -block;  // whose source lies in the field
+        long whole = std::max(used - 2, 0L) & -block;  // words whose source words all lie in the field
         if (from == 0)
             whole = 0;
         const long base = from % 32 == 0 ? from - 32 : from / 32 * 32;
@@ -93,7 +122,7 @@ struct Passes {
         widen(layout.stages[0], to, whole);
     }
 
-    // What a slice reaches along x, from a word on.
+    // Writes the voxels that a slice reaches along x to between(), from word `start` on.
     KPLIB_KERNEL_BODY void widen(const Stage& stage, const Word* bits, long start) const
     {
         while (start < layout.words) {
@@ -109,7 +138,7 @@ struct Passes {
     {
         return reinterpret_cast<Word*>(job.dst + z * layout.sliceBits / 32);
     }
-    // Slices share words with the ones beside them.
+    // Writes slice z. Its first and last words may be shared with adjacent slices.
     KPLIB_KERNEL_BODY void store(long z, const Word* bits) const
     {
         const long to = z * layout.sliceBits, by = to % 32, base = to - by, end = layout.sliceBits + by;
@@ -121,7 +150,7 @@ struct Passes {
                     shiftedUp(bits[whole - 1], bits[whole], by) ^ flip);
     }
 
-    // Slice z comes to a stage; the one `step` before it is complete then, and goes out.
+    // Passes slice z to a stage, and writes the slice `step` before it, which is then complete.
     template <MorphologyReach reach>
     KPLIB_KERNEL_BODY void step(const Stage& stage, const Word* in, long z, Word* out, Word flipOut) const
     {
@@ -134,7 +163,6 @@ struct Passes {
     }
 };
 
-// A slice is read before any that is written at the time, so dst may be src.
 template <MorphologyReach reach>
 struct AllPasses {
     KPLIB_KERNEL_BODY static void run(const MorphologyJob* job, Word* area)
