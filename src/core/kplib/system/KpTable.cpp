@@ -10,6 +10,31 @@
 
 using namespace kplib::detail;
 
+// Plan
+//
+// The rows of a table lie in one block, the cells of each relation column in a pool:
+//
+//     rows_    | state | table id | client bytes | row pointer | first, last | ...   row 0
+//              | ...                                    |          |     |           row 1
+//                                                       |          |     '------------.
+//                  a row of columnTable_[i] <-----------'          v                  v
+//     relationPool_[offset of the column]                  | target, next | free | target, next |
+//                                                               |     |               ^
+//                  a row of columnTable_[i] <-------------------'     '---------------'
+//
+// freeRows_ lists the rows to reuse, relationFree_[offset] the cells to reuse. Of a free row all
+// bytes after the head are 0, and a free cell holds two null pointers: so repairs visit all rows
+// and cells without asking which are in use.
+//
+// All pointers are addresses, so a move repairs them:
+//
+//  - Rows: expand() copies each row and writes its new address over the first bytes of its old
+//    place. Each pointer to an old row is then replaced by the address found there: in the columns
+//    of all tables of the database, in freeRows_ and in the client's externalRowPointers_.
+//  - Cells: a pool moves as a whole, so the pointers to its cells change by the same distance.
+//
+// While rows and pointers disagree, CheckSkipped makes check() return true.
+
 namespace {
 
 constexpr int pointerSize = 8, relationSize = 16, idColumnSize = 4;
@@ -71,9 +96,9 @@ int KpTable::columnAdd(int columnId, ColumnType type, int size, KpTable* target)
 bool KpTable::canAdd(int columnId, ColumnType type, int size, const KpTable* target) const
 {
     if (!isColumnId(columnId))
-        return false;  // there are as many ids as places for columns
+        return false;  // the ids also limit the number of columns
     if (columnCount_ == 1 && (type != Plain || size < rowHeadSize - idColumnSize))
-        return false;  // it has to hold the table's id
+        return false;  // the column has to hold the table's id
     if (sizeOf(type, size) > INT_MAX - rowSize_)
         return false;
     if (type == Plain)
@@ -81,7 +106,7 @@ bool KpTable::canAdd(int columnId, ColumnType type, int size, const KpTable* tar
     return target && (type == RowPointer || (type == Relation && rowSize_ < maxRelationOffset));
 }
 
-// Room for two cells' worth of entries a row of a new table, none of them used.
+// Creates the pool of a relation column, with room for initialRows_ cells and none in use.
 void KpTable::addPool(int offset)
 {
     dropPool(offset);
@@ -119,7 +144,7 @@ int KpTable::changeRelationLock(int offset, int by)
 {
     const auto index = static_cast<int>(std::find(columnOffset_, columnOffset_ + columnCount_, offset) - columnOffset_);
     if (index == columnCount_) {
-        ++skipCheck_;  // whatever `by` is: kept as it is
+        ++skipCheck_;  // intentional: for either `by`
         return -1;
     }
     relationLocks_[index] += by;
@@ -179,7 +204,7 @@ bool KpTable::isRelationSound(const char* row, int column) const
     for (char** cell = relationFirst(row, offset); cell; cell = relationNext(cell)) {
         const std::intptr_t at = distance(pool.data(), cell);
         const bool isInPool = at >= 0 && at < distance(pool.begin(), pool.end()) && at % relationSize == 0;
-        if (!isInPool || ++cells > pool.size() / 2)  // more cells than there are: the list bites its tail
+        if (!isInPool || ++cells > pool.size() / 2)  // more cells than there are: the list has a cycle
             return false;
         if (!columnTable_[column]->checkRowPointer(relationTarget(cell)))
             return false;

@@ -10,7 +10,7 @@ using namespace kplib::detail;
 
 namespace {
 
-// The same elements in storage of the same capacity.
+// Copies the elements into storage of the same capacity.
 template <typename T>
 void copyWithCapacity(const KpDArray<T>& from, KpDArray<T>& to)
 {

@@ -10,7 +10,7 @@ using namespace kplib::detail;
 
 namespace {
 
-// The two ends of a list, as a relation column holds them.
+// The first and the last cell of a list, as a relation column holds them.
 struct Ends {
     char** first;
     char** last;
@@ -40,7 +40,7 @@ char** KpTable::relationFirst(const char* row, int offset)
 
 void KpTable::relationAdd(char* row, int offset, char* target)
 {
-    char** const cell = takeCell(offset);  // may move the pool, and the ends with it
+    char** const cell = takeCell(offset);  // may move the pool and change the ends, so before they are read
     Ends ends = endsOf(row, offset);
     cell[0] = target;
     link(cell, nullptr);
@@ -103,7 +103,7 @@ void KpTable::relationRemoveAll(char* row, int offset)
     setEnds(row, offset, {nullptr, nullptr});
 }
 
-// Clears a cell, for which the list has room.
+// Clears a cell and adds it to the list of free cells, which has room for it.
 void KpTable::freeCell(char** cell, int offset)
 {
     cell[0] = cell[1] = nullptr;
@@ -131,7 +131,7 @@ void KpTable::relationReserve(int cells, int offset)
     relationExpand(wanted, offset, pool);
 }
 
-// Gives the pool room for `size` cells, and leads all pointers to cells to where these are then.
+// Gives the pool room for `size` cells, and corrects all pointers to cells if the pool moves.
 void KpTable::relationExpand(long size, int offset, Pool& pool)
 {
     if (pool.capacity() >= size * 2)
@@ -146,7 +146,7 @@ void KpTable::relationExpand(long size, int offset, Pool& pool)
         shiftCells(offset, moved);
 }
 
-// Leads the pointers to the cells of a pool that has moved by `bytes` to where they are.
+// Corrects the pointers to the cells of a pool that has moved by `bytes`.
 void KpTable::shiftCells(int offset, std::intptr_t bytes)
 {
     Pool& pool = *relationPool_[offset];

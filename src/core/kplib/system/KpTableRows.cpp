@@ -14,7 +14,7 @@ using namespace kplib::detail;
 
 namespace {
 
-// Where a row has moved to: written into the first bytes of the place it has left.
+// The new address of a moved row, which expand() writes into the first bytes of its old place.
 char* movedTo(const char* oldRow)
 {
     return readAt<char*>(oldRow);
@@ -146,7 +146,7 @@ void KpTable::relationsRepair()
         database_->tables()[i]->repairColumns(*this);
 }
 
-// Leads all pointers to rows of `moved` to where these are.
+// Replaces all pointers of this table to rows of `moved` by the new addresses.
 void KpTable::repairColumns(const KpTable& moved)
 {
     for (int column = columnCount_ - 1; column >= 0; --column) {

@@ -16,8 +16,9 @@
 //
 //     factor = (0.8 tolerance / err) ^ exponent[method]
 //
-//     err <= tolerance: accepted, then h = min(h * min(factor, 2), hMax)
-//     err >  tolerance: rejected, then h = h * max(factor, 0.5), or the end if h < hMin
+//     err <= tolerance or NaN: accepted, then h = min(h * min(factor, 2), hMax)
+//     err >  tolerance:        rejected, then the end if h < hMin or h = 0,
+//                              otherwise h = h * max(factor, 0.5)
 //
 // Samples: each accepted step from (y0, k0) to (y1, k1) over the parameters start to start + dt is a segment of the
 // curve, a Hermite cubic in u = (parameter - start) / dt:
@@ -34,10 +35,10 @@
 //     segment:  |---------------|-----------|---- ...          (steps of their own sizes)
 //               init  cubic  differences  cubic
 //
-// A field that ends at a wall makes the steps smaller and smaller: an attempt across the wall fails, a quarter of it is
-// accepted short of the wall, the size doubles, and the next attempt fails again. So the third failure in a row may
-// never come before the step is too small to advance; hence lastFailure, which keeps the code of the field for that
-// end.
+// If the field ends at a wall, the steps shrink without end: an attempt across the wall fails, an
+// attempt with a quarter of its size is accepted, the size doubles, and the next attempt fails
+// again. Three failures in a row may then not occur before the step is too small to advance. The
+// integration ends there with lastFailure, the last code of the field other than 0.
 
 namespace {
 
@@ -107,7 +108,7 @@ void KpODEBase<Vector>::init(const Vector& start, float h0)
     std::fill(std::begin(s.points), std::end(s.points), Vector{});
     std::fill(std::begin(s.derivatives), std::end(s.derivatives), Vector{});
     std::fill(std::begin(s.secondDerivatives), std::end(s.secondDerivatives), Vector{});
-    s.points[0] = start;  // what samples go on from where there never was a segment
+    s.points[0] = start;  // the last sample if there is no segment
     s.derivatives[0] = derivative;
     s.status = s.lastFailure = Success;
     if (h0 > 0) {
@@ -120,7 +121,7 @@ void KpODEBase<Vector>::init(const Vector& start, float h0)
     s.h = std::min(static_cast<float>(length == 0 ? step : step / static_cast<double>(length)), 5 * s.hSampling);
 }
 
-// Scales what the right-hand side gave; false for a derivative of length 0.
+// Scales the derivative by the orientation; false for a derivative of length 0.
 template <typename Vector>
 bool KpODEBase<Vector>::orient(Vector& derivative) const
 {
@@ -198,7 +199,7 @@ int KpODEBase<Vector>::attempt(Vector& y, Vector& f, Vector& error) const
     }
 }
 
-// An attempt that leaves the field is made again with a quarter of the step, twice.
+// Repeats an attempt that leaves the field with a quarter of the step, at most twice.
 template <typename Vector>
 int KpODEBase<Vector>::attemptWithSmallerSteps(Vector& y, Vector& f, Vector& error)
 {
@@ -220,7 +221,7 @@ double KpODEBase<Vector>::stepFactor(float error) const
     return std::pow(static_cast<double>(ratio), static_cast<double>(exponent[state_.method]));
 }
 
-// The code for a step that cannot go on: that of the field where the field made it small.
+// The code for a step that cannot advance: the last code of the field, if it failed since init().
 template <typename Vector>
 int KpODEBase<Vector>::stepTooSmall() const
 {
@@ -284,7 +285,7 @@ int KpODEBase<Vector>::next(Vector& point, Vector& derivative, Vector& secondDer
     return s.status;
 }
 
-// Advances the tables by one sample, over as many steps as that takes.
+// Advances the tables by one sample, with as many integration steps as it requires.
 template <typename Vector>
 auto KpODEBase<Vector>::advanceToSample() -> Phase
 {

@@ -6,7 +6,7 @@
 
 namespace kplib::detail {
 
-// A value that stands unaligned in a row.
+// Reads a value at an unaligned place in a row.
 template <typename T>
 T readAt(const char* place)
 {
@@ -21,17 +21,18 @@ void writeAt(char* place, const T& value)
     std::memcpy(place, &value, sizeof value);
 }
 
-// The distance of two blocks that are no parts of one array.
+// The distance between two blocks that are not parts of one array.
 inline std::intptr_t distance(const void* from, const void* to)
 {
     return reinterpret_cast<std::intptr_t>(to) - reinterpret_cast<std::intptr_t>(from);
 }
 
-// The place that follows a pointer's target by `bytes`; null stays null.
+// The address `bytes` after that of a pointer; null stays null.
 template <typename T>
 T* shifted(T* pointer, std::intptr_t bytes)
 {
-    // By way of numbers: the two blocks are no parts of one array. (clang-tidy 14 doesn't survive a bit_cast here.)
+    // Integer arithmetic, as the two blocks are not parts of one array. (clang-tidy 14 crashes on
+    // a bit_cast here.)
     // NOLINTNEXTLINE(performance-no-int-to-ptr)
     return pointer ? reinterpret_cast<T*>(reinterpret_cast<std::intptr_t>(pointer) + bytes) : nullptr;
 }

@@ -3,7 +3,7 @@
 #include <kplib/system/KpDataBase.h>
 #include <kplib/system/KpTable.h>
 
-// Keeps check() of a table and its database quiet while rows and pointers don't agree.
+// Makes check() of a table and its database return true while rows and pointers disagree.
 class KpTable::CheckSkipped {
 public:
     explicit CheckSkipped(KpTable& table) : table_(table)

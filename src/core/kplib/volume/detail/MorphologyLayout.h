@@ -26,8 +26,8 @@ struct MorphologyStage {
 //
 // A buffer holds one slice. The zeros of the pads are what a shift by `step` rows reads beyond it.
 //
-// Several passes with all 26 neighbours make a box. From a box of radius r, one step of r + 1 makes
-// a box of radius 2r + 1. The border of the volume does not change that, since all voxels between
+// Several passes with all 26 neighbours make a box. From a box of radius r, a step of r + 1 makes
+// one of radius 2r + 1. The border of the volume does not change that, since all voxels between
 // two voxels of the volume belong to the volume.
 struct MorphologyLayout {
     static constexpr long wordBits = 64, block = 8;  // loops go by blocks, the words of a cache line

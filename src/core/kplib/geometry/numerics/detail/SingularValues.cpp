@@ -5,24 +5,46 @@
 #include <algorithm>
 #include <cmath>
 
+// Plan
+//
+// The singular value decomposition of Golub and Reinsch, "Singular value decomposition and least
+// squares solutions", Numerische Mathematik 14, 1970, in floats and in the memory of U, w and V.
+//
+//     x x x  reflections  w r .  rotations  w . .
+//     x x x  ---------->  . w r  -------->  . w .
+//     x x x               . . w             . . w
+//     x x x               . . .             . . .
+//
+// bidiagonalize(): reflection i clears column i below the diagonal, then row i right of the
+// superdiagonal. w_ receives the diagonal, rv_ the superdiagonal (rv_[i] is above w_[i], rv_[0] is
+// 0). The normal of each reflection stays in its column or row of `u`.
+//
+// accumulateRight() and accumulateLeft() multiply the reflections to V and, in place, to U.
+//
+// diagonalize(k), from the last value to the first: QR sweeps with an implicit shift over the part
+// from l to k make rv_[k] smaller until it vanishes. findSplit() starts the part at the last l
+// where rv_[l] or w_[l - 1] vanishes; in the second case cancel() first rotates rv_[l] away. A
+// value vanishes if it does not change norm_, the largest |w_[i]| + |rv_[i]|, when added to it.
+
 namespace kplib::detail {
 namespace {
 
-// `magnitude` with the sign of `value`. A zero counts as positive whatever its sign, which is left to chance by what
-// comes before.
+// `magnitude` with the sign of `value`. Both zeros count as positive, since the sign of a zero
+// depends on roundings of earlier steps.
 float withSignOf(float value, float magnitude)
 {
     return value >= 0 ? magnitude : -magnitude;
 }
 
-// A reflector that makes a scaled vector with the first element `f` and the sum of squares `s` a multiple g of the
-// first axis; `h` is half the squared length of its normal, negative.
+// A reflector that maps a scaled vector with the first element `f` and the sum of squares `s` to
+// `g` times the first axis; -2 h is the squared length of its normal.
 struct Reflector {
     Reflector(float f, float s) : g(-withSignOf(f, std::sqrt(s))), h(f * g - s) {}
     float g, h;
 };
 
-// The work on a matrix that stands in `u`; `Fixed`: its rows and columns where they are known to the compiler, or 0.
+// Decomposes the matrix in `u`. `Fixed` is the number of its rows and columns if that is known at
+// compile time, or 0.
 template <int Fixed>
 class SingularValues {
 public:
@@ -49,7 +71,7 @@ public:
     }
 
 private:
-    static constexpr int small = 8;  // so many columns need no memory from the heap
+    static constexpr int small = 8;  // up to this number of columns no memory is allocated
 
     int m() const { return Fixed ? Fixed : m_; }
     int n() const { return Fixed ? Fixed : n_; }
@@ -57,7 +79,7 @@ private:
     float* v(int row) const { return v_ + static_cast<std::ptrdiff_t>(row) * n(); }
     bool vanishes(float value) const { return std::abs(value) + norm_ == norm_; }
 
-    // Turns columns `p` and `q` against each other.
+    // Rotates columns `p` and `q`.
     void rotate(float* row, int rows, int p, int q, float c, float s) const
     {
         for (int i = 0; i < rows; ++i, row += n()) {
@@ -292,7 +314,7 @@ private:
     float norm_ = 0;
     float small_[small];
     KpDMatrix<float> large_;
-    float* rv_;  // the superdiagonal in one of them, element i above w[i]
+    float* rv_;  // the superdiagonal in one of the two, element i above w[i]
 };
 
 }  // namespace

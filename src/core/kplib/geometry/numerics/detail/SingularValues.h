@@ -7,7 +7,7 @@
 
 namespace kplib::detail {
 
-// KpDMatrix::pythag(), where the compiler sees it.
+// KpDMatrix::pythag(), inline.
 inline float pythag(float a, float b)
 {
     if (a == 0 && b == 0)
@@ -18,8 +18,8 @@ inline float pythag(float a, float b)
     return static_cast<float>(static_cast<double>(greater) * std::sqrt(1.0 + static_cast<double>(ratio * ratio)));
 }
 
-// The work of KpDMatrix::SVD() on a matrix that stands in `u`, with `v` of its size: Householder reflections to a
-// bidiagonal matrix, then implicit QR sweeps.
+// Decomposes the matrix in `u` for KpDMatrix::SVD(), with a square `v` of as many columns:
+// Householder reflections to a bidiagonal matrix, then implicit QR sweeps.
 bool computeSingularValues(KpDMatrix<float>& u, float* w, KpDMatrix<float>& v, int maxIterations);
 
 }  // namespace kplib::detail
