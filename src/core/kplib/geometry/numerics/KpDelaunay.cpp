@@ -12,6 +12,37 @@
 #include <span>
 #include <utility>
 
+// Plan
+//
+// Incremental insertion: A. Bowyer, "Computing Dirichlet tessellations", and D. F. Watson,
+// "Computing the n-dimensional Delaunay tessellation with application to Voronoi polytopes", both
+// in The Computer Journal 24(2), 1981. The mesh starts with a simplex around all points. Each
+// point p replaces the simplices whose circle contains it:
+//
+//     +-------+        +-------+        +-------+
+//     |     / |        |       |        | \   / |
+//     |   /   |        |   p   |        |   p   |
+//     | /     |        |       |        | /   \ |
+//     +-------+        +-------+        +-------+
+//     simplices        the cavity       a fan: p with each
+//     around p         and its rim      face of the rim
+//
+// A face of two simplices of the cavity lies inside it, a face of one is a part of the rim. So
+// CavityRim::flip() adds a face at its first visit and removes it at the second.
+//
+//     DelaunayMesh.h      simplices and circles in numbered slots, which are reused; insertion
+//     DelaunayRim.h       the rim, in an order that decides the slots of the new simplices
+//     DelaunayGrid.h      finds the circles around a point in large meshes
+//     DelaunayKernels.h   finds them in small ones: a scan of all circles
+//     DelaunayCircle.h    contains(), whose rounding all searches share
+//
+// Every search returns the same slots in ascending order, apart from free ones and repetitions,
+// which insert() skips. So the result depends on the points and on their shift only, not on the
+// processor and not on the size from which the grid is used.
+//
+// Degenerate input: points are shifted at random by up to 0.5e-8 of the range, and simplices that
+// are almost flat are left out of the result, like those with a corner of the enclosing simplex.
+
 namespace kplib::detail::delaunay {
 namespace {
 
@@ -46,7 +77,7 @@ Box<Size> boxOf(const KpDArray<Point<Size>>& points, int n)
     return box;
 }
 
-// Positive for corners in the order that is given out, zero for a flat simplex.
+// Positive for corners in the order of the results, zero for a flat simplex.
 template <int Size>
 float volume(const KpDArray<Point<Size>>& points, const Simplex<Size>& simplex)
 {
@@ -64,7 +95,8 @@ void collect(const Mesh<Size>& mesh, const PointSet<Size>& set, KpDArray<Simplex
     for (int axis = 1; axis < Size; ++axis)
         flat *= set.range;
     flat *= 1e-8F;
-    // Corners of the enclosing simplex are older than all points, and so come first where there is one.
+    // Faces keep the order of their corners and new points are appended, so a corner of the
+    // enclosing simplex is always the first.
     const auto volumeIn = [&](std::int32_t slot) {
         const Simplex<Size>& s = mesh[slot];
         return s[0] >= 0 && s[0] < set.n ? volume<Size>(set.points, s) : 0;
@@ -121,7 +153,7 @@ template <int Size>
 Finder bestFinder()
 {
     static CircleScan* const scan = best(circleScanPaths<Size>());
-    return {scan, Size == 2 ? 8192 : 32768};  // where building and keeping the grid begins to pay
+    return {scan, Size == 2 ? 8192 : 32768};  // from this size on the grid is faster
 }
 
 template PointSet<2> shifted(const float*, int);
@@ -137,7 +169,7 @@ template <typename Vector, int Size = Vector::size()>
 bool triangulatePoints(const Vector* points, int n, KpDArray<Simplex<Size>>& result)
 {
     static_assert(sizeof(Vector) == Size * sizeof(float));
-    std::srand(367);  // callers that draw from the system's generator count on it
+    std::srand(367);  // callers that use the system's generator depend on it
     return triangulate(shifted<Size>(reinterpret_cast<const float*>(points), n), bestFinder<Size>(), result);
 }
 

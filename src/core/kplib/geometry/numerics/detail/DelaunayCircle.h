@@ -23,8 +23,8 @@ struct Circle {
     double squaredRadius;
 };
 
-// Whether `point` is inside or on `circle`. Every other way to ask has to round as this one does; what isn't a number
-// counts as inside.
+// Whether `point` is inside or on `circle`. Every other implementation has to round as this one
+// does. A NaN counts as inside.
 template <int Size>
 bool contains(const Circle<Size>& circle, const Position<Size>& point)
 {
@@ -51,7 +51,8 @@ T determinant(const std::array<std::array<T, 3>, 3>& m)
            m[0][2] * (m[1][0] * m[2][1] - m[1][1] * m[2][0]);
 }
 
-// The circle through point `last` and the corners of `face`, where the bisectors between them and `last` meet.
+// The circle through point `last` and the corners of `face`. Its centre is the intersection of the
+// bisectors between `last` and each corner.
 template <int Size>
 Circle<Size> circleThrough(const Point<Size>* points, const Face<Size>& face, int last)
 {

@@ -6,11 +6,12 @@
 
 namespace kplib::detail::delaunay {
 
-// Numbered circles as the scan wants them: an array for each number of a circle.
+// Numbered circles in the layout of the scan: an array for each coordinate of the centres, and one
+// for the squared radii.
 template <int Size>
 class CircleColumns {
 public:
-    // What is new is not set to anything.
+    // New elements are uninitialised.
     void resize(long count)
     {
         for (KpDArray<double>& column : columns_)
@@ -35,7 +36,8 @@ public:
         return circle;
     }
 
-    // Which of the first `count` contain `point`.
+    // Writes the indices of those of the first `count` that contain `point`, and returns their
+    // number.
     long scan(CircleScan* run, long count, const Position<Size>& point, std::int32_t* hits) const
     {
         const double* columns[std::size_t{Size} + 1];

@@ -12,15 +12,26 @@ namespace kplib::detail::delaunay {
 
 // Finds the circles around a point among many, by a pyramid of grids whose cells are powers of two wide.
 //
-// A circle stands in the cell of its box's low corner, in the finest level where a box of its width reaches no more
-// than `reach` cells along an axis: so a point's circles stand in its own cell or in those few before it. The boxes
-// are wide enough for all roundings of contains(). Cells share hash buckets; strangers met there fail the test like
-// other neighbours. What is wide against the set, or has no place (infinite, not a number, tiny but far out), is in a
-// table of its own that is scanned for every point.
+// A circle is stored in the cell of the low corner of its bounding box, in the finest level where
+// a box of its width overlaps at most `reach` cells along an axis. So the circles around a point p
+// are stored in the cell of p or in the `reach` - 1 cells before it along each axis:
+//
+//     +-------+-------+
+//     |     ..|..     |      reach 2: p is in cell (1, 1), and the circles around p are
+//     |   .   | p .   |      stored in the cells (0, 0), (1, 0), (0, 1) and (1, 1)
+//     +---.---+---.---+
+//     |   .   |   .   |
+//     |   * ..|..     |      *: the low corner of the box of this circle, in cell (0, 0)
+//     +-------+-------+
+//
+// The boxes are wide enough for all roundings of contains(). Several cells share a hash bucket:
+// all circles there are tested, some of them more than once. Circles wider than a quarter of the
+// range, and those without a cell (infinite, NaN, or too small for their distance from the
+// origin), are in a table that is scanned for every point.
 template <int Size>
 class CircleGrid {
 public:
-    // For about that many circles, of points that spread over `range`.
+    // For about `circles` circles of points in a range of width `range`.
     CircleGrid(long circles, float range, CircleScan* scan) : widest_(static_cast<double>(range) / 4), scan_(scan)
     {
         const int bits = std::max(8, static_cast<int>(std::bit_width(static_cast<unsigned long>(circles))));
@@ -57,8 +68,9 @@ public:
             nodes_[node.next].before = node.before;
     }
 
-    // Writes the slots of the circles that contain `point` to `hits`, in no order and some perhaps more than once, and
-    // gives how many it wrote; -1 if it would have to walk over more than `most`, or if the point isn't finite.
+    // Writes the slots of the circles that contain `point` to `hits`, in no order and some perhaps
+    // more than once, and returns their number. Returns -1 if it would have to test more than
+    // `most` circles, or if the point is not finite.
     long find(const Position<Size>& point, long most, std::int32_t* hits) const
     {
         for (const double x : point)
@@ -75,9 +87,9 @@ public:
 
 private:
     static constexpr std::int32_t none = -1;
-    static constexpr int reach = Size == 2 ? 2 : 3;      // in space smaller cells spare more walks than they cost
-    static constexpr int cells = Size == 2 ? 4 : 27;     // from which a box can reach a point
-    static constexpr int smallest = -140, levels = 268;  // from what is lost in the rounding to beyond all floats
+    static constexpr int reach = Size == 2 ? 2 : 3;      // in space smaller cells save more tests than they cost
+    static constexpr int cells = Size == 2 ? 4 : 27;     // whose boxes may contain a point
+    static constexpr int smallest = -140, levels = 268;  // from below all roundings to above all floats
     static constexpr double lastCell = 0x1p51;           // up to here numbers of neighbouring cells differ
     static constexpr std::uint64_t levelFactor = 0xD6E8FEB86659FD93;
     static constexpr std::uint64_t factors[] = {0x9E3779B97F4A7C15, 0xC2B2AE3D27D4EB4F, 0x165667B19E3779F9};
@@ -88,7 +100,7 @@ private:
     };
     struct Node {
         Circle<Size> circle;
-        std::int32_t next, before;  // in the bucket; of a wide one `next` is its number in the table
+        std::int32_t next, before;  // in the bucket; for a wide circle `next` is its index in the table
         Place place;
     };
     struct Search {

@@ -17,7 +17,8 @@ KPLIB_KERNEL_BODY long put(std::uint32_t mask, long first, std::int32_t* hits, l
     return count;
 }
 
-// By hand, since the compiler doesn't find the way from comparisons to positions. "Not less than" lets NaN pass.
+// Intrinsics, since the compiler does not vectorise the step from comparisons to positions. "Not
+// less than" lets NaN pass.
 
 template <int Size>
 KPLIB_TARGET_AVX2 std::uint32_t hitsAvx2(const double* const* columns, long i, const double* point)

@@ -9,19 +9,21 @@
 
 namespace kplib::detail::delaunay {
 
-// How the simplices around a point are found: by a scan of all, or by a grid once so many slots are used.
+// How the simplices around a point are found: by a scan of all, or by a grid once `gridFrom` slots
+// are used.
 struct Finder {
     CircleScan* scan;
     long gridFrom;
 };
 
-// The simplices of the points so far, in numbered slots. The results depend on the numbers: cavities grow in the order
-// of their slots, and a new simplex takes the slot that was freed last, or else the next one never used.
+// The simplices of the points inserted so far, in numbered slots. The results depend on the
+// numbers: the simplices of a cavity are removed in the order of their slots, and a new simplex
+// takes the slot that was freed last, or the next unused one if none is free.
 template <int Size>
 class Mesh {
 public:
-    // Holds the simplex of the last Size + 1 of `points`, whose circle contains whatever is put in. The points have to
-    // outlive the mesh; it receives their number and extent.
+    // Starts with the simplex of the Size + 1 points after the first `n`, and a circle with the
+    // squared radius FLT_MAX around the origin for it. The points have to outlive the mesh.
     Mesh(const Point<Size>* points, int n, float range, const Finder& finder) :
         points_(points), finder_(finder), expected_(n), range_(range)
     {
@@ -31,7 +33,8 @@ public:
         take(corners, {{}, static_cast<double>(std::numeric_limits<float>::max())});
     }
 
-    // Puts point `i` in; false if its cavity has too many faces, and the mesh is of no more use.
+    // Inserts point `i`. Returns false if its cavity has too many faces; the mesh is then
+    // unusable.
     bool insert(int i)
     {
         rim_.clear();
@@ -49,16 +52,16 @@ public:
         return true;
     }
 
-    // Slots that have been used; some of them may be empty.
+    // Number of slots in use or free.
     std::int32_t slots() const { return used_; }
     bool isAlive(std::int32_t slot) const { return simplices_[slot][0] >= 0; }
     const Simplex<Size>& operator[](std::int32_t slot) const { return simplices_[slot]; }
 
 private:
-    static constexpr int perPoint = Size == 2 ? 2 : 7;  // simplices, in a large set
-    static constexpr long worthIt = 16;                 // a circle of the grid costs as much as that many of the scan
+    static constexpr int perPoint = Size == 2 ? 2 : 7;  // simplices per point of a large set
+    static constexpr long worthIt = 16;                 // a test in the grid costs as much as this many of the scan
 
-    // Makes room for `more` simplices; for hits too, which a point that isn't a number has everywhere.
+    // Makes room for `more` simplices, and for as many hits: a NaN is in every circle.
     void reserve(long more)
     {
         const long needed = used_ + more;
@@ -68,7 +71,7 @@ private:
         const long room = simplices_.capacity();
         simplices_.resize(room);
         circles_.resize(room);
-        hits_.resize(room + room / worthIt);  // what stands in a cell may be met twice
+        hits_.resize(room + room / worthIt);  // the grid may find a circle more than once
         free_.resize(room);
     }
 
@@ -93,14 +96,14 @@ private:
         }
         free_[freeCount_++] = slot;
         simplices_[slot][0] = -1;
-        circles_.set(slot, {{}, -1});  // no finite point is in it, so the scan needn't ask for more
+        circles_.set(slot, {{}, -1});  // contains no finite point, so the scan needs no other test
         if (grid_)
             grid_->remove(slot);
         return true;
     }
 
-    // Fills hits_ with the slots whose circles contain point `i`, ascending; empty slots and repetitions may be among
-    // them. Gives their number.
+    // Fills hits_ with the slots whose circles contain point `i`, ascending, and returns their
+    // number. Free slots and repetitions may be among them.
     long findHits(int i)
     {
         Position<Size> point;
@@ -129,7 +132,7 @@ private:
     float range_;
     std::int32_t used_ = 0;
     long freeCount_ = 0;
-    KpDArray<Simplex<Size>> simplices_;  // a slot each, as the circles
+    KpDArray<Simplex<Size>> simplices_;  // one for each slot, as the circles
     CircleColumns<Size> circles_;
     KpDArray<std::int32_t> free_, hits_;
     CavityRim<Size> rim_;

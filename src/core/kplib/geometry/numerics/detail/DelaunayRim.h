@@ -7,8 +7,8 @@
 
 namespace kplib::detail::delaunay {
 
-// The faces between a cavity and what stays around it, as a list whose order decides where new simplices go, with a
-// hash table over it: the list may be long.
+// The faces between a cavity and the simplices around it, as a list with a hash table over it. The
+// order of the list decides the slots of the new simplices.
 template <int Size>
 class CavityRim {
 public:
@@ -22,8 +22,9 @@ public:
         std::fill(heads_.begin(), heads_.end(), none);
     }
 
-    // Takes `face` out if it is there, the last one moving to its place, and else puts it at the end; false if there
-    // is no room. A list of one or two isn't searched: simplices with the same corners then leave a face twice.
+    // Removes `face` if the list has it, and moves the last one to its place; otherwise appends
+    // it. Returns false if the list is full. Intentional: a list of one or two faces is not
+    // searched, so simplices with the same corners leave a face twice.
     bool flip(const Face<Size>& face)
     {
         const Index at = count_ > 2 ? find(face) : none;
@@ -60,7 +61,7 @@ private:
         return sum >> (32 - bits);
     }
 
-    // The first of its kind in the list, which need not be the first in its bucket.
+    // The first equal face in the list, which may not be the first in its bucket.
     Index find(const Face<Size>& face) const
     {
         Index first = none;

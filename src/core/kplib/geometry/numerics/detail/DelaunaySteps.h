@@ -4,19 +4,19 @@
 
 namespace kplib::detail::delaunay {
 
-// What is triangulated: a shifted copy of the caller's points, and behind it the corners of a simplex around them.
+// A shifted copy of the caller's points, followed by the corners of a simplex around them.
 template <int Size>
 struct PointSet {
     KpDArray<Point<Size>> points;
     int n = 0;
-    float range = 0;  // the greatest along an axis, before the shift
+    float range = 0;  // the largest along an axis, before the shift
 };
 
 // Reads `n` points of Size coordinates each, and draws Size numbers for each of them.
 template <int Size>
 PointSet<Size> shifted(const float* coordinates, int n);
 
-// Whether no cavity was too large; only then `result` is written.
+// Writes `result` and returns true, unless a cavity is too large.
 template <int Size>
 bool triangulate(const PointSet<Size>& set, const Finder& finder, KpDArray<Simplex<Size>>& result);
 
