@@ -14,11 +14,32 @@
 #include <unistd.h>
 #include <utility>
 
+// Plan
+//
+// The file of a log. `file` is the descriptor that lines are written to, -1 for none:
+//
+//     consoleToLogEnabled   file                   descriptors 1 and 2
+//     false                 a descriptor above 2   unchanged
+//     true                  1                      both lead to the file
+//
+// open() creates base folder/[year/month/day/]date-time-process.log in this order, so that a
+// failure leaves the log as it was:
+//
+//     open the next file; stop here if that fails
+//     close the last one; if it had 1 and 2, closeFile() leads them to the terminal, if there is one
+//     write to the next one: useFile() leads 1 and 2 to it if the flag is set
+//     remove the oldest files: cleanUp()
+//
+// A line that finds the file larger than its limit calls chunkTryOpenNext(), which opens the next
+// file and names the last one in its first line. append() continues a file of any name; it neither
+// closes a file nor redirects the console.
+
 namespace {
 
 using Lock = KpScopedLockT<KpMutex>;
 
-// Opens for writing, under a number that is none of the three standard ones: a service may have closed those.
+// Opens for writing with a descriptor above the three standard ones, which a service may have
+// closed.
 int openAside(const char* path, int mode)
 {
     const int first = ::open(path, O_WRONLY | O_CLOEXEC | mode, 0666);
@@ -29,7 +50,7 @@ int openAside(const char* path, int mode)
     return descriptor;
 }
 
-// Leads standard output and standard error to what is open at a descriptor, which it closes.
+// Redirects standard output and standard error to the file of a descriptor, which it closes.
 void leadConsoleTo(int descriptor)
 {
     std::fflush(stdout);
@@ -69,7 +90,7 @@ void KpLogFilePrivate::closeFile()
     if (file < 0)
         return;
     if (consoleToLogEnabled) {
-        // Without a terminal standard output stays on the file, and usable.
+        // Without a terminal, standard output still leads to the file and stays usable.
         if (const int terminal = openAside("/dev/tty", 0); terminal >= 0)
             leadConsoleTo(terminal);
         if (consoleFile)
@@ -81,8 +102,9 @@ void KpLogFilePrivate::closeFile()
     file = -1;
 }
 
-// Removes the oldest files: names sort by time. Intentional: one more than the excess goes, since open() counts the
-// file that it opens. `kept` is the name of a file that stays in any case.
+// Removes the oldest files: names sort by time. Intentional: if the limit is reached, one file
+// less than the limit stays, the open one included. `kept` is the name of a file that is never
+// removed.
 void KpLogFilePrivate::cleanUp(std::string_view kept) const
 {
     if (maxNumLogFiles == 0 || dateFoldersEnabled)
@@ -106,14 +128,14 @@ bool KpLogFile::open(bool force)
     if (folder.isEmpty())
         return false;
     KpFilename path = KpString(0, "%s/%s.log", folder.c_str(), name.c_str());
-    // For appending: two files of one second have one name, and no line is lost to that.
+    // Appends: two files opened within a second have one name, and no line may be lost.
     const int next = openAside(path, O_CREAT | O_APPEND);
     if (next < 0)
         return false;
     record_->closeFile();
     record_->useFile(next, std::move(path));
-    // Last, as it may run out of memory. A folder that cannot be read would be logged, into a file that may be full
-    // and calls this function again for each line.
+    // Last, as it may run out of memory. Only for a folder that exists: scanning another one would
+    // log an error, and a line into a file that is full calls this function again.
     if (KpDirectory::isDirectory(record_->baseFolder.c_str()))
         record_->cleanUp(record_->filePath.basename());
     return true;
@@ -128,7 +150,7 @@ void KpLogFile::close()
 bool KpLogFile::append(KpString path)
 {
     const Lock lock(&record_->mutex);
-    record_->file = openAside(path, O_CREAT | O_APPEND);  // what was open stays so: the caller may have plans with it
+    record_->file = openAside(path, O_CREAT | O_APPEND);  // intentional: a file that was open stays open
     const bool isOpen = record_->file >= 0;
     record_->filePath = isOpen ? std::move(path) : KpString();
     record_->bytesWritten = isOpen ? record_->filePath.fileSize() : 0;
@@ -216,14 +238,14 @@ void KpLogFile::cleanUp()
     record_->cleanUp("");
 }
 
-// Stores a flag of the console; where a file is open that takes a new one.
+// Sets a flag of the console. If a file is open, the log continues in a new one.
 void KpLogFile::setConsoleFlag(std::atomic<bool>& flag, bool enabled)
 {
     const Lock lock(&record_->mutex);
     if (flag == enabled)
         return;
     const bool wasOpen = record_->file >= 0;
-    record_->closeFile();  // by the flag as it was
+    record_->closeFile();  // with the old value of the flag
     flag = enabled;
     if (wasOpen)
         chunkTryOpenNext();

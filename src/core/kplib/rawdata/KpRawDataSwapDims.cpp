@@ -15,6 +15,26 @@
 #include <span>
 #include <utility>
 
+// Plan
+//
+// Each permutation of the axes x, y, z is a product of exchanges of two adjacent axes, in place:
+//
+//     new axes   exchanges           yz  moves whole rows of nx voxels
+//     x z y      yz                  xy  transposes each slice, from a copy in the scratch area
+//     y x z      xy
+//     z x y      yz, xy
+//     y z x      xy, yz
+//     z y x      yz, xy, yz
+//
+// The exchange yz is an in-place transposition of a matrix of ny * nz rows: F. Gustavson, L.
+// Karlsson and B. Kagstrom, "Parallel and cache-efficient in-place matrix storage format
+// conversion", 2012. Row i goes to place (i mod ny) * nz + i / ny. If ny = nz, pairs of rows are
+// exchanged; otherwise each cycle of places is followed once, with a bit for each place visited.
+//
+// The scratch area holds a slice of the two largest sizes, and at least two rows. The bits suffice
+// for the rows of any two axes. Both are allocated before the first voxel moves, so the function
+// fails with nothing changed.
+
 namespace {
 
 using namespace kplib::detail;
@@ -35,7 +55,7 @@ Dims permuted(const Dims& dims, const Perm& perm)
     return {size(0), size(1), size(2)};
 }
 
-// Permutes the axes of a block of voxels of so many bytes in its own memory.
+// Permutes the axes of a block in place. A voxel has `voxelSize` bytes.
 class AxisSwap {
 public:
     AxisSwap(char* data, long voxelSize, char* scratch, KpBitfield& visited) :
@@ -43,7 +63,7 @@ public:
     {
     }
 
-    // What the permutation is made of: exchanges of y and z, and of x and y.
+    // Runs the exchanges of the permutation, of y and z and of x and y.
     void run(Dims dims, const Perm& perm)
     {
         const bool beginsWithYZ = perm == Perm{0, 2, 1} || perm[0] == 2;
@@ -94,9 +114,9 @@ private:
         }
     }
 
-    // The in-place transposition of a matrix of rows: each cycle of places is walked once, with the row that was met
-    // last in one half of the scratch area and the one that it drives out in the other. Rows are asked for some steps
-    // ahead, since no processor foresees where they are.
+    // Follows each cycle of places once. One half of the scratch area holds the row to store next,
+    // the other the row that it replaces. Rows are prefetched four steps ahead, as no processor
+    // predicts their addresses.
     void followCycles(long ny, long nz)
     {
         const auto placeOf = [&](long index) { return index % ny * nz + index / ny; };
@@ -150,7 +170,7 @@ private:
     std::size_t rowSize_ = 0;
 };
 
-// Four bytes move as an int, whatever they are.
+// Voxels of four bytes move as an int, so their type does not matter.
 bool canPermute(KpPrimType type, long voxelSize)
 {
     return voxelSize == 4 || type.isNumber();

@@ -26,8 +26,38 @@ bool isBusy(int state)
 
 }  // namespace
 
-// The two mutexes are never held together. Conditions are signalled with no mutex held where that can be, since whom
-// they wake would only stop at the mutex; nobody tears the record down before the thread has left run().
+// Plan
+//
+// Two mutexes, three conditions. The caller is any thread but the worker.
+//
+//     mutex           condition           waits                       is signalled by
+//     stateMutex      workerCondition     worker: awaitPass(),        caller: start(), resume(),
+//                                         suspended()                 cancel(), terminate()
+//     stateMutex      callerCondition     caller: makeThread(),       worker: enter(), endPass(),
+//                                         wait(), terminate()         suspended()
+//     handshakeMutex  handshakeCondition  caller: start(true)         worker: endPass(),
+//                                                                     wakeCaller()
+//
+// State, written under stateMutex and read anywhere:
+//
+//     NotStarted          --worker: run()-->        Idle
+//     Idle, CanceledIdle  --caller: start()-->      Computing
+//     Computing           --caller: suspend()-->    SuspendRequested
+//     SuspendRequested    --worker: suspended()-->  Suspended
+//     Suspended           --caller: resume()-->     Computing      also from SuspendRequested
+//     Suspended           --caller: cancel()-->     CancelRequested
+//                                                   also from Computing, SuspendRequested
+//     CancelRequested     --worker: endPass()-->    CanceledIdle
+//     Computing           --worker: endPass()-->    Idle           also from SuspendRequested
+//     Idle, CanceledIdle  --caller: terminate()-->  TerminateRequested
+//     TerminateRequested  --worker: run()-->        NotStarted
+//
+// `released` records that start(true) may return. Without it, the signal of a short pass would be
+// lost if the pass ends before the caller waits.
+//
+// The two mutexes are never held together. start(), enter(), endPass() and wakeCaller() signal
+// after unlocking: a woken thread would block on the mutex at once. The record outlives these
+// signals, since terminate() returns only after the thread has left run().
 class KpWorkerThreadPrivate final : public KpThread {
 public:
     KpWorkerThreadPrivate(const char* label, KpWorkerThread* object) : KpThread(label), name(label), owner(object) {}
@@ -55,8 +85,7 @@ public:
     std::atomic<int> state = KpWorkerThread::NotStarted;  // written under stateMutex
     std::uint64_t startCount = 0;
     std::uint64_t computeCount = 0;
-    // Whether the caller has nothing to wait for in start(true): without it a short pass would be over, and its signal
-    // lost, before the caller sleeps.
+    // Whether start(true) may return; cleared under stateMutex, set under handshakeMutex.
     std::atomic<bool> released = false;
 };
 
@@ -74,7 +103,7 @@ void KpWorkerThreadPrivate::run()
     enter(KpWorkerThread::NotStarted);
 }
 
-// False when the thread is to end.
+// Waits for a pass. Returns false if the thread has to end.
 bool KpWorkerThreadPrivate::awaitPass()
 {
     const Lock lock(&stateMutex);
@@ -90,7 +119,8 @@ void KpWorkerThreadPrivate::endPass()
         const Lock lock(&stateMutex);
         set(now() == KpWorkerThread::CancelRequested ? KpWorkerThread::CanceledIdle : KpWorkerThread::Idle);
     }
-    // Only here, so that a caller who runs at once on the same processor has no second wait before it.
+    // After the change of state: a caller that runs at once on the same processor then does not
+    // block in wait().
     handshakeCondition.wakeAll();
     callerCondition.wakeOne();
 }
@@ -104,7 +134,7 @@ void KpWorkerThreadPrivate::enter(int next)
     callerCondition.wakeOne();
 }
 
-// False if the platform has no thread.
+// Returns false if the platform cannot create a thread.
 bool KpWorkerThreadPrivate::makeThread()
 {
     KpThread::start();
@@ -150,7 +180,7 @@ bool KpWorkerThread::start(bool waitForCaller)
         const Lock lock(&record_->stateMutex);
         if (!acceptsStart(record_->now()))
             return false;
-        record_->released = false;  // the last pass is over, and the next one can't have begun
+        record_->released = false;  // the last pass has ended, and the next one has not begun
         record_->set(Computing);
     }
     record_->workerCondition.wakeOne();

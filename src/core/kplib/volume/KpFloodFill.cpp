@@ -8,9 +8,24 @@
 
 using Ground = kplib::detail::FloodGround;
 
+// Plan
+//
+// The fill proceeds by runs: maximal parts of a row that have the value (ground). `dst` holds the
+// visited voxels, also those that the caller set there, which are not filled again. A stack holds
+// the segments of rows to search. walk() takes the last one, fills the runs that begin in it, and
+// pushes the extent of each run as a segment of the four rows around:
+//
+//     row        . # # # # . # # # .
+//     segment        ^ ^ ^ ^ ^
+//     filled     . o o o o . o o o .     the first run to both sides, the others to the right
+//     pushed       ^ ^ ^ ^   ^ ^ ^       for y - 1, y + 1, z - 1 and z + 1
+//
+// Only segments with an open voxel, one of the ground that is not visited, are pushed. Runs are
+// found in words of bits (FloodGround). A segment takes 8 bytes, so coordinates are at most 32767.
+
 namespace {
 
-// Part of a row from where to look for what is to be filled. The size matters: there may be many.
+// Part of a row to search. The size matters, as there may be many.
 struct SF3D_Segment {
     std::int16_t z, y, xLeft, xRight;
 };
@@ -21,7 +36,7 @@ struct Range {
 
     void extend(int low, int high)
     {
-        // Seldom, so this is cheaper than to write what is there.
+        // Branches, as an extension is rare: cheaper than a store each time.
         if (low < min)
             min = low;
         if (high > max)
@@ -58,10 +73,12 @@ public:
 private:
     long row(long y, long z) const { return (z * ny_ + y) * nx_; }
 
-    // The ground goes by value and into inlined functions: as a field it would be loaded anew after each write of bits,
-    // as an argument copied by way of memory.
+    // The ground is passed by value and to inlined functions: a field would be loaded again after
+    // each write of bits, and an argument of a function that is not inlined would be copied
+    // through memory.
 
-    // A segment in which nothing is open has no effect, not later either. `pos` is the voxel at its left.
+    // Pushes a segment unless it has no open voxel: it then has no effect later either. `pos` is
+    // its first voxel.
     [[gnu::always_inline]] void push(Ground ground, int z, int y, int xLeft, int xRight, long pos)
     {
         if (!ground.isOpen(pos, xRight - xLeft + 1))
@@ -84,9 +101,9 @@ private:
             push(ground, z, y + 1, xLeft, xRight, pos + nx_);
     }
 
-    // Fills the runs that begin in the segment, the first one to both sides. Where runs are partly visited already,
-    // what is filled depends on these very steps: only the first looks to its left, and visited ground at the end of
-    // the segment ends it.
+    // Fills the runs that begin in the segment, the first one to both sides. Intentional: if runs
+    // are partly visited already, the result depends on these steps. Only the first run is
+    // extended to the left, and visited ground at the end of the segment ends the search.
     void walk(Ground ground, const SF3D_Segment segment)
     {
         const long start = row(segment.y, segment.z), last = start + segment.xRight;
@@ -149,7 +166,7 @@ unsigned long fillAll(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpV
     return count;
 }
 
-// The fields at a size that the fill can work on.
+// Fills fields of one word in copies of 64 bits, the smallest size of FloodGround.
 unsigned long fillFew(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpVec3i>& seeds, bool value,
                       const int* dims, Box& box)
 {

@@ -4,11 +4,28 @@
 #include <cstdlib>
 #include <strings.h>
 
+// Plan
+//
+// A response of HTTP/1.1, RFC 9112. Its head arrives in pieces of any size:
+//
+//     HTTP/1.1 206 Partial Content CR LF      the status line, which starts with "HTTP"
+//     Content-Length: 4096 CR LF              a field; all other fields are ignored
+//     CR LF                                   the empty line: Complete
+//     body                                    not taken
+//
+// take() appends to line_ up to the next LF and evaluates the line there. White space at the end
+// of a line is removed: LF without CR ends a line too, and a line of white space ends the head.
+//
+//     Open -- empty line --> Complete
+//     Open -- other first line, or 1 MiB without an empty line --> Unexpected
+//
+// Once the state is not Open, take() takes no more bytes, so the body stays with the caller.
+
 namespace {
 
 constexpr std::string_view whiteSpace = " \t\n\v\f\r";
 
-// Far beyond any honest head: a server that goes on and on must not fill the memory.
+// Far more than any valid head: a head without an end must not exhaust the memory.
 constexpr size_t longestHead = 1 << 20;
 
 }  // namespace
@@ -55,5 +72,5 @@ void kplib::detail::HttpHead::takeField()
     if (colon != name.size() || strncasecmp(line_.c_str(), name.data(), colon) != 0)
         return;
     hasLength_ = true;
-    length_ = std::atoll(line_.c_str() + colon + 1);  // which skips the white space in front
+    length_ = std::atoll(line_.c_str() + colon + 1);  // skips leading white space
 }

@@ -6,24 +6,24 @@
 
 namespace kplib::detail {
 
-// The head of an HTTP response, read as it comes in: what its status line and its length say.
+// Reads the head of an HTTP response in pieces, for its status and the length of its body.
 class HttpHead {
 public:
     enum class State {
-        Open,        // more has to come
-        Complete,    // the empty line was there
-        Unexpected,  // no response at all, or one whose head doesn't end
+        Open,        // needs more bytes
+        Complete,    // the empty line was read
+        Unexpected,  // no HTTP response, or one whose head is too long
     };
 
-    // Takes what belongs to the head and is not yet Complete or Unexpected, from the start of `bytes`; the number of
-    // bytes that it took.
+    // Takes bytes from the start of `bytes` while the state is Open, and returns their number.
     size_t take(std::string_view bytes);
 
     State state() const { return state_; }
-    // False without a Content-Length; of several the last counts. Text that is no number is 0.
+    // False without a Content-Length. Of several the last one counts. Text that is not a number is
+    // 0.
     bool hasLength() const { return hasLength_; }
     long long length() const { return length_; }
-    // 0 for a status line without one.
+    // 0 if the status line has none.
     int status() const { return status_; }
 
 private:
@@ -35,7 +35,7 @@ private:
     int status_ = 0;
     long long length_ = 0;
     size_t taken_ = 0;
-    std::string line_;  // as far as it has come
+    std::string line_;  // the bytes of the current line so far
 };
 
 }  // namespace kplib::detail

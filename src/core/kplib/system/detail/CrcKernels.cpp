@@ -7,13 +7,33 @@
 #include <initializer_list>
 #include <span>
 
+// Plan
+//
+// The data are a polynomial D over GF(2), the most significant bit of each byte first. The
+// register, which starts at 0, is the remainder of D * x^32 modulo the polynomial of CrcLoops.h.
+// KpCoder appends the length and inverts the result.
+//
+//     plain    one byte a step: crc = crc << 8 ^ tables[0][crc >> 24 ^ byte]
+//     slicing  eight bytes a step, with a table for each distance from the end of the eight:
+//              M. Kounavis and F. Berry, "A Systematic Approach to Building High Performance
+//              Software-Based CRC Generators", ISCC 2005
+//     pclmul, vpclmul  folding by carry-less products (CrcKernelsX86.cpp)
+//
+//     bytes of a step   b0    b1    b2    b3    b4    b5    b6    b7
+//                        ^     ^     ^     ^
+//     register          crc, 4 bytes, is added to the first four
+//     table              7     6     5     4     3     2     1     0
+//
+// The remainder is linear in the bits, so a table entry is the sum of the entries of its bits, and
+// the new register is the sum of eight look-ups that do not wait for each other.
+
 namespace kplib::detail {
 
 using namespace crc;
 
 namespace {
 
-// Entry [k][b]: what byte b, followed by k zero bytes, makes of a register of zero.
+// Entry [k][b]: the register after byte b and k zero bytes, from a register of 0.
 using Tables = std::array<std::array<std::uint32_t, 256>, 8>;
 
 constexpr Tables makeTables()

@@ -11,10 +11,14 @@ using namespace crc;
 
 namespace {
 
-// Folding, after V. Gopal et al., "Fast CRC Computation for Generic Polynomials Using PCLMULQDQ Instruction", 2009: 16
-// bytes are a polynomial of 128 bits, of which each half is multiplied by what it stands for `distance` bits further
-// on, and there the products are added to the data. What is left at the end has the same remainder as the data it
-// stands for.
+// Folding, after V. Gopal et al., "Fast CRC Computation for Generic Polynomials Using PCLMULQDQ
+// Instruction", 2009. A vector of 16 bytes is a polynomial of 128 bits, high * x^64 + low. To move
+// it `distance` bits on, each half is multiplied by the remainder of its power of x, and the
+// products are added to the data there:
+//
+//     v * x^distance = high * (x^(distance + 64) mod P) + low * (x^distance mod P)    (modulo P)
+//
+// So the last vector has the same remainder as all data before it, and crcSlicing() finishes it.
 
 #define KPLIB_TARGET_PCLMUL KPLIB_TARGET("pclmul,ssse3")
 #define KPLIB_TARGET_VPCLMUL KPLIB_TARGET("avx512f,avx512bw,vpclmulqdq")
@@ -34,7 +38,7 @@ KPLIB_TARGET_PCLMUL inline __m128i load16(const unsigned char* data)
     return reversed(_mm_loadu_si128(reinterpret_cast<const __m128i*>(data)));
 }
 
-// `v` moved on by `distance` bits and added to what stands there.
+// `v` moved by `distance` bits and added to `onto`.
 template <int distance>
 KPLIB_TARGET_PCLMUL inline __m128i fold(__m128i v, __m128i onto)
 {
@@ -83,7 +87,7 @@ KPLIB_TARGET_VPCLMUL inline __m512i fold(__m512i v, __m512i onto)
     return _mm512_ternarylogic_epi64(low, high, onto, 0x96);  // exclusive or of all three
 }
 
-// Four folds in each instruction. The 64 bytes that are left go through crcPclmul() as if they were data.
+// Four folds in each instruction. crcPclmul() takes the last 64 bytes as if they were data.
 KPLIB_TARGET_VPCLMUL std::uint32_t crcVpclmul(std::uint32_t crc, const unsigned char* data, long n)
 {
     if (n < 256)

@@ -12,7 +12,7 @@ namespace crc {
 
 constexpr std::uint32_t polynomial = 0x04C11DB7;
 
-// x^n modulo the polynomial: what a bit stands for that lies n places above the last one.
+// x^n modulo the polynomial: the remainder of a bit n places above the last one.
 constexpr std::uint32_t power(int n)
 {
     std::uint32_t remainder = 1;
@@ -21,7 +21,7 @@ constexpr std::uint32_t power(int n)
     return remainder;
 }
 
-// Eight bytes a step, by as many look-ups that don't wait for each other.
+// Eight bytes a step.
 CrcLoop crcSlicing;
 
 }  // namespace crc

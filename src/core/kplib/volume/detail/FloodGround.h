@@ -9,13 +9,15 @@
 
 namespace kplib::detail {
 
-// What a flood fill goes by: the ground, voxels of the value, in one field, and the visited voxels in the other.
+// The two fields of a flood fill: `src` with the ground, the voxels that have the value, and `dst`
+// with the visited voxels.
 //
-// The fields have at least 64 bits. At any position `step` bits may be looked at; those behind the end vary.
+// The fields have at least 64 bits. At any position `step` bits may be read; bits after the end of
+// the field are unspecified.
 class FloodGround {
 public:
     using Word = std::uint64_t;
-    static constexpr long step = 56;  // bits that eight bytes from any byte on hold for certain
+    static constexpr long step = 56;  // bits from any position that a load of eight bytes contains
 
     FloodGround(const KpBitfield& src, KpBitfield& dst, bool value) :
         src_(reinterpret_cast<const char*>(src.data())), dst_(reinterpret_cast<char*>(dst.data())),
@@ -34,7 +36,7 @@ public:
     bool isGround(long pos) const { return (ground(pos) & 1) != 0; }
     bool isVisited(long pos) const { return (visited(pos) & 1) != 0; }
 
-    // Whether some of n > 0 voxels is still to be filled.
+    // Whether any of n > 0 voxels is ground and not visited.
     bool isOpen(long pos, long n) const
     {
         for (; n > step; pos += step, n -= step) {
@@ -44,7 +46,7 @@ public:
         return (open(pos) & lowBits(n)) != 0;
     }
 
-    // The first position in [pos, end) of its kind, or `end`.
+    // The first such position in [pos, end), or `end`.
 
     long firstGround(long pos, long end) const
     {
@@ -59,7 +61,7 @@ public:
         return first(pos, end, [this](long at) { return ~visited(at); });
     }
 
-    // Where the run begins that `pos` is in, at `row` at the earliest.
+    // The start of the run that contains `pos`, not before `row`.
     long runStart(long pos, long row) const
     {
         while (pos > row) {
