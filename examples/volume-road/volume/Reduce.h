@@ -6,11 +6,11 @@
 
 #include <array>
 
-// Volumes with fewer voxels, by whole factors along the axes; an axis that is shorter than its factor becomes one
-// voxel.
+// Reduces volumes by whole factors along the axes. An axis that is shorter than its factor becomes
+// one voxel.
 
-/// Each voxel is the mean of a block; padding if the block holds padding.
+/// Each voxel is the mean of a block, or padding if the block contains padding.
 Volume reducedByMean(Volume& volume, std::array<int, 3> factors, KpProgressInterface& progress);
 
-/// Each voxel is the maximum of a block and its neighbours.
+/// Each voxel is the maximum of a block, component by component. Padding counts as a value.
 Volume reducedByMaximum(Volume& volume, std::array<int, 3> factors, KpProgressInterface& progress);

@@ -12,15 +12,16 @@
 #include <type_traits>
 #include <utility>
 
-/// How a KpDArray makes, copies and drops its elements; it never changes how the array grows.
+/// How a KpDArray constructs, copies and destroys its elements. The kind does not affect how the
+/// array grows.
 enum class KpElementKind : int {
     Bytes,    ///< scalars and pointers: left uninitialised, copied as one block
     Plain,    ///< values without a destructor: left uninitialised (no constructor runs), copied one by one
     Managed,  ///< all others: constructed, copied and destroyed one by one
 };
 
-/// What the array has to know of an element type. The default suits all types that may be moved as
-/// bytes; specialise it for a type of your own that points into itself, with `movesAsBytes` false.
+/// What the array requires of an element type. The default suits all types that may be moved as
+/// bytes. Specialise it with `movesAsBytes` false for a type that points into itself.
 template <typename T>
 struct KpElementTraits {
     /// How elements of type T are treated.
@@ -39,14 +40,25 @@ struct KpElementTraits {
 ///     for (int size : sizes)
 ///         std::printf("%d ", size);  // prints: 256 128
 ///
-/// Elements are moved as bytes when the array grows or opens a gap (the exceptions are those of
-/// KpElementTraits), so an address of an element is valid only until the next growth. The array
-/// grows by half its size, and only resize(), remax() and the insertions change it; positions are
-/// not checked. Exhausted memory is a KpMemoryException. If copying or making a managed element
-/// throws, the array is as before, without the new elements; if the storage itself cannot grow in
-/// insertMemory() or a function that calls it, the capacity is already changed and only the
-/// destructor may follow. T may be incomplete where an array is only declared, as within T itself.
-/// One thread at a time.
+/// Growth: if resize() or an insertion needs more capacity, the new capacity is one and a half
+/// times the size, or what is needed if that is more. Only remax() and move assignment reduce the
+/// capacity.
+///
+/// Addresses: growth and insertion move elements as bytes, or by move construction if
+/// `movesAsBytes` of their KpElementTraits is false. An address of an element is valid only until
+/// then.
+///
+/// Preconditions: positions are checked in Debug builds only. T may be incomplete where an array
+/// is only declared, as within T itself.
+///
+/// Errors: exhausted memory throws KpMemoryException. If the storage cannot grow in insertMemory()
+/// or a function that calls it, the capacity is already changed, and only the destructor may
+/// follow. If copying an element throws in insert(), append() or insertSorted(), the elements are
+/// as before. If constructing or copying one throws in resize(), remax() or copy assignment, the
+/// array may hold fewer elements than requested, and after an assignment old ones among them. In
+/// all these cases the capacity may have grown.
+///
+/// Threads: one thread at a time.
 template <typename T>
 class KpDArray {
 public:
@@ -96,38 +108,41 @@ public:
         kpfree(data_);
     }
 
-    /// Copies the elements one by one; storage that is large enough is kept.
+    /// Copies the elements one by one. Storage that is large enough is kept.
     KpDArray& operator=(const KpDArray& other);
-    /// Frees the old elements and takes the storage of `other`.
+    /// Destroys the elements, frees the storage, capacity included, and takes the storage of
+    /// `other`, which is left empty.
     KpDArray& operator=(KpDArray&& other) noexcept
     {
         KpDArray(std::move(other)).swap(*this);
         return *this;
     }
 
-    /// Sets the capacity to the larger of `newMax` and `newSize`, and the size to `newSize`; -1
-    /// stands for the size as it is. The only operation that frees storage. Returns the old
-    /// capacity less the new one.
+    /// Sets the capacity to the larger of `newMax` and `newSize`, and the size to `newSize`. -1
+    /// stands for the present size. Returns the old capacity less the new one.
     long remax(long newMax = -1, long newSize = -1);
 
-    /// Sets the size (negative counts as 0) and returns it. Storage is never freed.
+    /// Sets the size and returns it. A negative size counts as 0. The capacity never shrinks.
     long resize(long newSize);
 
-    /// Ensures room for one more element, growing as append() does. If memory runs out, throws KpMemoryException and
-    /// leaves the array unchanged, which an insertion does not: long-lived lists call this first.
+    /// Ensures capacity for one more element, growing as append() does. If memory runs out, throws
+    /// KpMemoryException and leaves the elements unchanged, unlike an insertion: call this first
+    /// for long-lived lists. T must be default-constructible.
     void reserveOne()
     {
         resize(size_ + 1);
         resize(size_ - 1);
     }
 
-    /// Opens a gap of `count` raw elements at `pos`, which the caller has to fill (to construct, if managed).
+    /// Opens a gap of `count` raw elements at `pos`. The caller must fill them; managed elements
+    /// must be constructed.
     void insertMemory(long pos, long count);
 
-    /// Copies `count` elements to `pos`. `src` may point into this array, if the range doesn't run across `pos`.
+    /// Inserts copies of `count` elements at `pos`. `src` may point into this array if its range
+    /// does not extend across `pos`.
     void insert(long pos, long count, const T* src);
 
-    /// Adds a copy at the end, in constant time on average; `item` may be an element of this array.
+    /// Appends a copy, in constant time on average. `item` may be an element of this array.
     void append(const T& item)
     {
         if (size_ >= capacity_) [[unlikely]] {
@@ -138,15 +153,15 @@ public:
         ++size_;
     }
 
-    /// Inserts a copy after all elements that `compare` finds less or equal, by binary search in
-    /// ]lo, hi[; -1 and -1 search the whole array. Returns its index. O(log n) comparisons, and
-    /// the move of what follows.
+    /// Inserts a copy after all elements for which `compare` returns that they are less or equal,
+    /// by binary search in ]lo, hi[. -1 and -1 search the whole array. Returns the index of the
+    /// copy. O(log n) comparisons, and the move of the elements after it.
     long insertSorted(const T& item, int (*compare)(const T&, const T&), long lo = -1, long hi = -1);
 
     /// Removes the element at `pos`; those after it move down.
     void remove(long pos);
 
-    /// Size 0; the storage stays.
+    /// Sets the size to 0. The capacity stays.
     void clear() noexcept { destroyFrom(0); }
 
     /// Exchanges the storage; no element is moved.
@@ -195,7 +210,8 @@ public:
 protected:
     /// For derived arrays that fill raw storage themselves.
     void setSize(long size) noexcept { size_ = size; }
-    /// For derived arrays over storage that isn't theirs: overwrites what the array holds, freeing nothing.
+    /// For derived arrays over storage that is owned elsewhere: overwrites the fields and frees
+    /// nothing.
     void setStorage(T* data, long size, long capacity) noexcept
     {
         data_ = data;

@@ -10,26 +10,30 @@
 class KpCoordinateSystem;
 class KpFrameOfReference;
 
-/// A space of positions: a node of a tree whose root is a named frame of reference. Systems can be
-/// related only if they end at the same frame.
+/// A coordinate system in a tree whose root is a named frame of reference. Two systems are related
+/// only if they have the same root.
 ///
-/// A child holds its parent, so a parent is an object on the heap that handles hold; a system
-/// without children may be any object, and functions that ask it or about it take no handle to it.
-/// Systems may be changed, which also moves all child systems. There is no notification. The count
-/// of handles is for one thread.
+/// Ownership: a child holds a handle to its parent, so every parent must live on the heap and be
+/// held by handles. A system without children may be any object. Functions that are called on it
+/// or take it as an argument hold no handle to it unless they say so.
+///
+/// Changes: a change of a system also moves all its child systems. No notification is sent.
+///
+/// Threads: the count of handles is for one thread.
 class KPLIB_API KpAbstractCoordinateSystem : public KpHandable {
 public:
-    /// The root this system ends at; null if it floats.
+    /// The root of the tree; null for a system without a root, which floats.
     virtual KpHandle<const KpFrameOfReference> frameOfReference() const = 0;
     /// The parent; null for a root or a system that floats.
     virtual KpHandle<const KpAbstractCoordinateSystem> parent() const = 0;
-    /// From this system to its parent.
+    /// The transformation from this system to its parent.
     virtual KpMat4f asTransformation() const = 0;
-    /// From this system to the root.
+    /// The transformation from this system to the root.
     virtual KpMat4f asTransformationToFrameOfReference() const = 0;
-    /// One name and its value as in a JSON object, without the braces around.
+    /// One name and its value as in a JSON object, without the surrounding braces.
     virtual std::string dump() const = 0;
 
-    /// A new system with this one as its parent, in the same place. This one lives on the heap.
+    /// Returns a new system at the same place, with this one as its parent. This one must live on
+    /// the heap.
     KpHandle<KpCoordinateSystem> createChildSystem() const;
 };

@@ -13,22 +13,33 @@
 ///     KpMorphology::dilation3D(mask, grown, KpVec3i(5, 5, 5), 1, true);  // 6 neighbours
 ///     std::printf("%lu voxels\n", grown.nSetBits());  // prints: 7 voxels
 ///
-/// A mask is a field of dims[0] * dims[1] * dims[2] bits, x fastest, rows and slices without gaps; `src` has that many.
-/// Neighbours are the voxels at most one step away along each axis: 6 (in the plane 4) along one axis, 18 along two, 26
-/// (8) along all three. Voxels have no size here; wider effects come from repetition.
+/// A mask is a KpBitfield of dims[0] * dims[1] * dims[2] bits, x fastest, without gaps between
+/// rows or slices. `src` must have that size. The neighbours of a voxel are at most one step away
+/// along each axis: 6 (4 in the plane) differ along one axis, 18 along one or two, 26 (8) along
+/// any. The size of voxels is not considered; repeat passes for a wider effect.
 ///
-/// One pass of dilation sets a voxel if it or a neighbour is set in `src`; one of erosion keeps a set voxel if all its
-/// neighbours are set. Outside the volume dilation sees background and erosion foreground, so neither acts from there.
-/// `dst`, another object than `src`, is brought to the size of the volume. If it has that size already, its spare bits,
-/// which a digest may contain, stay as they are. Volumes of size 0 or less have no voxels.
+/// One pass of dilation sets a voxel if it or one of its neighbours is set in `src`. One pass of
+/// erosion keeps a set voxel if all its neighbours are set. `dst` must be another object than
+/// `src`. It is resized to the volume; if it has that size already, its spare bits stay as they
+/// are, and a digest may contain them. Volumes with a size of 0 or less have no voxels.
 ///
-/// `fast` works on words, many voxels at a time, otherwise each voxel looks at its neighbours; the results are the
-/// same. Work areas are a few slices. If one that is needed cannot be allocated, all bits of `dst` are set and nothing
-/// is logged. Rows of a multiple of 32 voxels need none for 6, 4 and 8 neighbours, rows of less than 32 need none at
-/// all. Other exhausted memory is a KpMemoryException. Any number of threads may work at once on fields of their own.
+/// Borders: dilation treats voxels outside the volume as unset, erosion as set.
+///
+/// `fast`: processes words of many voxels instead of one voxel at a time. The results are the
+/// same.
+///
+/// Errors: if `fast` cannot allocate its work area, rows of less than 32 voxels, and with 4, 6 or
+/// 8 neighbours also rows of a multiple of 32, are processed voxel by voxel. For all other rows,
+/// all bits of `dst` are set and nothing is logged. Other exhausted memory throws
+/// KpMemoryException.
+///
+/// Threads: safe for distinct fields.
+///
+/// Memory: the work area of `fast` has six slices, or more for several passes while it fits into
+/// the cache. Without `fast`, several passes take one more mask.
 class KPLIB_API KpMorphology {
 public:
-    /// `iterations` passes; none copies.
+    /// Performs `iterations` passes. 0 copies `src`.
     static void dilation3D(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, unsigned int iterations,
                            bool fast);
     /// @{
@@ -39,7 +50,7 @@ public:
                               bool fast);
     /// @}
 
-    /// `iterations` passes, at least one; less copies.
+    /// Performs `iterations` passes. A number below 1 copies `src`.
     static void erosion3D(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, int iterations, bool fast);
     /// @{
     /// As above, with 18 or 26 neighbours.
@@ -57,19 +68,25 @@ public:
     static void erosion2D_8(const KpBitfield& src, KpBitfield& dst, const KpVec2i& dims);
     /// @}
 
-    /// Sets in `dst` what is connected with a seed by faces through voxels whose bit in `src` is `value`; gives the
-    /// number of voxels filled. `dims` are three sizes.
+    /// Sets in `dst` the voxels that are connected with a seed by faces through voxels whose bit
+    /// in `src` is `value`. Returns the number of filled voxels. `dims` are three sizes.
     ///
-    /// What `dst` holds, resized first if it is of another size, counts as visited and stops the
-    /// fill. A run along x that is entered where `dst` is clear is filled as a rule from end to
-    /// end, and visited voxels in it count again. `box`, if not null, becomes xmin, xmax, ymin,
-    /// ymax, zmin, zmax of what was filled and of all seeds, also those outside or on a wrong
-    /// value; without seeds it stays. If `src` is not of the size of `dims`, or a size is above
-    /// 32768 (one error in the log), the result is 0 and nothing changes. Time grows with the
-    /// number of runs.
+    /// Bits that are set in `dst` count as visited and stop the fill. `dst` is resized first if it
+    /// has another size. The fill sets runs along x: a run that is entered at a voxel which is
+    /// clear in `dst` is usually filled from end to end, and visited voxels in it are counted
+    /// again.
+    ///
+    /// `box`, if not null, becomes xmin, xmax, ymin, ymax, zmin, zmax of the filled voxels and of
+    /// all seeds, also of seeds outside the volume or on another value. Without seeds it stays
+    /// unchanged.
+    ///
+    /// Errors: returns 0 and changes nothing if `src` does not have the size of `dims`, or if a
+    /// size is above 32768, which is one error in the log.
+    ///
+    /// Complexity: linear in the number of runs.
     static unsigned long floodfill(const KpBitfield& src, KpBitfield& dst, const KpDArray<KpVec3i>& seeds, bool value,
                                    const int* dims, int* box);
 
-    /// Whether the operations on planes are right for each pixel of a set of patterns.
+    /// Whether the operations on planes compute each pixel of a set of patterns correctly.
     static bool unitTest2D();
 };
