@@ -4,8 +4,8 @@
 
 #include <functional>
 
-/// A value that names a pair of functions to allocate and free with, so that a buffer is freed the
-/// way it was allocated. Copied by value, never throws: failure is a null result.
+/// A pair of functions that allocate and free memory, stored beside a buffer so that the buffer is
+/// freed by the function that matches its allocation. A plain value. Nothing throws.
 class KPLIB_API KpAllocator {
 public:
     /// Which pair of functions.
@@ -16,13 +16,14 @@ public:
         AllocatorNew = 3,      ///< array new and delete of bytes
     };
 
-    /// The pair of that type; any other value gives that of AllocatorNone.
+    /// The pair of `type`. Any other value counts as AllocatorNone.
     KpAllocator(AllocatorType type);
 
     /// The given pair; either may be null.
     KpAllocator(void* (*allocateWith)(unsigned long), void (*deallocateWith)(void*));
 
-    /// `size` bytes or null. On a first failure the callback below runs, if one is set, and one more attempt is made.
+    /// Returns `size` bytes, or null on failure. If the first attempt fails and a callback is set
+    /// by setFreeUnusedUncompressedDataCB(), calls it and tries once more.
     void* allocate(unsigned long size) const;
 
     /// Frees memory of allocate(); null is ignored.
@@ -31,9 +32,8 @@ public:
     /// Whether both functions are the same.
     bool operator==(const KpAllocator& other) const = default;
 
-    /// Sets the function to run when an allocation fails, for the owner of a cache that can be
-    /// dropped. It is process-wide and unlocked: set it before other threads start. An empty
-    /// function removes it.
+    /// Sets the function that is called when an allocation fails, for example to release a cache.
+    /// An empty function removes it. Process-wide and unlocked: set it before other threads start.
     static void setFreeUnusedUncompressedDataCB(std::function<void()> callback);
 
 private:

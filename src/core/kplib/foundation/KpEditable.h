@@ -5,12 +5,12 @@
 
 class KpEditable;
 
-/// Receives the changes of a KpEditable. It must not remove itself during a call.
+/// Receives the changes of a KpEditable. A listener must not remove itself during a call.
 class KPLIB_API KpEditingListener {
 public:
-    /// A change of `object` starts; its flags are set already.
+    /// Called when a change of `object` starts. Its flags are already set.
     virtual void editingStarted(KpEditable* object) = 0;
-    /// The object still has the flags of the change.
+    /// Called when the change ends. The object still has the flags of the change.
     virtual void editingFinished(KpEditable* object) = 0;
 
 protected:

@@ -2,10 +2,10 @@
 
 #include <kplib/foundation/KpString.h>
 
-/// Base of the library's exceptions: a message. doClone() and doRaise() let a handler keep an
-/// exception and raise it later, on another thread for example; a derived class that does not
-/// override them, such as KpMemoryException, comes back as a plain KpException with the text it
-/// had then.
+/// Base of the library's exceptions: a message. With doClone() and doRaise() a handler stores an
+/// exception and raises it later, for example on another thread. A derived class that does not
+/// override them, such as KpMemoryException, is raised as a plain KpException with the text that
+/// it had when it was cloned.
 class KPLIB_API KpException {
 public:
     KpException() = default;

@@ -1,8 +1,8 @@
 #pragma once
 
-/// Marks what the shared library shows to others; all else is hidden.
+/// Exports a symbol from the shared library. All other symbols are hidden.
 #define KPLIB_API __attribute__((visibility("default")))
 
-/// Has the compiler check a call's arguments against its format, as those of printf() are. Both numbers count from 1,
-/// and in members from the object.
+/// Makes the compiler check the arguments of a call against its format, as for printf(). Both
+/// positions count from 1. In a member function the object is position 1.
 #define KPLIB_PRINTF(text, firstArgument) __attribute__((__format__(__printf__, text, firstArgument)))

@@ -2,35 +2,36 @@
 
 #include <kplib/foundation/KpExport.h>
 
-/// Base of objects that KpHandle counts, for one thread; KpHandableThreaded is for objects that
-/// threads share.
+/// Base of objects whose handles are counted by KpHandle, for use by one thread. Use
+/// KpHandableThreaded for objects that threads share.
 ///
-/// The count is the number of handles, 0 for a new object. An object that no handle ever holds is
-/// an ordinary object; one that a handle has held is deleted with its last handle, never by its
-/// owner. A copy of an object is an object of its own, with a count of 0. Constant objects are
-/// counted too, so that handles may be to const.
+/// The count is the number of handles, 0 for a new object. An object that was never held by a
+/// handle is an ordinary object. An object that was held by a handle is deleted with its last
+/// handle; its owner must not delete it. A copy of an object is a separate object with a count of
+/// 0. Constant objects are counted too, for handles to const.
 class KPLIB_API KpHandable {
 public:
     KpHandable() = default;
     /// @{
-    /// Leaves the count alone: it belongs to the object, not to its value.
+    /// Does not change the count, which belongs to the object and not to its value.
     KpHandable(const KpHandable&) noexcept {}
     KpHandable& operator=(const KpHandable&) noexcept { return *this; }
     /// @}
 
     virtual ~KpHandable();
 
-    /// Runs once before the object is deleted, while it is whole. It may take and drop handles to the object.
+    /// Called once before the object is deleted, while it is complete. May take and release
+    /// handles to the object.
     virtual void notifyDelete();
 
-    /// Counts one handle more.
+    /// Adds one to the count.
     void ref() const
     {
         if (!destructionInProgress_)
             ++refCount_;
     }
 
-    /// Deletes the object when the count is no longer positive.
+    /// Subtracts one from the count, and deletes the object if the count is no longer positive.
     void unref() const
     {
         if (--refCount_ <= 0) [[unlikely]]

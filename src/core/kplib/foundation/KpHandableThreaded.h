@@ -4,10 +4,11 @@
 
 #include <atomic>
 
-/// Base of objects that KpHandle counts and that threads share; otherwise as KpHandable.
+/// Base of objects that threads share and whose handles are counted by KpHandle; otherwise as
+/// KpHandable.
 ///
-/// Any thread that has a handle may copy and drop it. Whatever a thread did with the object before it dropped its
-/// handle is seen by the destructor.
+/// Any thread that has a handle may copy and release it. All changes that a thread makes to the
+/// object before it releases its handle are visible to the destructor.
 class KPLIB_API KpHandableThreaded {
 public:
     KpHandableThreaded() = default;
@@ -17,16 +18,17 @@ public:
     KpHandableThreaded& operator=(const KpHandableThreaded&) noexcept { return *this; }
     virtual ~KpHandableThreaded();
 
-    /// Runs once before the object is deleted, while it is whole. It may take and drop handles to the object.
+    /// Called once before the object is deleted, while it is complete. May take and release
+    /// handles to the object.
     virtual void notifyDelete();
 
-    /// One atomic instruction.
+    /// Adds a reference by one atomic instruction.
     void ref() const { refCount_.fetch_add(1, std::memory_order_relaxed); }
 
-    /// Deletes the object with its last reference.
+    /// Removes a reference, and deletes the object with its last one.
     void unref() const
     {
-        // The spin lock is only for threads that may bring the count to 0; dropping one reference
+        // The spin lock is only for threads that may bring the count to 0; removing one reference
         // of several needs none.
         for (int n = refCount_.load(std::memory_order_relaxed); n > 1;) {
             if (refCount_.compare_exchange_weak(n, n - 1, std::memory_order_release, std::memory_order_relaxed))
@@ -35,7 +37,8 @@ public:
         unrefLast();
     }
 
-    /// Never deletes, so that an object can leave the scope that held it with a count of 0.
+    /// Removes a reference but never deletes the object, so that it can leave the scope that held
+    /// it with a count of 0.
     void unrefNoDelete() const { refCount_.fetch_sub(1, std::memory_order_release); }
 
     /// The number of references; 0 during destruction.
@@ -47,8 +50,7 @@ public:
     /// Whether the last reference is gone and the destruction has begun.
     bool isDestructionInProgress() const { return refCount_.load(std::memory_order_relaxed) >= destructionCount; }
 
-    /// Whether there is no reference: none was ever taken, or all are dropped. Takes the spin
-    /// lock.
+    /// Whether there is no reference: none was taken, or all are released. Takes the spin lock.
     bool isVirgin() const;
 
 private:

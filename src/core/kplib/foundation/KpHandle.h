@@ -27,19 +27,19 @@ public:
     }
     /// Holds the same object.
     KpHandle(const KpHandle& other) : KpHandle(other.pointer_) {}
-    /// Takes the reference; `other` is null then.
+    /// Takes over the reference. `other` becomes null.
     KpHandle(KpHandle&& other) noexcept : pointer_(std::exchange(other.pointer_, nullptr)) {}
 
-    /// The pointer is cleared before the reference is dropped, so that the destructor of the
-    /// object finds no handle to itself here.
+    /// Releases the reference. The pointer is cleared first, so that the destructor of the object
+    /// does not find a handle to itself here.
     ~KpHandle()
     {
         if (T* const old = std::exchange(pointer_, nullptr))
             old->unref();
     }
 
-    /// Does nothing if the pointer is the same. References the new object before it drops the old
-    /// one, so that a new object that only the old one holds survives.
+    /// Does nothing if the pointer is the same. Otherwise references the new object before it
+    /// releases the old one, so that a new object that only the old one holds survives.
     KpHandle& operator=(T* object)
     {
         if (object == pointer_)
@@ -54,7 +54,7 @@ public:
     /// As the assignment of the pointer.
     // NOLINTNEXTLINE(bugprone-unhandled-self-assignment): the same pointer is left alone
     KpHandle& operator=(const KpHandle& other) { return *this = other.pointer_; }
-    /// Drops the old object and takes the reference of `other`.
+    /// Releases the old object and takes over the reference of `other`.
     KpHandle& operator=(KpHandle&& other) noexcept
     {
         KpHandle(std::move(other)).swap(*this);

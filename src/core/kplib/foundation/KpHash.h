@@ -5,8 +5,8 @@
 
 #include <cstdint>
 
-// Hashes of 32 bits. They do not mix their bits: they are cheap, and the containers that use them
-// expect that. Those of vectors, digests and UUIDs are in the headers of these types.
+// Hashes of 32 bits. They are cheap and do not mix bits; the containers that use them allow for
+// that. The hashes of vectors, digests and UUIDs are in the headers of these types.
 
 /// h * 9 + c over the characters, which count as signed; 0 for an empty text.
 constexpr unsigned int kp_hash(const char* s)
@@ -48,7 +48,7 @@ constexpr unsigned int kp_hash(const KpID_C<T>& id)
     return kp_hash(id.value());
 }
 
-/// kp_hash() under the name that Qt's hash containers look for.
+/// kp_hash() under the name that Qt's hash containers use.
 template <typename T, T empty>
 constexpr unsigned int qHash(KpID<T, empty> id)
 {

@@ -10,9 +10,10 @@
 #include <iosfwd>
 #include <type_traits>
 
-/// An identifier that is a number of type T on the wire; `empty` is the number that means that there is none.
+/// An identifier that is stored and sent as a number of type T. `empty` is the number of the empty
+/// identifier.
 ///
-/// Each kind of identifier is a type of its own, so that they cannot be mixed up. A plain value of
+/// Each kind of identifier is a separate type, so that kinds cannot be mixed up. A plain value of
 /// the size of T.
 template <typename T, T empty>
 class KpID {
@@ -20,9 +21,9 @@ public:
     /// What a derived identifier is an instance of.
     using IDType = KpID;
 
-    /// No id.
+    /// The empty identifier.
     constexpr KpID() = default;
-    /// The id of that number.
+    /// The identifier with that number.
     constexpr explicit KpID(const T& value) : value_(value) {}
 
     /// The number.
@@ -30,14 +31,14 @@ public:
     /// Replaces the number.
     constexpr void valueSet(const T& value) { value_ = value; }
 
-    /// Whether there is no id.
+    /// Whether this is the empty identifier.
     constexpr bool isEmpty() const { return value_ == empty; }
-    /// Whether there is an id.
+    /// Whether this is not the empty identifier.
     constexpr bool isNotEmpty() const { return value_ != empty; }
-    /// Becomes no id.
+    /// Makes this the empty identifier.
     constexpr void makeEmpty() { value_ = empty; }
 
-    /// The order of the numbers; an empty id has no place of its own in it.
+    /// Compares the numbers. The empty identifier is ordered by its number.
     friend constexpr auto operator<=>(const KpID& a, const KpID& b) = default;
 
     /// Prints the number.
@@ -51,7 +52,8 @@ private:
     T value_ = empty;
 };
 
-/// An identifier that is a class of two 64-bit words, such as Kp128; zero in both means that it is not valid.
+/// An identifier that is a class of two 64-bit words, such as Kp128. It is not valid if both words
+/// are zero.
 template <typename T>
 class KpID_C {
 public:

@@ -5,8 +5,8 @@
 /// Base of an interface that is attached to an owner.
 class KPLIB_API KpInterface : public KpTypedObject {
 public:
-    /// Registers this with `owner`; a null owner makes a new KpInterfaceOwnerDefaultImpl, which is
-    /// deleted with the last handle to it.
+    /// Registers this with `owner`. For a null owner, creates a KpInterfaceOwnerDefaultImpl, which
+    /// is deleted with the last handle to it.
     KpInterface(KpInterfaceOwner* owner, KpInterfaceOwner::MemoryPolicy policy);
     KpInterface(const KpInterface&) = delete;
     KpInterface& operator=(const KpInterface&) = delete;

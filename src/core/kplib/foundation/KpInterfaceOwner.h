@@ -5,11 +5,11 @@
 #include <kplib/foundation/KpHandle.h>
 #include <kplib/foundation/KpTypedObject.h>
 
-/// An object that carries add-on interfaces, found by their type. It is reference counted by what derives from it. One
-/// thread at a time.
+/// An object with add-on interfaces, which are found by their type. Derived classes provide the
+/// reference count. One thread at a time.
 class KPLIB_API KpInterfaceOwner : public KpTypedObject {
 public:
-    /// Who deletes a registered interface.
+    /// Ownership of a registered interface.
     enum MemoryPolicy : int {
         StaticMemory = 0,  ///< the owner only lists the interface
         OwnerDeletes = 1,  ///< the owner also deletes it, in notifyDelete()
@@ -22,13 +22,13 @@ public:
     const KpTypeInfo* getTypeId() const override;
     ~KpInterfaceOwner() override;
 
-    /// Counts one handle more.
+    /// Adds one to the count of handles.
     virtual void ref() = 0;
-    /// Counts one handle less.
+    /// Subtracts one from the count of handles.
     virtual void unref() = 0;
 
-    /// Runs before the owner is destroyed: empties the list of interfaces, deletes those it owns,
-    /// the last one first, and drops the handles of addHandle().
+    /// Called before the owner is destroyed: empties the list of interfaces, deletes those it
+    /// owns, the last one first, and releases the handles of addHandle().
     virtual void notifyDelete();
 
     /// @{
@@ -37,21 +37,21 @@ public:
     static void initClass() { getClassTypeId(); }
     /// @}
 
-    /// Adds an interface to the list. With OwnerDeletes the owner takes it over, unless memory is
-    /// exhausted: then the caller keeps it.
+    /// Adds an interface to the list. With OwnerDeletes the owner takes ownership, except if
+    /// memory is exhausted: the caller then keeps the interface.
     void registerInterface(KpTypedObject* object, MemoryPolicy policy);
     /// As registerInterface() with StaticMemory.
     void registerInterfaceStaticMemory(KpTypedObject* object);
 
-    /// Sets what runs once, with `data`, at the first query, to attach interfaces only when one is
-    /// needed.
+    /// Sets a function that is called once, with `data`, at the first query, to attach interfaces
+    /// only if one is needed.
     void registerAttachInterfacesOnceCB(void (*callback)(void*), void* data);
 
-    /// Keeps the object alive as long as this owner.
+    /// Holds a handle to `object` until notifyDelete().
     void addHandle(KpHandable* object);
 
-    /// The interface of that type, the last registered one of several; the owner itself if it is of that type and no
-    /// interface is; else, and for a null `type`, null.
+    /// The interface of that type, the last registered one if there are several. If there is none,
+    /// the owner if it is of that type, else null. Null for a null `type`.
     KpTypedObject* getInterface(const KpTypeInfo* type) const;
 
     /// All interfaces from the last registered to the first, and then the owner.

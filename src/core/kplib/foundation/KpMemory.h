@@ -4,11 +4,13 @@
 
 // The library's allocation functions, over the C heap. All are safe from any thread.
 
-/// `size` bytes, never null. Throws KpMemoryException(size) when there are none.
+/// Allocates `size` bytes. Never returns null: throws KpMemoryException(size) if memory is
+/// exhausted.
 KPLIB_API void* kpmalloc(unsigned long size);
 
-/// Resizes a block of kpmalloc; a null `ptr` allocates. Size 0 with `ptr` set frees it and gives null. Throws
-/// KpMemoryException(size) when there is no memory; `ptr` then stays as it was.
+/// Resizes a block of kpmalloc; a null `ptr` allocates. A size of 0 frees a `ptr` that is not null
+/// and returns null. Throws KpMemoryException(size) and leaves the block unchanged if memory is
+/// exhausted.
 KPLIB_API void* kprealloc(void* ptr, unsigned long size);
 
 /// Frees a block; null is ignored.
@@ -20,7 +22,8 @@ struct KpFree {
     void operator()(void* block) const { kpfree(block); }
 };
 
-/// `size` bytes with the heap's own alignment (16 here) or null; `alignment` is ignored.
+/// Allocates `size` bytes with the alignment of the heap (16 here), or returns null. `alignment`
+/// is ignored.
 KPLIB_API void* KpAlignedMalloc(unsigned long size, unsigned long alignment);
 
 /// Frees a block of KpAlignedMalloc.

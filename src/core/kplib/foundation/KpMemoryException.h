@@ -2,10 +2,10 @@
 
 #include <kplib/foundation/KpException.h>
 
-/// Exhausted memory. Making, throwing and reading it needs no memory.
+/// Exhausted memory. Constructing, throwing and reading it needs no free memory.
 class KPLIB_API KpMemoryException : public KpException {
 public:
-    /// `size`: the bytes that were asked for, 0 when unknown.
+    /// `size`: the requested number of bytes, 0 if unknown.
     explicit KpMemoryException(unsigned long size = 0);
     /// @{
     /// Copies the size.
@@ -20,7 +20,7 @@ public:
     /// memory for the text. Writes into this object: one thread at a time.
     const char* what() override;
 
-    /// Number of bytes that were asked for, 0 if unknown.
+    /// The requested number of bytes, 0 if unknown.
     unsigned long size() const { return size_; }
 
 private:

@@ -7,24 +7,26 @@ struct KpMutexPrivate;
 /// Receives the failures of KpMutex and KpWaitCondition: `format` is a printf format for `errorCode`.
 using KpLockFailureReport = void (*)(const char* format, int errorCode);
 
-/// Sets the receiver; null restores the default, which prints to standard output. The log sets itself here at its first
-/// use, which comes no later than static initialisation. Set it before other threads start.
+/// Sets the receiver. Null restores the default, which prints to standard output. The log sets
+/// itself as the receiver at its first use, at the latest during static initialisation. Set it
+/// before other threads start.
 KPLIB_API void kpSetLockFailureReport(KpLockFailureReport report);
 
 /// Mutual exclusion, recursive on request.
 ///
-/// Failures of the platform do not throw: unlock() writes them to the log, the others ignore them.
-/// The caller ensures that a mutex is unlocked when it is destroyed, and that a plain one is
-/// unlocked by the thread that holds it.
+/// Platform failures do not throw: unlock() writes them to the log, the other functions ignore
+/// them. Preconditions: a mutex is unlocked when it is destroyed, and a mutex that is not
+/// recursive is unlocked by the thread that holds it.
 class KPLIB_API KpMutex {
 public:
-    /// An unlocked mutex. With `recursive` its holder may lock it again, and unlocks it as often.
+    /// An unlocked mutex. If `recursive` is true, the thread that holds it may lock it again and
+    /// must unlock it as often.
     explicit KpMutex(bool recursive);
     KpMutex(const KpMutex&) = delete;
     KpMutex& operator=(const KpMutex&) = delete;
     virtual ~KpMutex();
 
-    /// Whether its holder may lock it again.
+    /// Whether the thread that holds the mutex may lock it again.
     bool isRecursive() const;
 
     /// Blocks until the mutex is held.
@@ -33,13 +35,13 @@ public:
     /// Locks the mutex if it is free, and returns whether it did.
     bool tryLock();
 
-    /// Gives up one lock. A failure is one error line in the log.
+    /// Releases one lock. A failure is one error line in the log.
     void unlock();
 
 private:
     friend class KpWaitCondition;
 
-    KpMutexPrivate* record_;  // keeps the platform's thread header out of here
+    KpMutexPrivate* record_;  // hides the platform's thread header
 };
 
 /// Holds a lock for the length of a scope; null holds nothing. Nests on a recursive KpMutex.
@@ -55,7 +57,7 @@ public:
     KpScopedLockT(const KpScopedLockT&) = delete;
     KpScopedLockT& operator=(const KpScopedLockT&) = delete;
 
-    /// Ends the process if the unlocking throws.
+    /// Unlocks. Ends the process if that throws.
     ~KpScopedLockT()
     {
         if (lock_)
@@ -67,7 +69,7 @@ private:
     Lock* lock_;
 };
 
-/// One recursive lock for all modules of the system, to guard the making of singletons on first
-/// use. Valid from static initialisation until exit. The name is a reserved one for compatibility
+/// One recursive lock for all modules of the system, which guards the creation of singletons on
+/// first use. Valid from static initialisation until exit. The reserved name is for compatibility
 /// with existing modules.
 extern KPLIB_API KpMutex _KpSingleton_Mutex;  // NOLINT(bugprone-reserved-identifier)

@@ -32,10 +32,11 @@ public:
     /// Of that type.
     constexpr KpPrimType(Type type = Byte) : type_(type) {}
 
-    /// From a number, as read from a message; any number is held as it is.
+    /// From a number, such as one read from a message. Any number is stored unchanged.
     constexpr explicit KpPrimType(std::int32_t number) : type_(static_cast<Type>(number)) {}
 
-    /// The type of that exact name into `type`; false for an unknown name, and `type` stays.
+    /// Sets `type` to the type of that exact name. Returns false, and leaves `type` unchanged, for
+    /// an unknown name.
     static bool nameToType(const char* name, Type& type);
 
     /// The enumerator, for switches and comparisons.
@@ -47,9 +48,9 @@ public:
     /// Whether the library computes with elements of this type: byte, short, int, float, double and ushort.
     constexpr bool isNumber() const;
 
-    /// Name of any value: "unknown" outside the ten types, with a size of 0.
+    /// The name, or "unknown" for a value outside the ten types.
     const char* name() const { return isValid() ? primTypeName[type_] : "unknown"; }
-    /// As name(), the size in bytes.
+    /// The size in bytes, or 0 for a value outside the ten types.
     int size() const { return isValid() ? primTypeSize[type_] : 0; }
 
 private:

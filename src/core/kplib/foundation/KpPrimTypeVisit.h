@@ -11,8 +11,9 @@ struct KpElementTag {
     using Type = T;
 };
 
-/// Calls `work` once with the KpElementTag of `type` and returns true; returns false without a call if `type` is not a
-/// number, see KpPrimType::isNumber(). The loop over elements belongs inside `work`, so that the type is asked once:
+/// Calls `work` once with the KpElementTag of `type` and returns true. Returns false without a
+/// call if `type` is not a number, see KpPrimType::isNumber(). The loop over elements belongs
+/// inside `work`, so that the type is tested once:
 ///
 ///     kpVisitNumberType(data.type, [&]<typename T>(KpElementTag<T>) { sum(static_cast<const T*>(data.data), n); });
 template <typename Work>

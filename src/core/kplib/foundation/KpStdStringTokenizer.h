@@ -14,10 +14,10 @@ public:
     /// Number of tokens in the whole text, however many have been read; O(length) the first time.
     size_t countTokens() const;
 
-    /// Whether nextToken() has one to give.
+    /// Whether there is a next token.
     bool hasMoreTokens() const { return begin_ != end_; }
 
-    /// The next token into `token`; after the last one, `token` stays.
+    /// Sets `token` to the next token. After the last one `token` stays unchanged.
     void nextToken(std::string& token);
 
 private:

@@ -17,9 +17,9 @@
 ///     name.replaceSubStr(".raw", ".mask");
 ///     std::printf("%s %d\n", name.c_str(), name.length());  // prints: slice07.mask 12
 ///
-/// Text is bytes, of whatever encoding. Only raw array operations, a move from it and a format
-/// that the platform refuses leave a string without its NUL (an array of size 0), which reads as
-/// "". No positions are checked. One thread at a time.
+/// Text is a sequence of bytes in any encoding. Raw array operations, moving from a string and a
+/// format that the platform rejects leave a string without its NUL (an array of size 0), which
+/// reads as "". No other operation does. Positions are not checked. One thread at a time.
 class KPLIB_API KpString : public KpDArray<char> {
 public:
     /// Selects the constructor that takes no memory.
@@ -88,11 +88,11 @@ public:
 
     /// Equality of length and of the text up to the first NUL.
     bool operator==(const KpString& other) const;
-    /// As !=, turned round.
+    /// The negation of operator!=.
     bool operator==(const char* s) const { return !(*this != s); }
-    /// True when the texts differ; a string without a NUL differs from every text, "" too. A null
-    /// `s` differs only from such a one, not from any proper string, empty or not. Intentional:
-    /// existing callers depend on it.
+    /// Whether the texts differ. A string without a NUL differs from every text, "" included. A
+    /// null `s` differs only from a string without a NUL. Intentional: existing callers depend on
+    /// it.
     bool operator!=(const char* s) const;
     /// @{
     /// As above, for other kinds of null and text.
@@ -101,26 +101,27 @@ public:
     friend bool operator==(const char* s, const KpString& text) { return text == s; }
     /// @}
 
-    /// The order of strcmp, so that no comparison ever falls back on the addresses of the texts.
+    /// Compares by strcmp(). The addresses of the texts are never compared.
     std::weak_ordering operator<=>(const KpString& other) const { return *this <=> other.c_str(); }
     /// As above; `s` is not null.
     std::weak_ordering operator<=>(const char* s) const { return std::strcmp(c_str(), s) <=> 0; }
 
-    /// Replaces the content by the formatted text and returns it. The string itself must not be among the arguments. If
-    /// there is no memory, the content is undefined text.
+    /// Replaces the content by the formatted text and returns it. The string itself must not be
+    /// among the arguments. If memory is exhausted, the content is undefined text.
     char* printf(const char* format, ...) KPLIB_PRINTF(2, 3);
-    /// As printf(), with the arguments in `args`, which are used up.
+    /// As printf(), with the arguments in `args`, which is undefined afterwards.
     char* vprintf(const char* format, va_list args) KPLIB_PRINTF(2, 0);
 
-    /// The number in decimal, in place of the content or as a new string.
+    /// Replaces the content by the number in decimal.
     void setInt64(long long v);
     /// The number in decimal.
     static KpString fromInt64(long long v);
-    /// The decimal number at the start of the text; without one, 0.
+    /// The decimal number at the start of the text, or 0 if there is none.
     static long long toInt64(const char* s);
     /// As above, of this text.
     long long toInt64() const;
-    /// The number at the start of the text, by sscanf with "%f" or "%d"; 0 and `ok` false without one.
+    /// The number at the start of the text, read by sscanf with "%f". If there is none, returns 0
+    /// and sets `ok` to false.
     float toFloat(bool& ok) const;
     /// As above, with "%d".
     int toInt(bool& ok) const;
@@ -140,8 +141,8 @@ public:
     /// empty or null `from` changes nothing.
     void replaceSubStr(const char* from, const char* to);
 
-    /// Splits at each separator, empty pieces included: always one piece more than there are separators. `out` must not
-    /// hold this string, as it is emptied first.
+    /// Splits at each separator, empty pieces included: `out` receives one piece more than there
+    /// are separators. `out` is emptied first and must not contain this string.
     void explode(char separator, KpDArray<KpString>& out) const;
 
     /// The text as a token: a backslash before each " and \, and quotes around all when it is empty, holds white space,

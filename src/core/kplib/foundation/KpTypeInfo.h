@@ -5,21 +5,22 @@
 
 /// The identity of a class at run time: its name, up to two parents and perhaps a factory.
 ///
-/// There is one for each class, a static in its getClassTypeId(), and a process-wide registry that finds it by name.
-/// Types are made during static initialisation or with the loading of a shared object: the registry has no lock.
+/// There is one object for each class, a static in its getClassTypeId(), and a process-wide
+/// registry that finds it by name. Types are registered during static initialisation or while a
+/// shared object is loaded: the registry has no lock.
 class KPLIB_API KpTypeInfo {
 public:
     /// Makes an object of the class on the heap.
     using Factory = KpTypedObject* (*)();
 
-    /// A key to search with; it is not registered. The name is not copied, here and below.
+    /// A search key, which is not registered. The name is not copied, here and below.
     explicit KpTypeInfo(const char* name);
     /// A type, which is registered after those of an equal name. `create`, the factory, and the
     /// parents may be null.
     KpTypeInfo(const char* name, Factory create, const KpTypeInfo* parent1, const KpTypeInfo* parent2);
     KpTypeInfo(const KpTypeInfo&) = delete;
     KpTypeInfo& operator=(const KpTypeInfo&) = delete;
-    /// Removes this object from the registry, if it is there.
+    /// Removes this object from the registry if it is registered.
     ~KpTypeInfo();
 
     /// The name of the class.

@@ -3,7 +3,7 @@
 #include <kplib/foundation/KpExport.h>
 #include <kplib/foundation/KpTypeInfo.h>
 
-/// Base of objects that know their class at run time.
+/// Base of objects with a run-time type.
 ///
 /// A typed class has its own getClassTypeId() with a static KpTypeInfo that names the class and its parent, a
 /// getTypeId() that returns it, and an initClass(); a static initialiser in its source calls getClassTypeId(), so that

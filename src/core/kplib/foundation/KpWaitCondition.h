@@ -5,9 +5,9 @@
 
 struct KpWaitConditionPrivate;
 
-/// Lets threads wait for a change that a mutex guards. A thread may wake up without a cause, so
-/// the caller checks for the change in a loop. Failures of the platform do not throw: they are
-/// written to the log.
+/// Blocks threads until another thread signals a change of data that a mutex guards. A thread may
+/// wake up without a cause: check for the change in a loop. Platform failures do not throw; they
+/// are written to the log.
 class KPLIB_API KpWaitCondition {
 public:
     KpWaitCondition();
@@ -15,9 +15,10 @@ public:
     KpWaitCondition& operator=(const KpWaitCondition&) = delete;
     virtual ~KpWaitCondition();
 
-    /// Unlocks `mutex`, which the caller holds, waits to be woken, and locks it again. ULONG_MAX
-    /// waits without a time limit. False after `milliseconds`, silently, or when the platform
-    /// fails. The deadline is on the wall clock, so a change of the system time moves it.
+    /// Unlocks `mutex`, which the caller must hold, waits for a signal, and locks it again.
+    /// ULONG_MAX waits without a time limit. Returns false after `milliseconds`, without a log
+    /// line, or if the platform fails. The deadline is on the wall clock, so a change of the
+    /// system time moves it.
     bool wait(KpMutex* mutex, unsigned long milliseconds);
 
     /// Wakes one waiting thread, if there is one.

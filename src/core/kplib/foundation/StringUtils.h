@@ -2,9 +2,9 @@
 
 #include <kplib/foundation/KpExport.h>
 
-/// Number conversions that take the whole text or nothing: white space or anything else after the
-/// number is a failure, as is a null text. On failure they give `defaultValue`. `ok`, if not null,
-/// receives the success.
+/// Number conversions of a whole text. White space or anything else after the number is a failure,
+/// and so is a null text. A failure returns `defaultValue`. `ok`, if not null, receives whether
+/// the conversion succeeded.
 namespace StringUtils {
 
 KPLIB_API double toDouble(const char* s, double defaultValue = 0, bool* ok = nullptr);  ///< by strtod
@@ -14,7 +14,7 @@ KPLIB_API unsigned long toULong(const char* s, unsigned long defaultValue = 0,
 
 }  // namespace StringUtils
 
-/// Whether `text` matches `pattern` with `*` and `?`, byte by byte. Less than a full glob: the
-/// text never goes back after a mismatch, so "aab" doesn't match "*ab", and a last `?` accepts any
+/// Whether `text` matches `pattern` with `*` and `?`, byte by byte. A subset of a glob: matching
+/// never goes back in the text, so "aab" does not match "*ab", and a last `?` matches any
 /// remaining text as `*` does. O(n).
 KPLIB_API bool kpWildMatch(const char* text, const char* pattern);

@@ -152,40 +152,23 @@ public:
     void unsetCameraOffset();
 
 private:
-    /// As above.
     void setShape(Type type, const KpVec3f& llf, const KpVec3f& lrf, const KpVec3f& ulf, float near, float far);
-    /// As above.
     void rebuildCorners();
-    /// As above.
     void moveSidesIn(const KpVec3f& step);
-    /// As above.
     void moveBottomAndTopIn(const KpVec3f& step);
-    /// As above.
     KpVec3f width() const { return lrfO_ - llfO_; }
-    /// As above.
     KpVec3f height() const { return ulfO_ - llfO_; }
-    /// As above.
     KpPlane face(int i) const;
-    /// As above.
     float stereoShift(float width) const;
 
-    /// As above.
     Type type_ = Orthographic;
-    /// As above.
     KpVec3f projPoint_{0, 0, 0}, projDir_{0, 0, 0};
-    /// As above.
     float nearDist_ = 0, nearToFar_ = 0;
-    /// As above.
     KpVec3f llf_{0, 0, 0}, lrf_{0, 0, 0}, ulf_{0, 0, 0};  // always the eye and the three below
-    /// As above.
     KpVec3f llfO_{0, 0, 0}, lrfO_{0, 0, 0}, ulfO_{0, 0, 0};
-    /// As above.
     float stereoEyeScale_ = 1, stereoOffsetScale_ = 1;
-    /// As above.
     std::int32_t stereoMode_ = 0;
-    /// As above.
     float cameraOffset_ = 0;
-    /// As above.
     std::int32_t cameraOffsetIsSet_ = 0;
 };
 

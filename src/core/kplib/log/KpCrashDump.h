@@ -2,8 +2,8 @@
 
 #include <kplib/foundation/KpExport.h>
 
-// Entry points of crash reporting, so that callers need no switch for the platform. Here the system's own core dumps
-// serve, and these do nothing.
+// Entry points of crash reporting, present on every platform so that callers need no conditional
+// code. On this platform the system writes core dumps, and these functions do nothing.
 
 /// No configuration: null.
 KPLIB_API void* kpCrashDumpConfig();

@@ -2,10 +2,10 @@
 
 #include <kplib/foundation/KpExport.h>
 
-// Design by contract: switches and a hook that the checking macros of an application share. The library itself keeps
-// them but does not use them. Set them at start-up, before other threads run.
+// Design by contract: switches and a hook for the checking macros of an application. The library
+// stores them but does not use them. Set them at start-up, before other threads start.
 
-/// What kind of promise was broken.
+/// The kind of a broken contract.
 enum DbCEventType : int {
     DbCPrecondition = 0,   ///< of a caller
     DbCPostcondition = 1,  ///< of the function itself
@@ -15,7 +15,7 @@ enum DbCEventType : int {
 
 /// Whether broken contracts are handled at all.
 extern KPLIB_API bool kp_DbC_handleEvents;
-/// Whether a handled one stops at a breakpoint.
+/// Whether handling a broken contract stops at a breakpoint.
 extern KPLIB_API bool kp_DbC_breakOnEvent;
 
 /// Receives a broken contract: kind, condition, file, line, function and a message for the reader; texts may be null.

@@ -2,25 +2,27 @@
 
 #include <kplib/log/KpResult.h>
 
-/// Failures made public: the log, this thread's last error, the notification callbacks.
+/// Reports failures: to the log, as this thread's last error, and to the notification callbacks.
 ///
 ///     if (Tm::fail(load(file)))
 ///         return false;
 namespace Tm {
 
-/// This thread's last error, a success when there is none. The call clears it unless `keep` is true.
+/// This thread's last error, or a success if there is none. Clears it unless `keep` is true.
 KPLIB_API KpResult lastError(bool keep);
 
-/// Makes `result` this thread's last error, whatever it was; a success clears it.
+/// Replaces this thread's last error by `result`. A success clears it.
 KPLIB_API void setError(const KpResult& result);
 
-/// A failure with the code's own text, what KP_ERROR expands to. With `verbose`, `function`, `date` and `time` go into
-/// the data, below the given one. With `setLastError` it also becomes the last error.
+/// Returns a failure with the code's own text; KP_ERROR expands to this. If `verbose` is true,
+/// `function`, `date` and `time` are added to the data, below `data`. If `setLastError` is true,
+/// the failure also becomes the last error.
 KPLIB_API KpResult tmError(KpResult::Code code, const char* file, unsigned int line, const char* function,
                            const char* date, const char* time, const char* data, bool verbose, bool setLastError);
 
-/// Whether `result` is a failure. One is logged, becomes the last error unless there is one already (the first failure
-/// stays until lastError() takes it), and goes to the notification callbacks.
+/// Whether `result` is a failure. A failure is logged, becomes the last error unless there is one
+/// already (the first failure stays until lastError() clears it), and is passed to the
+/// notification callbacks.
 KPLIB_API bool fail(const KpResult& result);
 
 /// The same.

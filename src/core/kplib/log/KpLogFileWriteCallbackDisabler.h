@@ -2,18 +2,18 @@
 
 #include <kplib/log/KpLogFile.h>
 
-/// Turns the write callback of the process's log off and on again, for code that logs from within the callback or must
-/// not disturb a user interface.
+/// Removes the write callback of the process's log and restores it, for code that logs within the
+/// callback or must not disturb a user interface.
 class KPLIB_API KpLogFileWriteCallbackDisabler {
 public:
-    /// Only remembers the callback and its level.
+    /// Stores the current callback and its level; changes nothing.
     KpLogFileWriteCallbackDisabler();
     KpLogFileWriteCallbackDisabler(const KpLogFileWriteCallbackDisabler&) = delete;
     KpLogFileWriteCallbackDisabler& operator=(const KpLogFileWriteCallbackDisabler&) = delete;
 
-    /// No callback and KpLogOff.
+    /// Sets no callback and KpLogOff.
     void disableWriteCallback();
-    /// Sets what was remembered.
+    /// Restores the stored callback and level.
     void restoreWriteCallback();
 
 private:

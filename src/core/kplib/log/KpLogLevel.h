@@ -2,7 +2,7 @@
 
 #include <kplib/foundation/KpExport.h>
 
-/// How grave a message is, from the least up.
+/// The severity of a message, in ascending order.
 enum KpLogLevel : int {
     KpLogDebug = 0,     ///< for developers
     KpLogInfo = 1,      ///< what happens

@@ -4,7 +4,7 @@
 #include <kplib/foundation/KpExport.h>
 #include <kplib/foundation/KpString.h>
 
-/// Counts messages that would otherwise be repeated many times, for one report of all of them.
+/// Counts messages that would otherwise be logged many times, for one report of all of them.
 ///
 /// Slots are never removed: an index stays valid for the collector's life. One thread at a time.
 class KPLIB_API KpMessageCollector {

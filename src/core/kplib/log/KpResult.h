@@ -6,10 +6,10 @@
 
 /// The outcome of an operation, one pointer wide.
 ///
-/// A success is a null pointer: it costs nothing to make, copy or test. A failure is a record that all copies share and
-/// that never changes; making one writes a debug line to the log. The record is counted for one thread: a failure may
-/// go to another thread only when no other copy of it is in use. Hand a result to Tm::fail() (KpLastError.h) to report
-/// it.
+/// A success is a null pointer: constructing, copying and testing it costs nothing. A failure is
+/// an immutable record that all copies share; constructing one writes a debug line to the log. The
+/// count of copies is for one thread: a failure may be passed to another thread only if no other
+/// copy of it is in use. Pass a result to Tm::fail() (KpLastError.h) to report it.
 class KPLIB_API KpResult {
 public:
     /// Any number may stand for a failure; those below have texts of their own.
@@ -68,8 +68,8 @@ public:
 
     KpResult() noexcept = default;
 
-    /// A failure with its texts and perhaps its place in the source; null texts are empty. Without
-    /// `data` the code's own text is taken. Code 0 is a success; the texts are ignored.
+    /// A failure with its texts; null texts are empty. Without `data` the code's own text is used.
+    /// Code 0 is a success, and the texts are ignored.
     KpResult(Code code, const char* text, const char* data);
     /// As above, with the place in the source; `file` may be null.
     KpResult(Code code, int line, const char* file, const char* text, const char* data);
@@ -98,9 +98,9 @@ public:
     /// The texts as above: what the caller gave, and the details.
     const char* text() const;
     const char* data() const;
-    /// Whether data() has characters.
     /// @}
 
+    /// Whether data() has characters.
     bool hasData() const;
 
     /// Makes this a success.
@@ -116,7 +116,8 @@ public:
     /// Throws a copy of a failure, as KpResult.
     void throwOnFail() const;
 
-    /// The process-wide list of callbacks. It has no lock: it is set up before threads start.
+    /// Adds a callback to the process-wide list. The list has no lock: set it up before other
+    /// threads start.
     static void notificationCallbackAdd(NotificationCallback callback);
     /// Removes the entry of `callback` that was added last, if there is one.
     static void notificationCallbackRemove(NotificationCallback callback);

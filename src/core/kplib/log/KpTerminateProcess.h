@@ -2,6 +2,6 @@
 
 #include <kplib/foundation/KpExport.h>
 
-/// Ends this process at once: signal SIGTERM, and where that is handled or blocked, the exit status `status`. No exit
-/// handler and no static destructor runs.
+/// Ends this process immediately: by the signal SIGTERM, or with the exit status `status` if that
+/// signal is handled or blocked. No exit handler and no static destructor runs.
 [[noreturn]] KPLIB_API void KpTerminateProcess(int status);

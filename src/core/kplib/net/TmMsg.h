@@ -80,9 +80,9 @@ public:
     /// The bytes of the message, valid until it is written to; null if it has none.
     unsigned char* dataPtr() { return buffer_.data(); }
     const unsigned char* dataPtr() const { return buffer_.data(); }
-    /// Number of bytes.
     /// @}
 
+    /// Number of bytes.
     unsigned long size() const { return static_cast<unsigned long>(buffer_.size()); }
     /// The next byte to read; after a failed array it may lie past the end.
     unsigned long readOffset() const { return readOffset_; }

@@ -12,10 +12,12 @@ class NameKey;
 
 /// A named node of the parameter tree: an HxParameter with a value, or an HxParamBundle with children.
 ///
-/// A node is made outside a tree, without a parent; the bundle that takes it owns it from then on.
-/// Names follow the rules of setName(). A tree belongs to one thread at a time (for the one
-/// exception see HxParamBundle). Exhausted memory is a KpMemoryException, the node then being as
-/// before. Nodes live in blocks of kpmalloc().
+/// A node is created without a parent. The bundle into which it is inserted owns it from then on.
+/// Names follow the rules of setName(). Nodes are allocated by kpmalloc().
+///
+/// Errors: exhausted memory throws KpMemoryException and leaves the node unchanged.
+///
+/// Threads: one thread at a time uses a tree; for the one exception see HxParamBundle.
 class KPLIB_API HxParamBase {
 public:
     /// The two kinds of nodes.
@@ -24,8 +26,8 @@ public:
         TypeBundle = 1,     ///< an HxParamBundle
     };
 
-    /// Rules for a node. The setters of the tree ignore them, except as stated here: they are for
-    /// editors, through HxParamEditCheck.
+    /// Restrictions of a node. Except as stated here, the setters of the tree ignore them: they
+    /// are for editors, by way of HxParamEditCheck.
     enum Flag : int {
         FlagNoSave = 1,          ///< left out when a tree is written to a file
         FlagNoCopy = 2,          ///< left out by HxParamBundle::copy()
@@ -37,7 +39,7 @@ public:
         FlagHidden = 128,        ///< never part of the text form
     };
 
-    /// What changed at a node or below it; for clients: the tree itself does not read it.
+    /// What changed in a node or below it. For clients: the tree itself does not read it.
     enum TouchMask : int {
         TouchName = 1,        ///< the name of the node
         TouchValue = 2,       ///< of a bundle: its list of children
@@ -52,27 +54,29 @@ public:
     /// Destroys the node; its parent is not notified.
     virtual ~HxParamBase();
 
-    /// Takes over flags and name. The record of changes is cleared before a change of the name is
-    /// recorded; kind, parent and edit check stay.
+    /// Copies flags and name. The record of changes is cleared before a change of the name is
+    /// recorded. Kind, parent and edit check stay.
     HxParamBase& operator=(const HxParamBase& other);
 
-    /// Names the node. A leading digit gets a `_` in front; letters, digits and `-` stay, some
-    /// Latin-1 letters lose their accents, any other byte becomes `_`. A bundle keeps only the
-    /// part before the first blank, the rest goes into its parameter `Name`, its title, which in
-    /// turn never repeats the name. Null or empty makes up a name from a process-wide, unlocked
+    /// Sets the name. A leading digit is prefixed with `_`; letters, digits and `-` stay; some
+    /// Latin-1 letters lose their accents; any other byte becomes `_`. A bundle keeps only the
+    /// part before the first blank; the rest becomes its title, the parameter `Name`, which never
+    /// repeats the name. For null or empty text a name is generated from a process-wide, unlocked
     /// counter. Records TouchName if the name differs from the old one.
     void setName(const char* name);
 
-    /// Records a change here and, as one of a child, in all bundles above.
+    /// Records a change in this node and, as a change of a child, in all bundles above.
     void touch(int mask);
 
     /// Sets (`on` not 0) or clears the bits of `mask` in flags().
     void setFlag(int mask, int on);
 
-    /// Lets `check` decide for this node and all below it that have none of their own; null for none. Not owned.
+    /// Sets the edit check of this node and of all nodes below it that have none. Null removes it.
+    /// Not owned.
     void setEditCheck(HxParamEditCheck* check) { editCheck_ = check; }
 
-    /// The nearest check on the way up, at last HxParamEditCheck::defaultEditCheck(); never null.
+    /// The edit check of this node or of the nearest node above that has one, else
+    /// HxParamEditCheck::defaultEditCheck(). Never null.
     HxParamEditCheck* editCheck() const;
 
     /// The bundle that holds the node, null outside a tree.

@@ -8,8 +8,8 @@
 #include <cstdio>
 #include <utility>
 
-/// The inner node of the parameter tree: a container of sub-bundles, which come first and in the
-/// order of insertion, and of parameters. It owns its children.
+/// The inner node of the parameter tree: a container that owns its children. Sub-bundles come
+/// first, in the order of insertion, followed by the parameters.
 ///
 ///     HxParamBundle scan("Scan");
 ///     scan.set("Slices", 30);
@@ -19,18 +19,18 @@
 ///         std::printf("%s, %d slices\n", scan.findTag("G0008-0060", "?"), slices);
 ///         // prints: CT, 30 slices
 ///
-/// Lookups ignore the case of ASCII letters and put a `_` in front of a leading digit, as names
-/// have it. A name with a blank in it also matches what is named by the part before, but for
-/// titles and sorted parameters. A bundle answers to its name and to the first 16 words of its
-/// parameter `Name`, its title. A missing node is never an error: lookups return null or false and
-/// leave their output unchanged.
+/// Lookups ignore the case of ASCII letters and prefix a leading digit with `_`, as in names. A
+/// name that contains a blank also matches nodes that are named by the part before the blank,
+/// except for titles and sorted parameters. A bundle is found by its name and by the first 16
+/// words of its title, the parameter `Name`. A missing node is not an error: lookups return null
+/// or false and leave their output unchanged.
 ///
-/// One thread at a time uses a tree, but any number may look parameters up by findSorted() and the
-/// functions that use it: the first lookup sorts, under a lock of its own.
+/// Threads: one thread at a time uses a tree, but any number may look parameters up by
+/// findSorted() and the functions that use it. The first lookup sorts under a lock.
 ///
-/// Exhausted memory is a KpMemoryException. A node that couldn't be inserted is deleted; operations on many children,
-/// and those that make bundles or reservations on their way, stop at the failure and keep what they did so far, the
-/// others leave the tree as it was.
+/// Errors: exhausted memory throws KpMemoryException. A node that could not be inserted is
+/// deleted. Operations on many children, and operations that create bundles or reservations first,
+/// stop at the failure and keep what was done before it; all others leave the tree unchanged.
 class KPLIB_API HxParamBundle : public HxParamBase {
 public:
     /// A new bundle, owned by the caller.
@@ -46,7 +46,7 @@ public:
 
     /// Copies flags and name and takes the children. Assignment leaves flags and name as they are.
     HxParamBundle(HxParamBundle&& other);  // NOLINT(performance-noexcept-move-constructor): the name needs memory
-    /// Takes the children, dropping those that are here.
+    /// Takes the children of the other bundle and deletes the present ones.
     HxParamBundle& operator=(HxParamBundle&& other) noexcept;
 
     HxParamBundle* duplicate() const override;
@@ -61,7 +61,8 @@ public:
     /// FlagNoCopy inside them, and those with the flag themselves come without children.
     void copyAll(const HxParamBase& src);
 
-    /// Takes all children out of `other` and inserts them here, replacing those of the same name. O(1) if empty.
+    /// Moves all children of `other` here; they replace children of the same name. O(1) if this
+    /// bundle is empty.
     void move(HxParamBundle& other);
 
     /// Takes over `node`, which has no parent, as the last one of its kind; or, with `replace`, in the place of the
@@ -69,7 +70,8 @@ public:
     /// BoundaryConditions and the other way round. The node is deleted if memory runs out.
     void insert(HxParamBase* node, int replace);
 
-    /// Makes room for `more` children, so that as many insertions need no memory of their own.
+    /// Ensures capacity for `more` children, so that as many insertions allocate no memory for the
+    /// list.
     void reserve(long more);
 
     /// Deletes a child, unless it has FlagNoDelete; the form with a name takes what findBase() finds.
@@ -136,7 +138,7 @@ public:
     /// Sorts the parameters by name, once, until the next insertion. A new name doesn't move a parameter: lookups may
     /// miss those that were renamed in between.
     void sortParameters() const;
-    /// Whether findSorted() can search without sorting.
+    /// Whether the parameters are sorted, so that findSorted() does not sort them.
     bool isSorted() const { return (counts() & sortedBit) != 0; }
 
     /// A text, or a single number as text, see HxParameter::getString().
@@ -175,9 +177,9 @@ public:
     /// The bundle `All` in the bundle `DICOM`, null if there is none.
     HxParamBundle* dicomAll() { return const_cast<HxParamBundle*>(std::as_const(*this).dicomAll()); }
     const HxParamBundle* dicomAll() const;
-    /// The same, made as needed.
     /// @}
 
+    /// The same, made as needed.
     HxParamBundle* dicomAllCreate();
 
     /// Sets a tag of dicomAllCreate(), with an empty description.

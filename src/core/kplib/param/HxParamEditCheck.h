@@ -6,9 +6,9 @@
 /// Decides which changes an editor may make to a tree. Derive from it and pass the object to
 /// HxParamBase::setEditCheck() to forbid changes.
 ///
-/// Each check returns whether the change is allowed. In this class it is allowed if the flag of
-/// that name is clear in the node (FlagNoRename and so on), whatever the proposed names and
-/// values. The tree itself calls no check.
+/// Each check returns whether the change is allowed. This class allows it if the flag of that name
+/// is clear in the node (FlagNoRename and so on), independent of the proposed names and values.
+/// The tree itself calls no check.
 class KPLIB_API HxParamEditCheck {
 public:
     virtual ~HxParamEditCheck();
@@ -22,7 +22,7 @@ public:
     virtual bool checkSetValue(HxParameter* node, const char* newValue);
     /// @}
 
-    /// The check of trees that have none of their own. It is made on first use without a lock, so
-    /// one thread makes the first call, and is never destroyed.
+    /// The check of trees without one of their own. It is created on first use without a lock, so
+    /// the first call must not run at the same time as another. Never destroyed.
     static HxParamEditCheck* defaultEditCheck();
 };

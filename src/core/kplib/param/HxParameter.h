@@ -5,8 +5,9 @@
 
 /// A named array of values of one primitive type, or a text.
 ///
-/// Setters may change the type. Each counts as a change, of equal values too, unless it is given the stored block
-/// itself. Indices are not checked. Exhausted memory is a KpMemoryException, the parameter then being as before.
+/// Setters may change the type. Each counts as a change, even if the values are equal, unless its
+/// argument is the stored block itself. Indices are not checked. Exhausted memory throws
+/// KpMemoryException and leaves the parameter unchanged.
 class KPLIB_API HxParameter : public HxParamBase {
 public:
     /// A new text parameter, owned by the caller.
@@ -29,7 +30,8 @@ public:
 
     /// As HxParamBase: a copy outside any tree.
     HxParameter(const HxParameter& other);
-    /// Copies name, flags and value. Only the bundles above keep the mark of the changed value.
+    /// Copies name, flags and value. The change of the value is recorded in the bundles above
+    /// only.
     HxParameter& operator=(const HxParameter& other);
 
     HxParameter* duplicate() const override;
@@ -51,8 +53,9 @@ public:
     /// As above.
     const void* value() const { return value_; }
 
-    /// The stored text; numbers are written into one of four process-wide, unlocked strings in
-    /// rotation, so that the last four results are valid. Null only for a text built from null.
+    /// The text of the value. Numbers are written into one of four process-wide, unlocked strings
+    /// in rotation, so that the last four results are valid. Null only for a text constructed from
+    /// null.
     const char* getString() const
     {
         return primType_ == KpPrimType::String ? static_cast<const char*>(value_) : numbersAsString();
@@ -63,8 +66,9 @@ public:
     /// memory runs out, `out` holds a part of it.
     void print(KpString& out, bool append = false) const;
 
-    /// Element `i`; floating-point numbers are truncated after adding 0.5, negative ones too, and what no int holds
-    /// gives INT_MIN. Of complex numbers the real part; of a text the number at its start, whatever `i`; else 0.
+    /// Element `i` as an int. Floating-point numbers are truncated after 0.5 is added, negative
+    /// ones too; a number outside the range of int gives INT_MIN. Of a complex number the real
+    /// part is used, of a text the number at its start, whatever `i` is. 0 for other types.
     int getNum(int i) const;
     /// As getNum(), without rounding.
     double getReal(int i) const;

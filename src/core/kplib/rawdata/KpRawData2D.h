@@ -31,9 +31,9 @@ public:
     {
         init(w, h, bytesPerPixel, pixelStride, rowStride, data);
     }
-    /// As the assignment.
     /// @}
 
+    /// As the assignment.
     KpRawData2D(const KpRawData2D& other) { *this = other; }
     ~KpRawData2D() { cleanup(); }
 

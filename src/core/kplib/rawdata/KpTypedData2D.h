@@ -22,9 +22,9 @@ public:
     {
         init(w, h, ignored, rowStride, p, nDataVar);
     }
-    /// As the assignment.
     /// @}
 
+    /// As the assignment.
     KpTypedData2D(const KpTypedData2D& other) = default;
 
     /// As that of KpRawData2D.

@@ -27,9 +27,9 @@ public:
     /// The 16 bytes.
     constexpr unsigned char* data() { return bytes_.data(); }
     constexpr const unsigned char* data() const { return bytes_.data(); }
-    /// The bytes as two numbers.
     /// @}
 
+    /// The bytes as two numbers.
     constexpr Words words() const { return std::bit_cast<Words>(bytes_); }
 
     /// Whether all bytes are zero.

@@ -67,6 +67,5 @@ public:
     KpVec4i asKpVec4i() const;
 
 private:
-    /// As above.
     unsigned majorVersion_ = 0, minorVersion_ = 0, patchLevel_ = 0, buildNumber_ = 0;
 };

@@ -36,9 +36,9 @@ public:
     /// The points, empty at first.
     KpDArray<KpVec3f>& points() { return points_; }
     const KpDArray<KpVec3f>& points() const { return points_; }
-    /// The mean of the points.
     /// @}
 
+    /// The mean of the points.
     const KpVec3f& centroid() const { return centroid_; }
     /// The normal, of length 1 after a fit.
     const KpVec3f& normal() const { return normal_; }

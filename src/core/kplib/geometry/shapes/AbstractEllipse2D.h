@@ -28,9 +28,9 @@ public:
     /// A radius.
     virtual float radiusX() const = 0;
     virtual float radiusY() const = 0;
-    /// The enclosed area.
     /// @}
 
+    /// The enclosed area.
     virtual float area() const;
     /// By S. Ramanujan's second approximation ("Modular equations and approximations to pi", 1914).
     virtual float circumference() const;

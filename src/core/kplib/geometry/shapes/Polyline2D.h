@@ -19,9 +19,9 @@ public:
     /// The vertices as a range.
     std::vector<KpVec2f>::const_iterator begin() const { return vertices_.begin(); }
     std::vector<KpVec2f>::const_iterator end() const { return vertices_.end(); }
-    /// Number of vertices.
     /// @}
 
+    /// Number of vertices.
     size_t size() const { return vertices_.size(); }
     /// Checked: std::out_of_range.
     const KpVec2f& at(size_t i) const { return vertices_.at(i); }
