@@ -2,9 +2,10 @@
 
 #include <kplib/geometry/KpVec2f.h>
 
-/// An axis-aligned rectangle: the lower corner, then the upper one, so xmin, ymin, xmax, ymax - two corners, other than
-/// the boxes in space, which are intervals. Both bounds belong to it; it is empty when a minimum is above its maximum.
-/// A default-made one is empty, from (1, 1) to (0, 0).
+/// An axis-aligned rectangle, stored as its lower and its upper corner: xmin, ymin, xmax, ymax.
+/// Boxes in space are stored as intervals instead. Both bounds belong to the rectangle. It is
+/// empty if a minimum is above its maximum; a default-constructed one is empty, from (1, 1) to (0,
+/// 0).
 class KpBox2f {
 public:
     constexpr KpBox2f() = default;
@@ -42,7 +43,8 @@ public:
     /// Whether a minimum is above its maximum.
     constexpr bool isEmpty() const { return min_.x() > max_.x() || min_.y() > max_.y(); }
 
-    /// Makes it hold `point`: an empty one becomes that point, else bounds move that it lies strictly outside of.
+    /// Extends the rectangle to contain `point`: an empty one becomes that point, otherwise each
+    /// bound that `point` lies strictly outside of moves to it.
     constexpr void extendBy(const KpVec2f& point)
     {
         const bool wasEmpty = isEmpty();

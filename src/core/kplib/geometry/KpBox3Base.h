@@ -4,11 +4,11 @@
 #include <kplib/geometry/KpVecBase.h>
 
 /// Base of the axis-aligned boxes in space: xmin, xmax, ymin, ymax, zmin, zmax and nothing else,
-/// so that the object is its own byte image. `Box` is the class that derives from it, `Vector` its
-/// corner.
+/// so that the object is its own byte image. `Box` is the derived class, `Vector` the type of its
+/// corners.
 ///
-/// Both bounds belong to the box; it is empty when on any axis the minimum is above the maximum. A default-made box is
-/// empty, from 1 to 0 on each axis.
+/// Both bounds belong to the box. It is empty if the minimum is above the maximum on any axis. A
+/// default-constructed box is empty, from 1 to 0 on each axis.
 template <typename Box, typename Vector>
 class KpBox3Base {
 public:
@@ -47,7 +47,8 @@ public:
     constexpr Vector min() const { return {b_[0], b_[2], b_[4]}; }
     /// The upper corner.
     constexpr Vector max() const { return {b_[1], b_[3], b_[5]}; }
-    /// Corner `i` from 0 to 7: x from the maximum if bit 0 of `i` is set, y if bit 1 is, z if bit 2 is.
+    /// Corner `i` from 0 to 7: the maximum of x if bit 0 of `i` is set, of y if bit 1 is set, of z
+    /// if bit 2 is set, else the minimum.
     constexpr Vector corner(int i) const { return {b_[i & 1], b_[2 + (i >> 1 & 1)], b_[4 + (i >> 2 & 1)]}; }
     /// max() - min(), also of an empty box.
     constexpr Vector size() const { return max() - min(); }
@@ -55,7 +56,8 @@ public:
     /// Whether a minimum is above its maximum.
     constexpr bool isEmpty() const { return b_[0] > b_[1] || b_[2] > b_[3] || b_[4] > b_[5]; }
 
-    /// Whether `point` lies in the box, of which each bound is moved out by `tolerance`; bounds are inside, NaN is not.
+    /// Whether `point` lies in the box after each bound is moved outward by `tolerance`. Points on
+    /// the bounds are inside, NaN is not.
     constexpr bool contains(const Vector& point, value_type tolerance = 0) const
     {
         for (int axis = 0; axis < 3; ++axis) {
@@ -65,7 +67,8 @@ public:
         return true;
     }
 
-    /// Makes the box hold `point`: an empty one becomes that point, else bounds move that it lies strictly outside of.
+    /// Extends the box to contain `point`: an empty one becomes that point, otherwise each bound
+    /// that `point` lies strictly outside of moves to it.
     constexpr void extendBy(const Vector& point)
     {
         const bool wasEmpty = isEmpty();
@@ -76,7 +79,7 @@ public:
                 b_[2 * axis + 1] = point[axis];
         }
     }
-    /// Makes the box hold `other`, unless that is empty.
+    /// Extends the box to contain `other`, unless that is empty.
     constexpr void extendBy(const Box& other)
     {
         if (other.isEmpty())

@@ -8,12 +8,14 @@
 
 class KpPlane;
 
-/// The polygons in which parallel planes cut an axis-aligned box. What depends on the box and the normal is computed
-/// once; a cut then costs eight comparisons, a look into a table and up to six vertices.
+/// Computes the polygons in which parallel planes cut an axis-aligned box. Values that depend on
+/// the box and the normal are computed once. A cut then takes eight comparisons, one table look-up
+/// and up to six vertices.
 ///
-/// Vertices come in order around the polygon, 3 to 6 of them or none; which way round is not tied to the normal. A
-/// corner in the plane counts as above it. With a second box each vertex is also given at the same place in that one,
-/// such as in texture coordinates of a volume. A plain value for the stack; any number of threads may cut at once.
+/// The vertices are in order around the polygon, 3 to 6 of them or none. The direction of rotation
+/// is independent of the normal. A corner on the plane counts as above it. With a second box, each
+/// vertex is also computed at the corresponding place in that box, for example in texture
+/// coordinates of a volume. A plain value; any number of threads may cut at once.
 class KPLIB_API KpCutBoxPlane {
 public:
     /// The box from 0 to 1 on each axis, cut at a right angle to x.
@@ -26,8 +28,8 @@ public:
     KpCutBoxPlane(const KpVec3f& min, const KpVec3f& max, const KpVec3f& normal) { init(KpBox3f(min, max), normal); }
     /// @}
 
-    /// Prepares cuts of `box` by planes with `normal`, of any length. A second box stays as it was: unset, if there
-    /// hasn't been any.
+    /// Prepares cuts of `box` by planes with `normal`, of any length. A second box that was set
+    /// before stays.
     void init(const KpBox3f& box, const KpVec3f& normal);
     /// The same, with `box2` as the second box.
     void init(const KpBox3f& box1, const KpBox3f& box2, const KpVec3f& normal);
@@ -39,8 +41,9 @@ public:
 
     /// The vertices of the polygon.
     std::vector<KpVec3f> cutPlane(float distance) const;
-    /// Writes the vertices in both boxes, each to an array with 6 places, and gives their number; allocates nothing.
-    /// `secondVertices` may be null, and has to be where there is no second box.
+    /// Writes the vertices in both boxes, each to an array of 6 elements, and returns their
+    /// number. Allocates nothing. `secondVertices` may be null, and must be null if there is no
+    /// second box.
     int cutPlane(float distance, KpVec3f* vertices, KpVec3f* secondVertices) const;
 
     // For one cut alone.

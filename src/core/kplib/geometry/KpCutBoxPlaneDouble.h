@@ -23,8 +23,8 @@ public:
     KpCutBoxPlaneDouble(const KpVec3d& min, const KpVec3d& max, const KpVec3d& normal);
     /// @}
 
-    /// Prepares cuts of `box` by planes with `normal`, of any length. A second box stays as it was: unset, if there
-    /// hasn't been any.
+    /// Prepares cuts of `box` by planes with `normal`, of any length. A second box that was set
+    /// before stays.
     void init(Box box, const KpVec3d& normal);
     /// The same, with `box2` as the second box.
     void init(Box box1, Box box2, const KpVec3d& normal);
@@ -34,10 +34,11 @@ public:
     /// The box.
     Box box() const { return box_; }
 
-    /// Writes the vertices of the cut by the plane normal · p = distance to an array with 6 places, in order around the
-    /// polygon, and gives their number; allocates nothing.
+    /// Writes the vertices of the cut by the plane normal · p = distance to an array of 6
+    /// elements, in order around the polygon, and returns their number. Allocates nothing.
     int cutPlane(double distance, KpVec3d* vertices) const { return cutPlane(distance, vertices, nullptr); }
-    /// The same in both boxes. `secondVertices` may be null, and has to be where there is no second box.
+    /// The same in both boxes. `secondVertices` may be null, and must be null if there is no
+    /// second box.
     int cutPlane(double distance, KpVec3d* vertices, KpVec3d* secondVertices) const;
 
 private:

@@ -6,8 +6,8 @@
 #include <string>
 #include <utility>
 
-/// A root of coordinate systems, named by an id such as the one of a scanner's frame: frames of the same id are the
-/// same space.
+/// A root of coordinate systems, named by an id such as that of a scanner's frame. Frames of the
+/// same id are the same space.
 class KPLIB_API KpFrameOfReference : public KpAbstractCoordinateSystem {
 public:
     /// The frame of that id.
@@ -18,7 +18,7 @@ public:
     /// Whether the ids are equal.
     friend bool operator==(const KpFrameOfReference& a, const KpFrameOfReference& b) { return a.id_ == b.id_; }
 
-    /// This object, which has to live on the heap: the last such handle deletes it.
+    /// A handle to this object, which must live on the heap: the last handle deletes it.
     KpHandle<const KpFrameOfReference> frameOfReference() const override;
     /// Null.
     KpHandle<const KpAbstractCoordinateSystem> parent() const override;

@@ -11,8 +11,8 @@ class KpMat4f;
 
 /// A 3x3 matrix of floats, row by row and nothing else, so that the object is its own byte image.
 ///
-/// Points are row vectors and a matrix stands to their right: a product applies its left factor
-/// first. A plain value; a default-made one is not initialised.
+/// Points are row vectors that are multiplied by a matrix on their right: a product applies its
+/// left factor first. A plain value. A default-constructed matrix is not initialised.
 class KPLIB_API KpMat3f {
 public:
     constexpr KpMat3f() = default;
@@ -24,14 +24,14 @@ public:
     }
     /// From three rows.
     explicit KpMat3f(const float (&rows)[3][3]) { setValue(rows); }
-    /// From three columns - other than the form with an array, which takes rows.
+    /// From three columns, unlike the overload for an array, which takes rows.
     constexpr KpMat3f(const KpVec3f& column0, const KpVec3f& column1, const KpVec3f& column2) :
         m_{{column0.x(), column1.x(), column2.x()},
            {column0.y(), column1.y(), column2.y()},
            {column0.z(), column1.z(), column2.z()}}
     {
     }
-    /// From three rows - other than the form with three vectors, which takes columns.
+    /// From three rows, unlike the overload for three vectors, which takes columns.
     explicit KpMat3f(const std::array<KpVec3f, 3>& rows) { setValue(rows); }
 
     /// The identity.
@@ -115,12 +115,13 @@ public:
 
     /// The inverse; of a matrix whose determinant is exactly 0 the adjugate.
     KpMat3f inverse() const;
-    /// The adjugate divided by `det`, which the caller knows already.
+    /// The adjugate divided by `det`, the determinant if the caller knows it already.
     KpMat3f inverse(float det) const;
     /// The same for a symmetric matrix, of which only the upper half is read.
     KpMat3f symmInverse(float det) const;
 
-    /// The column product: result[i] = sum over j of m[i][j] * v[j]. Input and output may be one object.
+    /// The column product: result[i] = sum over j of m[i][j] * v[j]. Input and output may be the
+    /// same object.
     void multMatrixVec(const KpVec3f& v, KpVec3f& result) const { result = multMatrixVec(v); }
     /// As above.
     constexpr KpVec3f multMatrixVec(const KpVec3f& v) const
@@ -129,7 +130,7 @@ public:
                 m_[1][0] * v.x() + m_[1][1] * v.y() + m_[1][2] * v.z(),
                 m_[2][0] * v.x() + m_[2][1] * v.y() + m_[2][2] * v.z()};
     }
-    /// The row product, the way a point is transformed: result[j] = sum over i of v[i] * m[i][j].
+    /// The row product, which transforms a point: result[j] = sum over i of v[i] * m[i][j].
     void multVecMatrix(const KpVec3f& v, KpVec3f& result) const { result = multVecMatrix(v); }
     /// As above.
     constexpr KpVec3f multVecMatrix(const KpVec3f& v) const
@@ -139,15 +140,16 @@ public:
                 v.x() * m_[0][2] + v.y() * m_[1][2] + v.z() * m_[2][2]};
     }
 
-    /// Eigenvalues and eigenvectors of a symmetric matrix by cyclic Jacobi rotations in single precision;
-    /// `evectors[j]`, of length 1, belongs to `evalues[j]`, and they come unsorted. `rotations` counts the rotations.
-    /// After 50 sweeps without an end, one warning in the log and `evectors` unwritten. Press et al., "Numerical
-    /// Recipes", 11.1.
+    /// Computes eigenvalues and eigenvectors of a symmetric matrix by cyclic Jacobi rotations in
+    /// single precision. `evectors[j]`, of length 1, belongs to `evalues[j]`; they are not sorted.
+    /// `rotations` counts the rotations. If 50 sweeps do not converge, logs one warning and leaves
+    /// `evectors` unwritten. Press et al., "Numerical Recipes", 11.1.
     void jacobi(float (&evalues)[3], KpVec3f (&evectors)[3], int& rotations) const;
 
-    /// In place: the unit lower factor below the diagonal, the upper one on and above it, of the rows in the order
-    /// `index`. The first element of a column that is not 0 is its pivot. `parity` is 0 for an even number of
-    /// exchanges, else 1. False for a matrix with no pivot in column 0 or 1; the last element is not tested.
+    /// Decomposes in place: the unit lower factor is below the diagonal, the upper factor on and
+    /// above it, with the rows in the order `index`. The pivot of a column is its first element
+    /// that is not 0. `parity` is 0 for an even number of exchanges, else 1. Returns false if
+    /// column 0 or 1 has no pivot; the last element is not tested.
     bool LUDecomposition(int (&index)[3], float& parity);
 
     /// {"m00":"1.000000","m01": ... ,"m22":"1.000000"}
@@ -160,7 +162,7 @@ private:
         return {element(0, 0), element(0, 1), element(0, 2), element(1, 0), element(1, 1),
                 element(1, 2), element(2, 0), element(2, 1), element(2, 2)};
     }
-    /// The determinant that remains without row i and column j, with its sign.
+    /// The cofactor of element (i, j): the signed determinant without row i and column j.
     constexpr float cofactor(int i, int j) const
     {
         const int r1 = (i + 1) % 3, r2 = (i + 2) % 3, c1 = (j + 1) % 3, c2 = (j + 2) % 3;

@@ -15,13 +15,13 @@ class KpRotation;
 /// A 4x4 matrix of floats, row by row and nothing else, so that the object is its own byte image: an affine or
 /// projective transformation of space.
 ///
-/// Points are row vectors and a matrix stands to their right: a product applies its left factor
-/// first, a translation is in the last row, and the last column is (0, 0, 0, 1) for an affine
-/// matrix. A plain value; a default-made one is not initialised.
+/// Points are row vectors that are multiplied by a matrix on their right: a product applies its
+/// left factor first. A translation is in the last row. The last column of an affine matrix is (0,
+/// 0, 0, 1). A plain value. A default-constructed matrix is not initialised.
 class KPLIB_API KpMat4f {
 public:
-    /// Four floats that are computed with side by side, each in the order of a plain loop: one instruction where the
-    /// processor has vectors.
+    /// Four floats for element-wise arithmetic, each in the order of a plain loop: one instruction
+    /// if the processor has vectors.
     using Row = float __attribute__((vector_size(16)));
 
     constexpr KpMat4f() = default;
@@ -118,31 +118,33 @@ public:
     /// The determinant.
     float det4() const;
 
-    /// The inverse: affine_inverse() where it applies, else by LUDecomposition(). A singular
-    /// matrix is no error: its result is large, infinite or NaN.
+    /// The inverse, by affine_inverse() if possible, else by LUDecomposition(). A singular matrix
+    /// is not an error: its result has large, infinite or NaN elements.
     KpMat4f inverse() const;
-    /// The inverse of an affine matrix, its determinant in double precision. False, and `out` as it was, if the last
-    /// column isn't exactly (0, 0, 0, 1), or if the determinant is below 1e-15 of the sum of its terms' magnitudes; if
-    /// all terms are 0, true with infinities and NaN.
+    /// Computes the inverse of an affine matrix, with its determinant in double precision. Returns
+    /// false and leaves `out` unchanged if the last column is not exactly (0, 0, 0, 1), or if the
+    /// determinant is below 1e-15 of the sum of the magnitudes of its terms. If all terms are 0,
+    /// returns true with infinities and NaN.
     static bool affine_inverse(const KpMat4f& in, KpMat4f& out);
 
-    /// In place, by Crout's method with scaled partial pivoting; `index` receives the pivot rows, `sign` 1 or -1 for an
-    /// even or odd number of exchanges. Rows of zeros and pivots of 0 are replaced by tiny numbers, so true always.
-    /// Press et al., "Numerical Recipes", 2.3.
+    /// Decomposes in place by Crout's method with scaled partial pivoting. `index` receives the
+    /// pivot rows, `sign` 1 or -1 for an even or odd number of exchanges. Always returns true:
+    /// rows of zeros and pivots of 0 are replaced by tiny numbers. Press et al., "Numerical
+    /// Recipes", 2.3.
     bool LUDecomposition(int (&index)[4], float& sign);
-    /// Solves M x = b for the matrix M that was decomposed, in place.
+    /// Solves M x = b in place, where this is the decomposition of M.
     void LUBackSubstitution(const int (&index)[4], float (&b)[4]) const;
 
-    /// The row product, the way a point is transformed: (v, 1) M, divided by its fourth component w; w = 0 is not
-    /// guarded against. Input and output may be one object.
+    /// The row product, which transforms a point: (v, 1) M divided by its fourth component w. w =
+    /// 0 is not checked. Input and output may be the same object.
     void multVecMatrix(const KpVec3f& v, KpVec3f& result) const { result = multVecMatrix(v); }
     /// As above.
     KpVec3f multVecMatrix(const KpVec3f& v) const
     {
         return projected(v.x() * row(0) + v.y() * row(1) + v.z() * row(2) + row(3));
     }
-    /// The same for many points at once, to the bit: `results` has as many places as `points`, and may be the same
-    /// memory.
+    /// The same for many points, with results equal to the bit. `results` has as many elements as
+    /// `points` and may be the same memory.
     void multVecMatrix(std::span<const KpVec3f> points, KpVec3f* results) const;
     /// The column product M (v, 1), divided by its fourth component: the transposed transformation.
     void multMatrixVec(const KpVec3f& v, KpVec3f& result) const { result = multMatrixVec(v); }
@@ -151,7 +153,8 @@ public:
     {
         return projected(v.x() * column(0) + v.y() * column(1) + v.z() * column(2) + column(3));
     }
-    /// The row product with the upper left alone, the way a direction is transformed: no translation, no division.
+    /// The row product with the upper left 3x3 part, which transforms a direction: no translation,
+    /// no division.
     void multDirMatrix(const KpVec3f& v, KpVec3f& result) const { result = multDirMatrix(v); }
     /// As above.
     KpVec3f multDirMatrix(const KpVec3f& v) const
@@ -176,25 +179,28 @@ public:
         return {sums[0], sums[1], sums[2], sums[3]};
     }
 
-    /// Eigenvalues and eigenvectors of the upper left, a symmetric matrix, by cyclic Jacobi rotations in double
-    /// precision. Eigenvector j is column j of `evectors`, of length 1; they come unsorted. `rotations` grows by 3 a
-    /// sweep, and after 50 sweeps it ends silently. Press et al., "Numerical Recipes", 11.1.
+    /// Computes eigenvalues and eigenvectors of the upper left 3x3 part, a symmetric matrix, by
+    /// cyclic Jacobi rotations in double precision. Eigenvector j, of length 1, is column j of
+    /// `evectors`; they are not sorted. `rotations` grows by 3 a sweep. After 50 sweeps it ends
+    /// without a log line. Press et al., "Numerical Recipes", 11.1.
     void jacobi3(float (&evalues)[3], float (&evectors)[3][3], int& rotations) const;
 
-    /// The polar decomposition M = r s r^T u t: scales `s` along the axes of the rotation `r`, a rotation `u`, a
-    /// translation `t`; `proj` is the identity. False for a singular matrix, which writes `t` and `proj` alone.
-    /// Shoemake and Duff, "Matrix animation and polar decomposition", 1992.
+    /// Computes the polar decomposition M = r s r^T u t: scales `s` along the axes of the rotation
+    /// `r`, a rotation `u` and a translation `t`; `proj` is the identity. Returns false for a
+    /// singular matrix and then writes `t` and `proj` only. Shoemake and Duff, "Matrix animation
+    /// and polar decomposition", 1992.
     bool factor(KpMat4f& r, KpVec3f& s, KpMat4f& u, KpVec3f& t, KpMat4f& proj) const;
-    /// What setTransform() makes this matrix from, by factor(). A singular matrix gives identity rotations and leaves
-    /// `scaleFactor`.
+    /// Computes the arguments of setTransform() for this matrix, by factor(). A singular matrix
+    /// gives identity rotations and leaves `scaleFactor` unchanged.
     void getTransform(KpVec3f& translation, KpRotation& rotation, KpVec3f& scaleFactor, KpRotation& scaleOrientation,
                       const KpVec3f& center = KpVec3f(0, 0, 0)) const;
-    /// Moves by -`center`, scales by `scaleFactor` along the axes of `scaleOrientation`, rotates, and moves by `center`
-    /// and `translation`, in this order of application.
+    /// Sets the transformation that translates by -`center`, scales by `scaleFactor` along the
+    /// axes of `scaleOrientation`, rotates, and translates by `center` and `translation`, in this
+    /// order.
     void setTransform(const KpVec3f& translation, const KpRotation& rotation, const KpVec3f& scaleFactor,
                       const KpRotation& scaleOrientation, const KpVec3f& center = KpVec3f(0, 0, 0));
 
-    /// Writes each row as two lines, the second of one element; does nothing for null.
+    /// Writes each row as two lines, the second with one element. Does nothing for null.
     void print(std::FILE* file) const;
     /// {"m00":"1.000000","m01": ... ,"m33":"1.000000"}
     std::string dump() const;

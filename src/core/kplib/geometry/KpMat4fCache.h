@@ -2,7 +2,8 @@
 
 #include <kplib/geometry/KpMat4f.h>
 
-/// A matrix and its inverse, for code that applies both many times: the inverse is computed as the matrix is set.
+/// A matrix and its inverse, for code that applies both many times. The inverse is computed when
+/// the matrix is set.
 class KpMat4fCache {
 public:
     /// The identity.

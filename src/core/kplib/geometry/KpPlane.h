@@ -14,14 +14,14 @@ class KpMat4f;
 /// An unbounded plane in space: the points p with normal · p = distance, a normal and a float and nothing else, so that
 /// the object is its own byte image.
 ///
-/// What is built from usable points or directions has a normal of length 1, on which all
-/// operations rely; otherwise the plane is empty. Nothing here reports an error: where there is no
-/// result, NaN or zeros come out. A plain value in float arithmetic; a default-made one is not
-/// initialised.
+/// A plane constructed from valid points or directions has a normal of length 1, which all
+/// operations require. Otherwise the plane is empty. No operation reports an error: without a
+/// result it returns NaN or zeros. A plain value in float arithmetic. A default-constructed plane
+/// is not initialised.
 class KPLIB_API KpPlane {
 public:
     constexpr KpPlane() = default;
-    // Each is what set() makes of the same arguments.
+    // Each constructor does what set() does with the same arguments.
     /// @{
     /// As set().
     KpPlane(const KpVec3f& p0, const KpVec3f& p1, const KpVec3f& p2) { set(p0, p1, p2); }
@@ -32,11 +32,12 @@ public:
     /// A plane of four zeros, always the same object; safe from any thread.
     static const KpPlane& emptyPlane();
 
-    // Each makes the normal of length 1, and all four numbers 0 if its length is 0.
+    // Each set() normalises the normal, and sets all four numbers to 0 if its length is 0.
 
     /// The plane through three points, which run counterclockwise as seen against the normal.
     void set(const KpVec3f& p0, const KpVec3f& p1, const KpVec3f& p2);
-    /// `distance` is the one from the origin: it stays as it is, whatever the length of `normal`.
+    /// Sets normal and distance from the origin. `distance` is not scaled with the length of
+    /// `normal`.
     void set(const KpVec3f& normal, float distance);
     /// The plane through `point`.
     void set(const KpVec3f& normal, const KpVec3f& point);
@@ -45,7 +46,7 @@ public:
     const KpVec3f& normal() const { return normal_; }
     /// Distance from the origin along the normal.
     float distance() const { return distance_; }
-    // These store their argument unchanged: the caller ensures that the normal is of length 1.
+    // The next two store their argument unchanged. Precondition: the normal has length 1.
     /// Replaces the normal.
     void setNormal(const KpVec3f& normal) { normal_ = normal; }
     /// Replaces the distance.
@@ -53,12 +54,13 @@ public:
 
     /// Moves the plane along its normal.
     void offset(float distance) { distance_ += distance; }
-    /// Makes the normal of length 1 with the distance as it is, then turns the plane over if that is strictly below 0.
+    /// Normalises the normal and keeps the distance. Then, if the distance is strictly below 0,
+    /// reverses the plane.
     void normalize();
-    /// Moves the plane by `matrix`, which has to be rigid or scale all axes alike: the normal is
-    /// multiplied by the matrix itself, not by its inverse transpose.
+    /// Transforms the plane by `matrix`, which must be rigid or scale all axes alike: the normal
+    /// is multiplied by the matrix itself, not by its inverse transpose.
     void transform(const KpMat4f& matrix);
-    /// Moves the plane by the inverse of `matrix`, which may be any.
+    /// Transforms the plane by the inverse of `matrix`, which may be any matrix.
     void transformInv(const KpMat4f& matrix);
 
     /// Whether a number is NaN, or the squared length of the normal is strictly outside 0.999 to 1.001.
@@ -68,24 +70,28 @@ public:
     /// The nearest point of the plane.
     KpVec3f getProjectedPoint(const KpVec3f& point) const;
 
-    /// Where the unbounded `line` goes through the plane: `out` = position + direction * t. False, with NaN in `out`
-    /// and `t` as it was, if the line is exactly parallel. `t` may be null.
+    /// Intersects the plane with the unbounded `line`: `out` = position + direction * t. Returns
+    /// false, sets `out` to NaN and leaves `t` unchanged if the line is exactly parallel. `t` may
+    /// be null.
     bool intersect(const KpLine& line, KpVec3f& out, float* t = nullptr) const;
-    /// The line in which the planes meet. False, with NaN in all of `line`, if the sine of their angle is below 1e-5.
+    /// Sets `line` to the intersection of the planes. Returns false and sets `line` to NaN if the
+    /// sine of their angle is below 1e-5.
     bool intersect(const KpPlane& other, KpLine& line) const;
 
     /// The least and the greatest signed distance of the corners of `box`.
     void getDistance(const KpBox3f& box, float& min, float& max) const;
-    /// True and the signed distance of `other` from this plane; false and 0 if they aren't parallel.
+    /// Returns true and the signed distance of `other` from this plane, or false and 0 if the
+    /// planes are not parallel.
     std::pair<bool, float> getDistance(const KpPlane& other) const;
 
     /// Whether the cosine of the angle is 1 or -1 to within 0.0001, in double precision.
     bool isParallel(const KpPlane& other) const;
-    /// Whether the direction of `normal`, of any length but 0, is this normal's to within 0.0001 of the cosine; an
-    /// opposite one is taken too, unless `orientationMatters`.
+    /// Whether `normal`, of any length but 0, has the direction of this plane's normal to within
+    /// 0.0001 of the cosine. The opposite direction also matches unless `orientationMatters`.
     bool isNearEqualNormal(const KpVec3f& normal, bool orientationMatters) const;
-    /// Whether the normals are near equal and the distances from the origin to within `tolerance`, that of an opposite
-    /// normal negated. `point` and `extent` take no part: planes are compared everywhere, not in a region.
+    /// Whether isNearEqualNormal() holds and the distances from the origin are equal to within
+    /// `tolerance`; for an opposite normal the distance is negated. `point` and `extent` are
+    /// ignored: planes are compared everywhere, not in a region.
     bool isNearEqualInROI(const KpPlane& other, const KpVec3f& point, float extent, float tolerance,
                           bool orientationMatters) const;
 

@@ -7,9 +7,10 @@
 #include <kplib/geometry/KpVec3f.h>
 #include <kplib/geometry/KpViewVolume.h>
 
-/// Turns positions of a pointer on the screen into positions in a working space, for handles that are dragged.
+/// Maps positions of a pointer on the screen to positions in a working space, for handles that are
+/// dragged.
 ///
-/// One thread at a time uses a projector. There are no errors: without a result the output is NaN.
+/// One thread at a time. Errors are not reported: without a result the output is NaN.
 class KPLIB_API KpProjector {
 public:
     /// The position in working space for `point` on the screen, from (0, 0) at the lower left to (1, 1).
@@ -31,7 +32,7 @@ public:
     const KpMat4f& workingToWorld() const { return workingToWorld_; }
     /// @}
 
-    /// What is seen at `point` of the screen, as a line in working space.
+    /// The line of sight through `point` of the screen, in working space.
     KpLine getWorkingLine(const KpVec2f& point) const;
 
 protected:

@@ -9,12 +9,12 @@ class KpMat4f;
 /// A rotation in space: the quaternion x, y, z, w with w the scalar part, four floats and nothing else, so that the
 /// object is its own byte image.
 ///
-/// Products follow those of matrices: a * b applies a first. A positive angle about +z takes +x to
-/// +y. A plain value; a default-made one is not initialised.
+/// Products are ordered as those of matrices: a * b applies a first. A positive angle about +z
+/// turns +x toward +y. A plain value. A default-constructed rotation is not initialised.
 class KPLIB_API KpRotation {
 public:
     constexpr KpRotation() = default;
-    // Each is what setValue() makes of the same arguments.
+    // Each constructor does what setValue() does with the same arguments.
     /// @{
     /// As setValue().
     KpRotation(float x, float y, float z, float w) { setValue(x, y, z, w); }
@@ -32,25 +32,27 @@ public:
     /// The rotation by 0.
     static constexpr KpRotation identity() { return asStored(0, 0, 0, 1); }
 
-    /// The four, normalised; all 0 is not guarded against.
+    /// Sets the four components, normalised. Four zeros are not checked.
     void setValue(float x, float y, float z, float w);
     /// As above, from four floats.
     void setValue(const float* xyzw) { setValue(xyzw[0], xyzw[1], xyzw[2], xyzw[3]); }
-    /// The turn by `angle` (radians) about `axis`, of any length but 0.
+    /// Sets the rotation by `angle` (radians) about `axis`, of any length but 0.
     void setValue(const KpVec3f& axis, float angle);
-    /// The rotation of a matrix, whose upper left has to be one. Not normalised afterwards. Shoemake, "Animating
-    /// rotation with quaternion curves", 1985.
+    /// Sets the rotation of a matrix, whose upper left must be a rotation. The result is not
+    /// normalised. Shoemake, "Animating rotation with quaternion curves", 1985.
     void setValue(const KpMat4f& matrix);
     /// As above.
     void setValue(const KpMat3f& matrix);
-    /// The smallest turn that takes the direction `from` to the direction `to`.
+    /// Sets the smallest rotation that maps the direction `from` to the direction `to`.
     ///
-    /// Exactly opposite directions give a half turn about some axis at a right angle to them, if the dot product of the
-    /// normalised directions is -1. Rounding makes it greater for about a third of all directions: these give the
-    /// quaternion (0, 0, 0, w) with w below 0.001, whose matrix is the identity. Check for opposite directions first.
+    /// If the directions are exactly opposite and the dot product of the normalised directions is
+    /// -1, the result is a half turn about an axis orthogonal to them. For about a third of all
+    /// directions rounding makes the dot product greater than -1. The result is then the
+    /// quaternion (0, 0, 0, w) with w below 0.001, whose matrix is the identity. Check for
+    /// opposite directions first.
     void setValue(const KpVec3f& from, const KpVec3f& to);
-    /// The turn that takes `from1` to `to1`, and `from2` as near to `to2` as can be where each pair is at a right
-    /// angle. All four are of length 1.
+    /// Sets the rotation that maps `from1` to `to1`, and `from2` as near to `to2` as possible, for
+    /// pairs that are orthogonal. All four have length 1.
     void setValue(const KpVec3f& from1, const KpVec3f& from2, const KpVec3f& to1, const KpVec3f& to2);
 
     /// The four as stored.
@@ -71,13 +73,14 @@ public:
     /// x, y, z, w
     constexpr const float* data() const { return q_; }
 
-    /// Divides by the square root of norm(), which is taken in double precision.
+    /// Divides by the square root of norm(). The root is computed in double precision.
     void normalize();
     /// The sum of the four squares; no root is taken.
     float norm() const { return q_[0] * q_[0] + q_[1] * q_[1] + q_[2] * q_[2] + q_[3] * q_[3]; }
-    /// Becomes the turn back, also if this isn't normalised: the product of both is the identity.
+    /// Replaces this rotation by its inverse, also if it is not normalised: the product of both is
+    /// the identity.
     void invert();
-    /// What invert() makes of this.
+    /// The inverse rotation, as by invert().
     KpRotation inverse() const
     {
         KpRotation result = *this;
@@ -106,15 +109,16 @@ public:
     /// Whether the four, or their negatives, differ by strictly less than `tolerance`.
     bool equals(const KpRotation& other, float tolerance) const;
 
-    /// `v` turned, by way of the matrix. Input and output may be one object.
+    /// Rotates `v`, by toMat3f(). Input and output may be the same object.
     void multVec(const KpVec3f& v, KpVec3f& result) const { result = multVec(v); }
     /// As above.
     KpVec3f multVec(const KpVec3f& v) const;
     /// As multVec().
     KpVec3f operator*(const KpVec3f& v) const { return multVec(v); }
 
-    /// From `a` at t = 0 to `b` (or its negative) at t = 1 at a steady speed along the shorter way; not normalised.
-    /// Shoemake, "Animating rotation with quaternion curves", 1985.
+    /// Interpolates from `a` at t = 0 to `b` (or its negative) at t = 1 at a constant speed along
+    /// the shorter way. The result is not normalised. Shoemake, "Animating rotation with
+    /// quaternion curves", 1985.
     static KpRotation slerp(const KpRotation& a, const KpRotation& b, float t);
 
 private:

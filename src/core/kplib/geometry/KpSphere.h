@@ -7,9 +7,9 @@
 
 class KpLine;
 
-/// A sphere: a center and a radius. A tangent line hits it; a negative radius meets lines as its
-/// magnitude does. Lines and points that are NaN hit, in NaN. A plain value in float arithmetic; a
-/// default-made one is not initialised.
+/// A sphere: a centre and a radius. A tangent line hits it. For lines a negative radius counts as
+/// its magnitude. A line or point that is NaN hits, with NaN as the result. A plain value in float
+/// arithmetic. A default-constructed sphere is not initialised.
 class KPLIB_API KpSphere {
 public:
     constexpr KpSphere() = default;
@@ -29,13 +29,16 @@ public:
     /// Replaces the radius.
     void setRadius(float radius) { radius_ = radius; }
 
-    /// The first hit at or in front of the line's position, from inside the way out. False, with `out` as it was, if
-    /// there is none.
+    /// Sets `out` to the first intersection at a parameter of 0 or more along the line; if the
+    /// position is inside, that is where the line leaves the sphere. Returns false and leaves
+    /// `out` unchanged if there is none.
     bool intersect(const KpLine& line, KpVec3f& out) const;
-    /// Both hits of the unbounded line. False, with NaN in both, if it misses.
+    /// Sets both intersections with the unbounded line. Returns false and sets both to NaN if it
+    /// misses.
     bool intersect(const KpLine& line, KpVec3f& enter, KpVec3f& exit) const;
-    /// The ends of the part in the sphere of the segment from `p0` to `p1`. False, with NaN in both, if the unbounded
-    /// line misses. If only the segment misses it is true, and both are the same end of the segment.
+    /// Sets the ends of the part of the segment from `p0` to `p1` that is in the sphere. Returns
+    /// false and sets both to NaN if the unbounded line misses. If only the segment misses,
+    /// returns true and sets both to the same end of the segment.
     bool intersect(const KpVec3f& p0, const KpVec3f& p1, KpVec3f& enter, KpVec3f& exit) const;
 
     /// Exact; a sphere that holds a NaN equals none.

@@ -5,17 +5,17 @@
 #include <kplib/geometry/KpRotation.h>
 #include <kplib/geometry/KpSphere.h>
 
-/// A projector onto a sphere in working space: positions on it become rotations.
+/// A projector onto a sphere in working space. Pairs of positions on the sphere become rotations.
 ///
-/// A change of the sphere, of front or orientation or of the working space is taken up by the next
-/// projection. A new view volume is not: for a projector that is oriented to the eye call
-/// setFront() or setSphere() afterwards.
+/// The next projection takes account of a change of the sphere, of front or orientation or of the
+/// working space, but not of a new view volume: for a projector that is oriented to the eye call
+/// setFront() or setSphere() after that.
 class KPLIB_API KpSphereProjector : public KpProjector {
 public:
-    /// The turn about the sphere's center that takes `from` to `to`, two positions on it.
+    /// The rotation about the centre of the sphere that maps `from` to `to`, two positions on it.
     virtual KpRotation getRotation(const KpVec3f& from, const KpVec3f& to) = 0;
-    /// Applies all changes since the last call; `line`, which may be null, is the view in working
-    /// space. Projections call it.
+    /// Applies all changes since the last call. `line`, which may be null, is the line of sight in
+    /// working space. Projections call this function.
     virtual void setupPlane(const KpLine* line) = 0;
     void setWorkingSpace(const KpMat4f& workingToWorld) override;
 
@@ -23,20 +23,21 @@ public:
     void setSphere(const KpSphere& sphere);
     /// The sphere in working space.
     const KpSphere& sphere() const { return sphere_; }
-    /// Selects the half toward the viewer, the default, or the one behind it.
+    /// Selects the half of the sphere that faces the viewer, the default, or the opposite one.
     void setFront(bool intersectFront);
     /// See setFront().
     bool isIntersectFront() const { return intersectFront_; }
-    /// Whether that half is the one toward the eye, or the one toward +z.
+    /// Sets whether the half of setFront() faces the eye or +z.
     void setOrientToEye(bool orientToEye);
     /// See setOrientToEye().
     bool isOrientToEye() const { return orientToEye_; }
 
     /// Whether `point` in working space is on the half of the sphere toward the eye, its rim included.
     bool isPointInFront(const KpVec3f& point) const;
-    /// project(), and the rotation from the position before: for each step of a drag, which begins with project().
+    /// Calls project() and computes the rotation from the previous position. For each step of a
+    /// drag, whose first position is passed to project().
     KpVec3f projectAndGetRotation(const KpVec2f& point, KpRotation& rotation);
-    /// What the last projection gave; zero before the first.
+    /// The result of the last projection, zero before the first one.
     const KpVec3f& lastPoint() const { return lastPoint_; }
 
 protected:

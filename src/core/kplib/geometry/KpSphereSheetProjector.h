@@ -21,7 +21,8 @@ public:
     KpVec3f project(const KpVec2f& point) override;
     KpVec3f intersect(const KpLine& line) override;
     KpSphereSheetProjector* copy() const override;
-    /// The identity for points that are nearly equal or further apart than the sphere is wide.
+    /// The identity for points that are nearly equal or that are farther apart than the diameter
+    /// of the sphere.
     KpRotation getRotation(const KpVec3f& from, const KpVec3f& to) override;
     void setupPlane(const KpLine* line) override;
 

@@ -17,8 +17,8 @@ public:
 
     /// The length by std::hypot() in double, rounded to float; length() computes in float and may overflow.
     float hypot() const;
-    /// Makes the length 1 and gives the former one, hypot(). A vector of length 0 stays, and
-    /// 0 is given.
+    /// Scales the vector to length 1 and returns its former length, hypot(). A vector of length 0
+    /// stays unchanged, and 0 is returned.
     float normalize();
     /// The unsigned angle between the two in radians, from 0 to pi; NaN if one of them is zero.
     float angle(const KpVec2f& other) const;

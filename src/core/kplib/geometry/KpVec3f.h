@@ -17,12 +17,13 @@ public:
     {
     }
 
-    /// Makes the length 1 and gives the former one. A vector of length 0 stays, and 0 is given:
-    /// planes and lines become empty then.
+    /// Scales the vector to length 1 and returns its former length. A vector of length 0 stays
+    /// unchanged, and 0 is returned: planes and lines then become empty.
     float normalize() { return normalizeByLength(); }
 
-    /// The signed unit axis that is nearest in direction; of equally near ones the first of +x, -x, +y, -y, +z, -z,
-    /// which is +x for the zero vector. The zero vector if a component is NaN.
+    /// The signed unit axis that is nearest in direction. Among equally near ones, the first of
+    /// +x, -x, +y, -y, +z, -z, which is +x for the zero vector. The zero vector if a component is
+    /// NaN.
     KpVec3f getClosestAxis() const;
 
     /// {"x":"1.000000","y":"2.000000","z":"3.000000"}

@@ -17,7 +17,8 @@ public:
     {
     }
 
-    /// Makes the length 1 and gives the former one. A vector of length 0 stays, and 0 is given.
+    /// Scales the vector to length 1 and returns its former length. A vector of length 0 stays
+    /// unchanged, and 0 is returned.
     float normalize() { return normalizeByLength(); }
 };
 

@@ -11,9 +11,9 @@
 /// the object is its own byte image. `Vector` is the class that derives from it (KpVec3f ...) and
 /// is what the operators return.
 ///
-/// All arithmetic is done in the width of the component, sums from x to the last. A plain value:
-/// no errors, no allocation; different objects may be used by different threads. A default-made
-/// vector is not initialised.
+/// Arithmetic uses the precision of the component; sums run from x to the last component. A plain
+/// value without errors and allocations; distinct objects may be used by distinct threads. A
+/// default-constructed vector is not initialised.
 template <typename Vector, typename Component, int Size>
 class KpVecBase {
 public:
@@ -60,7 +60,7 @@ public:
             sum += v_[i] * other.v_[i];
         return sum;
     }
-    /// At a right angle to both, by the right-hand rule.
+    /// The cross product, by the right-hand rule.
     constexpr Vector cross(const Vector& other) const requires(Size == 3)
     {
         return {y() * other.z() - z() * other.y(), z() * other.x() - x() * other.z(),
@@ -71,7 +71,7 @@ public:
     /// The square root of squaredLength(); of integers its whole part.
     Component length() const
     {
-        // The compiler's own roots: <cmath> would take a compiler as long as all the rest.
+        // The compiler's built-in roots: <cmath> would double the time to compile this header.
         if constexpr (std::same_as<Component, float>)
             return __builtin_sqrtf(squaredLength());
         else if constexpr (std::same_as<Component, double>)
@@ -118,7 +118,7 @@ public:
         return self();
     }
 
-    /// Divides each component; of integers toward zero, and by 0 not at all allowed.
+    /// Divides each component. Integers are truncated toward zero and must not be divided by 0.
     constexpr Vector& operator/=(Component divisor)
     {
         for (Component& c : v_)
@@ -178,7 +178,7 @@ protected:
             v_[i] = static_cast<Component>(other[i]);
     }
 
-    /// Divides by length() and gives it; a length of exactly 0 changes nothing.
+    /// Divides by length() and returns it. A length of exactly 0 changes nothing.
     Component normalizeByLength()
     {
         const Component length = this->length();

@@ -11,11 +11,12 @@
 
 #include <cstdint>
 
-/// What a camera sees: a box or a frustum in the world, for picking, projection and culling.
+/// The volume that a camera sees: a box or a frustum in the world, for picking, projection and
+/// culling.
 ///
 /// Screen coordinates go from (0, 0) at the lower left of the viewport to (1, 1) at the upper
-/// right. A plain value. Its shape is undefined until ortho(), perspective() or frustum() is
-/// called. There are no errors: a degenerate volume divides by zero and gives NaN.
+/// right. A plain value. The shape is undefined until ortho(), perspective() or frustum() is
+/// called. Errors are not reported: a degenerate volume divides by zero and returns NaN.
 class KPLIB_API KpViewVolume {
 public:
     /// How points are projected.
@@ -26,21 +27,22 @@ public:
 
     KpViewVolume() = default;
 
-    // The eye goes to the origin and looks along -z; the rectangle is the near one. Stereo and camera offset stay.
+    // The next three place the eye at the origin, looking along -z. The rectangle is the one at
+    // the near plane. Stereo and camera offset stay.
 
     /// A box between these bounds.
     void ortho(float left, float right, float bottom, float top, float near, float far);
     /// `fovy` is the angle between bottom and top in radians, `aspect` the width over the height.
     void perspective(float fovy, float aspect, float near, float far);
-    /// The near rectangle is at z = +near: for one in front of the eye, `near` and `far` are
-    /// negative.
+    /// The near rectangle is at z = +near: pass negative `near` and `far` for a volume in front of
+    /// the eye.
     void frustum(float left, float right, float bottom, float top, float near, float far);
 
     /// Moves the eye and the volume.
     void translateCamera(const KpVec3f& translation);
     /// About the eye.
     void rotateCamera(const KpRotation& rotation);
-    /// Shrinks the near rectangle about its center to the share abs(factor) of its width, height or both.
+    /// Scales the near rectangle about its centre by abs(factor) in width, height or both.
     void scale(float factor);
     /// @{
     /// As above, in one direction.
@@ -48,15 +50,16 @@ public:
     void scaleHeight(float factor);
     /// @}
 
-    /// Moves the volume by `matrix`. Under a mirror left and right change places, so that the rectangle stays
-    /// right-handed as seen from the eye. Stereo and camera offset go back to their defaults.
+    /// Transforms the volume by `matrix`. Under a reflection left and right are exchanged, so that
+    /// the rectangle stays right-handed as seen from the eye. Stereo and camera offset are reset
+    /// to their defaults.
     void transform(const KpMat4f& matrix);
 
-    /// The part in front of a rectangle on the screen.
+    /// The part of the volume that projects to a rectangle on the screen.
     KpViewVolume narrow(float left, float bottom, float right, float top) const;
-    /// The part between two depths, fractions from 1 at the near plane to 0 at the far one. The
-    /// clamped `near` itself becomes nearDist(). Stereo and camera offset go back to their
-    /// defaults.
+    /// The part between two depths, fractions from 1 at the near plane to 0 at the far plane. The
+    /// clamped value of `near` itself becomes nearDist(). Stereo and camera offset are reset to
+    /// their defaults.
     KpViewVolume zNarrow(float near, float far) const;
     /// Both: x and y of `box` are the rectangle, zmax is near and zmin is far.
     KpViewVolume narrow(const KpBox3f& box) const;
@@ -66,7 +69,8 @@ public:
     void getMatrices(KpMat4f& affine, KpMat4f& proj) const;
     /// The product of the two.
     KpMat4f getMatrix() const;
-    /// Moves the eye to the origin and turns the viewing direction to -z the shortest way, whatever is up.
+    /// Moves the eye to the origin and rotates the viewing direction to -z the shortest way,
+    /// regardless of the up direction.
     KpMat4f getCameraSpaceMatrix() const;
 
     /// The points of the near and the far plane that are seen at `point` of the screen, and the line through them.
@@ -85,26 +89,31 @@ public:
     KpPlane getPlane(float distance) const;
     /// The point at `distance` along the viewing direction from the eye.
     KpVec3f getSightPoint(float distance) const { return projPoint_ + projDir_ * distance; }
-    /// What is seen at `point` of the screen in getPlane().
+    /// The point of getPlane() that projects to `point` of the screen.
     KpVec3f getPlanePoint(float distance, const KpVec2f& point) const;
     /// The unit vector from the near rectangle toward the viewer.
     KpVec3f zVector() const;
-    /// Turns what is upright in the world, y up and x right, to the up and right of the view; with `rightAngleOnly`
-    /// only by right angles.
+    /// The rotation that turns y and x of the world to the up and right directions of the view;
+    /// with `rightAngleOnly` only by right angles.
     KpRotation getAlignRotation(bool rightAngleOnly) const;
-    /// How long a segment at `center` is that spans `normRadius` of the screen; for handles of
-    /// steady size. What is off the screen is measured at its border. 1 if there is no result.
+    /// The length of a segment at `center` that spans `normRadius` of the screen, for handles of
+    /// constant size. A position off the screen is measured at its border. Returns 1 if there is
+    /// no result.
     float getWorldToScreenScale(const KpVec3f& center, float normRadius) const;
 
-    /// Whether the point is in the volume, its faces included. Not in one whose nearDist() and nearToFar() are 0.
+    /// Whether the point is in the volume, faces included. False for each point if nearDist() and
+    /// nearToFar() are 0.
     bool intersect(const KpVec3f& point) const;
-    /// Whether the point of the segment that is nearest to the volume's central line is in the volume; it goes to
-    /// `out`, on a false result too. False for a segment that is parallel to that line, with NaN, or whose own line is
-    /// nearest beyond its ends.
+    /// Sets `out` to the point of the segment that is nearest to the central line of the volume,
+    /// and returns whether it is in the volume. Returns false for a segment that is parallel to
+    /// that line, with NaN in `out`, and for a segment whose unbounded line is nearest beyond its
+    /// ends.
     bool intersect(const KpVec3f& p0, const KpVec3f& p1, KpVec3f& out) const;
-    /// False if the box lies wholly behind one face or is empty; so true also for some boxes near the volume's edges.
+    /// Whether the box may be in the volume: false if it lies wholly outside one face or is empty.
+    /// True also for some boxes outside, near the edges of the volume.
     bool intersect(const KpBox3f& box) const;
-    /// Whether the box from `min` to `max` lies wholly behind the plane.
+    /// Whether the box from `min` to `max` lies wholly on the side that the normal of the plane
+    /// does not point to.
     static bool outsideTest(const KpPlane& plane, const KpVec3f& min, const KpVec3f& max);
 
     /// How points are projected.
@@ -124,8 +133,8 @@ public:
     const KpVec3f& ulfO() const { return ulfO_; }
     /// @}
 
-    // Stereo, of a perspective alone: mode 0 is off, 1 one eye and any other value the other one. The scales are for
-    // the distance of the eyes and for what comes of it.
+    // Stereo, for a perspective only. Mode 0 is off, 1 is one eye and any other value the other
+    // eye. The scales apply to the distance of the eyes and to the offset that follows from it.
     /// @{
     /// Scale of the distance of the eyes.
     float stereoEyeScale() const { return stereoEyeScale_; }
@@ -141,7 +150,7 @@ public:
     /// As above.
     void setStereoMode(std::int32_t mode) { stereoMode_ = mode; }
 
-    // The offset of the eye in place of the one that stereo computes; 0 while it isn't set.
+    // The offset of the eye, in place of the one that stereo computes; 0 if it is not set.
     /// Whether there is such an offset.
     bool isCameraOffsetSet() const { return cameraOffsetIsSet_ != 0; }
     /// The offset.

@@ -15,8 +15,8 @@ public:
     /// Both radii.
     KpVec2f radius() const { return {radiusX(), radiusY()}; }
 
-    /// An approximation: the point of the outline in the direction of `p`, as seen after the ellipse has been made a
-    /// circle.
+    /// An approximation: the point of the outline in the direction of `p` after the ellipse is
+    /// scaled to a circle.
     std::pair<bool, KpVec2f> closestPoint(KpVec2f p) const override;
     /// The box of centre and radii.
     Rectangle2D boundingBox() const override;
@@ -34,7 +34,8 @@ public:
     virtual float area() const;
     /// By S. Ramanujan's second approximation ("Modular equations and approximations to pi", 1914).
     virtual float circumference() const;
-    /// The point of the outline at an angle in radians, from x to y, of the circle that the ellipse is an image of.
+    /// The point of the outline at an angle in radians, from x to y, measured on the circle of
+    /// which the ellipse is a scaled image.
     virtual KpVec2f projectPoint(float angle) const = 0;
 
 protected:

@@ -7,8 +7,8 @@
 
 class Rectangle2D;
 
-/// A shape in the plane. Shapes are values of their own kind: equal shapes are of the same class,
-/// not of one that derives from it. A shape belongs to one thread at a time.
+/// A shape in the plane. Equal shapes have the same class; a shape never equals one of a derived
+/// class. One thread at a time.
 class KPLIB_API AbstractShape2D {
 public:
     AbstractShape2D() = default;
@@ -20,13 +20,13 @@ public:
 
     virtual ~AbstractShape2D();
 
-    /// The point of the shape next to `p`; the flag is false if it has none.
+    /// The point of the shape nearest to `p`. The flag is false if the shape has no points.
     virtual std::pair<bool, KpVec2f> closestPoint(KpVec2f p) const = 0;
     /// The smallest rectangle around the shape.
     virtual Rectangle2D boundingBox() const = 0;
     /// Whether the shape has no points.
     virtual bool isEmpty() const = 0;
-    /// Same class and exactly the same numbers.
+    /// Whether class and numbers are exactly the same.
     virtual bool equals(const AbstractShape2D& other) const = 0;
 
     /// @{

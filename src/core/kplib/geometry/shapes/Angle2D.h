@@ -9,19 +9,21 @@
 class KPLIB_API Angle2D : public Polyline2D {
 public:
     Angle2D() = default;
-    /// Any number of vertices; changes take three alone.
+    /// Accepts any number of vertices; the changes below accept three only.
     explicit Angle2D(std::vector<KpVec2f> vertices) : Polyline2D(std::move(vertices)) {}
 
-    /// Ignores what isn't three vertices.
+    /// Replaces the vertices. Ignored unless there are three.
     void setVertices(std::vector<KpVec2f> vertices) override;
-    /// Ignored once there are three.
+    /// Appends a vertex. Ignored if there are three already.
     void append(KpVec2f v) override;
 
-    /// Fewer than three vertices.
+    /// Whether there are fewer than three vertices.
     bool isEmpty() const override { return size() < 3; }
-    /// Not empty, and both arms long enough to measure an angle: 0.001 squared units.
+    /// Whether the angle is not empty and the squared length of both arms is large enough to
+    /// measure it, 0.001.
     bool isValid() const;
-    /// In radians from 0 to pi, 0 if the outer vertices are the same; the flag is false unless isValid().
+    /// The angle in radians from 0 to pi, 0 if the outer vertices are equal. The flag is false
+    /// unless isValid().
     std::pair<bool, float> angle() const;
 
 private:

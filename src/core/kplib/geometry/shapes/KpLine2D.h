@@ -7,7 +7,8 @@
 
 /// A line in the plane, or the segment between two points: a position and a direction that keeps its length.
 ///
-/// A plain value. An empty line has no direction (or a NaN in it); what would need one then refers to the position.
+/// A plain value. An empty line has a direction of zero or NaN; operations that need a direction
+/// use the position instead.
 class KPLIB_API KpLine2D {
 public:
     /// Empty: four zeros.
@@ -38,19 +39,20 @@ public:
     /// Whether there is a direction.
     bool isNotEmpty() const { return !isEmpty(); }
 
-    /// Distance of `p` from the line, which goes on at both ends: above 0 to the left of the direction (y upward). From
-    /// a line without direction it is never negative.
+    /// Signed distance of `p` from the unbounded line, positive to the left of the direction (y
+    /// upward). The distance from an empty line is never negative.
     float getDistanceTo(const KpVec2f& p) const;
     float getDistance2To(const KpVec2f& p) const;  ///< its square
 
-    /// The point of the line, or of the segment alone, next to `p`.
+    /// The point of the line, or with `clampToSegment` of the segment, nearest to `p`.
     KpVec2f getClosestPoint(const KpVec2f& p, bool clampToSegment) const;
 
     /// Moves the line sideways, to the left of its direction (y upward).
     void translate(float distance);
 
-    /// Whether the lines meet, and where, into `out` if it isn't null. Parallel lines and empty ones never do. With
-    /// `segmentsOnly` the point has to lie in both segments, ends included.
+    /// Whether the lines intersect. Sets `out`, if not null, to the intersection. Parallel and
+    /// empty lines never intersect. With `segmentsOnly` the point must lie in both segments, ends
+    /// included.
     bool intersects(const KpLine2D& other, bool segmentsOnly, KpVec2f* out) const;
     /// As above, for lines.
     bool intersects(const KpLine2D& other, KpVec2f* out) const { return intersects(other, false, out); }

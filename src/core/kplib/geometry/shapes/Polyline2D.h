@@ -6,8 +6,8 @@
 #include <utility>
 #include <vector>
 
-/// A line through a list of vertices. boundingBox() keeps its result, so that it changes the
-/// object: threads that share one need a lock, also for reading.
+/// A line through a list of vertices. boundingBox() caches its result and so changes the object:
+/// threads that share one need a lock for reading too.
 class KPLIB_API Polyline2D : public Shape2D {
 public:
     Polyline2D() = default;
@@ -23,43 +23,44 @@ public:
 
     /// Number of vertices.
     size_t size() const { return vertices_.size(); }
-    /// Checked: std::out_of_range.
+    /// Vertex `i`. Throws std::out_of_range if there is none.
     const KpVec2f& at(size_t i) const { return vertices_.at(i); }
 
-    // Each change drops the bounding box that is kept.
+    // Each change invalidates the cached bounding box.
 
     /// Replaces all vertices.
     virtual void setVertices(std::vector<KpVec2f> vertices);
     /// Adds a vertex at the end.
     virtual void append(KpVec2f v);
-    /// Not checked.
+    /// Replaces vertex `i`, which is not checked.
     void set(size_t i, const KpVec2f& v);
     /// Removes all vertices.
     void clear();
     /// Adds `v` to all vertices.
     void offset(KpVec2f v);
-    /// Drops the bounding box.
+    /// Invalidates the cached bounding box.
     void invalidateBoundingBox() { isBoxValid_ = false; }
 
-    /// No vertices.
+    /// Whether there are no vertices.
     bool isEmpty() const override { return vertices_.empty(); }
-    /// At least three vertices, and the last one exactly the first.
+    /// Whether there are at least three vertices and the last one equals the first exactly.
     bool isClosed() const;
-    /// Appends the first vertex, unless it is closed. False with fewer than three.
+    /// Appends the first vertex if the line is not closed. Returns false if there are fewer than
+    /// three vertices.
     bool close();
 
-    /// Of one vertex that vertex; none without.
+    /// The nearest point of the line. For a single vertex that vertex; for none the flag is false.
     std::pair<bool, KpVec2f> closestPoint(KpVec2f p) const override;
-    /// Four zeros without vertices.
+    /// The bounding box, cached; four zeros without vertices.
     Rectangle2D boundingBox() const override;
     bool equals(const AbstractShape2D& other) const override;
 
     /// The sum of the lengths of the segments.
     double length() const;
-    /// One less than vertices; 0 without.
+    /// The number of vertices less one, or 0 without vertices.
     size_t numberOfSegments() const { return vertices_.empty() ? 0 : vertices_.size() - 1; }
     /// The distance of the vertices 2 `i` and 2 `i` + 1: here a segment is a pair of vertices,
-    /// unlike those that numberOfSegments() counts. 0 without that pair.
+    /// unlike in numberOfSegments(). 0 if there is no such pair.
     float lengthOfSegment(size_t i) const;
 
 protected:
