@@ -5,15 +5,16 @@
 #include <cstdint>
 #include <cstring>
 
-// How the results of a loop over elements get to memory.
+// Writes the results of a loop over elements to memory.
 
 namespace kplib::detail {
 
-// Bytes from which a target is written past the caches, since it couldn't stay there: reading its old contents first
-// would cost a third of the time.
+// From this size in bytes a target is written past the caches, since it would not stay in them:
+// reading its old contents first would cost a third of the time.
 inline constexpr long streamedSize = 8L << 20;
 
-// Copies past the caches; `dst` and `bytes` are multiples of 64. streamFence() has to follow before others look.
+// Copies past the caches. `dst` and `bytes` are multiples of 64. streamFence() must follow before
+// other threads read.
 void streamCopy(void* dst, const void* src, long bytes);
 void streamFence();
 
@@ -41,8 +42,8 @@ struct Transfer {
     bool overlaps() const { return target(0) < source(n) && source(0) < target(n); }
 };
 
-// Has `make(dst, src, n)` do the transfer, whose arguments never overlap: in one go, or by blocks that are made in the
-// first cache and then moved to their place.
+// Performs the transfer by calls of `make(dst, src, n)`, whose arguments never overlap: in one
+// call, or by blocks that are computed in the first cache and then moved to their place.
 template <typename Make>
 void transfer(const Transfer& t, Make&& make)
 {

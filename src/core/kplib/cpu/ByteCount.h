@@ -5,7 +5,8 @@
 
 namespace kplib::detail {
 
-// The product of `factors`; where it is out of range, the largest number, of which no allocator has so many bytes.
+// The product of `factors`, or, if it is out of range, the largest number, which no allocator can
+// serve.
 constexpr long byteCount(std::initializer_list<long> factors)
 {
     long product = 1;

@@ -8,7 +8,7 @@
 
 namespace kplib::detail {
 
-// `value` brought into [low, high]; NaN passes.
+// `value` limited to [low, high]. NaN is unchanged.
 template <typename T>
 KPLIB_KERNEL_BODY T clamped(T value, T low, T high)
 {
@@ -16,17 +16,18 @@ KPLIB_KERNEL_BODY T clamped(T value, T low, T high)
     return value > high ? high : value;
 }
 
-// The fraction cut off, for values not below the smallest int; NaN and what lies above the largest become the
-// smallest, as the processor answers them. The choice is made before the cast: a cast out of range is undefined, and
-// compilers make use of that.
+// Truncates values not below the smallest int. NaN and values above the largest int become the
+// smallest, as the processor converts them. The test is before the cast: a cast out of range is
+// undefined, and compilers exploit that.
 template <typename Real>
 KPLIB_KERNEL_BODY std::int32_t truncatedToInt(Real value)
 {
     return static_cast<std::int32_t>(value < Real(2147483648.0) ? value : Real(-2147483648.0));
 }
 
-// The bounds of a conversion from real numbers. Those of int are odd and meant: from float the upper bound is one
-// above what an int holds, so all from there on becomes the smallest int; from double the lower is two above it.
+// The bounds of a conversion from real numbers. Intentional for int, since peers depend on them:
+// from float the upper bound is one above the largest int, so all values from there on become the
+// smallest int; from double the lower bound is two above the smallest int.
 template <typename Integer, typename Real>
 struct RealBounds {
     static constexpr Real low = std::numeric_limits<Integer>::min();
@@ -49,7 +50,7 @@ KPLIB_KERNEL_BODY To converted(From value)
                   "a wider integer is clamped as 32 bits here: extend it");
     static_assert(sizeof(From) <= 4 || std::is_floating_point_v<From>,
                   "a wider integer is read as 32 bits here: extend it");
-    // Ushort to short: the bits as they are, not clamped, and that is meant.
+    // Intentional: ushort to short keeps the bits and does not clamp. Peers depend on it.
     constexpr bool keepsBits = std::is_same_v<To, std::int16_t> && std::is_same_v<From, std::uint16_t>;
     if constexpr (std::is_floating_point_v<To> || keepsBits) {
         return static_cast<To>(value);

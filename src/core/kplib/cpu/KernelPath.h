@@ -4,15 +4,15 @@
 #include <initializer_list>
 #include <span>
 
-// A body shared by functions that are compiled for different processors: inlined at every level, so that it is
-// compiled for the processor of its caller.
+// A body shared by functions that are compiled for several processors: inlined at every level, so
+// that it is compiled for the processor of its caller.
 #define KPLIB_KERNEL_BODY [[gnu::always_inline]] inline
 
 // The only place in the sources that distinguishes processors; else CMake chooses between files.
 //
-// KPLIB_X86_ROWS declares `name()`, the rows that a kernel's table has on x86-64 only; the kernel's *X86.cpp defines
-// it. There are none on other processors. KPLIB_PROCESSOR_HEADER is the header of inline code that each family of
-// processors has its own of.
+// KPLIB_X86_ROWS declares `name()`, the rows that a kernel's table has on x86-64 only; the
+// kernel's *X86.cpp defines it. Other processors have no such rows. KPLIB_PROCESSOR_HEADER is the
+// header of inline code that differs between families of processors.
 #if defined(__x86_64__)
 // NOLINTNEXTLINE(bugprone-macro-parentheses): it names a header
 #define KPLIB_PROCESSOR_HEADER(name) <kplib/cpu/name##X86.h>
@@ -30,7 +30,7 @@
 
 namespace kplib::detail {
 
-// One way to do a kernel's work. All usable paths of a table give equal results to the bit.
+// One implementation of a kernel. All usable paths of a table give results equal to the bit.
 template <typename Function>
 struct KernelPath {
     const char* name;  // for tests and benchmarks: "plain", "avx2" ...
@@ -38,8 +38,8 @@ struct KernelPath {
     Function* run;
 };
 
-// All paths of a kernel: those that any processor has, of which the first is the plain loop, then those of this family
-// of processors.
+// All paths of a kernel: first the portable ones, of which the first is the plain loop, then those
+// for this family of processors.
 template <typename Function>
 class KernelTable {
 public:

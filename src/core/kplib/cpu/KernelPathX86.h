@@ -2,9 +2,10 @@
 
 #include <kplib/cpu/KernelPath.h>
 
-// What the sources for x86-64, *X86.cpp, compile their kernels with. They are compiled with the flags of all others and
-// mark each function with its target: flags of their own would also apply to inline functions of the standard library,
-// of which the linker may keep the copy that an older processor cannot run.
+// Definitions for the sources for x86-64, *X86.cpp. They are compiled with the same flags as all
+// others and mark each function with its target: separate flags would also apply to inline
+// functions of the standard library, of which the linker may keep the copy that an older processor
+// cannot run.
 
 // Compiles a function for processors that have `features`; it may be called only where they were found.
 #define KPLIB_TARGET(features) [[gnu::target(features)]]

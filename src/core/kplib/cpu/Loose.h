@@ -4,8 +4,8 @@
 
 namespace kplib::detail {
 
-// An element at any address and beside any other type: buffers out of files and messages start where they start, and
-// a conversion may write its results over its source.
+// An element at any address that may alias any other type: buffers from files and messages may be
+// unaligned, and a conversion may write its results over its source.
 template <typename T>
 struct __attribute__((packed, may_alias)) Loose {
     T value;

@@ -11,14 +11,17 @@ namespace kplib::detail {
 class HttpHead;
 }
 
-/// Reads ranges of a file from an HTTP server, one after the other over a connection that stays open.
+/// Reads ranges of a file from an HTTP server, one after the other over a connection that is kept
+/// open.
 ///
-/// Understands http:// only, and responses with a Content-Length; no redirects and no chunked
-/// transfer. A response of any status is delivered: check status() where it matters. Only
-/// exhausted memory throws, and nothing is logged: errorText() describes a failure. After a
-/// failure the next request() connects anew.
+/// Supported: http:// URLs and responses with a Content-Length. Redirects and chunked transfer are
+/// not supported.
 ///
-/// Belongs to one thread, but for cancel().
+/// Errors: a response of any status is delivered: check status() where it matters. Only exhausted
+/// memory throws, and nothing is logged: errorText() describes a failure. After a failure the next
+/// request() opens a new connection.
+///
+/// Threads: one thread at a time, except for cancel().
 class KPLIB_API KpHttpGet {
 public:
     /// Where the request stands.
@@ -35,53 +38,55 @@ public:
     KpHttpGet& operator=(const KpHttpGet&) = delete;
     ~KpHttpGet();
 
-    /// Takes server and path from "http://HOST[:PORT][/PATH]". Closes the connection if the server
-    /// is another one. False for another scheme, which closes it too and clears the host.
-    /// request() calls this.
+    /// Sets server and path from "http://HOST[:PORT][/PATH]". Closes the connection if the server
+    /// is another one. Returns false for another scheme, which also closes the connection and
+    /// clears the host. request() calls this.
     ///
-    /// The first colon is taken for the port's, even one in the path: a URL with a colon there is not understood.
+    /// The first colon is taken as that of the port, even in the path: a URL with a colon in its
+    /// path is not supported.
     bool setURL(const char* url);
 
-    /// Asks for the whole file; true when the request has gone out.
+    /// Requests the whole file. Returns true when the request is sent.
     bool request(const char* url);
-    /// Asks for the bytes from `first` to `last`, both included; for the whole file if `first` > `last`. What is left
-    /// of the response before is dropped, with its connection.
+    /// Requests the bytes from `first` to `last`, both included, or the whole file if `first` >
+    /// `last`. The unread rest of the previous response is discarded with its connection.
     bool request(const char* url, unsigned long first, unsigned long last);
 
-    /// Waits for the next `size` bytes of the body and returns their number, less only at its end;
-    /// 0 after the end. A failure is -1, or the number of bytes that came before it (0 if the
-    /// server closed), and then -1 in the next call.
+    /// Waits for the next `size` bytes of the body and returns their number, which is smaller only
+    /// at the end of the body, and 0 after it. On a failure returns the number of bytes that
+    /// arrived before it (0 if the server closed the connection) and -1 in the next call, or -1 at
+    /// once.
     long read(void* buffer, unsigned long size);
 
-    /// Length of the response's body, for which it waits for the head if necessary; 0 if that
-    /// fails.
+    /// The length of the body of the response. Waits for the head if necessary; 0 if that fails.
     long long contentLength();
     /// Bytes of the body delivered so far.
     long long bytesRead() const { return bytesReadSoFar_; }
 
-    /// Closes the connection. From another thread this ends a read() that waits, which then fails, and a request(),
-    /// which then returns false in the state NotConnected; a request() that is connecting too, once the name of the
-    /// host is resolved.
+    /// Closes the connection. Called from another thread, it ends a waiting read(), which then
+    /// fails, and a waiting request(), which then returns false in the state NotConnected; a
+    /// request() that is connecting ends once the name of the host is resolved.
     void cancel();
 
-    /// Waits for the head of the response. False in any state but RequestSent, or on failure. read() calls this.
+    /// Waits for the head of the response. Returns false in any state but RequestSent, or on a
+    /// failure. read() calls this.
     bool readResponse();
 
-    /// Closes the connection with `text` for the cause; null stands for the system's text of its
-    /// last error.
+    /// Closes the connection and sets errorText() to `text`. Null stands for the system's text of
+    /// its last error.
     void setError(const char* text);
 
     /// Where the request stands.
     State state() const { return state_; }
-    /// The port of setURL(), 80 without one there.
+    /// The port of setURL(), or 80 if the URL has none.
     int port() const { return port_; }
     /// The host of setURL().
     const std::string& host() const { return host_; }
     /// The path of setURL().
     const std::string& path() const { return path_; }
-    /// Of the last failure.
+    /// The text of the last failure.
     const std::string& errorText() const { return errorText_; }
-    /// That of the last response, such as 206; 0 while there is none.
+    /// The status of the last response, such as 206; 0 if there is none.
     int status() const { return status_; }
     /// Seconds spent on the network for this request.
     double elapsedTime() const { return watch_.getTime2(); }

@@ -13,7 +13,7 @@ public:
     static unsigned int getIPV4Address(const char* host);
     /// As above.
     static unsigned int getIPV4Address(const KpString& host);
-    /// That of this machine, by its name.
+    /// The first IPv4 address of this machine, by its name.
     static unsigned int getIPV4Address();
 
     /// The same as "192.0.2.1"; "0.0.0.0" if there is none.

@@ -26,10 +26,11 @@ using WireElements = KpTypeList<unsigned char, bool, int, float, double, long, l
 template <typename T>
 concept WireElement = WireElements::contains<T>;
 
-/// Takes `bytes` bytes of array elements at the read offset, or logs that the message doesn't hold them.
+/// Reads `bytes` bytes of array elements at the read offset, or logs that the message does not
+/// contain them.
 KPLIB_API bool readElements(TmMsg& msg, void* elements, unsigned long bytes);
 
-/// Any byte but 0 is true: no bool of another value comes out of a message.
+/// Sets each byte that is not 0 to 1: a message never yields a bool of another value.
 KPLIB_API void makeBools(unsigned char* bytes, long count);
 
 }  // namespace kplib::detail
@@ -46,34 +47,39 @@ KPLIB_API void makeBools(unsigned char* bytes, long count);
 ///
 /// A message is a plain memory image: packed, in the host's byte order (little-endian), without
 /// tags, version or length. The reader must read the same types in the order in which they were
-/// written. The two ends are independent: reading may follow writing. Counts on the wire have 32
-/// bits; larger ones lose their upper bits. A truncated message is not reported, but no read
-/// leaves the message: past its end values are of zero bytes, text is null or empty, fields and
-/// views are empty. Check bytesAvailable() before reading data from an untrusted peer. Exhausted
-/// memory is a KpMemoryException. One thread at a time.
+/// written. Writing and reading are independent: reading may follow writing. Counts in a message
+/// have 32 bits; larger ones lose their upper bits.
+///
+/// Errors: a truncated message is not reported, but no read leaves the message: past its end
+/// values are zero, texts are null or empty, and fields and views are empty. Check
+/// bytesAvailable() before reading data from an untrusted peer. Exhausted memory throws
+/// KpMemoryException.
+///
+/// Threads: one thread at a time.
 class KPLIB_API TmMsg {
 public:
     /// Empty; takes no memory.
     TmMsg() = default;
-    /// For reading `size` bytes that stay the caller's and must outlive the message.
+    /// A message for reading `size` bytes, which the caller owns and which must outlive the
+    /// message.
     TmMsg(unsigned long size, unsigned char* data) { setRawData(size, data); }
     /// Owns a copy of the bytes; the read offset is that of `other`.
     TmMsg(const TmMsg& other);
     ~TmMsg();
 
-    /// Copies the bytes alone: the read offset stays.
+    /// Copies the bytes only; the read offset stays.
     TmMsg& operator=(const TmMsg& other);
 
     /// Exchanges the storage of two messages, without copying; the read offsets stay.
     void take(TmMsg& other);
 
-    /// Makes this a message over bytes of the caller, as the constructor does. Bytes that the
-    /// message owned are not freed: the caller, which has their address from dataPtr(), owns them
-    /// from then on. Appending does not change the caller's bytes: the message continues with a
-    /// copy of its own.
+    /// Makes this a message over bytes that the caller owns, as the constructor does. Bytes that
+    /// the message owned are not freed: the caller, which has their address from dataPtr(), owns
+    /// them from then on. Appending does not change the caller's bytes: the message continues with
+    /// its own copy.
     void setRawData(unsigned long size, unsigned char* data);
 
-    /// Equal bytes, and read up to the same offset.
+    /// Whether bytes and read offset are equal.
     bool operator==(const TmMsg& other) const;
 
     /// @{
@@ -84,14 +90,15 @@ public:
 
     /// Number of bytes.
     unsigned long size() const { return static_cast<unsigned long>(buffer_.size()); }
-    /// The next byte to read; after a failed array it may lie past the end.
+    /// The offset of the next byte to read. After a failed read of an array it may be past the
+    /// end.
     unsigned long readOffset() const { return readOffset_; }
-    /// size() less readOffset(); so a very large number once the offset lies past the end.
+    /// size() less readOffset(). Wraps to a very large number if the offset is past the end.
     unsigned long bytesAvailable() const { return size() - readOffset_; }
 
     /// Sets the size; bytes that are added are not initialised.
     void resize(long size);
-    /// Starts anew with a message of `size` bytes; the storage stays. 0 makes it empty.
+    /// Resets the message to `size` bytes; the storage stays. 0 makes it empty.
     void reset(long size);
     /// The same, with storage for `capacity` bytes.
     void reset(long size, long capacity);
@@ -109,8 +116,8 @@ public:
         buffer_.setSize(size + static_cast<long>(count));
     }
 
-    /// Makes `data` the address of the next `count` bytes in the message itself, valid until it is written to, and
-    /// moves on by `count`. Null if the message doesn't hold them.
+    /// Sets `data` to the address of the next `count` bytes in the message itself, valid until it
+    /// is written to, and advances by `count`. Null if the message does not contain them.
     void readRawBytes(unsigned long count, void*& data)
     {
         data = holds(count) ? buffer_.data() + readOffset_ : nullptr;
@@ -120,14 +127,14 @@ public:
     /// Whether `count` more bytes can be read.
     bool holds(unsigned long count) const { return readOffset_ <= size() && count <= size() - readOffset_; }
 
-    /// Two marks, 0 and 1, for the protocol that uses the messages: unset at first and copied by
-    /// the copy constructor only. This class does not interpret them.
+    /// Two marks, 0 and 1, for the protocol that uses the message. They are unset at first, and
+    /// only the copy constructor copies them. This class does not interpret them.
     bool isMarked(int mark) const { return (marks_ >> mark & 1) != 0; }
     /// Sets or clears a mark.
     void setMarked(int mark, bool on);
 
-    /// Writes "TmMsg" to the log: once if there is a title, and twice more. Neither the title nor
-    /// the bytes are shown.
+    /// Writes "TmMsg" to the log three times if there is a title, else twice. Neither the title
+    /// nor the bytes are written.
     void print(const char* title) const;
 
 private:
@@ -152,7 +159,8 @@ private:
 
 static_assert(sizeof(TmMsg) == 40);
 
-// Each operator appends or reads one value and returns the message. What isn't listed doesn't compile.
+// Each operator appends or reads one value and returns the message. Types that are not listed do
+// not compile.
 
 /// The bytes of the value.
 template <kplib::detail::WireValue T>
@@ -186,8 +194,8 @@ TmMsg& operator<<(TmMsg& msg, const KpDArray<T>& array)
     return msg;
 }
 
-/// Sets the size of the array to the count that was sent. If the message doesn't hold that many elements, that is one
-/// error line in the log: their values stay what they are, and the offset moves by all of them.
+/// Sets the size of the array to the count in the message. If the message does not contain that
+/// many elements, logs one error, leaves their values and advances the offset by all of them.
 template <kplib::detail::WireElement T>
 TmMsg& operator>>(TmMsg& msg, KpDArray<T>& array)
 {
@@ -207,8 +215,9 @@ template <typename T>
 requires(std::is_arithmetic_v<T> && !kplib::detail::WireValue<T>) TmMsg& operator<<(TmMsg& msg,
                                                                                     const T& value) = delete;
 
-/// The length with the NUL in 32 bits (0 for null), and the bytes with the NUL. Reads as an address in the message
-/// itself, or null; valid until the message is written to. A text of the message itself may be written to it, too.
+/// The length including the NUL in 32 bits (0 for null), and the bytes with the NUL. Reading
+/// returns an address in the message itself, or null, valid until the message is written to. A
+/// text of the message itself may be written to it.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const char* text);
 /// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, char*& text);
@@ -218,7 +227,7 @@ KPLIB_API TmMsg& operator<<(TmMsg& msg, const std::string& text);
 /// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, std::string& text);
 
-/// The bytes up to the first NUL, which goes with them; no length.
+/// The bytes up to the first NUL, included, without a length.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpString& text);
 /// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, KpString& text);
@@ -228,14 +237,15 @@ KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpFilename& name);
 /// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, KpFilename& name);
 
-/// The count in 32 bits, and each text in the form of `const char*`. The array that is read owns none of its texts; a
-/// negative count is no texts.
+/// The count in 32 bits, and each text in the form of `const char*`. The array that is read owns
+/// none of its texts. A negative count means no texts.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpDArray<char*>& texts);
 /// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, KpDArray<char*>& texts);
 
-/// The code, and for a failure text and data in the form of `const char*`; file and line stay here. Reading a failure
-/// makes a new one, with its line in the log; empty data becomes the text of the code.
+/// The code, and for a failure text and data in the form of `const char*`. File and line are not
+/// sent. Reading a failure constructs a new one, with its line in the log; empty data becomes the
+/// text of the code.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpResult& result);
 /// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, KpResult& result);
@@ -245,26 +255,26 @@ KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpBitfield& field);
 /// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, KpBitfield& field);
 
-/// Components, type, width and height in 32 bits each, and the pixels without gaps between the rows; the pixels of a
-/// row are taken to be dense. Without data width and height are sent as 0. The view that is read owns its pixels; its
-/// data is null if none came.
+/// Components, type, width and height in 32 bits each, and the pixels without gaps between the
+/// rows. Precondition: the pixels of a row have no gaps. Without data, width and height are sent
+/// as 0. The view that is read owns its pixels; its data is null if there are none.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const KpTypedData2D& image);
 /// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, KpTypedData2D& image);
 
-/// A bool that is true for null, and nothing else; or sizes, components, type and all voxels without gaps. The voxels
-/// of an object without data are sent as 0.
+/// A bool, true for null and then nothing else; otherwise sizes, components, type and all voxels
+/// without gaps. The voxels of an object without data are sent as 0.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, TmDataAccess const* const& object);
 
-/// Makes `object` a new, contiguous object that frees with free(), with a reference count of 0; it has no data if
-/// memory runs out. Null if null was sent, if the message holds fewer bytes than announced, or if the sizes are
-/// impossible; no memory is requested then.
+/// Sets `object` to a new, contiguous object that frees with free(), with a reference count of 0.
+/// It has no data if memory runs out. Sets `object` to null if null was sent, if the message
+/// contains fewer bytes than announced, or if the sizes are impossible; no memory is allocated
+/// then.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, TmDataAccess*& object);
 
 /// Sixteen bytes that are ignored when they are read, and all bytes of `inner` as an array. The
-/// read offset of `inner` is not sent: reading starts at its first byte. If the message holds
-/// fewer bytes than announced, that is one error line in the log, and `inner` has the announced
-/// size with bytes of 0.
+/// read offset of `inner` is not sent: reading starts at its first byte. If the message contains
+/// fewer bytes than announced, logs one error, and `inner` has the announced size with bytes of 0.
 KPLIB_API TmMsg& operator<<(TmMsg& msg, const TmMsg& inner);
 /// Reads that form.
 KPLIB_API TmMsg& operator>>(TmMsg& msg, TmMsg& inner);

@@ -4,7 +4,8 @@
 
 struct dirent;
 
-// What the library asks of the operating system beyond plain POSIX; one source a system answers.
+// The functions of the operating system that the library needs beyond plain POSIX. One source for
+// each system implements them.
 
 namespace kplib::platform {
 
@@ -34,7 +35,8 @@ struct Version {
 };
 Version version();
 
-// What of this machine is online. False, and `counts` as it was, if it doesn't tell.
+// Counts the processors that are online. Returns false and leaves `counts` unchanged if the system
+// does not report them.
 struct ProcessorCounts {
     int packages, physicalCores, logicalProcessors;
 };
@@ -42,7 +44,7 @@ bool processorCounts(ProcessorCounts& counts);
 
 // Bytes of physical memory; 0 if unknown.
 std::uint64_t totalMemory();
-// Bytes that processes can have without swapping. False if unknown.
+// Bytes available to processes without swapping. Returns false if unknown.
 bool availableMemory(std::uint64_t& bytes);
 
 // Memory of a process, in bytes. False where the system has no such figures.
@@ -54,7 +56,7 @@ bool processMemory(std::int64_t process, ProcessMemory& memory);
 // Names the calling thread for the system's tools; the name is cut where the system has no room for more.
 void setThreadName(const char* name);
 
-// What this system calls a shared object that others call ".so".
+// This system's suffix of shared objects, in place of ".so".
 const char* sharedObjectSuffix();
 
 // Whether an entry of the folder that is open at a descriptor is a folder itself; a link to one is not.

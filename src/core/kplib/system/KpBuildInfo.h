@@ -4,10 +4,10 @@
 
 #include <string>
 
-/// What was built: values that the build has set into the library. Safe from any thread.
+/// Values that the build stores in the library. Thread-safe.
 class KPLIB_API KpBuildInfo {
 public:
-    /// What getBuildString() shows, to be combined.
+    /// Contents of getBuildString(), to be combined.
     enum BuildStringFlag : int {
         BuildNumber = 1,  ///< the build number as a part of the version
         Comments = 2,     ///< the comments of the build
@@ -19,7 +19,7 @@ public:
 
     /// Writes major, minor, patch and build number to v[0] to v[3].
     static void getVersion(int* v);
-    /// Whether this is no release.
+    /// Whether this is not a release.
     static bool isSnapshotBuild();
     /// The text of a tag, empty for a key that isn't one: VERSION_MAJOR, VERSION_MINOR, VERSION_PATCH, VERSION_BUILD,
     /// VERSION_STRING, VERSION_SHA1 (the source revision, 40 zeros where there is none), VERSION_PRODUCT_NAME,

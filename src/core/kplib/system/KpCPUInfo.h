@@ -4,7 +4,7 @@
 
 #include <cstdint>
 
-/// The machine's processors: counts and features. Read once on first use. Any thread may call it.
+/// The machine's processors: counts and features, read once on first use. Thread-safe.
 class KPLIB_API KpCPUInfo {
 public:
     /// Bits of detectCPUFeatures(), each named after an extension of the x86 instruction set.
@@ -26,7 +26,7 @@ public:
     /// The machine's processors, read by the first call.
     static const KpCPUInfo& instance();
 
-    /// Whether the counts were read from the system; else each is 1.
+    /// Whether the counts were read from the system; otherwise each is 1.
     bool cpuInfoSucceed() const { return succeeded_; }
     /// Packages, cores of a package, logical processors of a core.
     int getCPUCount() const { return cpuCount_; }

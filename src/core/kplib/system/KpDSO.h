@@ -11,13 +11,13 @@ class KpFilename;
 
 /// A shared object that is loaded at run time: a plug-in package, by its short name.
 ///
-/// What is loaded stays in the process, also beyond close() and the object. One thread at a time; the static members
-/// are set before the first load.
+/// A loaded object stays in the process, also after close() and destruction. One thread at a time;
+/// set the static members before the first load.
 class KPLIB_API KpDSO {
 public:
-    /// Folders to search, the last one first; the texts stay the application's.
+    /// Folders to search, the last one first. The application owns the texts.
     static KpDArray<char*> dsoSearchPath;
-    /// Other than 0 for more lines in the log.
+    /// Any value but 0 writes more lines to the log.
     static int verbose;
 
     /// Opens `name` unless it is null; check isOpen() for success.
@@ -26,22 +26,24 @@ public:
     KpDSO& operator=(const KpDSO&) = delete;
     ~KpDSO();
 
-    /// Loads the object that fixPath() makes of `name`: an absolute path as it is, else below the folders of the search
-    /// path, and at last by the system's own search. Calls its function orlinpackage_NAME_init(), if it has one, NAME
-    /// being the file's name without "lib" and what follows its last dot. 0, or -1 with a line in the log unless
-    /// `quiet`.
+    /// Loads the object with the name that fixPath() makes of `name`: an absolute path as it is,
+    /// otherwise below the folders of the search path, and last by the system's own search. Calls
+    /// its function orlinpackage_NAME_init(), if there is one; NAME is the file's name without
+    /// "lib" and without the part from its last dot. Returns 0, or -1 with a line in the log
+    /// unless `quiet`.
     int open(const char* name, bool quiet);
     /// Closes the object, which stays loaded.
     void close();
     /// Whether an object is open.
     bool isOpen() const;
 
-    /// Makes "libNAME.so" of a bare NAME, and leaves what has a dot.
+    /// Changes NAME to "libNAME.so". A name with a dot stays unchanged.
     static void fixPath(KpFilename& name);
     /// Loads the file `path`; 0, or -1. `message` receives the outcome in words.
     int tryOpen(const char* path, KpString& message);
 
-    /// The address of a symbol, also if it has a '_' in front there; null if there is none or nothing is open.
+    /// The address of a symbol, with or without a leading '_'. Null if there is none or no object
+    /// is open.
     void* getSymbol(const char* name) const;
 
     // Call a function of the object with zero to five pointers. Without an object or such a symbol nothing is called,

@@ -5,7 +5,7 @@
 
 class KpTable;
 
-/// A small relational store in memory: tables whose rows point to each other; the pointers are
+/// A small relational store in memory: tables whose rows point to each other. The pointers are
 /// updated when rows move. See KpTable. One thread at a time.
 class KPLIB_API KpDataBase {
 public:
@@ -15,11 +15,11 @@ public:
     KpDataBase(const KpDataBase&) = delete;
     KpDataBase& operator=(const KpDataBase&) = delete;
 
-    /// Makes a table and gives its id: 400, 401 ...
+    /// Creates a table and returns its id: 400, 401 ...
     int createTable();
     /// The table of an id, owned by the database; null if there is none.
     KpTable* table(int tableId) const;
-    /// All tables in the order of their making.
+    /// All tables in the order of creation.
     const KpDArray<KpTable*>& tables() const { return tables_; }
 
     /// Whether all tables are consistent; true while skipCheck() is in effect.

@@ -7,8 +7,8 @@
 
 /// A string that is a path: operations on the name, questions about what it names, and names for new files.
 ///
-/// Separators are slashes. Nothing throws but for exhausted memory, and nothing is logged: a failure is false, 0 or
-/// what is said below.
+/// Separators are slashes. Only exhausted memory throws, and nothing is logged: a failure is
+/// false, 0 or the value stated below.
 class KPLIB_API KpFilename : public KpString {
 public:
     KpFilename() = default;
@@ -37,7 +37,7 @@ public:
     bool doesExist() const;
     /// Whether this process may read it.
     bool isReadable() const;
-    /// True for any directory; a file by its rights.
+    /// Whether it is a directory, or a file that this process may write.
     bool isWriteable() const;
     /// Whether it is a folder, or a link to one.
     bool isDirectory() const;
@@ -45,38 +45,40 @@ public:
     bool isRelative() const { return c_str()[0] != '/'; }
     /// Seconds since 1970, 0 on failure.
     std::time_t getModTime() const;
-    /// Likewise, of the last access.
+    /// The time of the last access, likewise.
     std::time_t getAccessTime() const;
-    /// The time of the last change of status: there is no time of birth.
+    /// The time of the last change of status, since there is no time of creation.
     std::time_t getCreateTime() const;
     /// Bytes; all bits set on failure.
     unsigned long long fileSize() const;
-    /// Type and rights as the system has them, of what can be opened for reading; else 0.
+    /// Type and rights as the system returns them if the file can be opened for reading, else 0.
     int getMode() const;
     /// Sets the rights; false on failure.
     bool setMode(int mode) const;
-    /// Makes an empty file of it, or empties it.
+    /// Creates an empty file, or truncates an existing one.
     bool create(int mode) const;
     /// Deletes the file; false on failure.
     bool unlink() const;
-    /// Renames the file; false on failure. The object takes `newName` in either case.
+    /// Renames the file and returns false on failure. The object takes `newName` in both cases.
     bool rename(const char* newName);
-    /// Copies contents and rights to the file `target`; false if either cannot be opened, or not
-    /// all can be read and written, which leaves no `target`. A file copied onto itself stays.
+    /// Copies contents and rights to the file `target`. Returns false if either cannot be opened
+    /// or not all can be read and written; no `target` remains then. A file that is copied to
+    /// itself is unchanged.
     bool copy(const char* target) const;
 
-    // The text alone; the static ones are for any path, null counts as empty.
+    // Operations on the text only. The static functions accept any path; null counts as empty.
 
-    /// What follows the last slash.
+    /// The part after the last slash.
     static const char* basename(const char* path);
     /// As above, of this path.
     const char* basename() const { return basename(c_str()); }
-    /// From the last '.' after the last slash, with the dot; empty for none. Of a hidden file the
-    /// whole name.
+    /// The part from the last '.' after the last slash, with the dot; empty if there is none. For
+    /// a hidden file that may be the whole name.
     static const char* extension(const char* path);
     /// As above, of this path.
     const char* extension() const { return extension(c_str()); }
-    /// Up to the last slash, that included, with backslashes as slashes; false, and `out` empty, without one.
+    /// Sets `out` to the part up to the last slash, included, with backslashes as slashes. Returns
+    /// false and empties `out` if there is none.
     static bool dirname(const char* path, KpString& out);
     /// As above, of this path.
     bool dirname(KpString& out) const { return dirname(c_str(), out); }
@@ -89,31 +91,34 @@ public:
     void fixSlashes();
     /// Adds a slash and `name`, and returns this object.
     KpFilename& appendFile(const KpString& name);
-    /// Tidies the text without a look at the file system: backslashes, "//", "/./" and "x/..".
-    /// Works on the three characters of "/..", so "a/b/..c" gives "ac". Intentional: stored names
+    /// Normalises the text without access to the file system: backslashes, "//", "/./" and "x/..".
+    /// Replaces the three characters "/..", so "a/b/..c" gives "ac". Intentional: stored names
     /// depend on it.
     void pack();
-    /// Makes an absolute path of a relative one, "~/" included, and follows its links if it
-    /// exists. An absolute one stays as it is. If the result ends in another character than the
-    /// text before, that character is appended: this keeps a trailing slash, and also applies to a
-    /// link whose target ends differently.
+    /// Makes a relative path absolute, "~/" included, and follows its links if it exists. An
+    /// absolute path is unchanged. If the last character of the result differs from that of the
+    /// original text, that character is appended: this keeps a trailing slash, and also applies to
+    /// a link whose target ends differently.
     void expandPath();
-    /// pack(), expandPath(), and without a slash at the end.
+    /// Calls pack() and expandPath(), and removes a trailing slash.
     void canonizePath();
-    /// Rewrites this path relative to the folder that `base` lies in. Where the two have no first piece in common it is
-    /// only packed.
+    /// Rewrites this path relative to the folder of `base`. If the two have no common first part,
+    /// only packs it.
     void makeRelativeTo(const KpFilename& base);
 
-    /// `pattern` with `number` in place of its last run of '#', padded with zeros; without one, numbers from 2 on stand
-    /// with four digits before the last dot.
+    /// Sets `result` to `pattern` with its last run of '#' replaced by `number`, padded with
+    /// zeros. Without such a run, numbers from 2 on are inserted before the last dot with four
+    /// digits.
     static void enumerate(KpString& result, const char* pattern, int number);
-    /// If something of this name exists, puts the first of .1, .2 ... before the extension that makes a new one.
+    /// If the path exists, inserts the first of .1, .2 ... before the extension that gives a path
+    /// that does not exist.
     void makeUnique();
-    /// A name that does not exist, in `dir` as it is or, for null, in the system's temporary
-    /// folder. The file is not made.
+    /// A name that does not exist, in `dir`, or for null in the system's temporary folder. The
+    /// file is not created.
     static KpFilename getTempFilename(const char* dir);
-    /// A place for a new file: `dir` below `root` (the system's temporary folder, if empty), made
-    /// if needed, with `dated` by year, month and day; and a `name` of local time and process,
-    /// with `withUuid` unique anywhere. Both are empty if the folder cannot be made.
+    /// Computes a path for a new file. `dir` is a folder below `root` (the system's temporary
+    /// folder if empty), created if needed, with `dated` by year, month and day. `name` consists
+    /// of local time and process, with `withUuid` also of a UUID. Both are empty if the folder
+    /// cannot be created.
     static void generateFilePath(KpString& dir, KpString& name, const KpString& root, bool dated, bool withUuid);
 };

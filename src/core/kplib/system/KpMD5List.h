@@ -6,18 +6,19 @@
 
 namespace KpLib {
 
-/// Digests in the order of insertion, or in ascending order, and a digest of them all. One thread at a time, hash()
-/// included.
+/// A list of digests in the order of insertion or in ascending order, with a digest of them all.
+/// One thread at a time, hash() included.
 class KPLIB_API MD5List {
 public:
-    /// With `sorted`, two lists of the same digests have the same hash, however they were filled.
+    /// With `sorted`, lists of the same digests have the same hash, independent of the order of
+    /// insertion.
     explicit MD5List(bool sorted = false) : sorted_(sorted) {}
 
     /// Appends, or inserts the digest after the last one that is not greater.
     void insert(const MD5& digest);
 
-    /// MD5 over the digests from the last to the first, a direction that is part of the result; computed once after
-    /// each change.
+    /// MD5 over the digests from the last to the first. Intentional: stored hashes depend on the
+    /// direction. Computed once after each change.
     MD5 hash() const;
 
     /// Whether insert() keeps the order.

@@ -2,11 +2,11 @@
 
 #include <kplib/foundation/KpExport.h>
 
-/// Memory of a process as it was when this was made, in bytes. Where the system has no such figures, as here, found()
-/// is false and all numbers are 0.
+/// Memory of a process, in bytes, at the time of construction. On systems without such figures, as
+/// here, found() is false and all numbers are 0.
 class KPLIB_API KpProcessInfo {
 public:
-    /// Asks for the process with that id.
+    /// Reads the figures of the process with that id.
     explicit KpProcessInfo(long long pid);
 
     /// Whether there are figures.
@@ -19,7 +19,7 @@ public:
     long long peakPagefileUsage() const { return peakPagefileUsage_; }
     /// @}
 
-    /// One line in the log, if found().
+    /// Writes one line to the log if found().
     void log() const;
 
 private:

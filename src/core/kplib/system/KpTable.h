@@ -10,18 +10,20 @@ class KpDataBase;
 
 /// A table of a KpDataBase: rows are records of one size in one block, to which columns are added at run time.
 ///
-/// A row is a plain `char*`. The block may move whenever rows or columns are added; every pointer to a row that the
-/// tables hold, and every client variable in externalRowPointers(), is repaired in place, so that a row is best kept in
-/// one of them. Relations - lists of rows of another table - are kept as lists of cells in a pool a column, which moves
-/// likewise.
+/// A row is a plain `char*`. The block may move whenever rows or columns are added. Every pointer
+/// to a row in the tables, and every client variable in externalRowPointers(), is then updated;
+/// keep pointers to rows in one of these. Relations, which are lists of rows of another table, are
+/// stored as lists of cells in one pool for each column, which may move too.
 ///
-/// Row form: columns follow one another without gaps (an offset is the sum of the sizes before it,
-/// so fields may lie unaligned: read them by memcpy). Column 0 is the table's own, 4 bytes: 0 in a
-/// row in use, 1 in a free one. The 4 bytes after it hold the table's id and belong to the first
-/// client column, which has to be a plain one of at least 4 bytes and leaves those to the table.
-/// At most 16 columns; a relation has to start within the first 512 bytes of a row.
+/// Row layout: columns follow one another without gaps. The offset of a column is the sum of the
+/// sizes before it, so fields may be unaligned: read them by memcpy. Column 0 is internal and has
+/// 4 bytes: 0 in a row in use, 1 in a free row. The next 4 bytes contain the id of the table and
+/// belong to the first client column, which must be a plain column of at least 4 bytes; clients
+/// must not change them. A table has at most 16 columns. A relation must start within the first
+/// 512 bytes of a row.
 ///
-/// Positions, rows and offsets are not checked unless said so. One thread at a time for a whole database.
+/// Positions, rows and offsets are not checked unless stated. One thread at a time for a whole
+/// database.
 class KPLIB_API KpTable {
 public:
     /// What a column holds.
@@ -48,10 +50,10 @@ public:
     /// Sets the name.
     void setName(const KpString& name) { name_ = name; }
 
-    /// Adds a column to all rows, its bytes zero there, unless there is one of this id (0 to 15).
-    /// `size` is that of a plain column, `target` the table that the others point to. The index of
-    /// the column, or -1, with a line in the log, for one that does not fit into the row form.
-    /// Moves the rows.
+    /// Adds a column to all rows, filled with zeros, unless a column with this id (0 to 15)
+    /// exists. `size` is the size of a plain column, `target` the table that the other types point
+    /// to. Returns the index of the column, or -1 with a line in the log if it does not fit into
+    /// the row layout. Moves the rows.
     int columnAdd(int columnId, ColumnType type, int size, KpTable* target);
     /// Number of columns, the table's own included.
     int columnCount() const { return columnCount_; }
@@ -60,25 +62,29 @@ public:
     /// Bytes in a row.
     int rowSize() const { return rowSize_; }
 
-    /// A new row, its client bytes zero, in constant time on average; may move the rows. Null, with a line in the log,
-    /// while there is no client column.
+    /// Returns a new row with all client bytes zero, in constant time on average. May move the
+    /// rows. Returns null, with a line in the log, if there is no client column.
     char* rowAdd();
-    /// Empties the row's relations and frees the row for rowAdd(). The caller clears all pointers
-    /// to it first. False if `row` is not a row in use.
+    /// Empties the relations of the row and frees it for rowAdd(). Clear all pointers to the row
+    /// first. Returns false if `row` is not a row in use.
     bool rowDel(char* row);
     /// The rows in use.
     long rowCount() const { return rowsInBlock() - freeRows_.size(); }
-    /// The rows in use in the order of the block: rowNext(null) is the first, null ends it.
+    /// The next row in use after `row` in the order of the block: rowNext(null) is the first, null
+    /// marks the end.
     char* rowNext(char* row) const;
     /// The first row in use after `row` (null: of all) whose column of this id holds the bytes at
     /// `value`; null for none.
     char* rowFind(int columnId, const void* value, char* row = nullptr) const;
-    /// Makes room, so that `rows` more can be added without a move. Gives by how many bytes the rows moved.
+    /// Ensures that `rows` more rows can be added without a move. Returns by how many bytes the
+    /// rows moved.
     long rowReserve(int rows);
-    /// Moves to a block of `rows` rows (or as many as there are), each longer by `extraRowBytes` zero bytes at its end,
-    /// and repairs all pointers to rows. Gives by how many bytes the rows moved.
+    /// Moves the rows to a block of `rows` rows, or of the present number if that is larger, each
+    /// extended by `extraRowBytes` zero bytes at its end, and updates all pointers to rows.
+    /// Returns by how many bytes the rows moved.
     long expand(int rows, int extraRowBytes);
-    /// Client variables that hold rows of this table and are repaired on a move; each may be null meanwhile.
+    /// Client variables that point to rows of this table and are updated when rows move. Each may
+    /// be null.
     KpDArray<char**>& externalRowPointers() { return externalRowPointers_; }
 
     /// The row that a row-pointer column at `offset` holds.
@@ -90,13 +96,13 @@ public:
 
     /// Appends `target` to the list, in constant time on average; may move the column's pool.
     void relationAdd(char* row, int offset, char* target);
-    /// Takes the first cell that points to `target` out of the list, if there is one. O(length).
+    /// Removes the first cell that points to `target` from the list, if there is one. O(length).
     void relationDel(char* row, int offset, char* target);
     /// Empties the list.
     void relationRemoveAll(char* row, int offset);
     /// Length of the list. O(length).
     static int relationGetCount(const char* row, int offset);
-    /// Makes room, so that `cells` more can be added without a move.
+    /// Ensures that `cells` more cells can be added without a move.
     void relationReserve(int cells, int offset);
     /// Walks a list: the first cell, the one after a cell, and the row a cell points to; null ends
     /// it.
@@ -120,8 +126,7 @@ public:
     /// Ends one skipCheck().
     void unskipCheck() { --skipCheck_; }
 
-    // Counters for clients that agree among themselves not to change locked data; the table itself
-    // ignores them.
+    // Counters for clients, which agree not to change locked data. The table itself ignores them.
 
     /// Raises the counter of the rows.
     void lockRows() { ++rowLocks_; }
@@ -129,15 +134,15 @@ public:
     void unlockRows() { --rowLocks_; }
     /// The counter of the rows.
     int rowLocks() const { return rowLocks_; }
-    /// Raises or lowers the counter of the column at `offset` and gives the column's index. An
-    /// unknown offset gives -1 and raises the counter of skipCheck() in its place, with either
-    /// function.
+    /// Increments or decrements the counter of the column at `offset` and returns the index of the
+    /// column. For an unknown offset, both functions return -1 and increment the counter of
+    /// skipCheck() instead.
     int lockRelation(int offset) { return changeRelationLock(offset, 1); }
     /// As above.
     int unlockRelation(int offset) { return changeRelationLock(offset, -1); }
 
-    /// Copies rows, columns and relations into an empty table, whose pointers to rows still point
-    /// to the old ones: KpDataBase::clone() corrects them.
+    /// Copies rows, columns and relations into an empty table. Its pointers to rows still point to
+    /// the old rows: KpDataBase::clone() corrects them.
     void clone(KpTable& target) const;
 
 private:

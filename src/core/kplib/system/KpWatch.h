@@ -5,12 +5,14 @@
 
 #include <cstdint>
 
-/// Stop watch on the system's monotonic counter, which adds up over several runs. One thread at a time.
+/// A stop watch on the system's monotonic counter, which adds up the time of several runs. One
+/// thread at a time.
 ///
-/// A watch that was only ever continued with cont(), before the first start() of any watch in the process, reports 0.
+/// A watch that was only continued by cont(), before the first start() of any watch in the
+/// process, reports 0.
 class KPLIB_API KpWatch {
 public:
-    /// Stopped at 0, or runs at once.
+    /// Starts the watch if `startNow`, otherwise it is stopped at 0.
     explicit KpWatch(bool startNow);
     /// The same with a label for dump(), copied; null for none.
     KpWatch(const char* name, bool startNow);
@@ -20,14 +22,14 @@ public:
     KpWatch& operator=(const KpWatch&) = delete;
     ~KpWatch();
 
-    /// Runs from 0.
+    /// Restarts from 0.
     void start();
-    /// Stops at 0.
+    /// Stops and sets the time to 0.
     void reset();
-    /// Runs on from the time gathered so far.
+    /// Continues from the time added up so far.
     void cont();
 
-    /// Stops and gives the time, in seconds or rounded to milliseconds (for up to 49 days).
+    /// Stops and returns the time, in seconds or rounded to milliseconds (for up to 49 days).
     /// Stopping a stopped watch adds the time since its last start once more.
     float stop();
     /// @{
@@ -47,8 +49,9 @@ public:
     /// Whether time is being added.
     bool isRunning() const { return running_; }
 
-    /// Writes one line to the log with name, `index` if not 0, the time so far, and how much that is since the last
-    /// dump(). Nothing without a name. The name is used as a printf() format: a percent sign in it has to be doubled.
+    /// Writes one line to the log with the name, `index` if not 0, the time so far, and the time
+    /// since the last dump(). Does nothing without a name. The name is used as a printf() format:
+    /// double each percent sign in it.
     void dump(int index);
 
 private:
@@ -62,7 +65,7 @@ private:
     std::uint64_t startTicks_ = 0;
 };
 
-/// Runs a watch for the length of a scope; one that runs already is left running.
+/// Runs a watch for the length of a scope. A watch that is running already stays running.
 class KPLIB_API KpScopedWatch {
 public:
     /// Continues `watch`, from 0 with `reset`.

@@ -2,7 +2,7 @@
 
 #include <kplib/foundation/KpExport.h>
 
-/// Something that can be invoked; a base for clients.
+/// Base of objects with one operation, for clients.
 class KPLIB_API KpCallable {
 public:
     KpCallable() = default;

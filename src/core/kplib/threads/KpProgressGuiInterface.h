@@ -6,8 +6,9 @@
 #include <functional>
 #include <string>
 
-/// What a user interface implements to show progress; KpProgressInterface::setProgressGui() attaches it, to one at a
-/// time. Values run from 0 to the maximum, which changes with the nesting of the work.
+/// A display of progress, implemented by a user interface. KpProgressInterface::setProgressGui()
+/// attaches it to one progress at a time. Values run from 0 to the maximum, which changes with the
+/// nesting of the work.
 class KPLIB_API KpProgressGuiInterface {
 public:
     KpProgressGuiInterface() = default;
@@ -16,13 +17,14 @@ public:
     /// Detaches itself.
     virtual ~KpProgressGuiInterface();
 
-    /// `text` is destroyed when the work is canceled: copy what is needed of it first.
+    /// Sets the text. `text` is destroyed when the work is cancelled: copy it first if it is
+    /// needed.
     virtual void setText(const std::string& text) = 0;
-    /// The scale of setValue() has changed.
+    /// Sets the maximum of setValue().
     virtual void setMaximum(int maximum) = 0;
-    /// The position on the scale.
+    /// Sets the position, from 0 to the maximum.
     virtual void setValue(int value) = 0;
-    /// The work has ended, with this outcome.
+    /// Called when the work has ended, with its outcome.
     virtual void setCompleted(const KpResult& result) = 0;
     /// Sets the title of the display; does nothing here.
     virtual void setWindowTitle(const std::string& title);
@@ -35,6 +37,7 @@ private:
     KpProgressInterface* progress_ = nullptr;
 
 protected:
-    /// Cancels the work; empty while detached. Call it when the user asks for that, on the thread of the work.
+    /// Cancels the work. Empty while detached. Call it on the thread of the work when the user
+    /// cancels.
     std::function<void()> cancelCallback;  // for derived classes to call, and so without _
 };

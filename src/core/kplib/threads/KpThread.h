@@ -6,43 +6,44 @@
 
 struct KpThreadPrivate;
 
-/// A thread of the platform that runs run() of a subclass, and can do so again when that has ended.
+/// A platform thread that runs run() of a subclass, and can run it again when it has ended.
 ///
-/// The object must outlive its run: its owner calls wait() before the destructor. An exception that leaves run() ends
-/// the process. Failures of the platform don't throw: they are written to the log. finished() and running() may be
-/// polled from any thread.
+/// The object must outlive the run: call wait() before the destructor. An exception that leaves
+/// run() ends the process. Platform failures do not throw; they are written to the log. finished()
+/// and running() may be polled from any thread.
 class KPLIB_API KpThread {
 public:
-    /// Named "KpThread %d" with the number of the objects made before.
+    /// The name is "KpThread %d" with the number of objects constructed before.
     KpThread();
-    /// Named so; null takes the generated name. The object counts in either case.
+    /// With that name; null stands for the generated name. The object is counted in both cases.
     explicit KpThread(const char* name);
     KpThread(const KpThread&) = delete;
     KpThread& operator=(const KpThread&) = delete;
     /// Neither stops the thread nor waits for it.
     virtual ~KpThread();
 
-    /// What the thread does.
+    /// The work of the thread.
     virtual void run() = 0;
 
-    /// Runs run() on a new thread; when one runs already, blocks until that has ended. If no thread can be made, a
-    /// warning is in the log, and the object counts as running until a later start() has a thread that ends.
+    /// Runs run() on a new thread. If a run is under way, blocks until it has ended. If no thread
+    /// can be created, logs a warning, and the object counts as running until a run of a later
+    /// start() has ended.
     void start();
 
-    /// Waits for the end of the run, at most `milliseconds`, ULONG_MAX for no limit. False if that was too short, and
-    /// at once if start() could make no thread; true if there was nothing to wait for. Waits once: a wake-up without a
-    /// cause counts as the end.
+    /// Waits for the end of the run, at most `milliseconds`; ULONG_MAX is no limit. Returns true
+    /// if the run has ended or there is none. Returns false if the time is too short, and at once
+    /// if start() could create no thread. Waits once: a spurious wake-up counts as the end.
     bool wait(unsigned long milliseconds = ULONG_MAX);
 
-    /// Whether a run has ended, and none has begun since. What run() wrote is then visible.
+    /// Whether a run has ended and no other has begun since. All writes of run() are then visible.
     bool finished() const;
     /// Whether start() was called and the run has not ended.
     bool running() const;
 
-    /// Gives up the processor.
+    /// Yields the processor.
     static void yield();
-    /// Suspend the caller for at least that time; a signal doesn't cut it short. msleep() counts microseconds in 32
-    /// bits, so its longest time is some 71 minutes, and longer ones wrap.
+    /// Suspends the caller for at least that time; a signal does not shorten it. msleep() counts
+    /// microseconds in 32 bits: its longest time is about 71 minutes, and longer times wrap.
     static void sleep(unsigned long seconds);
     /// As sleep(), in milliseconds.
     static void msleep(unsigned long milliseconds);
@@ -54,25 +55,26 @@ public:
     /// Replaces the name.
     void setThreadName(const char* name);
 
-    /// Names the calling thread for the tools of the platform, which may keep its first characters only.
+    /// Names the calling thread for the tools of the platform, which may truncate the name.
     void setThreadNameNative(const char* name);
 
 protected:
-    /// Whether a run is under way: running(), but false if start() could make no thread.
+    /// Whether a run is under way: running(), but false if start() could create no thread.
     bool hasThread() const;
 
 private:
     friend struct KpThreadPrivate;
 
-    KpThreadPrivate* record_;  // keeps the platform's thread header out of here
+    KpThreadPrivate* record_;  // hides the platform's thread header
 };
 
-/// The number of this process.
+/// The id of this process.
 KPLIB_API int tmCurrentProcessId();
 /// The platform's identifier of the calling thread, never 0.
 KPLIB_API unsigned long tmCurrentThreadId();
 
-/// The main thread is whichever asks first for one of these two, so an application asks from its real one at start-up.
+/// The id of the main thread, which is the first thread that calls this function or
+/// tmIsMainThread(). Call one of them on the real main thread at start-up.
 KPLIB_API unsigned long tmMainThreadId();
 /// Whether this is the main thread, see tmMainThreadId().
 KPLIB_API bool tmIsMainThread();

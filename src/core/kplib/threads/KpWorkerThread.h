@@ -6,7 +6,7 @@
 
 class KpWorkerThreadPrivate;
 
-/// One long-lived thread that performs one job again and again, whenever it is asked to.
+/// One long-lived thread that performs the same job repeatedly on request.
 ///
 ///     struct Sum : KpWorkerThread {
 ///         Sum() : KpWorkerThread("Sum") {}
@@ -18,16 +18,17 @@ class KpWorkerThreadPrivate;
 ///     sum.start(true);  // until the pass has ended
 ///     std::printf("%d\n", sum.result);  // prints: 7
 ///
-/// A subclass provides compute(), and stores the input of a pass before start(). There is no queue: one pass at a time.
-/// A pass costs two hand-overs between threads, not the making of one.
+/// A subclass implements compute() and stores the input of a pass before start(). There is no
+/// queue: one pass at a time. A pass costs two hand-overs between threads and creates no thread.
 ///
 ///     NotStarted --start--> Idle --start--> Computing --end of the pass--> Idle
 ///     Computing --suspend--> SuspendRequested --suspended()--> Suspended --resume--> Computing
 ///     Computing --cancel--> CancelRequested --end of the pass--> CanceledIdle, which accepts a start as Idle does
 ///     Idle, CanceledIdle --terminate--> TerminateRequested --computeDtor()--> NotStarted
 ///
-/// Two threads take part, the worker and one caller at a time; state(), canceled() and suspended() may be polled at the
-/// cost of a load. Requests bind only a compute() that polls. An exception that leaves compute() ends the process.
+/// Threads: the worker and one caller at a time. state(), canceled() and suspended() may be polled
+/// at the cost of a load. Requests have an effect only if compute() polls. An exception that
+/// leaves compute() ends the process.
 class KPLIB_API KpWorkerThread {
 public:
     /// The state of the worker.
@@ -37,8 +38,8 @@ public:
         Computing,          ///< compute() runs
         Suspended,          ///< compute() sleeps in suspended()
         CanceledIdle,       ///< waits for start(), the last pass was canceled
-        SuspendRequested,   ///< compute() hasn't noticed yet
-        CancelRequested,    ///< compute() hasn't returned yet
+        SuspendRequested,   ///< compute() has not polled yet
+        CancelRequested,    ///< compute() has not returned yet
         TerminateRequested  ///< the thread is about to end
     };
 
@@ -46,49 +47,55 @@ public:
     explicit KpWorkerThread(const char* name);
     KpWorkerThread(const KpWorkerThread&) = delete;
     KpWorkerThread& operator=(const KpWorkerThread&) = delete;
-    /// Terminates. A subclass calls terminate() in its own destructor: here compute() is gone already.
+    /// Calls terminate(). A subclass must call terminate() in its own destructor: here its
+    /// compute() no longer exists.
     virtual ~KpWorkerThread();
 
-    /// Runs on the worker thread before its first pass, to set up what belongs to the thread.
+    /// Called on the worker thread before its first pass, to initialise data of the thread.
     virtual void computeCtor();
     /// One pass.
     virtual void compute() = 0;
-    /// Runs on the worker thread after its last pass.
+    /// Called on the worker thread after its last pass.
     virtual void computeDtor();
 
-    /// Hands over one pass; the first one makes the thread, and waits for computeCtor(). With `waitForCaller` it
-    /// returns when the pass has ended, or has called wakeCaller(). False, and nothing is done, if a pass is under way,
-    /// or if no thread can be made, which is a warning in the log.
+    /// Starts one pass. The first call creates the thread and waits for computeCtor(). With
+    /// `waitForCaller` returns when the pass has ended or has called wakeCaller(). Returns false
+    /// and does nothing if a pass is under way, or if no thread can be created, which is a warning
+    /// in the log.
     bool start(bool waitForCaller);
 
-    /// Waits until the pass has ended or sleeps in suspended(). False at once if there was none. With `timedOut` it is
-    /// still under way after `milliseconds`, which each wake-up counts anew, and the result is true.
+    /// Waits until the pass has ended or sleeps in suspended(). Returns false at once if there is
+    /// no pass. Sets `timedOut` and returns true if the pass is still under way after
+    /// `milliseconds`; each wake-up restarts that time.
     bool wait(bool& timedOut, unsigned long milliseconds = ULONG_MAX);
     /// Without a time limit.
     bool wait();
 
-    /// Asks the pass to pause in its next suspended(). False if none is computing.
+    /// Requests the pass to pause in its next suspended(). Returns false if no pass is computing.
     bool suspend();
-    /// Lets a suspended pass go on. False if nothing slept; a request to pause is withdrawn all the same.
+    /// Continues a suspended pass. Returns false if no pass is suspended; a pending request to
+    /// pause is withdrawn in any case.
     bool resume();
-    /// Asks the pass, suspended or not, to end early. False if there is none to ask.
+    /// Requests the pass, suspended or not, to end early. Returns false if there is no pass.
     bool cancel();
-    /// Waits for the pass, a suspended one is resumed, and ends the thread; start() makes a new one. Always false.
+    /// Continues the pass if it is suspended, waits for its end, and ends the thread; start()
+    /// creates a new one. Always returns false.
     bool terminate();
 
     /// The State; the worker may change it at any time.
     int state() const;
 
-    /// The name, valid until it changes. The thread takes it over as it starts.
+    /// The name, valid until it changes. The thread takes the name that is set when it starts.
     const char* name() const;
     /// Replaces the name.
     void setName(const char* name);
 
     /// For compute(): whether to end early.
     bool canceled();
-    /// For compute(): sleeps here until resume() or cancel(), if suspend() asked for it. True if it did.
+    /// For compute(): sleeps until resume() or cancel() if suspend() has requested it, and returns
+    /// whether it did.
     bool suspended();
-    /// For compute(): lets start(true) return before the pass has ended.
+    /// For compute(): makes start(true) return before the pass has ended.
     void wakeCaller();
 
     /// Times 500 passes and writes the rate to the log.

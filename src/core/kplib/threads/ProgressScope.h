@@ -5,8 +5,8 @@
 
 #include <cstddef>
 
-/// Closes at the end of a C++ scope what was opened in it with KpProgressInterface::startWorking(), and nothing else;
-/// what was closed by hand is not closed again.
+/// Closes at the end of a C++ scope all scopes that were opened in it by
+/// KpProgressInterface::startWorking() and are still open.
 class KPLIB_API ProgressScope {
 public:
     /// `progress` may be null.
