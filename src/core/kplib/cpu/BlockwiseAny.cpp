@@ -1,6 +1,6 @@
 #include <kplib/cpu/Blockwise.h>
 
-// Copies through the caches: the language has no way around them.
+// Copies through the caches: the language has no stores that bypass them.
 
 void kplib::detail::streamCopy(void* dst, const void* src, long bytes)
 {

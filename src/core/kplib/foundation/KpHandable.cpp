@@ -7,7 +7,7 @@ void KpHandable::notifyDelete() {}
 void KpHandable::unrefLast() const
 {
     if (destructionInProgress_) {
-        ++refCount_;  // the count was 0 or less and stays so: what unref() took from it was taken in vain
+        ++refCount_;  // the count was 0 or less: restores what unref() subtracted
         return;
     }
     destructionInProgress_ = true;

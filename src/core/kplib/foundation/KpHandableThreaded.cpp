@@ -11,7 +11,7 @@ void KpHandableThreaded::unrefLast() const
         unlock();
         return;
     }
-    // Another thread may have taken a reference since, without the lock: then the object stays.
+    // If another thread has taken a reference since, without the lock, the object stays.
     int none = 0;
     const bool dies = refCount_.compare_exchange_strong(none, destructionCount, std::memory_order_acq_rel);
     unlock();

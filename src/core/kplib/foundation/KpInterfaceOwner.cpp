@@ -25,7 +25,7 @@ void KpInterfaceOwner::notifyDelete()
 {
     interfaces_.resize(0);
     while (ownedInterfaces_.size() > 0) {
-        // Out of the list before it goes, as its destructor may lead back here.
+        // Removed from the list before it is deleted, as its destructor may call this function.
         KpTypedObject* const last = ownedInterfaces_[ownedInterfaces_.size() - 1];
         ownedInterfaces_.resize(ownedInterfaces_.size() - 1);
         delete last;

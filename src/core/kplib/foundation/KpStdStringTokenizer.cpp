@@ -26,7 +26,7 @@ void KpStdStringTokenizer::nextToken(std::string& token)
     advance(begin_, end_);
 }
 
-// From the bounds of one token to those of the next; both npos behind the last.
+// Moves from the bounds of one token to those of the next; both are npos after the last one.
 void KpStdStringTokenizer::advance(size_t& begin, size_t& end) const
 {
     begin = str_.find_first_not_of(delimiters_, end);

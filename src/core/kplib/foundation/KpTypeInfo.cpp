@@ -33,7 +33,7 @@ KpTypeInfo::KpTypeInfo(const char* name) : name_(name) {}
 KpTypeInfo::KpTypeInfo(const char* name, Factory create, const KpTypeInfo* parent1, const KpTypeInfo* parent2) :
     name_(name), factory_(create), parent1_(parent1), parent2_(parent2)
 {
-    // The registry is complete before this object is, and so outlives it where both are static.
+    // The registry is constructed before this object, so it outlives a static object.
     allTypes().reserveOne();
     allTypes().insertSorted(this, compareNames);
 }

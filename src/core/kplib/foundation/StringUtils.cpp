@@ -35,7 +35,7 @@ unsigned long StringUtils::toULong(const char* s, unsigned long defaultValue, bo
 bool kpWildMatch(const char* text, const char* pattern)
 {
     const char* const start = pattern;
-    const char* resume = nullptr;  // behind the last run of `*`
+    const char* resume = nullptr;  // after the last run of `*`
     while (*pattern && *text) {
         if (*pattern == '*') {
             while (*pattern == '*')
@@ -49,7 +49,7 @@ bool kpWildMatch(const char* text, const char* pattern)
         else if (!resume)
             return false;
         else
-            pattern = resume;  // the text doesn't go back
+            pattern = resume;  // never moves back in the text
         ++text;
     }
     while (*pattern == '*')

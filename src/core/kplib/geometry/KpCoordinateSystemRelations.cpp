@@ -9,8 +9,8 @@ namespace {
 
 using Path = std::vector<const KpAbstractCoordinateSystem*>;
 
-// Visits `start`, its parent and so on for as long as `visit` gives true. Handles are taken to parents alone, which
-// their children hold: the only handle to `start` would delete it in its end.
+// Visits `start`, its parent and so on while `visit` returns true. Takes handles to parents only,
+// which their children hold: the only handle to `start` would delete it at the end.
 template <typename Visit>
 void walkUp(const KpAbstractCoordinateSystem& start, Visit visit)
 {
@@ -29,7 +29,7 @@ Path pathOf(const KpAbstractCoordinateSystem& start)
     return path;
 }
 
-// The product of the matrices from `start` to `last`, or to the root if `last` is not met.
+// The product of the matrices from `start` to `last`, or to the root if `last` is not an ancestor.
 KpMat4f chain(const KpAbstractCoordinateSystem& start, const KpAbstractCoordinateSystem* last)
 {
     KpMat4f matrix = KpMat4f::identity();

@@ -85,7 +85,7 @@ bool KpLine::intersect(float angle, const KpVec3f& point) const
     const float t = r.dot(direction_);
     if (!(t > 0))
         return false;
-    // Of a point on the line rounding may leave less than 0.
+    // For a point on the line, rounding may give a value below 0.
     const float squaredGap = std::max(r.dot(r) - t * t, 0.0F);
     return isPicked(angle, std::sqrt(squaredGap), t);
 }
@@ -98,7 +98,8 @@ bool KpLine::intersect(float angle, const KpVec3f& p0, const KpVec3f& p1, KpVec3
             onSegment = p0;
         else if ((p0 - p1).dot(onSegment - p1) < 0)
             onSegment = p1;
-        // The gap is measured from where the unbounded lines are nearest, also if the end of the segment is taken.
+        // Intentional: the gap is measured between the nearest points of the unbounded lines, even
+        // if an end of the segment is the result.
         const float gap = (onSegment - onThis).length();
         if (isPicked(angle, gap, (onThis - position_).length())) {
             out = onSegment;

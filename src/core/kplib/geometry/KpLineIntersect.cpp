@@ -14,7 +14,7 @@ namespace {
 constexpr float unbounded = 1e38F;
 constexpr float least = 1e-10F;  // below it a length, a cosine or an edge counts as 0
 
-// The parameters between which a line is inside all slabs that it has been held against.
+// The parameters between which a line is inside all slabs tested so far.
 struct Range {
     float entry = -unbounded;
     float exit = unbounded;

@@ -84,7 +84,7 @@ void KpMat4f::setTransform(const KpVec3f& translation, const KpRotation& rotatio
 {
     const bool isCentered = !(center == KpVec3f(0, 0, 0));
     makeIdentity();
-    // What changes nothing is left out, so that it doesn't round anything either.
+    // Factors that change nothing are left out, so that they cause no rounding.
     const auto applyBefore = [this](bool isWanted, const auto& matrix) {
         if (isWanted)
             *this = matrix() * *this;

@@ -16,7 +16,7 @@ namespace {
 
 constexpr float cosineTolerance = 0.0001F;
 
-// The cosine of the angle between two directions of any length; nothing for one that hasn't any.
+// The cosine of the angle between two directions of any length; nothing if one is too short.
 std::optional<float> cosine(KpVec3f a, KpVec3f b)
 {
     constexpr float shortest = 1e-6F;

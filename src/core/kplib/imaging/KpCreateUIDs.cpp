@@ -13,7 +13,7 @@ namespace {
 
 std::atomic<long long> sCounter = 0;  // the last one given
 
-constexpr long long sMacAddress = 84320313;  // stands for the node: all hosts share it
+constexpr long long sMacAddress = 84320313;  // in place of a node: all hosts share it
 
 std::tm localTime(std::time_t time)
 {
@@ -35,7 +35,8 @@ long long timeStamp(std::time_t time)
     return ((date * 100LL + local.tm_min) * 100 + local.tm_sec) * 100000;
 }
 
-// The stamp of this second. Asking the C library takes a lock that all threads share, so each asks once a second.
+// The stamp of this second. The C library takes a lock that all threads share, so each thread
+// calls it once a second.
 long long currentTimeStamp()
 {
     thread_local std::time_t second = -1;

@@ -8,7 +8,8 @@
 
 namespace {
 
-// Opposite letters stand at the same place; the two of patient axis i stand at 2 i and 2 i + 1, the positive one first.
+// Opposite letters have the same index; those of patient axis i are at 2 i and 2 i + 1, the
+// positive one first.
 constexpr std::string_view sAlphabet = "LRPAHF";
 constexpr std::string_view sAlphabetInv = "RLAPFH";
 
@@ -17,7 +18,7 @@ KpVec3f absolute(const KpVec3f& v)
     return {std::abs(v.x()), std::abs(v.y()), std::abs(v.z())};
 }
 
-// Of equals the first.
+// Of equal ones the first.
 int largestComponent(const KpVec3f& v)
 {
     int largest = 0;
@@ -28,7 +29,7 @@ int largestComponent(const KpVec3f& v)
     return largest;
 }
 
-// Of equals the last, other than above; both are meant.
+// Intentional: of equal ones the last, unlike above.
 int lastLargestComponent(const KpVec3f& v)
 {
     if (v.x() > v.y())

@@ -35,7 +35,7 @@ KpString hashOf(const KpDArray<Text>& list)
     return text;
 }
 
-// What all texts begin with.
+// The prefix of all texts.
 template <typename Text>
 std::string_view commonPrefix(const KpDArray<Text>& list)
 {
@@ -70,7 +70,8 @@ void store(HxParamBundle* bundle, const KpDArray<Text>& list)
     }
 }
 
-// Calls `visit` with the number and the text of each image until it gives false; gives whether it never did.
+// Calls `visit` with the number and the text of each image until it returns false. Returns true if
+// it never did.
 template <typename Visit>
 bool forEachImage(const HxParamBundle& bundle, Visit&& visit)
 {
@@ -84,7 +85,7 @@ bool forEachImage(const HxParamBundle& bundle, Visit&& visit)
     return true;
 }
 
-// The last parameter of exactly that name, wherever it stands: look-ups would ignore the case.
+// The last parameter of exactly that name at any level: look-ups would ignore the case.
 std::string prefixOf(const HxParamBundle& bundle)
 {
     std::string prefix;
@@ -106,7 +107,7 @@ bool canHold(const HxParamBundle& object, long frames, long instances)
     return frames * instances <= mostEntries || (items && frames <= items->size());
 }
 
-// An entry whose frame is the number behind its last point.
+// An entry whose frame is the number after its last point.
 bool splitFrame(const std::string& text, KpSOPInstanceUtility::SopUIDAndFrame& entry)
 {
     const size_t dot = text.rfind('.');

@@ -8,15 +8,15 @@ namespace {
 
 constexpr char separator = '\\';
 
-// As std::to_string() wrote it before it went over to the shortest text.
+// The text of std::to_string() before C++26, which writes the shortest one.
 std::string sixDecimals(float value)
 {
-    char text[64];  // FLT_MAX has 39 digits in front
+    char text[64];  // FLT_MAX has 39 digits before the point
     std::snprintf(text, sizeof text, "%f", static_cast<double>(value));
     return text;
 }
 
-// All pieces between separators, empty ones too.
+// All parts between separators, empty ones too.
 std::vector<std::string> values(const std::string& text)
 {
     std::vector<std::string> pieces;

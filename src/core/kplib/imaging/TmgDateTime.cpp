@@ -29,7 +29,7 @@ std::string padded(int width, long long value)
     return text;
 }
 
-// The digits of a number that got a 1 in front to keep its leading zeros.
+// The digits of a number after its first one, a 1 that keeps leading zeros.
 std::string withoutFirst(int value)
 {
     return std::to_string(value).substr(1);

@@ -37,7 +37,7 @@ const char* headerText(const HxParamBundle& object, const char* tag)
     return all && all->findString(tag, text) ? text : nullptr;
 }
 
-// Takes the next field, up to a comma, off `fields`; false behind the last one.
+// Takes the next field, up to a comma, off `fields`; false after the last one.
 bool nextField(const char*& fields, std::string_view& field)
 {
     if (!fields)
@@ -48,7 +48,7 @@ bool nextField(const char*& fields, std::string_view& field)
     return true;
 }
 
-// The field of `values` that stands where `name` stands in `names`; false without one.
+// The field of `values` at the position of `name` in `names`; false without one.
 bool findField(const char* names, const char* values, std::string_view name, std::string_view& value)
 {
     std::string_view each;
@@ -65,7 +65,8 @@ bool hasOneImage(const HxParamBundle& bundle, const char* name)
     return bundle.findNum(name, 1, &count) && count == 1;
 }
 
-// Whether what the header of the volume says of a tag may differ from what one of its images says.
+// Whether the value of a tag in the header of the volume may differ from that of one of its
+// images.
 bool isApproximate(const HxParamBundle& object, const HxParamBundle* list, const char* tag)
 {
     if (list && hasOneImage(*list, countName))

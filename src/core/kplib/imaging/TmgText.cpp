@@ -29,7 +29,7 @@ bool hasValue(const KpString& values, const KpString& value, const char* separat
     return false;
 }
 
-// The separator that stands last in `values`, else the first that there is.
+// The separator with the last position in `values`, or the first separator if none occurs.
 char separatorFor(std::string_view values, const char* separators)
 {
     const size_t last = values.find_last_of(separators);

@@ -17,7 +17,7 @@ namespace {
 
 using Lock = KpScopedLockT<KpMutex>;
 
-// Whoever logs first makes the log; this makes it at the latest.
+// The first message creates the log; this creates it at the latest.
 [[maybe_unused]] KpLogFile* const s_theLogInstance = &getTheLogInstance();
 
 KpString joined(std::initializer_list<std::string_view> pieces)
@@ -47,8 +47,8 @@ void traceFormatted(KpLogFile& log, KpLogLevel level, const char* module, const 
     log.trace(level, module, text);
 }
 
-// Writes both texts in one call as far as the system does so; goes on after a signal and after a part. Gives the number
-// of bytes written, with the cause in errno if some are missing.
+// Writes both texts, in one call if the system accepts all bytes; continues after a signal and
+// after a part. Returns the number of bytes written, with the cause in errno if some are missing.
 std::size_t writeAll(int file, std::string_view text, std::string_view ending)
 {
     std::size_t done = 0;
@@ -66,7 +66,7 @@ std::size_t writeAll(int file, std::string_view text, std::string_view ending)
     return done;
 }
 
-// As one piece and in order, also for other writers to the stream of standard output.
+// In one piece, and in order with other writers to the stream of standard output.
 std::size_t put(int destination, std::string_view text, std::string_view ending)
 {
     if (destination != STDOUT_FILENO)
@@ -109,8 +109,8 @@ bool KpLogFilePrivate::writeToFile(int destination, std::string_view text, std::
     return false;
 }
 
-// One line with the number of lost lines, tried before each line until the file takes it; but not at the head of a
-// file, where the name of the file before stands.
+// Writes one line with the number of lost lines. Repeated before each line until the file accepts
+// it, but not at the start of a file, which names the file before.
 void KpLogFilePrivate::reportLostLines()
 {
     if (file < 0 || linesLost == 0 || bytesWritten == 0)

@@ -8,7 +8,8 @@ KpLogFileDefaultModuleModifier::KpLogFileDefaultModuleModifier() :
 {
 }
 
-// By way of the other constructor, so that the destructor runs if there is no memory for the new module.
+// Delegates to the other constructor, so that the destructor runs if there is no memory for the
+// new module.
 KpLogFileDefaultModuleModifier::KpLogFileDefaultModuleModifier(const char* module) : KpLogFileDefaultModuleModifier()
 {
     getTheLogInstance().setDefaultModule(module);

@@ -26,7 +26,7 @@
 // failure leaves the log as it was:
 //
 //     open the next file; stop here if that fails
-//     close the last one; if it had 1 and 2, closeFile() leads them to the terminal, if there is one
+//     close the last one; closeFile() leads 1 and 2 back to the terminal if they led to the file
 //     write to the next one: useFile() leads 1 and 2 to it if the flag is set
 //     remove the oldest files: cleanUp()
 //

@@ -27,8 +27,9 @@ std::string requestText(const std::string& host, const std::string& path, unsign
 
 }  // namespace
 
-// While one lives the descriptor stays open, so that no system call meets another descriptor of the same number; a
-// connection that is closed meanwhile is shut down, which wakes the call, and closed in the end.
+// While an object exists the descriptor stays open, so that no system call uses another file of
+// the same number. A connection that is closed meanwhile is shut down, which wakes the call, and
+// is closed with the last object.
 class KpHttpGet::SocketInUse {
 public:
     explicit SocketInUse(KpHttpGet& owner) : owner_(owner)
@@ -104,7 +105,7 @@ bool KpHttpGet::request(const char* url, unsigned long first, unsigned long last
     if (!setURL(url))
         return false;
     if (state_ == RequestSent || state_ == ReadingBody)
-        closeConnection(NotConnected);  // the rest of that response would stand before this one
+        closeConnection(NotConnected);  // the rest of that response would precede this one
     if (socket_ < 0 && !connect())
         return false;
     const std::string text = requestText(host_, path_, first, last);
@@ -143,7 +144,8 @@ bool KpHttpGet::connect()
     const SocketInUse socket(*this);
     KpSocket::nonBlocking(socket);
     const Connection connection = kplib::detail::beginConnecting(socket, host_.c_str(), port_);
-    // cancel() ends the wait for a connection that is under way; if it came before, it is seen here.
+    // cancel() ends the wait for a connection that is under way. An earlier cancel() is noticed
+    // here.
     const bool isMade = connection == Connection::Made ||
                         (connection == Connection::UnderWay && !isCanceled() && kplib::detail::awaitConnection(socket));
     const KpString cause = isMade ? KpString() : KpSocket::lastError();
@@ -179,7 +181,7 @@ bool KpHttpGet::readResponse()
     return true;
 }
 
-// Looks ahead, so that the body stays in the socket and goes from there to where the caller wants it.
+// Peeks, so that the body stays in the socket and read() stores it in the caller's memory.
 bool KpHttpGet::receiveHead(HttpHead& head)
 {
     const SocketInUse socket(*this);

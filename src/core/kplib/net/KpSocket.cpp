@@ -31,7 +31,7 @@ int setOption(int socket, int level, int option, const T& value)
     return setsockopt(socket, level, option, &value, sizeof(value));
 }
 
-// Sets or clears O_NONBLOCK, with no call for what is so already.
+// Sets or clears O_NONBLOCK, without a call if it is as required.
 int setNonBlocking(int socket, bool enable)
 {
     const int flags = fcntl(socket, F_GETFL);
@@ -134,7 +134,7 @@ int KpSocket::connect(const char* host, int port, int /*ignored*/, int receiveBu
 
 int KpSocket::close(int socket)
 {
-    return ::close(socket);  // never twice: an interrupted close() has closed, and the number may be another's by then
+    return ::close(socket);  // never twice: an interrupted close() has closed, and the number may be in use again
 }
 
 bool KpSocket::isNonBlocking(int socket)

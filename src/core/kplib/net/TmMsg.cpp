@@ -26,7 +26,7 @@ TmMsg& TmMsg::operator=(const TmMsg& other)
 void TmMsg::take(TmMsg& other)
 {
     buffer_.swap(other.buffer_);
-    // Whose storage it is goes with the storage.
+    // The ownership of the storage is exchanged with the storage.
     const bool external = externalData_ != 0;
     externalData_ = other.externalData_;
     other.externalData_ = external ? 1 : 0;
@@ -50,8 +50,7 @@ void TmMsg::resize(long size)
     if (size > buffer_.capacity())
         own();
     buffer_.resize(size);
-    if (externalData_)  // no room behind the size either, so that what is appended doesn't go into somebody else's
-                        // bytes
+    if (externalData_)  // no room after the size either: bytes are not appended in the caller's storage
         buffer_.setStorage(buffer_.data(), buffer_.size(), buffer_.size());
 }
 
@@ -91,7 +90,7 @@ void TmMsg::becomeZeros(unsigned long size)
     buffer_.setStorage(zeros, static_cast<long>(size), static_cast<long>(size));
 }
 
-// Storage of somebody else is never reallocated: it is copied before it has to grow.
+// Storage of the caller is never reallocated: it is copied before it has to grow.
 void TmMsg::own()
 {
     if (!externalData_)
@@ -101,7 +100,7 @@ void TmMsg::own()
     buffer_.swap(copy);
 }
 
-// Lets go of storage of somebody else.
+// Drops storage of the caller.
 void TmMsg::disown()
 {
     if (externalData_)

@@ -13,7 +13,7 @@ using namespace kplib::detail;
 
 namespace {
 
-// Appends bytes that are not initialised, and gives where they begin.
+// Appends uninitialised bytes, and returns where they begin.
 unsigned char* append(TmMsg& msg, long bytes)
 {
     const auto at = static_cast<long>(msg.size());
@@ -32,7 +32,7 @@ void writeVoxels(TmMsg& msg, const TmDataAccess& object)
         std::memset(voxels, 0, static_cast<unsigned long>(bytes));
         return;
     }
-    msg.resize(at);  // the storage stays, so that no run has to ask for more
+    msg.resize(at);  // the storage stays, so that no run allocates more
     object.eachVoxelRun([&](const void* run, unsigned long n) { msg.writeRawBytes(n, run); });
 }
 

@@ -16,7 +16,8 @@
 #include <cstdint>
 #include <cstring>
 
-// The sizes that peers of other builds count on; those of the geometry are stated with its classes.
+// The sizes that peers of other builds depend on; those of the geometry are stated with its
+// classes.
 static_assert(sizeof(bool) == 1 && sizeof(long) == 8 && sizeof(KpPrimType) == 4);
 static_assert(sizeof(KpUniqueID) == 8 && sizeof(KpTransferID) == 8 && sizeof(KpFrameID) == 8);
 static_assert(sizeof(KpRemotificationID) == 4 && sizeof(TmSessionContextID) == 4);
@@ -81,7 +82,7 @@ TmMsg& operator>>(TmMsg& msg, KpBitfield& field)
     const unsigned long bytes = nBits > 0 ? (nBits / 32UL + 1) * sizeof(std::uint32_t) : 0;
     void* words = nullptr;
     msg.readRawBytes(bytes, words);
-    field.resize(words ? nBits : 0, KpBitfield::INIT_NONE);  // no memory for bits that didn't come
+    field.resize(words ? nBits : 0, KpBitfield::INIT_NONE);  // no memory for bits that are missing
     if (words && bytes > 0)
         std::memcpy(field.data(), words, bytes);
     return msg;
@@ -108,7 +109,7 @@ TmMsg& operator>>(TmMsg& msg, KpTypedData2D& image)
     int height = 0;
     msg >> nDataVar >> type >> width >> height;
     const KpPrimType primType(type);
-    unsigned int bytes = 0;  // in 32 bits, also where peers have more: what those don't hold is no image
+    unsigned int bytes = 0;  // in 32 bits, also if peers have more: a larger value is no image
     const bool isCounted = !__builtin_mul_overflow(width, height, &bytes) && width >= 0 &&
                            !__builtin_mul_overflow(bytes, nDataVar, &bytes) &&
                            !__builtin_mul_overflow(bytes, primType.size(), &bytes);
@@ -129,7 +130,7 @@ TmMsg& operator>>(TmMsg& msg, KpTypedData2D& image)
 TmMsg& operator<<(TmMsg& msg, const TmMsg& inner)
 {
     constexpr int mark = 0x6677;
-    const unsigned long size = inner.size();  // before the marks: a message may go into itself
+    const unsigned long size = inner.size();  // before the marks: a message may be appended to itself
     msg << mark << mark << mark << mark << static_cast<unsigned int>(size);
     msg.writeRawBytes(size, inner.dataPtr());
     return msg;
@@ -141,7 +142,7 @@ TmMsg& operator>>(TmMsg& msg, TmMsg& inner)
     msg.readRawBytes(4 * sizeof(int), marks);
     unsigned int count = 0;
     msg >> count;
-    inner = TmMsg();  // lets go of storage of somebody else; its own stays
+    inner = TmMsg();  // drops storage of the caller; its own stays
     if (msg.holds(count))
         inner.reset(count);
     else

@@ -19,7 +19,7 @@ namespace {
 
 using OwnedText = std::unique_ptr<char, KpFree>;
 
-// In a block of its own, filled up with zeros for NameKey.
+// In a block of its own, padded with zeros for NameKey.
 OwnedText nameCopy(const char* text)
 {
     constexpr size_t block = kplib::detail::nameBlock;
@@ -43,7 +43,7 @@ OwnedText generatedName(HxParamBase::Type type)
     return nameCopy(text);
 }
 
-// Ends `name` at its first blank; gives what follows, null without one.
+// Ends `name` at its first blank, and returns what follows, or null without one.
 char* cutAtBlank(char* name)
 {
     char* const blank = std::strchr(name, ' ');
@@ -81,7 +81,7 @@ char cleaned(char c)
     }
 }
 
-// Puts the tokens of `title` other than `name` together; false without any. Quotes may hold an empty one.
+// Joins the tokens of `title` other than `name`; false without any. Quotes may hold an empty one.
 bool tokensOtherThan(const char* name, const char* title, KpString& others)
 {
     bool any = false;

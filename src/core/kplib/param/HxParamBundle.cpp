@@ -13,7 +13,8 @@ HxParamBundle* HxParamBundle::create(const char* name)
     return new HxParamBundle(name);
 }
 
-// The constructors that may fail halfway stand on these two: once they are through, the destructor clears up.
+// The constructors that may throw delegate to these two: once these return, the destructor frees
+// the children.
 HxParamBundle::HxParamBundle(const char* name, Untitled) : HxParamBase(TypeParameter, name)
 {
     type_ = TypeBundle;
@@ -51,7 +52,7 @@ HxParamBundle& HxParamBundle::operator=(const HxParamBundle& other)
 {
     if (this == &other)
         return *this;
-    HxParamBundle fresh(other);  // first, since `other` may be one of the children that go
+    HxParamBundle fresh(other);  // first, since `other` may be one of the children that are deleted
     const std::uint32_t sorted = other.counts() & sortedBit;
     HxParamBase::operator=(other);
     swapChildren(fresh);
@@ -145,7 +146,7 @@ void HxParamBundle::move(HxParamBundle& other)
 void HxParamBundle::insert(HxParamBase* node, int replace)
 {
     std::unique_ptr<HxParamBase> owned(node);
-    if (node->isBundle()) {  // each of the two names finds the bundle by the other: crossed, and meant
+    if (node->isBundle()) {  // intentional: crossed, each of the two names finds the bundle by the other
         if (std::strcmp(node->name(), "BoundaryIds") == 0)
             static_cast<HxParamBundle*>(node)->set("name", "BoundaryConditions");
         else if (std::strcmp(node->name(), "BoundaryConditions") == 0)
@@ -183,7 +184,7 @@ void HxParamBundle::reserve(long more)
         children_.remax(std::max(static_cast<long>(static_cast<double>(size()) * 1.5), needed));
 }
 
-// Takes a child out without a record of it, and gives it to the caller.
+// Removes a child without a record of it, and passes it to the caller.
 HxParamBase* HxParamBundle::takeAt(long i)
 {
     HxParamBase* const node = children_[i];

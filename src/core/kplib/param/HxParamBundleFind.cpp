@@ -55,7 +55,7 @@ int takers(KpPrimType type)
 }
 
 // The numbers at the start of a text; false if it ends before the last one. What is no digit, `-` or blank is never
-// passed, so that all further numbers are read there. Intentional: callers depend on it.
+// passed, so all further numbers are read there. Intentional: callers depend on it.
 bool readNumbers(const char* text, int n, int* out)
 {
     for (int i = 0; i < n; ++i) {

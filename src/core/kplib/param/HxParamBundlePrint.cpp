@@ -27,7 +27,8 @@ void appendIndent(KpString& out, int indent)
         out += "    ";
 }
 
-// A text that is escaped in part loses its double quotes for single ones and keeps the backslashes: odd, and meant.
+// Intentional: a text that is escaped in part gets single quotes for double ones and keeps the
+// backslashes.
 void escapeDoubleQuotes(KpString& text)
 {
     const bool isEscaped = std::strstr(text, "\\\"");
@@ -45,7 +46,7 @@ void appendQuoted(KpString& out, const char* text)
         out += text;
     }
     if (out[out.size() - 2] == '\\')
-        out += ' ';  // so that the closing quote doesn't read as escaped
+        out += ' ';  // so that the closing quote is not read as escaped
     out += '"';
 }
 
@@ -61,7 +62,8 @@ void appendParameter(KpString& out, const HxParameter& parameter)
     appendQuoted(out, text ? text : "");
 }
 
-// Index of the last child that goes into a file; no comma stands from there on. 0 while none are written.
+// Index of the last child that is written to a file; no comma follows it. 0 while none are
+// written.
 long lastSaved(const HxParamBundle& bundle)
 {
     long last = interpreteNoSave > 0 ? bundle.size() - 1 : 0;

@@ -5,7 +5,8 @@
 #include <algorithm>
 #include <cstdio>
 
-// Sets what find() gives by the setter of that form, or adds a parameter by the constructor of that form.
+// Sets the parameter that find() returns by the setter of that form, or adds one by the
+// constructor of that form.
 template <typename... Value>
 void HxParamBundle::setOrAdd(const char* name, Value... value)
 {

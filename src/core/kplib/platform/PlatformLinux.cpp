@@ -18,7 +18,7 @@
 namespace kplib::platform {
 namespace {
 
-// The word that a file of a processor's topology holds; false for a processor that is offline.
+// Reads the word in a file of a processor's topology; false if the processor is offline.
 bool readTopology(long processor, const char* file, std::string& value)
 {
     std::ifstream in("/sys/devices/system/cpu/cpu" + std::to_string(processor) + "/topology/" + file);
@@ -102,7 +102,7 @@ bool availableMemory(std::uint64_t& bytes)
 
 bool processMemory(std::int64_t /*process*/, ProcessMemory& /*memory*/)
 {
-    return false;  // no figures here that mean the same as where these are read
+    return false;  // this system has no figures with the same meaning
 }
 
 void setThreadName(const char* name)

@@ -15,7 +15,8 @@ namespace {
 
 constexpr std::uint64_t eachByte = 0x0101010101010101;
 
-// What eight positions with these flags get, a byte each: all ones if flagged, and the number of flags before it.
+// The results of eight positions with these flags, a byte each: all ones if flagged, and the
+// number of flags before it.
 struct Eight {
     std::uint64_t isFlagged = 0;
     std::uint64_t rank = 0;

@@ -13,7 +13,7 @@ namespace {
 
 using namespace kplib::detail;
 
-// Storage of malloc, freed at the end of its scope unless it was given away.
+// Storage of malloc, freed at the end of its scope unless it is released.
 class Storage {
 public:
     explicit Storage(unsigned long size) : data_(static_cast<char*>(std::malloc(size))) {}
@@ -27,7 +27,7 @@ private:
     char* data_;
 };
 
-constexpr unsigned long exchangeSize = 16384;  // of a piece that is exchanged by way of the first cache
+constexpr unsigned long exchangeSize = 16384;  // of a piece that is exchanged through the first cache
 
 // Large items, in pieces that stay in registers.
 void exchange(char* a, char* b, unsigned long bytes)
@@ -111,7 +111,8 @@ struct Box {
     long row(long y, long z) const { return (z * size[1] + y) * size[0]; }
 };
 
-// Rows are packed towards the head; a row may overlap its own target, but never one that is still to come.
+// Rows are packed towards the head; a row may overlap its own target, but not the target of a
+// later row.
 void packRows(char* data, long voxel, const Box& box)
 {
     char* to = data;
@@ -131,7 +132,7 @@ char* repeat(char* to, const void* value, long voxel, long n)
     return to;
 }
 
-// One row of the box out of the row of the block that lies there, or is the nearest to it.
+// One row of the box, from the row of the block at its place or the nearest one.
 char* extendRow(char* to, const char* row, long voxel, const Box& box, const void* fillValue)
 {
     const long end = box.first[0] + box.count[0];

@@ -22,7 +22,7 @@ struct Grid {
     bool hasFactors() const { return factor[0] >= 1 && factor[1] >= 1 && factor[2] >= 1; }
     // Whether no factor exceeds its size by more than one, which is an axis without blocks.
     bool isWithin() const { return within(0) && within(1) && within(2); }
-    // Null will do where nothing is read and written; the progress runs all the same.
+    // Null is accepted if nothing is read and written; the progress is reported all the same.
     bool accepts(const void* dst, const void* src) const
     {
         return (dst && src) || !(blocks(0) && blocks(1) && blocks(2));
@@ -91,7 +91,7 @@ void downSample(BlockRule rule, void* dst, KpTypedPointer src, const Grid& grid,
     eachLayer(grid, progress, makeLayer, [&](long k) { return k * row.fz + 1; });
 }
 
-// FX is the factor, 0 if known at run time only.
+// FX is the factor, or 0 if it is known at run time only.
 template <int FX, typename Word>
 void takeEvery(Loose<Word>* __restrict to, const Loose<Word>* __restrict from, long n, long factor)
 {

@@ -103,7 +103,7 @@ unsigned long KpRawData::write(int fd, const void* data, unsigned long size)
     unsigned long done = 0;
     while (done < size) {
         const ssize_t put = ::write(fd, static_cast<const char*>(data) + done, size - done);
-        if (put <= 0)  // nothing written counts as a failure too: it would go on for ever
+        if (put <= 0)  // 0 bytes written is a failure too: the loop would not end
             return ~0UL;
         done += static_cast<unsigned long>(put);
     }

@@ -47,7 +47,8 @@ void eachElement(void* first, long step, long n, Each each)
 
 }  // namespace
 
-// A message may announce a volume without a voxel that is long on one axis; there is nothing behind its lines.
+// A message may announce a volume without voxels that is long on one axis; its lines have no
+// memory.
 bool TmDataAccess::hasVoxels() const
 {
     return hasData() && nDataVar_ > 0 && dims_[0] > 0 && dims_[1] > 0 && dims_[2] > 0;
@@ -76,7 +77,7 @@ KpResult TmDataAccess::putRow(long x, long y, long z, const float* in) const
     return {};
 }
 
-// A line is read and written as floats, by way of a 32-bit integer.
+// A line is read and written as floats, through a 32-bit integer.
 template <typename T>
 constexpr bool fitsIntoLine = std::is_floating_point_v<T> || sizeof(T) <= sizeof(std::int32_t);
 

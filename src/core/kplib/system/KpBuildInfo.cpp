@@ -52,7 +52,7 @@ const std::map<std::string, std::string>& tags()
     return sTags;
 }
 
-// What stands in the brackets of a build string; it may be nothing.
+// The text in the brackets of a build string, which may be empty.
 std::string details(int flags)
 {
     std::string inside;

@@ -8,7 +8,8 @@
 #include <dlfcn.h>
 #include <string>
 
-// The log takes the first text of each call as its format, so "DSO" is all that it shows of most of them. It stays so.
+// Intentional: the log takes the first text of each call as its format, so it shows only "DSO" of
+// most of them.
 #pragma GCC diagnostic ignored "-Wformat-extra-args"
 
 KpDArray<char*> KpDSO::dsoSearchPath;

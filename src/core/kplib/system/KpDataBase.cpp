@@ -58,8 +58,8 @@ void KpDataBase::clone(KpDataBase& target) const
     target.unskipCheck();
 }
 
-// Leads the columns of a table cloned from `source`, and all they point to, to the tables of this table's own
-// database.
+// Replaces the targets and the row pointers of the columns, for a table cloned from `source`, by
+// those of this table's own database.
 void KpTable::adoptTargets(const KpDataBase& source)
 {
     for (int column = columnCount_ - 1; column >= 0; --column) {

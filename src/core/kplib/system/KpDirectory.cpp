@@ -43,7 +43,8 @@ const dirent* nextEntry(const Folder& folder)
     return readdir(folder.get());
 }
 
-// Calls `visit` with the name of each wanted entry and with a question whether it is a folder.
+// Calls `visit` with the name of each wanted entry and with a function that returns whether it is
+// a folder.
 template <typename Visit>
 bool walk(const char* dir, const char* pattern, Visit visit)
 {
@@ -79,7 +80,8 @@ bool copyLink(const char* source, const char* target)
     return readlink(source, text, sizeof(text) - 1) > 0 && symlink(text, target) == 0;
 }
 
-// Copies a file, or a link as a link. To open a pipe or a device might block for ever.
+// Copies a file, or a link as a link; nothing else, as opening a pipe or a device might block
+// forever.
 void copyEntry(const KpString& source, const KpString& target)
 {
     struct stat status {};
@@ -115,7 +117,8 @@ int copyTree(const char* source, const char* target, const struct stat* newFolde
     return 0;
 }
 
-// Whether the path is a link; slashes behind it, with which the system would follow the link, don't count.
+// Whether the path is a link. Trailing slashes, with which the system would follow the link, are
+// ignored.
 bool isLink(const char* path)
 {
     const std::string_view text(path);
@@ -233,6 +236,6 @@ try {
         deleted(unlink(file), file);
     }
     return deleted(rmdir(path), path);
-} catch (...) {  // out of memory, for which destructors have no use
+} catch (...) {  // out of memory, which a destructor cannot report
     return -1;
 }

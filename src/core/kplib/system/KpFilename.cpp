@@ -26,14 +26,14 @@ public:
     Descriptor& operator=(const Descriptor&) = delete;
     ~Descriptor() { close(); }
     operator int() const { return number_; }
-    // False if the system reports only now that something was not written.
+    // False if close() reports that something was not written.
     bool close() { return number_ < 0 || ::close(std::exchange(number_, -1)) == 0; }
 
 private:
     int number_;
 };
 
-// The call, again for as long as signals interrupt it.
+// Repeats the call while signals interrupt it.
 template <typename Call>
 ssize_t despiteSignals(Call call)
 {
@@ -64,7 +64,7 @@ bool copyContents(int from, int to)
     }
 }
 
-// Leaves no part of a copy: where a link leads to it, the file is empty.
+// Removes a partial copy; if a link leads to it, the file is emptied.
 void removePart(const char* name)
 {
     struct stat status {};

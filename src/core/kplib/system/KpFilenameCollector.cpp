@@ -10,7 +10,7 @@ namespace {
 
 using Folders = std::set<std::pair<dev_t, ino_t>>;
 
-/// `ancestors`: the folders on the way to `dir`; a link back to one of them would lead in circles.
+/// `ancestors`: the folders on the way to `dir`; a link back to one of them would never end.
 void collectInto(KpDArray<KpString>& out, const char* pattern, const char* dir, Folders& ancestors)
 {
     struct stat status {};

@@ -13,14 +13,14 @@ namespace {
 
 using Pieces = KpDArray<KpString>;
 
-// The folders of the directory that a path lies in; none for a path without a slash.
+// The folders of the directory of a path; none for a path without a slash.
 Pieces foldersOf(const KpFilename& path)
 {
     KpFilename packed(path);
     packed.pack();
     Pieces folders;
     packed.dirname().explode('/', folders);
-    folders.resize(folders.size() - 1);  // the empty piece behind the last slash
+    folders.resize(folders.size() - 1);  // the empty part after the last slash
     return folders;
 }
 

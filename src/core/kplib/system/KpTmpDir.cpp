@@ -58,7 +58,8 @@ int KpTmpDir::remove()
 
 const char* KpTmpDir::getSystemTmpPath()
 {
-    // Plain memory: the log asks before other statics are made, and others while they are destroyed.
+    // Plain memory: the log calls this before other statics are constructed, others while they are
+    // destroyed.
     static thread_local char name[PATH_MAX + 2];
     const char* path = "/tmp";
     for (const char* variable : {"TMPDIR", "TEMP", "TMP"}) {

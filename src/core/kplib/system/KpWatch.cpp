@@ -20,10 +20,11 @@ double seconds(std::uint64_t ticks)
 unsigned int milliseconds(std::uint64_t ticks)
 {
     const double value = std::rint(static_cast<double>(ticks) * 1000.0 * cFactor.load(std::memory_order_relaxed));
-    return static_cast<unsigned int>(static_cast<std::uint64_t>(value));  // what doesn't fit wraps
+    return static_cast<unsigned int>(static_cast<std::uint64_t>(value));  // a larger value wraps
 }
 
-// Towards zero; what doesn't fit wraps, as a watch that was only ever stopped counts from the start of the system.
+// Rounds towards zero. A larger value wraps, as a watch that was never started counts from the
+// start of the system.
 int truncated(double value)
 {
     return static_cast<int>(static_cast<std::int64_t>(value));

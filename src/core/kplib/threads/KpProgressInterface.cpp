@@ -10,7 +10,7 @@
 
 namespace {
 
-// Drops the offset of a scope that closes, last of all and whatever the calls before it throw.
+// Drops the offset of a scope that closes, as the last step, even if the calls before it throw.
 struct OffsetDropper {
     std::vector<long>& offsets;
     ~OffsetDropper() { offsets.pop_back(); }
@@ -55,7 +55,7 @@ void KpProgressInterface::startWorking(int maximum, std::string text)
     if (text.empty() && !steps_.empty())
         text = steps_.back().text;
     Step step{text, maximum};
-    steps_.reserve(steps_.size() + 1);  // all that takes memory comes first, so that a failure leaves nothing half done
+    steps_.reserve(steps_.size() + 1);  // all allocations first, so that a failure changes nothing
     offsets_.reserve(offsets_.size() + 1);
     if (steps_.empty()) {
         working_ = true;

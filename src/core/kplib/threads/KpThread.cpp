@@ -76,7 +76,7 @@ KpThread::KpThread(const char* name) :
 
 KpThread::~KpThread()
 {
-    // A thread whose end was seen by finished() may still hold the mutex.
+    // A thread that finished() reports as ended may still hold the mutex.
     record_->mutex.lock();
     record_->mutex.unlock();
     const int error = pthread_attr_destroy(&record_->attributes);
@@ -92,7 +92,7 @@ void KpThread::start()
         record_->finishedCondition.wait(&record_->mutex, ULONG_MAX);
     const int error = pthread_create(&record_->threadId, &record_->attributes, KpThreadPrivate::startIt, this);
     if (error)
-        // The text names the destructor; tools that read logs know it so.
+        // Intentional: the text names the destructor, and tools that read logs depend on it.
         getTheLogInstance().warnf("KpThread::~KpThread() failed (error code: %d)\n", error);
     else
         pthread_detach(record_->threadId);
@@ -145,7 +145,7 @@ void KpThread::sleep(unsigned long seconds)
 
 void KpThread::msleep(unsigned long milliseconds)
 {
-    usleep(static_cast<std::uint32_t>(milliseconds) * std::uint32_t{1000});  // in 32 bits, and meant so
+    usleep(static_cast<std::uint32_t>(milliseconds) * std::uint32_t{1000});  // intentional: in 32 bits
 }
 
 void KpThread::usleep(unsigned long microseconds)

@@ -142,7 +142,7 @@ bool KpBitfield::hasIntersection(const KpBitfield& other) const
     return any<BitAnd>(bits_, other.bits_, std::min(nBits_, other.nBits_));
 }
 
-// The bits behind the full words.
+// The bits after the full words.
 std::uint32_t KpBitfield::lastBits() const
 {
     return nBits_ == 0 ? 0 : bits_[nBits_ >> 5] & lowBits(nBits_);

@@ -22,8 +22,8 @@ int KpConnectedComponents::dbg_clean;
 
 namespace {
 
-// The order of merging decides which counts get lost and how sums are rounded; do not sort these tables. Those of fewer
-// neighbours are the ends of longer ones.
+// The order of merging decides which counts are lost and how sums are rounded; do not sort these
+// tables. Tables of fewer neighbours are the ends of longer ones.
 constexpr int neighbours26[13][3] = {{-1, -1, -1}, {1, -1, -1}, {-1, 1, -1}, {1, 1, -1},  {0, -1, -1},
                                      {-1, 0, -1},  {1, 0, -1},  {0, 1, -1},  {-1, -1, 0}, {1, -1, 0},
                                      {0, 0, -1},   {0, -1, 0},  {-1, 0, 0}};
@@ -62,7 +62,8 @@ void countUp(int& counter)
     __atomic_store_n(&counter, __atomic_load_n(&counter, __ATOMIC_RELAXED) + 1, __ATOMIC_RELAXED);
 }
 
-// Rounded half up, cut to 32 bits as the processor does (all that doesn't fit is the smallest int), then to the type.
+// Rounded half up, cut to 32 bits as the processor does (any value out of range is the smallest
+// int), then to the type.
 template <typename T>
 T threshold(double value)
 {
@@ -96,8 +97,8 @@ void renumberEach(L* labels, long n, const int* numbers)
     std::transform(labels, labels + n, labels, [=](L label) { return static_cast<L>(numbers[label]); });
 }
 
-// Gives each label its new number. Labels come in runs, and most keep theirs: blocks of one label are not looked up
-// one by one, and not written if nothing changes.
+// Replaces each label by its new number. Labels occur in runs, and most stay: blocks of one label
+// are looked up once, and not written if nothing changes.
 template <typename L>
 void renumber(L* labels, long n, const int* numbers)
 {

@@ -19,7 +19,7 @@ struct Operation {
     bool fast = true;
 };
 
-// At most LONG_MAX, for which there is no memory.
+// At most LONG_MAX, for which no memory suffices.
 unsigned long voxels(const KpVec3i& dims)
 {
     if (*std::min_element(dims.begin(), dims.end()) <= 0)
@@ -55,7 +55,7 @@ bool byWords(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long p
     return true;
 }
 
-// Brings dst to its size; whether there is anything to do then.
+// Resizes dst if necessary. Returns whether there are voxels.
 bool prepare(KpBitfield& dst, unsigned long nBits)
 {
     if (dst.nBits() != nBits)
@@ -63,11 +63,11 @@ bool prepare(KpBitfield& dst, unsigned long nBits)
     return nBits != 0;
 }
 
-// `alignedNeedsArea`: also for rows that begin at words.
+// `alignedNeedsArea`: whether rows that begin at words need a work area too.
 void morph(const KpBitfield& src, KpBitfield& dst, const KpVec3i& dims, long passes, const Operation& operation,
            bool alignedNeedsArea)
 {
-    // After so many passes one voxel has reached all others.
+    // After this number of passes one voxel has reached all others.
     passes = std::min(passes, 1L * dims[0] + dims[1] + dims[2]);
     if (operation.fast && byWords(src, dst, dims, passes, operation))
         return;

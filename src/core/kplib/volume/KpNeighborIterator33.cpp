@@ -22,7 +22,8 @@ constexpr Delta edgesInPlane[] = {{-1, -1, 0}, {1, -1, 0}, {-1, 1, 0}, {1, 1, 0}
 constexpr Delta faces[] = {{0, 0, -1}, {0, -1, 0}, {-1, 0, 0}, {0, 0, 1}, {0, 1, 0}, {1, 0, 0}};
 constexpr Delta facesInPlane[] = {{0, -1, 0}, {-1, 0, 0}, {0, 1, 0}, {1, 0, 0}};
 
-// Calls `visit` with each neighbour in the table's order; nothing for a number of neighbours that isn't one.
+// Calls `visit` with each neighbour in the table's order; does nothing for an unknown number of
+// neighbours.
 template <typename Visit>
 void forEachNeighbor(int count, Visit visit)
 {
@@ -126,7 +127,7 @@ void KpNeighborIterator33::setIntegers(const Weight* w, int sort)
     if (!isFilled())
         return;
     for (int i = 0; i < nNeighbors_; ++i)
-        // NOLINTNEXTLINE(bugprone-signed-char-misuse): small weights below 0 are meant
+        // NOLINTNEXTLINE(bugprone-signed-char-misuse): intentional: small weights below 0
         iweights_[i] = w[13 + deltas_[i][0] + 3 * deltas_[i][1] + 9 * deltas_[i][2]];
     if (sort != 0)
         sort_iweights();

@@ -21,7 +21,7 @@ struct Active {
     int i;     // from vertex i to the next
 };
 
-// NaN behind all numbers, so that an order there is.
+// NaN after all numbers, so that the order is total.
 float sortKey(float value)
 {
     return std::isnan(value) ? std::numeric_limits<float>::infinity() : value;
@@ -32,14 +32,14 @@ bool compare_active(const Active& a, const Active& b)
     return sortKey(a.x) < sortKey(b.x);
 }
 
-// The integer that a float comes to between two bounds; NaN comes to the lower one.
+// A float as an integer between two bounds; NaN becomes the lower one.
 int clampedTo(double value, int low, int high)
 {
     return !(value > low) ? low : value < high ? static_cast<int>(value) : high;
 }
 
-// Memory that a scan takes and gives back at its end: from a buffer, and from the heap once that is used up. As
-// std::pmr's, which is missing from libc++ 14.
+// Memory of a scan, freed at its end: from a buffer, and from the heap when the buffer is used up.
+// As in std::pmr, which is missing from libc++ 14.
 class Arena {
 public:
     void* take(std::size_t bytes)
@@ -108,7 +108,8 @@ private:
     int before(int i) const { return i > 0 ? i - 1 : n_ - 1; }
     int behind(int i) const { return i < n_ - 1 ? i + 1 : 0; }
 
-    // Takes up the vertices up to the middle of the scanline: each starts, ends or passes over its two edges.
+    // Processes the vertices up to the middle of the scanline: each starts, ends or continues its
+    // two edges.
     void meetVertices(int y)
     {
         const auto isMet = [&](int i) { return static_cast<double>(points_[i].y()) <= y + 0.5; };
@@ -141,7 +142,7 @@ private:
         if (found != active_.end())
             active_.erase(found);
     }
-    // The list is nearly sorted, but for the edges that have just come.
+    // The list is nearly sorted, except for the edges just added.
     void sortActive()
     {
         if (!std::is_sorted(active_.begin(), active_.end(), compare_active))

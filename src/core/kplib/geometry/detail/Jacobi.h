@@ -16,8 +16,8 @@ public:
     int rotations = 0;
     int sweeps = 0;
 
-    // Small elements are left alone while the sweep is below `thresholdSweeps`; from `skipSweep` on those are dropped
-    // that the eigenvalues don't feel.
+    // Small elements are not rotated while the sweep is below `thresholdSweeps`; from `skipSweep`
+    // on those are set to 0 that do not change the eigenvalues.
     Jacobi(const float* rows, int stride, int thresholdSweeps, int skipSweep) :
         evalues{rows[0], rows[stride + 1], rows[2 * stride + 2]}, thresholdSweeps_(thresholdSweeps),
         skipSweep_(skipSweep), off_{Real(rows[stride + 2]), Real(rows[2]), Real(rows[1])}, sums_{Real(evalues[0]),
@@ -26,7 +26,7 @@ public:
     {
     }
 
-    // Whether it came to an end within 50 sweeps.
+    // Returns whether the rotations converged within 50 sweeps.
     bool run()
     {
         for (; sweeps < 50; ++sweeps) {
@@ -59,7 +59,7 @@ private:
             rotate<P, Q>(g, shifts);
     }
 
-    // An eigenvalue is a float, so that is what it has to be lost in.
+    // An eigenvalue is a float, so the element is compared in float.
     static bool isLostIn(float value, Real g)
     {
         return static_cast<float>(g + static_cast<Real>(std::abs(value))) == std::abs(value);

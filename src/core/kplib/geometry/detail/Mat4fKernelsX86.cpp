@@ -6,9 +6,10 @@
 namespace kplib::detail {
 namespace {
 
-// By hand, three lanes of four: compilers take each element by itself, which is twice the time. The rows' cross
-// products are the columns of the adjugate. Products of two floats are exact in double, and so it is all the same which
-// two factors of a determinant's term are multiplied first.
+// Intrinsics, three lanes of four: compilers handle each element by itself, which takes twice the
+// time. The cross products of the rows are the columns of the adjugate. Products of two floats are
+// exact in double, so the order of the first two factors in a term of the determinant does not
+// matter.
 
 KPLIB_TARGET_AVX2 inline __m256d turnedLeft(__m256d v)
 {

@@ -71,7 +71,7 @@ struct TransformTogether {
         long i = 0;
         for (; i + Lanes <= n; i += Lanes, from += 3 * Lanes, to += 3 * Lanes) {
             Vector points[3], v[3];
-            for (int k = 0; k < 3; ++k)  // one at a time: a single copy goes by way of memory
+            for (int k = 0; k < 3; ++k)  // one at a time: a single copy would pass through memory
                 std::memcpy(&points[k], from + k * Lanes, sizeof points[k]);
             collect<0>(points, v[0], Places());
             collect<1>(points, v[1], Places());
@@ -91,11 +91,11 @@ struct TransformTogether {
     }
 };
 
-// Whether the determinant is nothing beside the sums of its positive and its negative terms.
+// Whether the determinant is negligible against the sums of its positive and its negative terms.
 KPLIB_KERNEL_BODY bool isSingular(double positive, double negative)
 {
     const double det = positive + negative, magnitude = positive - negative;
-    // The first test spares nearly all matrices the division.
+    // The first test avoids the division for nearly all matrices.
     return !(std::abs(det) > 1e-14 * magnitude) && std::abs(det / magnitude) < 1e-15;
 }
 

@@ -6,7 +6,8 @@
 
 namespace kplib::detail {
 
-// What stands for a point or a direction that there isn't, so that who ignores a false return goes on with NaN.
+// The value of a point or a direction that does not exist: a caller that ignores a false return
+// continues with NaN.
 inline constexpr KpVec3f nanVector(std::numeric_limits<float>::quiet_NaN(), std::numeric_limits<float>::quiet_NaN(),
                                    std::numeric_limits<float>::quiet_NaN());
 

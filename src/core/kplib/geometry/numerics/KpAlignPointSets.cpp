@@ -130,7 +130,7 @@ KpMat4f fitAffine(const Rows& rows, const Centroids& centroids)
     float* lr[] = {factors[0], factors[1], factors[2]};
     kplib::detail::LinearSolver solver(normal.data(), 3, lr);
     if (!solver.isComplete())
-        throw KpMemoryException();  // else the sides would pass for the solution, as those of a plane do
+        throw KpMemoryException();  // otherwise the right-hand sides would be taken for the solution
     float sign = 1;
     if (solver.decompose(sign)) {
         for (int i = 0; i < 3; ++i)
@@ -212,7 +212,7 @@ void align(KpMat4f& result, const KpVec3f* points1, const KpVec3f* points2, cons
     alignment.run(result, mode, initial);
 }
 
-// Rows that are there already.
+// Rows that exist already.
 auto rowsOf(const KpDMatrix<float>& a, const KpDMatrix<float>& b)
 {
     using List = PointList<false, false>;

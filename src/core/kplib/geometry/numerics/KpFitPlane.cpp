@@ -65,7 +65,7 @@ float KpFitPlane::orthogonalPlaneFit()
     centroid_ = sumOf(points_) / static_cast<float>(points_.size());
 
     float evalues[3];
-    KpVec3f evectors[3] = {normal_, normal_, normal_};  // stays when the eigenvectors can't be found
+    KpVec3f evectors[3] = {normal_, normal_, normal_};  // the result if the eigenvectors are not found
     int rotations = 0;
     scatterMatrix(points_, centroid_).jacobi(evalues, evectors, rotations);
     int smallest = evalues[0] > evalues[1] ? 1 : 0;

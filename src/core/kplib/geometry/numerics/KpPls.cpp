@@ -65,7 +65,8 @@ void KpPls::DouglasPeuckerInLoop(const Points& points, float tolerance, Points& 
     extractMarkedPoints(points, marks, result);
 }
 
-// A stack of stretches stands for the recursion, which a spiral would drive as deep as it has points.
+// A stack of stretches replaces the recursion, whose depth for a spiral would be its number of
+// points.
 void KpPls::DouglasPeuckerImpl(const Points& points, KpBitfield& marks, long first, long last, float tolerance)
 {
     std::vector<std::pair<long, long>> stretches{{first, last}};

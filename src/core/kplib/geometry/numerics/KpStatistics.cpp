@@ -18,7 +18,7 @@ struct Lentz {
     float c = 1, d, h;
 
     explicit Lentz(float first) : d(1 / lifted(first)), h(d) {}
-    // Takes the next partial numerator; gives the factor by which the value changed.
+    // Takes the next partial numerator, and returns the factor by which the value changed.
     float step(float numerator)
     {
         d = 1 / lifted(1 + numerator * d);
@@ -71,7 +71,7 @@ float KpStatistics::betai(float a, float b, float x)
     const double realA = static_cast<double>(a), realB = static_cast<double>(b), realX = static_cast<double>(x);
     float front = 0;
     if (x != 0 && x != 1) {
-        // In double precision: of large arguments the logarithms nearly cancel out.
+        // In double precision: for large arguments the logarithms nearly cancel.
         const double beta = logGamma(realA + realB) - logGamma(realA) - logGamma(realB);
         front = static_cast<float>(std::exp(beta + realA * std::log(realX) + realB * std::log(1 - realX)));
     }

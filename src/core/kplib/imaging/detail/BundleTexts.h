@@ -24,8 +24,8 @@ inline const char* textOf(const HxParameter& parameter)
     return text ? text : "";
 }
 
-// What a DICOM leaf "description: value" holds: the text two characters behind the colon or, without something behind
-// a colon, all of it.
+// The value of a DICOM leaf "description: value": the text two characters after the colon or, if
+// nothing follows a colon, all of it.
 inline const char* leafValue(const char* text)
 {
     const char* const colon = std::strchr(text, ':');
@@ -45,7 +45,7 @@ inline bool imageNumberOfName(const char* name, int& number)
     return end != name + length;
 }
 
-// Adds a text parameter behind the others.
+// Adds a text parameter after the others.
 inline void addText(HxParamBundle& bundle, const char* name, const char* text)
 {
     bundle.insert(HxParameter::create(name, text), 0);

@@ -4,10 +4,10 @@
 
 namespace kplib::detail {
 
-// Where new UIDs take the time from; tests set it back and let it stand still.
+// The source of time for new UIDs; tests set it back and stop it.
 extern std::time_t (*uidClock)();
 
-// The five digits at the end of a UID that stand for a process.
+// The five digits at the end of a UID that identify a process.
 int uidProcessPart(int processId);
 
 }  // namespace kplib::detail

@@ -10,7 +10,8 @@
 #include <cstdio>
 #include <string>
 
-// What a log knows. The mutex guards all but the atomics, of which those of the level and the callback are set during
+// The state of a log. The mutex guards all but the atomics, of which those of the level and the
+// callback are set during
 // start-up.
 struct KpLogFilePrivate {
     KpLogFilePrivate();
@@ -19,15 +20,16 @@ struct KpLogFilePrivate {
 
     // The line of a message.
     KpString formatLine(KpLogLevel level, const char* module, const char* text);
-    // Puts out the text, with a newline unless it ends in one.
+    // Writes the text, with a newline unless it ends in one.
     void write(std::string_view line);
-    // False if the text and its ending do not arrive whole in the open file, which counts as a lost line.
+    // False if the open file does not take the whole text and its ending, which counts as a lost
+    // line.
     bool writeToFile(int destination, std::string_view text, std::string_view ending);
     void reportLostLines();
     void flush() const;
     std::string_view timeText(KpLogFile::DateTimeFormat format);
     bool chunkIsFull() const;
-    // Goes on in the file that is open at `descriptor`; none may be open.
+    // Continues in the file of `descriptor`; the log must have no open file.
     void useFile(int descriptor, KpFilename path);
     void closeFile();
     void cleanUp(std::string_view kept) const;
@@ -35,7 +37,7 @@ struct KpLogFilePrivate {
     KpMutex mutex{true};
     std::string baseFolder;
     bool dateFoldersEnabled = false;
-    int file = -1;  // descriptor; that of standard output when this leads to the file
+    int file = -1;  // descriptor; that of standard output if the console leads to the file
     FILE* consoleFile = nullptr;
     KpFilename filePath;
     long maxNumLogFiles = 40;

@@ -2,7 +2,7 @@
 
 namespace kplib::detail {
 
-// What a code of KpResult says by itself; null where it has no such text.
+// The text of a code of KpResult by itself; null if it has none.
 struct ResultTexts {
     const char* shortText;
     const char* defaultData;

@@ -8,7 +8,7 @@ namespace kplib::detail {
 int openSocket(int receiveBufferSize, int sendBufferSize);
 
 // Resolves the name and calls connect(). The connection is under way on a non-blocking socket, and after a signal,
-// since an interrupted connect() goes on by itself and can't be called again.
+// since an interrupted connect() continues by itself and cannot be called again.
 enum class Connection { Failed, UnderWay, Made };
 Connection beginConnecting(int socket, const char* host, int port);
 
@@ -16,14 +16,17 @@ Connection beginConnecting(int socket, const char* host, int port);
 // in errno.
 bool awaitConnection(int socket);
 
-// As recv(). A time-out of the socket holds under a steady row of signals too, if only to within a factor of two.
+// As recv(). A time-out of the socket also holds under repeated signals, to within a factor of
+// two.
 long receiveSome(int socket, char* buffer, long size, int flags);
 
-// Receives until `size` bytes have come, and counts them in `received`. The result of the last recv():
+// Receives until `size` bytes are read, and counts them in `received`. The result of the last
+// recv():
 // on failure below 1, 0 at the end of the stream.
 long receiveAll(int socket, char* buffer, long size, long& received);
 
-// Receives at most `size` bytes, none of them behind a newline, and gives their number, or the result below 1 of
+// Receives at most `size` bytes, none of them after a newline, and returns their number, or the
+// result below 1 of
 // recv(). Touches the buffer for these bytes only.
 long receiveToNewline(int socket, char* buffer, long size);
 

@@ -4,7 +4,7 @@
 #include <kplib/param/HxParameter.h>
 #include <kplib/param/detail/ParamName.h>
 
-// The two lookups that each look at a DICOM tag goes through, for inlining: calls were a quarter of its time.
+// The two look-ups of each access to a DICOM tag, for inlining: calls took a quarter of its time.
 
 namespace kplib::detail {
 

@@ -24,7 +24,8 @@ constexpr unsigned char upperCase(char c)
 }
 
 // The order of node names, -1, 0 or 1. A blank in `b`, and only there, ends `b`, so that a token inside a text can be
-// compared where it stands. A null `a` comes first, then a null `b`.
+// compared in place. A null `a` is less than any `b`, also a null one; a text is greater than a
+// null `b`.
 int mystrcasecmp(const char* a, const char* b);
 
 // The value of a hexadecimal digit in either case, 16 for any other character.
@@ -60,7 +61,7 @@ class NameKey {
 public:
     enum Form {
         Literal,
-        Canonical,  // a leading digit gets the `_` in front that it has in the name of a node
+        Canonical,  // a leading digit is preceded by the `_` that it has in the name of a node
     };
 
     constexpr explicit NameKey(const char* name, Form form = Canonical) :

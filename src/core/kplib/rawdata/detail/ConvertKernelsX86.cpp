@@ -12,8 +12,9 @@ using namespace convert;
 
 namespace {
 
-// Real to integer by hand, 16 elements at a time: the processor's own cast already answers NaN and what is too large as
-// it is wanted, which no C++ expression can say. Two to three times as fast as EachElement for the same processor.
+// Real to integer with intrinsics, 16 elements at a time: the processor's cast has the required
+// results for NaN and large values, which no C++ expression has. Two to three times as fast as
+// EachElement for the same processor.
 #define KPLIB_LANES KPLIB_TARGET_AVX512 KPLIB_KERNEL_BODY
 
 struct Doubles16 {
@@ -70,7 +71,7 @@ KPLIB_LANES Doubles16 mapped(const Linear<double>& map, Doubles16 v)
     return {_mm512_mul_pd(_mm512_add_pd(v.low, offset), scale), _mm512_mul_pd(_mm512_add_pd(v.high, offset), scale)};
 }
 
-// The bound stands first: minimum and maximum give their second operand if either is NaN.
+// The bound is the first operand: minimum and maximum give their second operand if either is NaN.
 KPLIB_LANES __m512i truncated(__m512 v, float low, float high)
 {
     return _mm512_cvttps_epi32(_mm512_min_ps(_mm512_set1_ps(high), _mm512_max_ps(_mm512_set1_ps(low), v)));

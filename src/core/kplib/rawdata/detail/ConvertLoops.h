@@ -12,7 +12,7 @@ KPLIB_X86_ROWS(MapLoops, mapX86);
 
 namespace convert {
 
-// A conversion and a linear map are one loop over what makes a number of each element.
+// A conversion and a linear map are one loop over a function of each element.
 
 template <typename Number>
 struct Unmapped {

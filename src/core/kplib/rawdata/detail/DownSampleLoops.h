@@ -36,7 +36,8 @@ struct Mean {
     KPLIB_KERNEL_BODY static T result(State sum, long count) { return static_cast<T>(signedSum(sum) / count); }
 
     // A product with the reciprocal, made a little too large, and cut is the exact quotient of all sums below 2^22 in
-    // single and 2^50 in double precision: it never falls below an integer quotient, and the next one is too far away.
+    // single and 2^50 in double precision: it is never below an integer quotient, and never
+    // reaches the next one.
     KPLIB_KERNEL_BODY static void finish(Loose<T>* dst, const State* sums, long n, long count)
     {
         if (count < (1L << 22) / largest)
@@ -121,7 +122,8 @@ struct PlainRow {
 };
 
 // The loops that a row is made of, each compiled for itself: as parts of a larger nest gcc takes them for rarely run
-// code, or joins several rows to one loop, which is no faster and defeats the processor's foresight in reading.
+// code, or joins several rows to one loop, which is no faster and defeats the processor's
+// prefetching.
 
 // Joins the elements of a row to the line of states, whatever block they belong to.
 template <typename Rule>
@@ -141,7 +143,7 @@ struct JoinRow {
 };
 
 // The next voxel of a block, `step` items on, and so forth. By recursion, since gcc unrolls a loop only after it has
-// given up to make vectors of the one around it.
+// failed to vectorise the one around it.
 template <typename Rule, int Count, typename Item>
 KPLIB_KERNEL_BODY typename Rule::State nextOf(typename Rule::State state, const Item* item, long step)
 {

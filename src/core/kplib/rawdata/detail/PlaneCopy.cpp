@@ -8,7 +8,8 @@ namespace {
 
 using PixelLoop = void(char* to, long toStride, const char* from, long fromStride, long n, std::size_t width);
 
-// The common widths are compiled in: a block copy of a size not known ahead costs more than the pixel. 0: any width.
+// The common widths are compiled in: a block copy of variable size costs more than the pixel. 0:
+// any width.
 template <std::size_t Width>
 void copyPixels(char* to, long toStride, const char* from, long fromStride, long n, std::size_t width)
 {

@@ -22,7 +22,7 @@ inline Plane densePlane(void* data, const PlaneShape& shape)
 // memory. Planes that overlap have to be the same.
 void copyPlane(const Plane& to, const Plane& from, const PlaneShape& shape);
 
-// Fills the pixels with zeros and leaves what is between them.
+// Fills the pixels with zeros; the bytes between them stay.
 void clearPlane(const Plane& plane, const PlaneShape& shape);
 
 }  // namespace kplib::detail

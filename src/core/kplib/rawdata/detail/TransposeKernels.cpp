@@ -29,7 +29,7 @@ struct Tile {
     }
 };
 
-// Block by block, so that what is read and what is written both stay in the first cache.
+// Block by block, so that source and target both stay in the first cache.
 template <typename T, typename Block>
 void blockwise(const void* from, void* to, long rows, long columns, Block block)
 {

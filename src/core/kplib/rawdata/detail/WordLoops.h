@@ -48,7 +48,7 @@ struct CopyReversed {
 };
 
 // Elements of 3 bytes, the pixels of colour images. Five of them are reversed in a register of 16 bytes, whose surplus
-// the next store covers; one by one they would take several times as long.
+// the next store covers; one by one they take several times as long.
 struct CopyThreesReversed {
     using Sixteen = unsigned char __attribute__((vector_size(16)));
 

@@ -8,8 +8,8 @@ struct CpuCounts {
     int packages, coresPerPackage, processorsPerCore;
 };
 
-// What the system's totals come to, each divided without a rest; false, and `counts` as it was, if they contradict
-// each other.
+// The counts of the system's totals, each divided without a remainder. False, and `counts`
+// unchanged, if the totals contradict each other.
 inline bool countsOf(const platform::ProcessorCounts& totals, CpuCounts& counts)
 {
     if (totals.packages < 1 || totals.physicalCores < 1 || totals.logicalProcessors < totals.physicalCores)

@@ -6,7 +6,7 @@ namespace kplib::detail {
 
 KPLIB_X86_ROWS(HexLoop, hexX86);
 
-// Without a table, so that it is done in vectors.
+// Without a table, so that the compiler vectorises it.
 struct WriteDigits {
     KPLIB_KERNEL_BODY static char digit(unsigned char value, unsigned char toLetter)
     {

@@ -23,15 +23,16 @@ constexpr std::uint32_t sines[64] = {
 };
 constexpr int rotations[4][4] = {{7, 12, 17, 22}, {5, 9, 14, 20}, {4, 11, 16, 23}, {6, 10, 15, 21}};
 
-// Has `value` computed as it is written: compilers put sums into another order, with more steps behind the newest
-// term.
+// Forces `value` to be computed as written: compilers reorder sums, with more steps after the
+// newest term.
 [[gnu::always_inline]] inline void settle(std::uint32_t& value)
 {
     asm("" : "+r"(value));
 }
 
-// Step I of the 64. All time goes into the chain from b, the result of the step before, so each round adds to `sum`
-// what is known without b, and b comes in with as few operations as can be: clang, left alone, takes a third longer.
+// Step I of the 64. The chain from b, the result of the step before, takes all the time. So each
+// round adds to `sum` the terms without b, and as few operations as possible depend on b:
+// otherwise clang takes a third longer.
 template <int I>
 [[gnu::always_inline]] inline void step(std::uint32_t (&words)[4], const unsigned char* block)
 {
@@ -46,7 +47,7 @@ template <int I>
         settle(sum);
         sum += ((c ^ d) & b) ^ d;
     } else if constexpr (round == 1) {
-        sum += ~d & c;  // has no bit in common with d & b, so that adding is as good as or
+        sum += ~d & c;  // has no bit in common with d & b, so addition equals or
         settle(sum);
         sum += d & b;
     } else if constexpr (round == 2) {

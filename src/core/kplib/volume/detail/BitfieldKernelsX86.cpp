@@ -14,7 +14,7 @@ using namespace bits;
 
 namespace {
 
-// By hand: without its instruction the compiler counts a word in some twelve steps.
+// With intrinsics: without the instruction the compiler counts a word in about twelve steps.
 KPLIB_TARGET("popcnt") unsigned long countPopcnt(const BitWord* words, unsigned long n)
 {
     unsigned long count = 0, i = 0;

@@ -10,7 +10,7 @@ using namespace labels;
 
 namespace {
 
-// Without the fours of set bits that stand side by side from a multiple of four.
+// Without the aligned groups of four set bits.
 template <typename Bits>
 KPLIB_KERNEL_BODY Bits withoutFours(Bits bits)
 {
@@ -19,7 +19,8 @@ KPLIB_KERNEL_BODY Bits withoutFours(Bits bits)
     return bits & ~((pairs & pairs >> 2 & lowest) * 15);
 }
 
-// A register full of labels and as many bits, by hand: the compiler doesn't find the way from bits to bytes and back.
+// A register of labels and as many bits, with intrinsics: the compiler does not vectorise bits to
+// bytes and back.
 
 KPLIB_TARGET_AVX2 void fromLabelsAvx2(BitWord* words, const unsigned char* labels, unsigned long n, unsigned char label)
 {
@@ -69,7 +70,7 @@ KPLIB_KERNEL_BODY void merge(unsigned char* labels, const Labels& ones, const La
     std::memcpy(labels, &old, sizeof old);
 }
 
-// Whether labels without a set bit stay as they are: then they needn't be looked at.
+// Whether labels without a set bit stay unchanged and need not be read.
 template <Policy policy>
 constexpr bool needsBits = policy == Policy::INSERT_SET || policy == Policy::INSERT_INTO_EMPTY;
 

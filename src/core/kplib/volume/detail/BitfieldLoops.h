@@ -16,7 +16,7 @@ KPLIB_X86_ROWS(AnyLoop, anyX86);
 
 namespace bits {
 
-// Words that are gone through between two looks at the outcome.
+// Words between two tests of the result.
 constexpr unsigned long block = 128;
 
 inline unsigned long countPlain(const BitWord* words, unsigned long n)

@@ -16,7 +16,8 @@ struct Steps {
     long offsets[13];
 };
 
-// A row before, of which a voxel sees the columns up to its own, or to the next one if it is `wide`.
+// A previous row, of which a voxel has the columns up to its own as neighbours, or to the next one
+// if it is `wide`.
 struct RowBefore {
     long offset;
     int dy, dz;
@@ -25,12 +26,13 @@ struct RowBefore {
 
 // The pass, a row at a time.
 //
-// What decides a voxel is the ids of the labels around it. After an exact step that gave the root m, those ids are m
-// or have just become its aliases, with nothing left to merge. So a voxel that sees no other labels than the one
-// before gets m too and changes nothing but the counts of m, which are added for all such voxels of a stretch at once.
-// A stretch ends where a row before brings in a label that differs from the one on its left, isn't the background, and
-// has another id than m. In label mode equal labels have equal values, so all this holds there too, as long as the
-// voxels have the same value.
+// The ids of the labels around a voxel decide its label. After an exact step with the root m,
+// those ids are m or its new aliases, and nothing is left to merge. So a voxel with the same
+// labels around it as the voxel before gets m too, and changes only the counts of m, which are
+// added for all such voxels of a stretch at once. A stretch ends where a previous row has a label
+// that differs from the label to its left, is not the background and has another id than m. In
+// label mode equal labels have equal values, so the same holds there as long as the voxels have
+// the same value.
 template <typename T, typename L>
 class RowLabelling {
 public:
@@ -138,8 +140,8 @@ private:
         rows_[i].isWide |= dx > 0;
     }
 
-    // Marks the voxels that may see other labels than the one before. After a clean-up some changes of label are none
-    // any more; that costs time only.
+    // Marks the voxels that may have other labels around them than the one before. After a
+    // clean-up some marked changes of label are obsolete, which costs time only.
     void findEnds()
     {
         const T* row = data_ + start_;
@@ -187,7 +189,7 @@ private:
         return true;
     }
 
-    // Whether all labels that come into sight at `x` lead to `m`.
+    // Whether all labels that are new neighbours at `x` lead to `m`.
     bool isNoEnd(long x, int m) const
     {
         if (isLabelMode_ && data_[start_ + x] != data_[start_ + x - 1])
@@ -229,7 +231,7 @@ private:
         const float position[3] = {static_cast<float>(x), static_cast<float>(y_), static_cast<float>(z_)};
         for (int axis = 0; axis < 3; ++axis)
             component.sum[axis] += position[axis];
-        labels_[at] = static_cast<L>(m);  // last: the label may take the place of the value
+        labels_[at] = static_cast<L>(m);  // last: the label may overwrite the value
         if (x > 0 && labels_[at - 1] != labels_[at])
             changes_[x / 64] |= RowBits{1} << x % 64;
         return m;
@@ -283,7 +285,7 @@ private:
     bool isLabelMode_;
     int nSteps_ = 0;
     int deltas_[13][3];
-    long nWords_;    // in a row of bits, with the zeros behind
+    long nWords_;    // in a row of bits, with the zeros after it
     long rowBytes_;  // of the changes of label
     KpDArray<RowBits> bits_;
 
@@ -306,7 +308,7 @@ int KpConnectedComponents::do_label(T* data, L* labels, KpDArray<Component>& com
                                     int neighbours, int labelMode)
 {
     using namespace kplib::detail;
-    if (dims[0] < 8)  // bits of a row pay from there on
+    if (dims[0] < 8)  // from this width on bits of a row are faster
         return PlainLabelling<T, L>(data, labels, components, low, high, dims, neighbours, labelMode).run();
     startComponents(components);
     const long nVoxels = nVoxelsOf(dims);

@@ -17,10 +17,10 @@ int addComponent(ComponentTable& components, L* labels, long nLabelled);
 template <typename L>
 int cleanUpComponents(ComponentTable& components, L* labels, long nLabelled, int minVoxels, int minSeeds);
 
-// Zeroes the counters and leaves nothing but the background in the table.
+// Zeroes the counters and removes all entries but the background from the table.
 void startComponents(ComponentTable& components);
 
-// The voxels of an image, at most LONG_MAX, for which there is no memory; 0 if a size is below 1.
+// The voxels of an image, at most LONG_MAX, for which no memory suffices; 0 if a size is below 1.
 inline long nVoxelsOf(const int* dims)
 {
     return dims[0] < 1 || dims[1] < 1 || dims[2] < 1 ? 0 : byteCount({dims[0], dims[1], dims[2]});

@@ -4,9 +4,10 @@
 #include <bit>
 #include <cstdint>
 
-// Sums of integers in floats, as one addition after the other gives them, without doing them all. A sum is a multiple
-// of the distance of floats at its size, the unit, so as long as it stays below the next power of two, what an addition
-// really adds is its term rounded to units: half a unit goes to where the sum becomes an even number of units.
+// Sums of integers in floats, equal to those of one addition after the other, without all the
+// additions. A sum is a multiple of the unit, the distance of floats of its magnitude. While it
+// stays below the next power of two, an addition adds its term rounded to units: half a unit is
+// rounded so that the sum is an even number of units.
 
 namespace kplib::detail {
 
@@ -34,7 +35,7 @@ inline float plusEqualTerms(float sum, long term, long n)
         const long added = term - rest + (isUp ? unit : 0), room = top - start;
         long count = added * n <= room ? n : room / added;
         if (isTie && (start & unit) != 0)
-            count = 0;  // from an odd number of units a first tie goes elsewhere than those behind it
+            count = 0;  // from an odd number of units the first tie is rounded differently from later ones
         if (count > 0)
             sum = static_cast<float>(start + added * count);
         else

@@ -7,7 +7,7 @@
 namespace kplib::detail {
 
 // The definition of KpConnectedComponents::do_label(), voxel by voxel: the fast pass equals it to the bit. Narrow
-// images are labelled by it too.
+// images use it too.
 template <typename T, typename L>
 class PlainLabelling {
 public:

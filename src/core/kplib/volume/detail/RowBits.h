@@ -9,7 +9,7 @@
 
 namespace kplib::detail {
 
-// A bit a voxel of a row, with a word of zeros behind.
+// One bit for each voxel of a row, followed by a word of zeros.
 using RowBits = std::uint64_t;
 
 inline long wordsOf(long n)

@@ -50,7 +50,8 @@ struct PointList {
         const float* const p = points + 3 * place(i);
         return Row4{p[0], p[1], p[2], 0};
     }
-    // point(i), and the first number of the next one in the fourth place, which has to be there; one load.
+    // point(i), and in the fourth place the first number of the next point, which has to exist;
+    // one load.
     Row4 pointWithNext(long i) const
     {
         Row4 row;

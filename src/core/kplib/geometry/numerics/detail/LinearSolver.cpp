@@ -34,7 +34,8 @@ double norm(const float* values, int n)
     return std::sqrt(sum);
 }
 
-// Sums of products wait for one another, so that several rows are summed side by side, each in its own order.
+// Each addition waits for the one before, so several rows are summed side by side, each in its own
+// order.
 constexpr int together = 4;
 
 // Subtracts from each of `count` sums the products of a row with `x`, from column `begin` toward `end` in steps of 1
@@ -154,7 +155,7 @@ void LinearSolver::solve(float* side)
     std::copy_n(x_, n_, side);
 }
 
-// Adds what the factors give for the residual to the solution.
+// Adds the solution for the residual to the solution.
 void LinearSolver::correct()
 {
     float* const y = correction_;

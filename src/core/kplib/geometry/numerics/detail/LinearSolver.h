@@ -16,7 +16,8 @@ public:
     SolverRows& operator=(const SolverRows&) = delete;
     ~SolverRows();
 
-    // False, with an error in the log, when the memory is exhausted; what there is of it is freed with the object.
+    // False, with an error in the log, if memory is exhausted; the blocks allocated so far are
+    // freed with the object.
     bool allocate();
     float** get() const { return rows_.get(); }
 
@@ -26,7 +27,8 @@ private:
     std::unique_ptr<float*[], KpFree> rows_;
 };
 
-// The work of KpDMatrix::solveLRdecomp() on the `n` by `n` matrix `a`, of which `lr` holds a copy.
+// Solves for KpDMatrix::solveLRdecomp() with the `n` by `n` matrix `a`, of which `lr` holds a
+// copy.
 class LinearSolver {
 public:
     // Logs it as an error when the memory is exhausted.
@@ -47,7 +49,7 @@ private:
     int n_;
     float** lr_;
     std::unique_ptr<float[], KpFree> work_;
-    std::unique_ptr<int[], KpFree> permutation_;  // the row of `a` that stands in each row of `lr`
+    std::unique_ptr<int[], KpFree> permutation_;  // the row of `a` that each row of `lr` holds
     float *b_ = nullptr, *residual_ = nullptr, *x_ = nullptr, *correction_ = nullptr;  // within work_
 };
 

@@ -2,7 +2,8 @@
 
 namespace kplib::detail {
 
-// Explicit embedded Runge-Kutta methods. Stage i stands at y + h * sum a[i][j] k[j]; b are the weights of the new
+// Explicit embedded Runge-Kutta methods. Stage i is at y + h * sum a[i][j] k[j]; b are the weights
+// of the new
 // point, where the field is evaluated once more, and e those of the error, for all stages and this last evaluation.
 
 struct Midpoint {
@@ -68,7 +69,8 @@ Vector weightedSum(const double* weights, const Vector* k, int count)
     return sum;
 }
 
-// A step of `h` from `y0`, where the field is `k1`. `evaluate(x, k)` gives 0, or a code that ends the step with
+// A step of `h` from `y0`, where the field is `k1`. `evaluate(x, k)` returns 0, or a code that
+// ends the step with
 // nothing written.
 template <typename Tableau, typename Vector, typename Evaluate>
 int rungeKuttaStep(const Vector& y0, const Vector& k1, float h, Evaluate evaluate, Vector& y, Vector& f, Vector& error)
