@@ -43,8 +43,8 @@ void exchange(char* a, char* b, unsigned long bytes)
     std::swap_ranges(a, a + bytes, b);
 }
 
-// Small items, by way of the first cache. The items at the end are met downwards, which the processor doesn't foresee,
-// so the next one of them is asked for ahead.
+// Small items, through the first cache. The items at the end are read downwards, which the
+// processor does not predict, so the next one is prefetched.
 void exchange(char* a, char* b, unsigned long bytes, char* buffer)
 {
     for (unsigned long line = 0; line < bytes; line += 64)

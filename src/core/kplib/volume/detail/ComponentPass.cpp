@@ -44,9 +44,10 @@ public:
     {
         int offsets[13];
         KpConnectedComponents::mknbtableprev(neighbours, dims, nSteps_, offsets, deltas_);
-        // For a row: foreground, seeds (of labels: changes of value), ends of stretches, each with a word of zeros
-        // behind. For this slice and the one before: changes of label, rows without a gap. Bit 0 of a row is never set,
-        // so the first word of the next row does as zeros behind; one word more is behind the last row.
+        // For a row: foreground, seeds (of labels: changes of value), ends of stretches, each with a
+        // word of zeros after it. For this slice and the one before: changes of label, rows without
+        // a gap. Bit 0 of a row is never set, so the first word of the next row serves as the zeros
+        // after it; one more word follows the last row.
         const long changeBytes = rowBytes_ * dims_[1] * std::min(dims_[2], 2L);
         bits_.resize(nWords_ * 3 + (changeBytes + 7) / 8 + 1);
         std::fill(bits_.begin(), bits_.end(), RowBits{0});
