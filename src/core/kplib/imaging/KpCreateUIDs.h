@@ -3,16 +3,16 @@
 #include <kplib/foundation/KpExport.h>
 #include <kplib/foundation/KpString.h>
 
-/// Makes DICOM unique identifiers for new objects (PS3.5, 9): root, version, a number for the kind of object, the node,
-/// a counter and the process, separated by dots.
+/// Creates DICOM unique identifiers for new objects (PS3.5, 9): root, version, a number for the
+/// kind of object, the node, a counter and the process, separated by dots.
 ///
-/// The counter is the time of day, and is incremented where the clock does not advance or goes
-/// back: within a process it never repeats, for all objects and threads. That the text stays
-/// within the 64 characters of DICOM is up to the root. createUID() may be called on one object by
-/// many threads, for types that there are; all else is for one thread.
+/// The counter is the time of day, and is incremented if the clock does not advance or goes back:
+/// within a process it never repeats, for all objects and threads. The root must be short enough
+/// for the limit of 64 characters. createUID() may be called on one object by many threads, for
+/// valid types; all else is for one thread.
 class KPLIB_API KpCreateUIDs {
 public:
-    /// What the identifier is for; the values of the layer above, which are 2 to 6 in the UID.
+    /// The kind of object, in the numbering of the layer above. The UID contains 2 to 6.
     enum UIDtype : int {
         UIDtype0 = 0,  ///< 2 in the UID
         UIDtype1 = 1,  ///< 3 in the UID
@@ -36,7 +36,8 @@ public:
     /// The text of the last failure, "" at first; valid until the next one.
     const char* lastError() const { return lastError_.c_str(); }
 
-    /// A new identifier into `uid`. An unknown type is an error: false, and `uid` is empty. Under a microsecond.
+    /// Sets `uid` to a new identifier. For an unknown type sets an error, returns false and
+    /// empties `uid`. Takes less than a microsecond.
     bool createUID(UIDtype type, KpString& uid);
 
     /// The local time: the full year, the month from 1.

@@ -15,7 +15,8 @@ class KPLIB_API KpOrientationLetters {
 public:
     /// Four empty strings.
     KpOrientationLetters() = default;
-    /// The two other edges are the opposites. All stay empty unless both strings are isValidOrientationString().
+    /// Sets the two given edges, and the two other edges to their opposites. All stay empty unless
+    /// both strings are isValidOrientationString().
     KpOrientationLetters(const std::string& rightLetters, const std::string& bottomLetters);
     /// One letter an edge, from the matrix of an image whose rows grow downward: image x points right, y to the bottom.
     /// A matrix that holds a NaN counts as the identity.
@@ -32,12 +33,12 @@ public:
     const std::string& bottom() const { return bottom_; }
     /// @}
 
-    /// All four strings are valid, and the right and the bottom edge don't name one axis as a whole: L and R do, LP and
-    /// A don't.
+    /// Whether all four strings are valid and the right and the bottom edge do not name the same
+    /// axis as a whole: L and R do, LP and A do not.
     bool isValid() const;
     /// Whether `letter` is neither at the right nor at the bottom.
     bool unusedLabel(char letter) const;
-    // Whether the view shows one kind of slice. With no letters at all it shows every kind.
+    // Whether the view shows one kind of slice. Without letters it shows every kind.
     /// @{
     /// Whether the letters allow that kind of slice.
     bool isAxial() const { return unusedLabel('F') && unusedLabel('H'); }
@@ -56,11 +57,11 @@ public:
     /// Whether all four strings are equal.
     friend bool operator==(const KpOrientationLetters& a, const KpOrientationLetters& b) = default;
 
-    /// Zero for what is no letter of the alphabet; lower case is not.
+    /// The direction of a letter, or zero for any other character. Lower case is not accepted.
     static KpVec3f letterToDirection(char letter);
     /// Whether the text is one or more letters of the alphabet and nothing else.
     static bool isValidOrientationString(const std::string& letters);
-    /// Each letter's opposite; what is no letter of the alphabet stays.
+    /// The opposite of each letter. Other characters stay unchanged.
     static std::string oppositeString(const std::string& letters);
     /// The letters nearest to where `matrix` takes the x axis and the y axis, never of one patient axis unless the
     /// matrix is singular.

@@ -26,9 +26,9 @@ struct KpWindowLevelTagGroup {
 
 /// A window/level preset: centre, width and an explanation.
 ///
-/// The numbers are kept as text, so that a preset is written back as it was read; center() and
+/// The numbers are stored as text, so that a preset is written as it was read. center() and
 /// width() parse the text, which counts as 0 if it is not a number. Numbers are written and read
-/// with the decimal point of the program's locale. Nothing fails. A plain value.
+/// with the decimal point of the program's locale. No operation fails. A plain value.
 class KPLIB_API KpWindowLevel {
 public:
     /// Three empty texts.
@@ -63,9 +63,9 @@ public:
     /// Equal numbers, however they are written, and the same explanation. A NaN equals nothing.
     bool operator==(const KpWindowLevel& other) const;
 
-    /// The presets of a header, in its order, without those that lack the text of centre or width. None if there are
-    /// not as many widths as centres; explanations may be too few or too many, and belong to the values at their
-    /// positions.
+    /// The presets of a header, in its order, without those that lack the text of centre or width.
+    /// None if the numbers of widths and centres differ. Explanations may be fewer or more; each
+    /// belongs to the values at its position.
     static std::vector<KpWindowLevel> createFromTags(const KpWindowLevelTagGroup& group);
     /// The inverse; empty explanations keep their place.
     static KpWindowLevelTagGroup toTags(const std::vector<KpWindowLevel>& presets);

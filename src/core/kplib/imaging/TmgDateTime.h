@@ -36,10 +36,10 @@ KPLIB_API long dateReformatString_default(const std::string& text);
 /// something else than a point, comes back as it is; null as "".
 KPLIB_API std::string timeReformat(const char* time);
 
-/// A key that sorts like the time `t`, or with `inverted` backwards: the six digits of the time, a point, the digits of
-/// the fraction. In keys that aren't inverted the six digits with a 1 in front come first, as 1123456123456. for
-/// 123456: stored keys have that form, and it stays. A text too short to be a time comes back as it is, or "" with a
-/// point in it.
+/// A key that sorts like the time `t`, or with `inverted` in reverse: the six digits of the time,
+/// a point, the digits of the fraction. Keys that are not inverted begin with a 1 and the six
+/// digits, as 1123456123456. for 123456. Intentional: stored keys have that form. A text too short
+/// to be a time is returned unchanged, or as "" if it contains a point.
 KPLIB_API std::string timeString(const std::string& t, bool inverted);
 
 /// Local date yyyymmdd and time hhmmss of seconds since 1970.

@@ -6,19 +6,20 @@
 #include <set>
 #include <string>
 
-// What belongs to each image of a volume, in the parameters of the volume: beside `DICOM` a bundle `ImageNumberList`,
-// whose first child is `NumImageNumbers` and whose others are a text for each image, `ImageNr00001` ... in the order of
-// the images. A text holds fields separated by commas, named by the tags in the parameter `ImageLevelTags`; its first
-// field is the image number. Images are found by their position: such a list must never be sorted, which a caller's
-// HxParamBundle::findSorted() on it does. A sort puts `NumImageNumbers` after all texts and so shifts every image by
-// one; with names of more than five digits it changes their order too. Nothing here sorts it.
+// Data of each image of a volume, in the parameters of the volume: beside `DICOM` a bundle
+// `ImageNumberList`. Its first child is `NumImageNumbers`; the others are one text for each image,
+// `ImageNr00001` ... in the order of the images. A text contains fields separated by commas, named
+// by the tags in the parameter `ImageLevelTags`; its first field is the image number. Images are
+// found by their position, so such a list must never be sorted, which HxParamBundle::findSorted()
+// on it does. A sort moves `NumImageNumbers` after all texts and so shifts every image by one;
+// with names of more than five digits it changes their order too. No function here sorts it.
 //
 // Failure is false. Threads as with HxParamBundle.
 
 namespace Tmg {
 
-/// Tags whose value is taken to be the same in all images of a volume, so that the first image
-/// serves for all. Lives from static initialisation to exit.
+/// Tags whose value is assumed to be the same in all images of a volume, so that the first image
+/// is read for all. Exists from static initialisation to exit.
 KPLIB_API extern const std::set<std::string> tagsConstantInVolume;
 
 /// Replaces all that `list` holds by the texts of the images; no texts leave it empty.

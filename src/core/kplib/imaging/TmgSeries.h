@@ -9,8 +9,8 @@
 #include <string>
 #include <vector>
 
-// Records of a loader for a series and its images. The loader defines what the texts mean; here
-// they are kept.
+// Records of a loader for a series and its images. The loader defines the meaning of the texts;
+// these classes store them.
 
 namespace Tmg {
 
@@ -69,7 +69,7 @@ private:
     bool flag_ = false;
 };
 
-/// Collects the images of a series while they come in.
+/// Collects the images of a series while they are loaded.
 class KPLIB_API ImageSeriesHelper {
 public:
     /// Without images.
@@ -98,13 +98,14 @@ private:
     KpHandle<SeriesInfo> seriesInfo_;
 };
 
-/// Brings volumes into a cache ahead of their use. The meaning of names and flags is that of the function installed.
+/// Loads volumes into a cache before their use. The installed function defines the meaning of
+/// names and flags.
 using VolumeCachePrecache = bool (*)(KpDArray<KpString>& names, bool flag1, bool flag2);
 
 /// Calls the installed function.
 KPLIB_API bool volumeCachePrecache(KpDArray<KpString>& names, bool flag1, bool flag2);
-/// Installs a function, null the default one: process-wide and unlocked: set it before other
-/// threads start.
+/// Installs a function; null stands for the default one. Process-wide and unlocked: set it before
+/// other threads start.
 KPLIB_API void volumeCacheSetFuncPrecache(VolumeCachePrecache function);
 /// Does nothing and gives false.
 KPLIB_API bool volumeCachePrecache_default(KpDArray<KpString>& names, bool flag1, bool flag2);

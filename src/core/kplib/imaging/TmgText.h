@@ -9,14 +9,15 @@
 
 namespace Tmg {
 
-/// Whether a text fits a pattern as a whole: `anyRun` stands for any characters, `anyOne` for one
-/// or none (but not at the end of the text), others for themselves. Only the first character of
-/// the pattern is held against `anyRun` and `anyOne`; after it they are always `*` and `?`. Null
+/// Whether a text matches a pattern as a whole: `anyRun` matches any characters, `anyOne` one or
+/// none (but not at the end of the text), other characters themselves. Only the first character of
+/// the pattern is compared with `anyRun` and `anyOne`; after it they are always `*` and `?`. Null
 /// counts as "". O(pattern * text).
 KPLIB_API bool match(const char* pattern, const char* text, char anyRun, char anyOne);
 
-/// Whether one of `texts` fits one of `patterns` by match() with `*` and `?`, ignoring case. Both
-/// are lists at `separators` as KpStdStringTokenizer reads them; null for either is false.
+/// Whether one of `texts` matches one of `patterns` by match() with `*` and `?`, ignoring case.
+/// Both are lists at `separators` as KpStdStringTokenizer reads them. Returns false if either is
+/// null.
 KPLIB_API bool matchSet(const char* patterns, const char* texts, const char* separators);
 
 /// Appends those values of `additions` that `target` lacks, and returns whether there were any.
@@ -24,7 +25,7 @@ KPLIB_API bool matchSet(const char* patterns, const char* texts, const char* sep
 /// the separator that `target` used last, else by the first of `separators`.
 KPLIB_API bool addToMultiValueString(KpString& target, const KpString& additions, const char* separators);
 
-/// The path as this machine knows it: on this platform the same.
+/// The local form of a network path: on this platform the path itself.
 KPLIB_API std::string networkToLocalPath(const std::string& path);
 
 }  // namespace Tmg

@@ -7,8 +7,9 @@
 
 /// Dense numbers for a sparse set of flagged positions: the k-th flagged position, counted from 0, has number k.
 ///
-/// A look-up takes constant time. The table takes one byte a position and 4 bytes for each block of 256, made in one
-/// pass; exhausted memory is a KpMemoryException. When made, any number of threads may read it.
+/// A look-up takes constant time. The table takes one byte for each position and 4 bytes for each
+/// block of 256, and is built in one pass. Exhausted memory throws KpMemoryException. After
+/// construction any number of threads may read it.
 class KPLIB_API KpPackedIndexing {
 public:
     /// Positions of a block.
@@ -19,7 +20,7 @@ public:
     /// A position is flagged if its bit is set; of fewer than 2^31 bits.
     explicit KpPackedIndexing(const KpBitfield& bits);
 
-    /// The dense number of position `i`, which has to be a flagged one.
+    /// The dense number of position `i`. Precondition: the position is flagged.
     int index(long i) const
     {
         KPLIB_CHECK(i >= 0 && i < offsets_.size(), "KpPackedIndexing: the position lies outside");

@@ -7,17 +7,18 @@
 /// A rectangle of pixels, either an owner of its memory or a view on memory that is owned
 /// elsewhere.
 ///
-/// Pixels are bags of bytes: only their size counts. Pixel (x, y) lies at data() + x * pixelStride() + y * rowStride(),
-/// strides in bytes. A view costs nothing and is valid as long as the memory is. Memory comes from malloc; when there
-/// is none, the object holds a null pointer. Sizes are not checked, but strides are 32 bits: pixels without gaps whose
-/// rows have 2^31 bytes or more are refused with an error in the log, and the object holds a null pointer. A plain
-/// value: one thread may change it, or any number read it.
+/// Pixels are opaque bytes of a given size. Pixel (x, y) is at data() + x * pixelStride() + y *
+/// rowStride(), strides in bytes. A view is valid as long as its memory. Owned memory comes from
+/// malloc; if it is exhausted, the object holds a null pointer. Sizes are not checked, but strides
+/// have 32 bits: pixels without gaps whose rows have 2^31 bytes or more are refused with an error
+/// in the log, and the object holds a null pointer. A plain value: one thread may change it, or
+/// any number read it.
 class KPLIB_API KpRawData2D {
 public:
     /// Empty: sizes, strides and pointers are 0.
     KpRawData2D() = default;
 
-    // Each constructor does what the init() of its arguments does.
+    // Each constructor does what init() does with the same arguments.
 
     /// @{
     /// As init().
@@ -40,8 +41,8 @@ public:
     /// A copy of an owner owns a copy of its block, without gaps; a copy of a view is one more view on the same memory.
     KpRawData2D& operator=(const KpRawData2D& other);
 
-    /// An owner of `w` * `h` pixels without gaps, not initialised. For a size of 0 nothing is
-    /// allocated, and data() keeps its value, even if that block is freed.
+    /// Makes this the owner of `w` * `h` pixels without gaps, not initialised. For a size of 0
+    /// nothing is allocated, and data() keeps its value, even if that block is freed.
     void init(int w, int h, int bytesPerPixel);
     /// A view on pixels without gaps, or with gaps between rows, or between pixels too.
     void init(int w, int h, int bytesPerPixel, void* data);
@@ -54,8 +55,8 @@ public:
     /// Frees the block of an owner. data() keeps its value and must not be used.
     void cleanup();
 
-    /// Makes this the owner of `data`, a block of malloc that holds the pixels without gaps. One that is refused is
-    /// freed.
+    /// Makes this the owner of `data`, a block of malloc with the pixels without gaps. A block
+    /// that is refused is freed.
     void commit(int w, int h, int bytesPerPixel, void* data);
 
     /// Copies the pixels of `from`, whatever the strides; false and nothing copied if the sizes are not the same.

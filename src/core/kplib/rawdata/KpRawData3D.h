@@ -8,11 +8,14 @@
 /// A block of voxels without gaps, x fastest, either an owner of its memory or a view on memory
 /// that is owned elsewhere.
 ///
-/// Voxels are bags of bytes: only their size counts. Memory comes from kpmalloc; exhausted memory
-/// is a KpMemoryException, after which the object holds none. Slices have an orientation: 0 is the
-/// plane of constant x with rows along y, 1 that of constant y and 2 that of constant z, both with
-/// rows along x. Positions and sizes are not checked. It cannot be copied: use init() for a second
-/// block. One thread may change it, or any number read it.
+/// Voxels are opaque bytes of a given size. Slices have an orientation: 0 is the plane of constant
+/// x with rows along y, 1 that of constant y and 2 that of constant z, both with rows along x.
+/// Positions and sizes are not checked. The object cannot be copied: use init() for a second
+/// block.
+///
+/// Errors: exhausted memory throws KpMemoryException; the object then holds no memory.
+///
+/// Threads: one thread may change it, or any number read it.  Memory: by kpmalloc.
 class KPLIB_API KpRawData3D {
 public:
     /// Empty: sizes and pointers are 0.
@@ -25,7 +28,7 @@ public:
     KpRawData3D& operator=(const KpRawData3D&) = delete;
     ~KpRawData3D() { cleanup(); }
 
-    /// An owner of voxels that are not set to anything, also if there are none.
+    /// Makes this the owner of voxels that are not initialised, also if there are none.
     void init(int nx, int ny, int nz, int bytesPerVoxel);
     /// A view.
     void init(int nx, int ny, int nz, int bytesPerVoxel, void* data);
@@ -33,7 +36,8 @@ public:
     /// Frees the block of an owner. data() keeps its value and must not be used.
     void cleanup();
 
-    /// Exchanges the owned block for `p`, also a block of kpmalloc or null; data() is what is owned then.
+    /// Exchanges the owned block for `p`, a block of kpmalloc or null. data() becomes the newly
+    /// owned block.
     void swapDataPtr(void*& p);
 
     /// Makes this the owner of `data`, a block of kpmalloc.
@@ -47,18 +51,19 @@ public:
     /// The same into three numbers.
     void getDims(int orientation, int& d0, int& d1, int& d2) const;
 
-    /// First voxel of slice `k`, and the bytes from voxel to voxel in a row and from row to row. Other orientations
-    /// than 1 and 2 count as 0. Strides are 32 bits: if one is 2^31 bytes or more, null and zeros, with an error in the
-    /// log; copies of such slices are still to be had by getSlice() and putSlice().
+    /// Sets `p` to the first voxel of slice `k`, and the strides to the bytes from voxel to voxel
+    /// in a row and from row to row. Other orientations than 1 and 2 count as 0. Strides have 32
+    /// bits: if one is 2^31 bytes or more, sets null and zeros and logs an error; use getSlice()
+    /// and putSlice() to copy such slices.
     void accessSlice(int orientation, int k, void*& p, int& stride0, int& stride1) const;
 
-    /// Makes `out` a view on slice `k`, without pixels or data if accessSlice() refuses it; or, with `copy`, fills the
-    /// memory that `out` has to have, without gaps and whatever its sizes and strides say. Other orientations than 0, 1
-    /// and 2 do nothing.
+    /// Makes `out` a view on slice `k`, without pixels or data if accessSlice() refuses it. With
+    /// `copy`, fills the memory of `out`, without gaps, regardless of its sizes and strides. Does
+    /// nothing for other orientations than 0, 1 and 2.
     void getSlice(int orientation, int k, KpRawData2D& out, int copy) const;
 
-    /// Overwrites slice `k` by the pixels of `slice`, which lie without gaps, whatever its sizes and strides say. Other
-    /// orientations than 0, 1 and 2 do nothing.
+    /// Overwrites slice `k` by the pixels of `slice`, read without gaps, regardless of its sizes
+    /// and strides. Does nothing for other orientations than 0, 1 and 2.
     void putSlice(int orientation, int k, const KpRawData2D& slice);
 
     /// Voxels along x, y and z.

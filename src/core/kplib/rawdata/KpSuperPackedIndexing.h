@@ -3,8 +3,9 @@
 #include <kplib/foundation/KpDArray.h>
 #include <kplib/foundation/KpExport.h>
 
-/// Dense numbers for a sparse set of flagged positions, as KpPackedIndexing, but from run lengths and growing at its
-/// end: one byte a run, and two bytes and two longs at most for each block of 255 positions.
+/// Dense numbers for a sparse set of flagged positions, as KpPackedIndexing, but stored as run
+/// lengths, and positions can be appended. Takes one byte for each run, and at most two bytes and
+/// two longs for each block of 255 positions.
 ///
 /// Exhausted memory is a KpMemoryException, after which only the destructor may follow. One thread
 /// at a time may append, or any number read.
@@ -19,7 +20,8 @@ public:
     /// Appends `n` positions, flagged where the byte isn't 0; nothing for `n` below 1. O(n).
     void appendIndexSpace(const unsigned char* flags, long n);
 
-    /// The dense number of a position, or -1 if it isn't flagged or not there. It goes through the runs of one block.
+    /// The dense number of a position, or -1 if it is not flagged or does not exist. Walks the
+    /// runs of one block.
     long index(long position) const;
 
     /// For each block the number of flagged positions before it.

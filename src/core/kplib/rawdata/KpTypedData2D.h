@@ -11,7 +11,7 @@ public:
     /// Empty: no components, of bytes.
     KpTypedData2D() = default;
 
-    // Each constructor does what the init() of its arguments does.
+    // Each constructor does what init() does with the same arguments.
 
     /// @{
     /// As init().

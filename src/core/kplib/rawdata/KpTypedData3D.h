@@ -26,7 +26,8 @@ public:
     void init(int nx, int ny, int nz, KpTypedPointer p, int nDataVar);
 
     using KpRawData3D::getSlice;
-    /// The same, and `out` gets the components and the type of this block, also where it gets nothing else.
+    /// As KpRawData3D::getSlice(). `out` also receives the components and the type of this block,
+    /// even if it receives nothing else.
     void getSlice(int orientation, int k, KpTypedData2D& out, int copy) const;
 
     /// Components a voxel.

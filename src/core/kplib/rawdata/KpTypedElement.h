@@ -5,9 +5,10 @@
 
 #include <cstdint>
 
-/// A short vector of components of one type that lie elsewhere: it owns nothing, and copies of it share them.
+/// A short vector of components of one type in memory that is owned elsewhere. Copies refer to the
+/// same components.
 ///
-/// Complex, string, uint and sbyte components are carried, but not computed with. No lock: the
+/// Complex, string, uint and sbyte components are accepted but not computed with. No lock: the
 /// owner of the buffer guards the memory.
 class KPLIB_API KpTypedElement {
 public:
@@ -18,8 +19,9 @@ public:
     {
     }
 
-    /// Adds or subtracts component by component in the arithmetic of this element's type: integers wrap. Type and count
-    /// of `other` are taken to be this one's, unchecked. A type that isn't a number: nothing happens.
+    /// Adds or subtracts component by component in the arithmetic of this element's type: integers
+    /// wrap. Precondition: `other` has the same type and count. Does nothing for a type that is
+    /// not numeric.
     KpTypedElement& operator+=(const KpTypedElement& other);
     /// As above.
     KpTypedElement& operator-=(const KpTypedElement& other);

@@ -25,25 +25,31 @@
 ///     std::printf("%ld bytes, stride %ld\n", volume->size(), volume->strides()[2]);
 ///     // prints: 48 bytes, stride 24
 ///
-/// The memory is one block (linear; strides()[2] is above 0) or one block a slice (sliced;
-/// strides()[2] is 0). Voxel (x, y, z) lies at its slice's address + x * strides()[0] + y *
-/// strides()[1], in bytes. The object frees its blocks through its allocator; with an allocator
-/// that frees nothing it is a view, which is valid as long as the memory is. Coordinates are never
-/// checked. Handles may be copied and dropped on any thread; all else has no lock: the fields of a
-/// lock on a region are only stored here; their users define what they mean.
+/// The memory is one block (linear; strides()[2] is above 0) or one block for each slice (sliced;
+/// strides()[2] is 0). Voxel (x, y, z) is at the address of its slice + x * strides()[0] + y *
+/// strides()[1], in bytes. Coordinates are not checked.
+///
+/// Ownership: the object frees its blocks by its allocator. With an allocator that frees nothing
+/// it is a view, which is valid as long as the memory.
+///
+/// Threads: handles may be copied and released on any thread; all else has no lock. The fields of
+/// a lock on a region are only stored here; their users define their meaning.
 class KPLIB_API TmDataAccess : public KpHandableThreaded {
 public:
-    /// Runs first in the destructor; `data` is that of setDeleteCallback().
+    /// Called first in the destructor. `data` is that of setDeleteCallback().
     using DeleteCallback = void (*)(TmDataAccess* object, void* data);
 
     /// Empty: all sizes are 0; frees with free().
     TmDataAccess() = default;
-    /// One block of size() bytes out of `allocator`, not set to anything. Without memory the object has no data.
+    /// Allocates one block of size() bytes by `allocator`, not initialised. If that fails, the
+    /// object has no data.
     TmDataAccess(const KpVec3l& dims, KpPrimType type, int nDataVar, KpAllocator allocator);
 
-    // Strides of 0 are those of data without gaps, but that of z of two slices or more stays 0.
+    // Strides of 0 stand for data without gaps, except that of z, which stays 0 for two or more
+    // slices.
 
-    /// Over one block, or without data if it is null. What `allocator` frees is the object's from now on.
+    /// Describes one block, or no data if it is null. The object owns the memory if `allocator`
+    /// frees it.
     TmDataAccess(const KpVec3l& dims, const KpVec3l& strides, void* data, KpPrimType type, int nDataVar,
                  KpAllocator allocator);
     /// Without data.
@@ -52,13 +58,14 @@ public:
         TmDataAccess(dims, strides, static_cast<void*>(nullptr), type, nDataVar, allocator)
     {
     }
-    /// Over one block a slice, `dims`[2] of them in the order of z; without data if `data` is null.
+    /// Describes one block for each slice, `dims`[2] of them in the order of z, or no data if
+    /// `data` is null.
     TmDataAccess(const KpVec3l& dims, const KpVec3l& strides, void* const* data, KpPrimType type, int nDataVar,
                  KpAllocator allocator);
 
     TmDataAccess(const TmDataAccess&) = delete;
     TmDataAccess& operator=(const TmDataAccess&) = delete;
-    /// Runs the delete callback, then dataRelease(). An exception out of either ends the process.
+    /// Calls the delete callback, then dataRelease(). An exception from either ends the process.
     ~TmDataAccess() override;
 
     /// Frees the memory and keeps the description.
@@ -83,7 +90,7 @@ public:
 
     /// Bytes of all voxels, without gaps; the largest number where that is out of range.
     long size() const;
-    /// Whether sizes, strides and the number of blocks go together.
+    /// Whether sizes, strides and the number of blocks are consistent.
     bool isValid() const;
     /// Whether the memory is one block.
     bool isLinear() const { return strides_[2] > 0; }
@@ -118,23 +125,26 @@ public:
     /// data gives a linear view.
     void subBox(KpHandle<TmDataAccess>& out, const KpBox3i& box) const;
 
-    /// Makes `out` a copy whose memory comes from malloc, whatever `allocator` is. Fails, with
-    /// `out` null, if the data aren't contiguous, and, with `out` a copy without data, if there is
-    /// no memory.
+    /// Sets `out` to a copy whose memory comes from malloc, whatever `allocator` is. Fails with a
+    /// null `out` if the data are not contiguous, and with a copy without data if memory is
+    /// exhausted.
     KpResult clone(KpHandle<TmDataAccess>& out, KpAllocator allocator) const;
 
-    // A line of voxels, along the first axis of which the coordinate is -1, or along z if that of neither x nor y is.
-    // Of each voxel the first component counts. Never fails: without data, and for types that aren't numbers, nothing
-    // is read or written. Sliced data stay in their first slice: not to be used on them.
+    // A line of voxels along the first axis whose coordinate is -1, or along z if neither x nor y
+    // is -1. Only the first component of each voxel is used. Never fails: without data, and for
+    // types that are not numeric, nothing is read or written. Do not use with sliced data: all
+    // values are taken from the first slice.
 
     /// Reads dims()[axis] values.
     KpResult row(long x, long y, long z, float* out) const;
-    /// Writes as many: clamped to the range of the type and cut towards zero. NaN becomes 0, in an int the smallest
-    /// one; so does, in an int, what lies above its range. The description doesn't change, so it is a const operation.
+    /// Writes as many values, clamped to the range of the type and truncated toward zero. NaN
+    /// becomes 0. In an int, NaN and values above its range become the smallest int. The function
+    /// is const because the description does not change.
     KpResult putRow(long x, long y, long z, const float* in) const;
 
-    /// MD5 of type, components, sizes and voxels, whatever the strides of y and z; rows are taken to have no gaps. Of
-    /// an object without data that of the first three. Bytes count as they lie in memory.
+    /// MD5 of type, components, sizes and voxels, independent of the strides of y and z.
+    /// Precondition: rows have no gaps. Without data, MD5 of the first three. Values are added as
+    /// their bytes in memory.
     Kp128 hash() const;
 
     // The lock that a thread holds on a region.

@@ -2,8 +2,8 @@
 
 #include <kplib/foundation/KpExport.h>
 
-/// Work on rows of pixels, as fast as the processor allows; every processor gives the same bits. No alignment is asked
-/// for. Any number of threads, on different rows.
+/// Operations on rows of pixels. All processors give the same bits. No alignment is required. Any
+/// number of threads, on different rows.
 class KPLIB_API TmSSETools {
 public:
     TmSSETools() = delete;
@@ -15,8 +15,8 @@ public:
 
     /// Reverses the order of the rows in place; nothing if they have no bytes.
     static void mirrorY(char* data, long rows, long rowBytes);
-    /// Copies the rows in reverse order, of each what both sides have room for, into memory that doesn't overlap.
-    /// Nothing if any number is below 1.
+    /// Copies the rows in reverse order, as many bytes of each as both sides have room for, to
+    /// memory that does not overlap. Does nothing if any number is below 1.
     static void memcpyMirrorY(const unsigned char* src, long rows, long srcRowBytes, unsigned char* dst,
                               long dstRowBytes);
 };

@@ -61,8 +61,8 @@ public:
     bool unlink() const;
     /// Renames the file and returns false on failure. The object takes `newName` in both cases.
     bool rename(const char* newName);
-    /// Copies contents and rights to the file `target`. Returns false if either cannot be opened
-    /// or not all can be read and written; no `target` remains then. A file that is copied to
+    /// Copies contents and rights to the file `target`. Returns false if either cannot be opened,
+    /// or if not all can be read and written, which leaves no `target`. A file that is copied to
     /// itself is unchanged.
     bool copy(const char* target) const;
 
@@ -116,9 +116,9 @@ public:
     /// A name that does not exist, in `dir`, or for null in the system's temporary folder. The
     /// file is not created.
     static KpFilename getTempFilename(const char* dir);
-    /// Computes a path for a new file. `dir` is a folder below `root` (the system's temporary
-    /// folder if empty), created if needed, with `dated` by year, month and day. `name` consists
-    /// of local time and process, with `withUuid` also of a UUID. Both are empty if the folder
-    /// cannot be created.
+    /// Computes a path for a new file. `dir` is `root` (the system's temporary folder if empty),
+    /// with `dated` a folder in it by year, month and day; it is created if needed. `name`
+    /// consists of local time and process, with `withUuid` also of a UUID. Both are empty if the
+    /// folder cannot be created.
     static void generateFilePath(KpString& dir, KpString& name, const KpString& root, bool dated, bool withUuid);
 };

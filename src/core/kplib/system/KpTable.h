@@ -104,8 +104,8 @@ public:
     static int relationGetCount(const char* row, int offset);
     /// Ensures that `cells` more cells can be added without a move.
     void relationReserve(int cells, int offset);
-    /// Walks a list: the first cell, the one after a cell, and the row a cell points to; null ends
-    /// it.
+    /// The first cell of a list, the next cell after a cell, and the row that a cell points to.
+    /// Null marks the end.
     static char** relationFirst(const char* row, int offset);
     /// @{
     /// As above.

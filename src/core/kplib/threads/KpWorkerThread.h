@@ -65,7 +65,7 @@ public:
     bool start(bool waitForCaller);
 
     /// Waits until the pass has ended or sleeps in suspended(). Returns false at once if there is
-    /// no pass. Sets `timedOut` and returns true if the pass is still under way after
+    /// no pass, else true. `timedOut` receives whether the pass is still under way after
     /// `milliseconds`; each wake-up restarts that time.
     bool wait(bool& timedOut, unsigned long milliseconds = ULONG_MAX);
     /// Without a time limit.

@@ -19,11 +19,14 @@ class KpString;
 /// Bit i is bit i & 31, from the least significant, of the 32-bit word i >> 5. There is always one
 /// word more than there are full ones: 32 bits take two. That spare word is part of the layout:
 /// fills and the digest include it, functions that count or find bits do not. Operations on many
-/// bits work on whole words. Bit numbers are not checked. Exhausted memory is a KpMemoryException,
-/// after which the field is as it was. One thread may change a field, or any number read it.
+/// bits work on whole words. Bit numbers are not checked.
+///
+/// Errors: exhausted memory throws KpMemoryException and leaves the field unchanged.
+///
+/// Threads: one thread may change a field, or any number read it.
 class KPLIB_API KpBitfield {
 public:
-    /// What words that are added begin with; any other value leaves them as they are, as INIT_NONE does.
+    /// Initial value of added words. Any other value leaves them uninitialised, as INIT_NONE does.
     enum INIT : int {
         INIT_SET = 0,    ///< all bits set
         INIT_UNSET = 1,  ///< all bits clear
@@ -155,9 +158,9 @@ public:
     /// short; bits that are not in it are unset.
     bool load(const KpString& file, unsigned long nBits);
 
-    /// MD5 over the first quarter of the full words and the used bits of the last word (over the spare word whole, if
-    /// no word is partly used). So it isn't a digest of all bits, and must stay as it is: digests are compared with
-    /// stored ones. An empty field has the digest of no bytes.
+    /// MD5 over the first quarter of the full words and the used bits of the last word (over the
+    /// whole spare word if no word is partly used). Intentional: this is not a digest of all bits,
+    /// but stored digests depend on it. An empty field has the digest of no bytes.
     void md5(unsigned char* digest) const;
     /// As 32 upper-case hexadecimal digits.
     void md5(KpString& text) const;

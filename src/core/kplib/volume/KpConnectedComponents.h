@@ -4,7 +4,7 @@
 #include <kplib/foundation/KpExport.h>
 #include <kplib/rawdata/KpTypedPointer.h>
 
-/// Labels the connected regions of a 2D or 3D image in one raster pass, and counts what they hold.
+/// Labels the connected regions of a 2D or 3D image in one raster pass, and counts their voxels.
 ///
 ///     short image[] = {9, 9, 0, 5, 0, 0, 0, 5};
 ///     const int dims[] = {4, 2, 1};
@@ -15,16 +15,19 @@
 ///     // prints: 2 regions, the first of 2 voxels
 ///     kpfree(labels);
 ///
-/// Images are dense, x fastest, `dims` their three sizes. Neighbours are 4 or 8 (in plane), 6, 18, 26, or 10 (8 and the
-/// faces in z); with any other number each voxel is a component of its own. The result is an image of labels and a
-/// table: entry 0 is the background, all zero, entry i component i, numbered in raster order of the first voxels. Where
-/// regions meet, one becomes an alias of the other. Only one step of an alias is followed while labelling, so in an
-/// intricate region a component may come out in parts, or its counts short of some voxels; peers expect these very
-/// numbers.
+/// Images are dense, x fastest; `dims` are their three sizes. Neighbours are 4 or 8 (in the
+/// plane), 6, 18, 26, or 10 (8 and the faces in z). With any other number each voxel is a
+/// component of its own. The result is an image of labels and a table: entry 0 is the background,
+/// all zero; entry i is component i, numbered in raster order of the first voxels. If regions
+/// meet, one becomes an alias of the other. Intentional: only one step of an alias is followed
+/// while labelling, so a component of an intricate region may be divided, or its counts may miss
+/// some voxels; peers depend on these numbers.
 ///
-/// Everything runs on the calling thread; threads may label different images at once. The table grows as the regions
-/// do. Scratch is two bits for each voxel of a slice, one if there is a single slice, with rows rounded up to 8, 16, 32
-/// or a multiple of 64 voxels; rows below 8 voxels need none. Exhausted memory is a KpMemoryException.
+/// Threads: runs on the calling thread; threads may label different images at once.
+///
+/// Memory: a table that grows with the number of regions, and two bits for each voxel of a slice,
+/// one if there is a single slice, with rows rounded up to 8, 16, 32 or a multiple of 64 voxels;
+/// rows below 8 voxels need none. Exhausted memory throws KpMemoryException.
 class KPLIB_API KpConnectedComponents {
 public:
     /// What the table holds of a component.
@@ -44,12 +47,12 @@ public:
     template <typename L>
     static constexpr int maxComponents = sizeof(L) == 2 ? 64999 : 9999999;
 
-    /// Regions of voxels at or above `low` (NaN counts as that), with the count of those at or
-    /// above `high` as seeds. For integers both are rounded, and cut to the element type. If
-    /// `labels` is null, it gets an image of kpmalloc, which the caller then owns, whatever the
-    /// result; labels may take the place of unsigned shorts of `data`. `components` may be null.
-    /// Returns the number of components; -1 with an error in the log, if the elements are not
-    /// numbers or there are too many components (the labels are incomplete then).
+    /// Labels regions of voxels at or above `low` (NaN counts as such), and counts their voxels at
+    /// or above `high` as seeds. For integers both thresholds are rounded and clamped to the
+    /// element type. If `labels` is null, it receives an image of kpmalloc, which the caller owns,
+    /// whatever the result. Labels may take the place of unsigned shorts of `data`. `components`
+    /// may be null. Returns the number of components, or -1 with an error in the log if the
+    /// elements are not numeric or there are too many components (the labels are then incomplete).
     static int labelCC(KpTypedPointer data, const int* dims, int neighbours, unsigned short*& labels, int, double low,
                        double high, int, int, KpDArray<Component>* components);
 
@@ -63,8 +66,8 @@ public:
     /// By the number of voxels, ascending: -1, 0 or 1.
     static int compareComponents(const Component& a, const Component& b);
 
-    /// The neighbours that come before a voxel in raster order, in the order of merging: `n` steps (dx, dy, dz) and
-    /// their offsets in elements. The arrays hold 13 at least.
+    /// The neighbours that precede a voxel in raster order, in the order of merging: `n` steps
+    /// (dx, dy, dz) and their offsets in elements. The arrays must have at least 13 elements.
     static void mknbtableprev(int neighbours, const int* dims, int& n, int* offsets, int (*deltas)[3]);
 
     /// Adds a zeroed entry and returns its index. At the limit, aliases are cleaned out first, in
@@ -73,16 +76,17 @@ public:
     template <typename L>
     static int addNewComponent(KpDArray<Component>& components, L* labels, int nLabelled);
 
-    /// Drops aliases, and components of fewer than `minVoxels` voxels or `minSeeds` seeds (where those are above 0),
-    /// and renumbers the others in order, in the first `nLabelled` labels too. Returns the new size of the table.
+    /// Removes aliases, and components of fewer than `minVoxels` voxels or `minSeeds` seeds (if
+    /// those are above 0), and renumbers the others in order, also in the first `nLabelled`
+    /// labels. Returns the new size of the table.
     template <typename L>
     static int cleanup_components(KpDArray<Component>& components, L* labels, int nLabelled, int minVoxels,
                                   int minSeeds);
 
-    /// The pass of all of these: regions of voxels not below `low`, or, with `labelMode`, of equal
-    /// value among them. T is unsigned char, short, unsigned short, int, float or double with L
-    /// unsigned short, or unsigned char with int. Time is linear in the voxels; far less than a
-    /// nanosecond is spent on one in the background.
+    /// The pass of all functions above: labels regions of voxels not below `low`, or, with
+    /// `labelMode`, of equal value among them. T is unsigned char, short, unsigned short, int,
+    /// float or double with L unsigned short, or unsigned char with int. Linear in the voxels; a
+    /// background voxel takes far less than a nanosecond.
     template <typename T, typename L>
     static int do_label(T* data, L* labels, KpDArray<Component>& components, T low, T high, const int* dims,
                         int neighbours, int labelMode);

@@ -4,11 +4,12 @@
 
 #include <cstdint>
 
-/// The neighbours of a voxel in a 3x3x3 window of a dense volume, x fastest: a table of offsets, directions and weights
-/// that a loop over neighbours walks without arithmetic on coordinates.
+/// The neighbours of a voxel in a 3x3x3 window of a dense volume, x fastest: a table of offsets,
+/// directions and weights, so that a loop over neighbours needs no arithmetic on coordinates.
 ///
-/// It serves volumes of one size. Offsets are ints: those of slices of 2^31 voxels and more are cut to their low 32
-/// bits. Once weights are set, any number of threads may read it.
+/// A table is for volumes of one size. Offsets are ints: those of slices of 2^31 voxels and more
+/// are truncated to their low 32 bits. After the weights are set, any number of threads may read
+/// it.
 class KPLIB_API KpNeighborIterator33 {
 public:
     /// Largest number of neighbours.
@@ -29,9 +30,10 @@ public:
     /// filled. `dims` are three sizes.
     KpNeighborIterator33(int nNeighbors, const int* dims);
 
-    /// Takes the weights from a table of 27 for the whole window, that of (dx, dy, dz) at 13 + dx + 3 dy + 9 dz and the
-    /// one in the middle unread; sorts by them unless `sort` is 0. Integers are kept as floats too, and floats as
-    /// integers, cut off toward zero. chars are signed.
+    /// Sets the weights from a table of 27 for the whole window: that of (dx, dy, dz) is at 13 +
+    /// dx + 3 dy + 9 dz, and the middle one is not read. Sorts by weight unless `sort` is 0.
+    /// Integers are also stored as floats, and floats as integers, truncated toward zero. chars
+    /// are signed.
     void setWeights(const char* w, int sort);
     /// @{
     /// As above.

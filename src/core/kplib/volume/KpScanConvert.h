@@ -3,11 +3,12 @@
 #include <kplib/foundation/KpExport.h>
 #include <kplib/geometry/KpVec2f.h>
 
-/// Turns polygons into spans of pixels, of any shape, by the even-odd rule: a pixel belongs to the polygon if its
-/// middle, at +0.5 in x and y, does. P. S. Heckbert, "Concave polygon scan conversion", Graphics Gems, 1990.
+/// Converts polygons of any shape to spans of pixels by the even-odd rule: a pixel belongs to the
+/// polygon if its centre, at +0.5 in x and y, does. P. S. Heckbert, "Concave polygon scan
+/// conversion", Graphics Gems, 1990.
 ///
-/// Rows come in ascending order, and the spans of a row from left to right. Different threads may render at once, and a
-/// callback may render with another object.
+/// Rows are reported in ascending order, the spans of a row from left to right. Distinct threads
+/// may render at once, and a callback may render with another object.
 class KPLIB_API KpScanConvert {
 public:
     /// Receives the pixels from `xLeft` to `xRight`, both included, of row `y`.
@@ -33,9 +34,9 @@ public:
         userData_ = userData;
     }
 
-    /// Reports the polygon of `n` vertices, which closes itself. Fewer than 3 vertices enclose nothing. O(n log n), and
-    /// a span costs a few comparisons. Polygons of a few hundred vertices allocate nothing; larger ones may end in a
-    /// std::bad_alloc.
+    /// Reports the polygon of `n` vertices, closed implicitly. Fewer than 3 vertices enclose
+    /// nothing. O(n log n), and a few comparisons for each span. Polygons of a few hundred
+    /// vertices allocate nothing; larger ones may throw std::bad_alloc.
     void render(int n, const KpVec2f* points);
 
     /// The span callback at the start: passes the pixels to the pixel callback of the object that

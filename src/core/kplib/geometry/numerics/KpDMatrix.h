@@ -8,8 +8,9 @@
 /// A dense matrix of any size, row by row, with the linear algebra that the 3x3 and 4x4 types
 /// cannot do. float is the only element type.
 ///
-/// Each matrix owns its block: copies are deep. An empty one has no block. Exhausted memory is a KpMemoryException
-/// where nothing else is said, and the matrix is as before. No shared state; one thread at a time.
+/// Each matrix owns its block: copies are deep. An empty matrix has no block. Unless stated
+/// otherwise, exhausted memory throws KpMemoryException and leaves the matrix unchanged. No shared
+/// state; one thread at a time.
 template <typename T>
 class KpDMatrix {
 public:
@@ -36,8 +37,9 @@ public:
     /// Exchanges the blocks.
     void swap(KpDMatrix& other) noexcept;
 
-    /// Nothing if the shape is this one. Else the elements keep their places in memory, not their rows and columns,
-    /// and new ones are not set to anything. Negative counts are not allowed.
+    /// Changes the shape. Does nothing if the shape is the same. Otherwise the elements keep their
+    /// places in memory, not their rows and columns, and new ones are not initialised. Counts must
+    /// not be negative.
     void resize(int rows, int cols);
 
     /// Number of rows.
@@ -64,8 +66,9 @@ public:
     /// Exchanges rows and columns, by way of a new block.
     void transpose();
 
-    /// The product this * other, each element summed from the first column on in the width of T. Shapes that don't fit:
-    /// one error in the log, and this stays.
+    /// Replaces this by the product this * other; each element is summed from the first column on
+    /// in the precision of T. If the shapes do not match, logs one error and leaves this
+    /// unchanged.
     KpDMatrix& operator*=(const KpDMatrix& other);
 
     /// The singular values of this m by n matrix A: A = U diag(w) transpose(V), with U m by n and
@@ -77,10 +80,11 @@ public:
     /// Numerische Mathematik 14, 1970.
     bool SVD(KpDMatrix& U, T* w, KpDMatrix& V, int maxIterations) const;
 
-    /// Solves A x = b for each of the `count` sides `rhs`, of n elements each, in place; A is this n by n matrix and
-    /// stays. 0 on success. 1, with a warning or errors in the log and the sides untouched, for a matrix that isn't
-    /// square, is singular, or for exhausted memory. Solutions are refined until the residual is 1e-5 of the side; one
-    /// that stays above 1e-4 is kept, with a warning. O(n^3).
+    /// Solves A x = b in place for each of the `count` right-hand sides `rhs`, of n elements each.
+    /// A is this n by n matrix and is unchanged. Returns 0 on success. Returns 1, with a warning
+    /// or errors in the log and the sides unchanged, if the matrix is not square or singular, or
+    /// if memory is exhausted. Solutions are refined until the residual is 1e-5 of the side; a
+    /// solution with a residual above 1e-4 is kept, with a warning. O(n^3).
     int solveLRdecomp(T** rhs, int count) const;
     /// The same with room from the caller: `lr` are n rows of n elements and receive the factors, with rows exchanged;
     /// `sign` is 1 or -1 for an even or odd number of exchanges. Gaussian elimination with partial pivoting and

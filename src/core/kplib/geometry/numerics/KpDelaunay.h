@@ -12,12 +12,13 @@ class KpVec3f;
 /// Delaunay triangulations of points in the plane and in space: no point lies inside the circle or sphere through the
 /// corners of another part.
 ///
-/// The points go in one after the other: what has the new one in its circle makes way for a fan
-/// around it (A. Bowyer, "Computing Dirichlet tessellations", and D. F. Watson, both in The
-/// Computer Journal 24(2), 1981). The algorithm works on copies, shifted at random by up to half a
-/// hundred-millionth of their range, with KpRandom::rand(): so equal or regular points are no
-/// trouble, and two processes may choose differently where the choice is open. Parts that are
-/// nearly flat are left out, so the hull may have small gaps.
+/// The points are inserted one after the other: the parts whose circle or sphere contains the new
+/// point are replaced by a fan around it (A. Bowyer, "Computing Dirichlet tessellations", and D.
+/// F. Watson, both in The Computer Journal 24(2), 1981). The algorithm works on copies of the
+/// points, shifted by KpRandom::rand() by up to half a hundred-millionth of their range. So equal
+/// or regular points are handled, and where several triangulations are valid, two processes may
+/// return different ones. Parts that are nearly flat are left out, so the hull may have small
+/// gaps.
 ///
 /// Both restart the system's generator with srand(367). They throw KpMemoryException with the result unchanged; memory
 /// is linear in the number of points, and the time about n log n, for points in no special order. Any number of

@@ -5,11 +5,11 @@
 /// Base of the integrators of curves in a vector field, KpODE2 in the plane and KpODE3 in space:
 /// streamlines.
 ///
-/// An embedded Runge-Kutta method follows the field in steps that fit the error; the curve is
-/// sampled at equal spacing of its parameter, from the cubic Hermite segment of each step. The
-/// parameter is arc length, unless setNormalization(0) leaves the field its own speed. Set up,
-/// init(), then next() or nextSL() until they give another code than 0. Nothing is logged, nothing
-/// allocated. One thread at a time; the field is called on it.
+/// An embedded Runge-Kutta method follows the field with steps that are adapted to the error. The
+/// curve is sampled at equal spacing of its parameter, from the cubic Hermite segment of each
+/// step. The parameter is arc length, unless setNormalization(0) keeps the length of the field.
+/// Set the parameters, call init(), then next() or nextSL() until they return another code than 0.
+/// Nothing is logged or allocated. One thread at a time; the field is called on it.
 template <typename Vector>
 class KPLIB_API KpODEBase {
 public:

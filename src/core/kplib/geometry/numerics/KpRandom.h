@@ -14,8 +14,8 @@ public:
     /// As initialize().
     explicit KpRandom(std::int64_t seed = 1) { initialize(seed); }
 
-    /// Starts the sequence of `seed`; 0 counts as 1. A multiple of 2^31 - 1 other than 0 is a fixed point of the
-    /// generator: it gives nothing but 0.
+    /// Starts the sequence of `seed`; 0 counts as 1. Any other multiple of 2^31 - 1 is a fixed
+    /// point of the generator: all numbers are then 0.
     void initialize(std::int64_t seed);
 
     /// The next number of this object's sequence, above 0 and at most 0.99999988. Threads that

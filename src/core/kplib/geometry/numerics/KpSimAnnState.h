@@ -17,7 +17,7 @@ public:
         changePending_ = false;
         doExecuteChange();
     }
-    /// The energy, which the search wants low.
+    /// The energy, which the search minimises.
     float evaluate() { return doEvaluate(); }
 
     /// Whether the last proposal has not been made.

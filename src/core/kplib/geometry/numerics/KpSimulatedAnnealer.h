@@ -6,9 +6,10 @@
 
 class KpSimAnnState;
 
-/// Simulated annealing: takes each change that lowers the energy of a state, and others the more rarely the more they
-/// raise it and the colder it is. S. Kirkpatrick et al., "Optimization by simulated annealing", Science 220, 1983; N.
-/// Metropolis et al., 1953.
+/// Simulated annealing: accepts each change that lowers the energy of a state. A change that
+/// raises it is accepted with a probability that decreases with the rise and with falling
+/// temperature. S. Kirkpatrick et al., "Optimization by simulated annealing", Science 220, 1983;
+/// N. Metropolis et al., 1953.
 class KPLIB_API KpSimulatedAnnealer {
 public:
     /// The factor from one temperature to the next.

@@ -15,8 +15,8 @@ public:
     /// function", 1964.
     static float gammln(float x);
 
-    /// The continued fraction of the incomplete beta function, by Lentz's method. If 100 rounds are too few, the log
-    /// says so, and what is reached by then is given.
+    /// The continued fraction of the incomplete beta function, by Lentz's method. If 100
+    /// iterations do not suffice, that is logged, and the value reached is returned.
     static float betacf(float a, float b, float x);
 
     /// The regularised incomplete beta function; 0 for an `x` outside 0 to 1.
