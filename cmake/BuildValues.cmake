@@ -1,5 +1,6 @@
-# cmake -P: writes HEADER with what KpBuildInfo tells. It is written anew only when something else than the time differs, so
-# that a build without changes stays one; SOURCE_DATE_EPOCH in the environment settles the time.
+# cmake -P: writes HEADER with the values of KpBuildInfo. It is rewritten only if a value other
+# than the time differs, so that a build without changes rebuilds nothing. SOURCE_DATE_EPOCH in the
+# environment sets the time.
 
 execute_process(COMMAND git rev-parse --verify HEAD WORKING_DIRECTORY ${SOURCE_DIR} OUTPUT_VARIABLE revision
                 OUTPUT_STRIP_TRAILING_WHITESPACE ERROR_QUIET RESULT_VARIABLE failed)

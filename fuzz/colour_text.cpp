@@ -4,7 +4,8 @@
 #include <cstdlib>
 #include <string>
 
-// A colour from any text: what is told to be read is a fixed point of the same three numbers, and no text does harm.
+// A colour from any text: an accepted colour stays from 0 to 1 after conversion to HSV and L*a*b*
+// and back. No text causes a fault.
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, size_t size)
 {
     const std::string text(reinterpret_cast<const char*>(data), size);

@@ -62,7 +62,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     datesAndTimes(input.line());
     KpString values(input.line().c_str());
     const KpString once = (Tmg::addToMultiValueString(values, KpString("a\\b"), "\\"), values);
-    const bool isQuoted = std::strchr(once, '"') != nullptr;  // an open quote swallows the separators behind it
+    const bool isQuoted = std::strchr(once, '"') != nullptr;  // an open quote includes the separators after it
     check(isQuoted || (!Tmg::addToMultiValueString(values, KpString("a\\b"), "\\") && values == once));
     valuesOfImages(input);
     return 0;

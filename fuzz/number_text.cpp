@@ -18,7 +18,7 @@ void defaultsTellFailures(Number (*convert)(const char*, Number, bool*), const c
     check(ok ? (a == b || (a != a && b != b)) : (a == Number(1) && b == Number(2)));
     check(!ok || *text != '\0');
     const std::string longer = std::string(text) + " ";
-    check((convert(longer.c_str(), Number(1), &again), !again));  // a blank behind the number is one too many
+    check((convert(longer.c_str(), Number(1), &again), !again));  // a blank after the number is one too many
 }
 
 }  // namespace

@@ -38,7 +38,7 @@ void protectAndReadBack(const std::string& bytes)
     const bool needsQuotes = plain == quoted;
     const bool hasEscapes = quoted.length() != text.length() + 2;
     if (needsQuotes && hasEscapes)
-        return;  // escapes inside quotes are not read back, and that is meant
+        return;  // intentional: escapes inside quotes are not read back
     KpStringTokenizer tokenizer(plain);
     check(tokenizer.nextToken() == text);
     check(!tokenizer.hasMoreTokens());

@@ -11,8 +11,9 @@
 #include <random>
 #include <vector>
 
-// Parallel planes through one box, in shuffled order so that the number of vertices can't be guessed: against a loop
-// over the twelve edges, which finds the same vertices but not their order.
+// Parallel planes through one box, in shuffled order so that the number of vertices cannot be
+// predicted, against a loop over the twelve edges, which finds the same vertices without their
+// order.
 
 using kplib::bench::report;
 

@@ -7,8 +7,8 @@
 #include <random>
 #include <vector>
 
-// Lines through the neighbourhood of a box and of a triangle, of which about half hit: against the shortest published
-// tests, which give less - whether the box is hit, the weights of the triangle.
+// Lines near a box and near a triangle, of which about half hit, against the shortest published
+// tests, which return less: whether the box is hit, the weights of the triangle.
 
 using kplib::bench::report;
 

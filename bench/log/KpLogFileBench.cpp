@@ -12,7 +12,7 @@
 #include <vector>
 
 // A line of some 60 bytes goes to a file of a memory file system, and is flushed. The baseline is the one system call
-// that this can't do without.
+// that each line needs.
 
 namespace {
 

@@ -21,7 +21,7 @@ constexpr long messageBytes = 64L << 20;
 const KpVec3l lineDims(512L, 512L, 64L);
 constexpr long lineVoxels = 512L * 512 * 64;
 
-/// 64 MiB of shorts over `memory`: one block, or with `gap` bytes behind each row.
+/// 64 MiB of shorts over `memory`: one block, or with `gap` bytes after each row.
 TmDataAccess volume(const Memory& memory, long gap)
 {
     return {{512L, 512L, 128L}, {2L, 1024 + gap, 0L}, memory.get(), KpPrimType::Short, 1, KpAllocator::AllocatorNone};

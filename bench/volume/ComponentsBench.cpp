@@ -112,7 +112,7 @@ void addImage(const std::string& kind, Image (*make)(const Volume&), const Volum
     for (const Volume& volume : {ct, atlas}) {
         for (int neighbours : {6, 18, 26})
             addImage("mask", mask, volume, neighbours, 0, neighbours == 6 ? 0.25 : 0.2);
-        addImage<int>("noise", noise, volume, 6, 0, 1);  // of more components than short labels tell apart
+        addImage<int>("noise", noise, volume, 6, 0, 1);  // more components than short labels can number
         addImage("noise", noise, volume, 18, 0, 1);
         addImage("noise", noise, volume, 26, 0, 1);
         addImage("labels", segmentation, volume, 26, 1, 0.2);

@@ -5,8 +5,8 @@
 #include <algorithm>
 #include <cmath>
 
-// The fill of something like a brain: an ellipsoid with folds that go deep. The limit is 0.7 nanoseconds a voxel
-// filled, which the items per second tell.
+// Fills a shape like a brain: an ellipsoid with deep folds. The limit is 0.7 nanoseconds for each
+// filled voxel, measured as items per second.
 
 using namespace kplib::bench;
 

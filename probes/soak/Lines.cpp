@@ -14,7 +14,7 @@ namespace kplib::probe {
 
 namespace {
 
-/// The number behind `key` in a line; -1 without one.
+/// The number after `key` in a line; -1 without one.
 long numberAfter(std::string_view line, std::string_view key)
 {
     const size_t at = line.find(key);
@@ -37,8 +37,8 @@ void writeLines(int writer, Tally& tally)
     }
 }
 
-/// A writer's lines stand in order, within a file and from file to file: one number a writer tells whether all are
-/// there.
+/// The lines of a writer are in order, within a file and from file to file, so the last number of
+/// each writer shows whether all are present.
 void checkLines(const std::string& folder, int writers, Tally& tally)
 {
     std::map<std::string, std::filesystem::path> files;  // by name, so by time

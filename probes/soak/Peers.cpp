@@ -17,7 +17,7 @@ namespace {
 
 constexpr std::uint64_t longestRange = 1 << 18;
 
-/// Sends back each message, behind its length, on a thread of its own.
+/// Sends back each message, after its length, on a thread of its own.
 class Echo {
 public:
     Echo()

@@ -39,7 +39,7 @@ static void changeAtRandomBesideAVector(ValueOf valueOf)
             array.append(pos < size ? array[pos] : value);
             model.push_back(pos < size ? T(model[pos]) : value);
             break;
-        case 1: {  // some of its own, from before or behind the place
+        case 1: {  // some of its own, from before or after the place
             const long from = random() % 2 ? pos / 2 : pos, to = from < pos ? pos : size;
             const std::vector<T> items(model.begin() + from, model.begin() + to);
             array.insert(pos, to - from, array.data() + from);

@@ -33,7 +33,7 @@ std::atomic<time_t> seconds = 1000000000;
 
 }  // namespace
 
-// Names of logs tell the second; here it is one of the test's own.
+// Names of logs contain the second; this clock replaces the system's.
 extern "C" time_t time(time_t* out) noexcept
 {
     const time_t now = seconds += clockRuns;

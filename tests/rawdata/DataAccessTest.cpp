@@ -19,7 +19,7 @@ const KpAllocator none(KpAllocator::AllocatorNone);
 
 struct Layout {
     const char* what;
-    long gapX, gapY;  // bytes behind a voxel and behind a row
+    long gapX, gapY;  // bytes after a voxel and after a row
     bool isSliced;
 };
 const Layout layouts[] = {{"dense", 0, 0, false},
@@ -58,7 +58,7 @@ Bytes voxels(const TmDataAccess& volume)
     return all;
 }
 
-/// An allocator that fails as often as it is told to, and counts what comes back.
+/// An allocator that fails a given number of times and counts the freed blocks.
 int failures, freed;
 const KpAllocator counting([](unsigned long n) { return failures-- > 0 ? nullptr : std::malloc(n); },
                            [](void* p) {
@@ -100,7 +100,7 @@ TEST(Volume, worksOutStrides)
 
 TEST(Volume, givesItsMemoryBack)
 {
-    for (int fails : {0, 1, 2}) {  // the second attempt comes behind the callback
+    for (int fails : {0, 1, 2}) {  // the second attempt is after the callback
         static int callbacks;
         failures = fails;
         freed = callbacks = 0;

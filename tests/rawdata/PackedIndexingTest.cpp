@@ -34,7 +34,7 @@ TEST(PackedIndexing, numbersFlaggedPositions)
         for (unsigned length : {1, 2, 5, 100, 100000, 100001}) {
             SCOPED_TRACE(testing::Message() << n << " positions, runs of " << length);
             const Flags flags = someFlags(n, length);
-            KpBitfield bits(static_cast<unsigned long>(n), KpBitfield::INIT_SET);  // behind the last bit too
+            KpBitfield bits(static_cast<unsigned long>(n), KpBitfield::INIT_SET);  // after the last bit too
             for (unsigned long i = 0; i < bits.nBits(); ++i)
                 flags[i] ? bits.set(i) : bits.unset(i);
             const KpPackedIndexing fromFlags(flags.data(), static_cast<int>(n)), fromBits(bits);

@@ -17,7 +17,7 @@ using namespace kplib::detail;
 
 namespace {
 
-/// What the kernel tells of the first processor: the value of a field, such as "flags".
+/// The kernel's value of a field of the first processor, such as "flags".
 std::string told(const std::string& field)
 {
     std::ifstream in("/proc/cpuinfo");

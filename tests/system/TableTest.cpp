@@ -38,7 +38,7 @@ class Pair {
 public:
     Pair()
     {
-        mallopt(M_PERTURB, 0xA5);  // what nobody sets to zero isn't
+        mallopt(M_PERTURB, 0xA5);  // memory that is not set to zero is not zero
         for (KpTable*& table : tables)
             table = database.table(database.createTable());
         for (int t = 0; t < 2; ++t) {
@@ -84,7 +84,7 @@ public:
         }
     }
 
-    /// A copy of the value, behind the columns that are there.
+    /// A copy of the value, after the existing columns.
     void addLateColumns()
     {
         for (int t = 0; t < 2; ++t) {
@@ -202,7 +202,7 @@ TEST(KpTable, clonesAreEqualAndIndependent)
     Pair pair;
     for (int i = 0; i < 2950; ++i)
         pair.step();
-    pair.addLateColumns();  // a column for rows that are there; its values tell the rows of the clone
+    pair.addLateColumns();  // a column for existing rows; its values identify the rows of the clone
     pair.tables[1]->setName("second");
     KpDataBase copy;
     pair.database.clone(copy);

@@ -15,7 +15,7 @@
 
 namespace {
 
-// Writes down what it is told: m10 a maximum, v3 a value, "text", c0 the end with that code.
+// Records the calls: m10 a maximum, v3 a value, "text", c0 the end with that code.
 struct Gui : KpProgressGuiInterface {
     void setText(const std::string& text) override { told += '"' + text + "\" "; }
     void setMaximum(int maximum) override { told += 'm' + std::to_string(maximum) + ' '; }

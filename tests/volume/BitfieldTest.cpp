@@ -23,7 +23,7 @@ using Labels = std::vector<unsigned char>;
 constexpr unsigned long sizes[] = {0,  1,  2,   3,   4,   5,   31,  32,  33,  34,   63,   64,   65,   67,
                                    96, 97, 127, 128, 129, 191, 255, 256, 257, 4095, 4096, 4097, 12345};
 
-/// Bits alike, alike but for one, or noise, by the seed; behind the last bit there is noise.
+/// Bits alike, alike but for one, or noise, by the seed; after the last bit there is noise.
 KpBitfield someField(unsigned long nBits, unsigned seed)
 {
     std::mt19937 random(seed);

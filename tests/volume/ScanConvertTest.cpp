@@ -44,7 +44,7 @@ Raster scanned(const Polygon& polygon, int w, int h)
     return raster;
 }
 
-/// Even-odd at the middle of a pixel; 0 where an edge is too near to tell.
+/// Even-odd at the middle of a pixel; 0 where an edge is too near to decide.
 int side(const Polygon& polygon, int px, int py)
 {
     const double x = px + 0.5, y = py + 0.5;
@@ -107,7 +107,7 @@ TEST(KpScanConvert, handsPixelsOnUnlessSpansAreWanted)
     const Polygon square = {{0, 0}, {2, 0}, {2, 2}, {0, 2}};
     Raster pixels(4, 4), spans(4, 4);
     KpScanConvert scan(0, 0, 3, 3);
-    scan.render(4, square.data());  // nobody wants it
+    scan.render(4, square.data());  // no callback is set
     scan.setPixelCB(Raster::onPixel, &pixels);
     scan.render(4, square.data());
     EXPECT_EQ(pixels.rows[1], "##..");

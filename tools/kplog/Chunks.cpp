@@ -20,7 +20,7 @@ struct Chunk {
     std::string before;  // the file that it continues, empty for none
 };
 
-// Files may have moved since they were written, so that their names decide.
+// Files may have been moved since they were written, so only their names are compared.
 bool isSame(const std::string& a, const std::string& b)
 {
     return fs::path(a).filename() == fs::path(b).filename();
@@ -62,7 +62,7 @@ void addEarlier(std::vector<Chunk>& chunks)
     }
 }
 
-// Moves the chunk behind the one that it continues, and what continues it along.
+// Moves the chunk after the one that it continues, together with its continuations.
 void appendWithLater(const std::vector<Chunk>& chunks, const Chunk& first, std::vector<std::string>& files)
 {
     if (std::find(files.begin(), files.end(), first.file) != files.end())

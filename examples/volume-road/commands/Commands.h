@@ -7,8 +7,8 @@
 /// Writes a NIfTI volume, or the phantom if no source is given, as a DICOM series.
 KpResult makeSeries(const Job& job, KpProgressInterface& progress);
 
-/// Takes the volume of the job down the whole road, with its pictures, reports and page in the target. All pictures are
-/// written, or none.
+/// Processes the volume of the job in all stages and writes its pictures, reports and page into
+/// the target. All pictures are written, or none.
 KpResult run(const Job& job, KpProgressInterface& progress);
 
 /// Measures the largest region of a series: measure.png, the middle slice with the measures drawn over it, and

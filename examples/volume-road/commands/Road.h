@@ -8,7 +8,7 @@
 
 #include <vector>
 
-/// Walks the stages of the road; each is one step of the outer progress and one line of the report.
+/// Runs the stages of a job. Each is one step of the outer progress and one line of the report.
 class Road {
 public:
     explicit Road(KpProgressInterface& progress) : progress_(progress), watch_(true) {}

@@ -4,6 +4,6 @@
 
 #include <kplib/imaging/KpOrientationLetters.h>
 
-/// Draws into the middle of each edge of the picture which way the patient lies there, white in a black rim.
-/// Nothing into a picture that has no room for them.
+/// Draws the patient's direction into the middle of each edge of the picture, white with a black
+/// rim. Draws nothing into a picture that is too small.
 void drawLetters(Picture& picture, const KpOrientationLetters& letters);

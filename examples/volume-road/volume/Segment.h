@@ -14,7 +14,7 @@ struct Region {
     bool isThresholdGiven = false;
     int components = 0;        ///< number of regions
     unsigned long voxels = 0;  ///< of the largest
-    double millilitres = 0;    ///< of no meaning if the volume is not scaled
+    double millilitres = 0;    ///< not valid if the volume is not scaled
     KpVec3f center{0, 0, 0};   ///< mm, in the patient
     KpBox3f box;               ///< mm, in the patient; empty without a region
     KpBitfield mask;           ///< the region's voxels

@@ -18,5 +18,5 @@ struct Space {
 };
 
 /// The letters of a picture of the volume that shows `right` and `down`, directions in the patient, at these edges.
-/// Empty if the position of the patient is unknown: no letters are safer than wrong ones.
+/// Empty if the position of the patient is unknown, since wrong letters would mislead.
 KpOrientationLetters lettersOf(const Volume& volume, const KpVec3f& right, const KpVec3f& down);

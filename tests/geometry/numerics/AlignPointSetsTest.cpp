@@ -121,7 +121,7 @@ TEST(KpAlignPointSets, equalsAPlainFitWithAnyListsAndWeights)
         call.points2 = moved(call.points1, someMotion(KpVec3f(1, 1.5F, trial < 40 ? 0.7F : -0.7F)));
         for (int i = 0; i < 20; ++i) {
             call.index1.push_back(call.isIndexed ? 7 * i % 25 : i);
-            const bool isWrong = call.isIndexed && i == 3;  // one pair, which tells which list the weights are of
+            const bool isWrong = call.isIndexed && i == 3;  // one pair, which depends on the list of the weights
             call.index2.push_back((call.index1.back() + (isWrong ? 1 : 0)) % 25);
         }
         for (std::size_t i = 0; i < 25; ++i) {

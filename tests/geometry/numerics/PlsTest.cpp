@@ -19,7 +19,7 @@ std::vector<KpVec2f> asVector(const Points& points)
     return {points.begin(), points.end()};
 }
 
-/// The rules as told, recursively.
+/// The definition, recursively.
 void plainDouglasPeucker(const Points& points, std::vector<bool>& marks, long first, long last, float tolerance)
 {
     const KpLine2D line(points[first], points[last]);
@@ -93,7 +93,7 @@ TEST(Pls, reumannWitkamGoesAlongStrips)
     } cases[] = {
         {{{0, 0}, {1, 0}, {2, 0.1F}, {3, 0}, {3, 1}, {3, 2}}, 0.5F, {{0, 0}, {3, 0}, {3, 2}}},
         {{{0, 0}, {1, 0}, {2, 0}, {3, 0}}, 0.5F, {{0, 0}, {3, 0}}},               // the strip reaches the end
-        {{{0, 0}, {0.1F, 0}, {0.1F, 3}, {0.1F, 5}}, 0.5F, {{0, 0}, {0.1F, 5}}},   // a short piece tells no direction
+        {{{0, 0}, {0.1F, 0}, {0.1F, 3}, {0.1F, 5}}, 0.5F, {{0, 0}, {0.1F, 5}}},   // too short for a direction
         {{{0, 0}, {1, 0}, {2, 1}, {3, 0}}, 1, {{0, 0}, {1, 0}, {2, 1}, {3, 0}}},  // just as long, just as far
         {{{3, 3}, {3, 3}}, 9, {{3, 3}, {3, 3}}},
         {{}, 9, {}},
