@@ -48,8 +48,8 @@ struct KpElementTraits {
 /// `movesAsBytes` of their KpElementTraits is false. An address of an element is valid only until
 /// then.
 ///
-/// Preconditions: positions are checked in Debug builds only. T may be incomplete where an array
-/// is only declared, as within T itself.
+/// Preconditions: positions are checked in Debug and sanitizer builds only. T may be incomplete
+/// where an array is only declared, as within T itself.
 ///
 /// Errors: exhausted memory throws KpMemoryException. If the storage cannot grow in insertMemory()
 /// or a function that calls it, the capacity is already changed, and only the destructor may
