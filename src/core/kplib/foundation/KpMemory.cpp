@@ -14,7 +14,10 @@ void dropReallocationText(unsigned long size)
 {
     try {
         KpString text{KpString::NoMemory()};
-        text.printf("could not reallocate %lu bytes", size);
+#pragma GCC diagnostic push
+#pragma GCC diagnostic ignored "-Wformat"
+        text.printf("could not reallocate %Id bytes", size);  // intentional: the text is fixed, and discarded
+#pragma GCC diagnostic pop
     } catch (const KpMemoryException&) {
         return;  // no memory for the text either
     }

@@ -21,7 +21,7 @@ public:
         NotSupported = 4,      ///< the request is not supported
         ReadOnly = 5,          ///< the object cannot be changed
         OutOfRange = 6,        ///< an index or a value is out of range
-        NotImplemented = 7,    ///< the request is not implemented
+        NotImplemented = 7,    ///< the operation has no implementation
         OutOfMemory = 8,       ///< memory is exhausted
         False = 9,             ///< a negative answer
         Interrupted = 11,      ///< canceled by the user
